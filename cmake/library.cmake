@@ -1,0 +1,10 @@
+# libtaviwireless.so.4: the product, linked from the object libraries of its folders.
+add_library(taviwireless SHARED)
+target_link_libraries(taviwireless PRIVATE tavi_common tavi_usbmodem)
+target_link_libraries(taviwireless PUBLIC tavi::core)
+target_include_directories(taviwireless PUBLIC
+  $<BUILD_INTERFACE:${PROJECT_SOURCE_DIR}/include>
+  $<INSTALL_INTERFACE:${CMAKE_INSTALL_INCLUDEDIR}>)
+set_target_properties(taviwireless PROPERTIES VERSION ${PROJECT_VERSION} SOVERSION ${PROJECT_VERSION_MAJOR})
+target_link_options(taviwireless PRIVATE LINKER:--version-script=${PROJECT_SOURCE_DIR}/cmake/exports.map)
+set_property(TARGET taviwireless PROPERTY LINK_DEPENDS ${PROJECT_SOURCE_DIR}/cmake/exports.map)
