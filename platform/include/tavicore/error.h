@@ -1,0 +1,36 @@
+/*
+ * The SDK's error code: why the last SDK call of this thread failed.
+ *
+ * A call that fails sets the code; a call that succeeds leaves it alone, so it is only meaningful
+ * right after a failure. Users of the SDK set it too, for failures of their own.
+ */
+#ifndef TAVICORE_ERROR_H
+#define TAVICORE_ERROR_H
+
+#include <tavicore/export.h>
+
+#ifdef __cplusplus
+extern "C" {
+#endif
+
+enum {
+    VEXAC_ERR_NONE = 0x0000,
+    VEXAC_ERR_OUT_OF_MEMORY = 0x0200,
+    VEXAC_ERR_NOT_FOUND = 0x0700,     /* no such file, section, key or process */
+    VEXAC_ERR_IO = 0x0800,            /* the file cannot be opened, read, written or replaced */
+    VEXAC_ERR_TOO_LONG = 0x0900,      /* the value does not fit into the caller's buffer */
+    VEXAC_ERR_BAD_PARAMETER = 0x0D00, /* a null argument, or text that the file cannot hold */
+    VEXAC_ERR_FORK_FAILED = 0x2A00
+};
+
+/* Records code as the calling thread's error code. */
+TAVI_SDK_API void VEXACErrSet(int code);
+
+/* Returns the calling thread's error code; VEXAC_ERR_NONE before the first failure. */
+TAVI_SDK_API int VEXACErrGet(void);
+
+#ifdef __cplusplus
+}
+#endif
+
+#endif

@@ -1,0 +1,7 @@
+#ifndef TAVICORE_EXPORT_H
+#define TAVICORE_EXPORT_H
+
+/* Marks what the SDK libraries export; everything else in them is hidden. */
+#define TAVI_SDK_API __attribute__((visibility("default")))
+
+#endif

@@ -1,0 +1,45 @@
+#ifndef TAVICORE_FAILURE_H
+#define TAVICORE_FAILURE_H
+
+#include <tavicore/error.h>
+
+#include <cerrno>
+#include <exception>
+
+namespace tavicore {
+
+// Why an SDK function fails. Thrown where the cause is found; Guarded() makes it the error code.
+struct Failure {
+    int code;  // VEXAC_ERR_...
+};
+
+// What errno says about a file.
+inline Failure FileFailure() {
+    return {errno == ENOENT || errno == ENOTDIR ? VEXAC_ERR_NOT_FOUND : VEXAC_ERR_IO};
+}
+
+// Throws when one of the pointers is null.
+template <typename... Pointers>
+void RequireAll(const Pointers*... pointers) {
+    if ((... || (pointers == nullptr))) {
+        throw Failure{VEXAC_ERR_BAD_PARAMETER};
+    }
+}
+
+// Runs the body of an SDK function, whose callers are C: an exception becomes the error code and the
+// result `failed`.
+template <typename Result, typename Body>
+Result Guarded(Result failed, Body body) {
+    try {
+        return body();
+    } catch (const Failure& failure) {
+        VEXACErrSet(failure.code);
+    } catch (const std::exception&) {  // bad_alloc, or length_error of a container
+        VEXACErrSet(VEXAC_ERR_OUT_OF_MEMORY);
+    }
+    return failed;
+}
+
+}  // namespace tavicore
+
+#endif

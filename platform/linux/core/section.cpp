@@ -1,0 +1,284 @@
+// Section files: "[name]" headers, each followed by its key=value lines.
+#include <strings.h>
+#include <tavicore/section.h>
+
+#include <optional>
+#include <set>
+#include <string>
+#include <vector>
+
+#include "failure.h"
+#include "line.h"
+#include "szhash_pairs.h"
+#include "text_file.h"
+
+using namespace tavicore;
+
+namespace {
+
+constexpr char kCommentMarks[] = "#;";
+
+using Lines = std::vector<std::string>;
+
+Lines Split(std::string_view text) {
+    Lines lines;
+    while (!text.empty()) {
+        lines.emplace_back(TakeLine(&text));
+    }
+    return lines;
+}
+
+std::string Join(const Lines& lines) {
+    std::string text;
+    for (const std::string& line : lines) {
+        text += line;
+    }
+    return text;
+}
+
+// The name in a header line; nothing for other lines.
+std::optional<std::string> ReadHeader(std::string_view line) {
+    const std::string_view text = TrimLeft(TrimRight(Readable(line)));
+    if (text.size() < 2 || text.front() != '[' || text.back() != ']') {
+        return std::nullopt;
+    }
+    return std::string(text.substr(1, text.size() - 2));
+}
+
+std::optional<Pair> ReadKey(std::string_view line) {
+    auto pair = ReadPair(line, kCommentMarks);
+    if (pair) {
+        pair->key = TrimRight(pair->key);
+    }
+    return pair;
+}
+
+// Where the lines of a section stand: from begin, behind its header, up to end.
+struct Section {
+    std::string name;
+    size_t begin;
+    size_t end;
+};
+
+std::vector<Section> FindSections(const Lines& lines) {
+    std::vector<Section> sections;
+    for (size_t i = 0; i < lines.size(); ++i) {
+        if (const auto name = ReadHeader(lines[i])) {
+            if (!sections.empty()) {
+                sections.back().end = i;
+            }
+            sections.push_back({*name, i + 1, lines.size()});
+        }
+    }
+    return sections;
+}
+
+// An exact match goes before one without regard to case.
+std::optional<Section> FindSection(const Lines& lines, const char* name) {
+    std::optional<Section> similar;
+    for (const Section& section : FindSections(lines)) {
+        if (section.name == name) {
+            return section;
+        }
+        if (!similar && strcasecmp(section.name.c_str(), name) == 0) {
+            similar = section;
+        }
+    }
+    return similar;
+}
+
+void CheckSectionName(std::string_view name) {
+    if (name.empty() || HasLineBreak(name) || name != TrimLeft(TrimRight(name))) {
+        throw Failure{VEXAC_ERR_BAD_PARAMETER};
+    }
+}
+
+// The pair as a line that reads back as this pair.
+std::string FormatPair(const PairFormat& format, std::string_view key, std::string_view value) {
+    if (key.empty() || key.find_first_of("=") != key.npos || key.find_first_of("[#;") == 0 ||
+        key != TrimLeft(TrimRight(key)) || HasLineBreak(key) || HasLineBreak(value)) {
+        throw Failure{VEXAC_ERR_BAD_PARAMETER};
+    }
+    return format.Line(key, value);
+}
+
+Lines FormatPairs(const VEXACSzHash& hash, const char* format) {
+    RequireAll(format);
+    const PairFormat lineFormat(format);
+    Lines lines;
+    for (const auto& [key, value] : hash.pairs) {
+        lines.push_back(FormatPair(lineFormat, key, value));
+    }
+    return lines;
+}
+
+// Inserts behind the last pair of the section: the comments and blank lines below it mostly belong
+// to the section that follows.
+void InsertAtEnd(Lines& lines, const Section& section, const Lines& newLines) {
+    size_t place = section.begin;
+    for (size_t i = section.begin; i < section.end; ++i) {
+        if (ReadKey(lines[i])) {
+            place = i + 1;
+        }
+    }
+    EndLastLine(&lines[place - 1]);
+    lines.insert(lines.begin() + static_cast<std::ptrdiff_t>(place), newLines.begin(),
+                 newLines.end());
+}
+
+void AppendSection(std::string* text, const std::string& name, const Lines& pairs) {
+    EndLastLine(text);
+    *text += "[" + name + "]\n" + Join(pairs);
+}
+
+// Replaces all pairs of the section; its comments and blank lines stay.
+void ReplacePairs(Lines& lines, Section section, const Lines& newPairs) {
+    for (size_t i = section.end; i-- > section.begin;) {
+        if (ReadKey(lines[i])) {
+            lines.erase(lines.begin() + static_cast<std::ptrdiff_t>(i));
+            --section.end;
+        }
+    }
+    InsertAtEnd(lines, section, newPairs);
+}
+
+// Puts newLine in the place of the key's first line, or at the end of the section; the key's
+// further lines go.
+void SetPair(Lines& lines, const Section& section, std::string_view key,
+             const std::string& newLine) {
+    bool written = false;
+    for (size_t i = section.begin; i < section.end; ++i) {
+        const auto pair = ReadKey(lines[i]);
+        if (pair && pair->key == key) {
+            lines[i] = written ? "" : newLine;
+            written = true;
+        }
+    }
+    if (!written) {
+        InsertAtEnd(lines, section, {newLine});
+    }
+}
+
+// Sets the section's pairs in *hash. False when the file has no such section.
+bool ReadSection(const char* file, const char* section, VEXACSzHash** hash) {
+    const Lines lines = Split(ReadText(file));
+    const auto found = FindSection(lines, section);
+    if (!found) {
+        return false;
+    }
+    std::set<std::string> seen;
+    for (size_t i = found->begin; i < found->end; ++i) {
+        const auto pair = ReadKey(lines[i]);
+        if (pair && seen.insert(std::string(pair->key)).second &&
+            VEXACSzHashSetValue(hash, std::string(pair->key).c_str(),
+                                std::string(pair->value).c_str()) != 0) {
+            throw Failure{VEXAC_ERR_OUT_OF_MEMORY};
+        }
+    }
+    return true;
+}
+
+}  // namespace
+
+int VEXACFileEnumSection(const char* file, VEXACSzList** list) {
+    return Guarded(-1, [&] {
+        RequireAll(file, list);
+        const auto sections = FindSections(Split(ReadText(file)));
+        for (const Section& section : sections) {
+            if (VEXACSzListPush(list, section.name.c_str()) < 0) {
+                return -1;
+            }
+        }
+        return static_cast<int>(sections.size());
+    });
+}
+
+int VEXACFileGetSection(const char* file, const char* section, VEXACSzHash** hash) {
+    return Guarded(-1, [&] {
+        RequireAll(file, section, hash);
+        RequireAll(*hash);
+        if (!ReadSection(file, section, hash)) {
+            VEXACErrSet(VEXAC_ERR_NOT_FOUND);
+            return 0;
+        }
+        return 1;
+    });
+}
+
+int VEXACFileAddSection(const char* file, const char* section, const VEXACSzHash* hash,
+                        const char* format) {
+    return Guarded(-1, [&] {
+        RequireAll(file, section, hash);
+        CheckSectionName(section);
+        const Lines pairs = FormatPairs(*hash, format);
+        ChangeText(file, IfMissing::kCreate, [&](std::string* text) {
+            if (FindSection(Split(*text), section)) {
+                throw Failure{VEXAC_ERR_BAD_PARAMETER};
+            }
+            AppendSection(text, section, pairs);
+        });
+        return 1;
+    });
+}
+
+int VEXACFileSetSection(const char* file, const char* section, const char* newName,
+                        const VEXACSzHash* hash, const char* format) {
+    bool exists = true;
+    const int result = Guarded(-1, [&] {
+        RequireAll(file, section, hash);
+        if (newName != nullptr) {
+            throw Failure{VEXAC_ERR_BAD_PARAMETER};
+        }
+        const Lines pairs = FormatPairs(*hash, format);
+        ChangeText(file, IfMissing::kFail, [&](std::string* text) {
+            Lines lines = Split(*text);
+            const auto found = FindSection(lines, section);
+            exists = found.has_value();
+            if (!exists) {
+                throw Failure{VEXAC_ERR_NOT_FOUND};
+            }
+            ReplacePairs(lines, *found, pairs);
+            *text = Join(lines);
+        });
+        return 1;
+    });
+    return exists ? result : 0;
+}
+
+int VEXACFileGetSectionValue(const char* file, const char* section, const char* key, char* value,
+                             size_t size) {
+    if (value != nullptr && size > 0) {
+        *value = '\0';
+    }
+    return Guarded(-1, [&] {
+        RequireAll(file, section, key, value);
+        VEXACSzHash pairs;
+        VEXACSzHash* hash = &pairs;
+        const char* found =
+            ReadSection(file, section, &hash) ? VEXACSzHashGetValue(hash, key) : nullptr;
+        if (found == nullptr) {
+            throw Failure{VEXAC_ERR_NOT_FOUND};
+        }
+        CopyOut(found, value, size);
+        return 0;
+    });
+}
+
+int VEXACFileSetSectionValue(const char* file, const char* section, const char* key,
+                             const char* value, const char* format) {
+    return Guarded(-1, [&] {
+        RequireAll(file, section, key, value, format);
+        CheckSectionName(section);
+        const std::string line = FormatPair(PairFormat(format), key, value);
+        ChangeText(file, IfMissing::kCreate, [&](std::string* text) {
+            Lines lines = Split(*text);
+            if (const auto found = FindSection(lines, section)) {
+                SetPair(lines, *found, key, line);
+                *text = Join(lines);
+            } else {
+                AppendSection(text, section, {line});
+            }
+        });
+        return 0;
+    });
+}

@@ -1,0 +1,20 @@
+#ifndef TAVICORE_SZHASH_PAIRS_H
+#define TAVICORE_SZHASH_PAIRS_H
+
+#include <tavicore/szhash.h>
+
+#include <deque>
+#include <string>
+#include <string_view>
+#include <unordered_map>
+
+struct VEXACSzHash {
+    struct Pair {
+        std::string key;
+        std::string value;
+    };
+    std::deque<Pair> pairs;  // in the order in which keys were first set; a deque never moves them
+    std::unordered_map<std::string_view, Pair*> byKey;
+};
+
+#endif

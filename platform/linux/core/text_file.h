@@ -1,0 +1,34 @@
+#ifndef TAVICORE_TEXT_FILE_H
+#define TAVICORE_TEXT_FILE_H
+
+#include <sys/stat.h>
+
+#include <functional>
+#include <string>
+
+// Whole text files: read, and replaced in one step. Everything here throws Failure.
+namespace tavicore {
+
+// Reads a regular file to its end. Anything else at the path is a failure and is never waited for.
+// `status`, when it is not null, is what fstat said before the first byte was read.
+std::string ReadText(const char* path, struct stat* status = nullptr);
+
+enum class IfMissing { kFail, kCreate };
+
+// Replaces the text of a file by what `change` makes of it; a missing file that is to be created is
+// the empty text. The file keeps its mode and owner, a new one has 0644 less the umask; a symbolic
+// link stays and leads to the new text. A text that `change` leaves alone is not written. While it
+// runs, this and every other writer of a file in the same directory waits.
+//
+// The new text is written and synced beside the file as ".NAME.new" and renamed, so at any moment
+// the path names the old or the new text. What a killed writer leaves of ".NAME.new", the next one
+// removes.
+void ChangeText(const char* path, IfMissing ifMissing,
+                const std::function<void(std::string* text)>& change);
+
+// Puts a new file with this text in the place of what regular file stands there.
+void ReplaceFile(const char* path, const std::string& text);
+
+}  // namespace tavicore
+
+#endif
