@@ -1,0 +1,237 @@
+#ifndef TAVIWIRELESS_USBMODEM_H
+#define TAVIWIRELESS_USBMODEM_H
+
+#include <taviwireless/export.h>
+#include <taviwireless/semaphore.h>
+
+#include <memory>
+#include <string>
+#include <vector>
+
+class WvModem;  // WvStreams
+
+namespace Json {
+class Value;
+}
+
+namespace taviwireless::usbmodem_lib {
+
+class USBModem_ATIF;
+
+// One plugged-in USB 3G modem: what its info file says, its serial channel and command set, and the
+// last good answer to everything that was asked.
+//
+// Conventions of all operations:
+// - Nothing throws on a device, file or parse failure; each failure is one line in the system log.
+// - An int result is 0 for success and -1 for failure where nothing else is said.
+// - A bool& err is only ever set to true; the caller clears it before the call. The text returned
+// is
+//   then the last good value, which may be empty.
+// - "Busy" is the time in which a dial-up connection owns the modem: nothing is sent, and queries
+//   give what they last knew.
+// - Operations that talk to the modem send through the open channel (OpenFileDevice) with the
+//   command set (SetATInterface); InitInfo sees to both. Each costs at least 300 ms.
+// - A record belongs to one thread at a time. The modem's semaphore keeps processes apart.
+//
+// The info file is a key/value file written at hot-plug, "/tmp/usbmodem.info" and the interface id:
+//   USB_ID_VENDOR  USB vendor id, four lowercase hexadecimal digits
+//   CONNECTNODE    number k of the dial port "/dev/ttyUSBk"
+//   DEVICENODE     numbers of all serial ports of the modem, separated by ","
+class TAVIWIRELESS_API USBModem {
+  public:
+    // Makes a record with nothing known yet. Touches no file and no device.
+    USBModem(unsigned int interfaceId, const std::string& infoPath);
+
+    // Copies what identifies the modem and its state, but not the names read from it: query node,
+    // PID file, vendor and product name, IMSI, default ISP and APN, interface name and local IP are
+    // empty in the copy. Copies share the open channel and the command set; each is released once,
+    // with the last record that holds it.
+    USBModem(const USBModem& other);
+    // Assignment copies everything and shares the channel and the command set likewise.
+    USBModem& operator=(const USBModem& other);
+    // Moving loses nothing; the source is left without channel and command set.
+    USBModem(USBModem&& other) noexcept;
+    USBModem& operator=(USBModem&& other) noexcept;
+
+    virtual ~USBModem();
+    // The device id, by which clients name the modem: "usbmodem" and the interface id.
+    virtual std::string GetDevId() const;
+    virtual bool IsNull() const;
+    // True once InitInfo succeeded.
+    virtual bool IsInited() const;
+    // True while the info file exists, that is, while the modem is plugged in.
+    virtual bool IsInfoExist() const;
+
+    unsigned int GetIfid() const;
+    // True from the sixth counted error on.
+    bool IsError();
+    // Counts one error and returns the new count.
+    int IncreaseErrorCounter();
+    bool IsUSBModemBusy();
+    // True until SetNotNewPlugIn or an operation that enters or changes a PIN.
+    bool IsNewPlugIn();
+    void SetNotNewPlugIn();
+    int GetConnectFailedAttempt();
+    // Network interface and local address of the running connection; empty when there is none.
+    std::string GetNetIFName(bool& err);
+    std::string GetNetLocalIP(bool& err);
+
+    // Makes a new record usable: chooses the command set, finds both ports (three attempts each,
+    // one second apart), sets full functionality, silences unsolicited reports and reads the SIM
+    // status, whose state does not matter. Returns 0; on failure -1 with the channel closed, and
+    // the record may be initialised again.
+    int InitInfo();
+
+    // Chooses the command set by USB_ID_VENDOR, the generic one if that is unknown or missing.
+    void SetATInterface();
+    void UnsetATInterface();
+    // Takes the dial port from CONNECTNODE. Its test with the SIM status query is advisory: a port
+    // that does not answer is taken with a warning. Fails when CONNECTNODE cannot be read.
+    int AssignConnectNode();
+    // Takes as query port the first of DEVICENODE, the dial port aside, that answers the SIM status
+    // query, and leaves the channel open on it.
+    int AssignQuaryNode();
+    // Reads the network interface name from the dialler's log,
+    // "/var/lib/usbmodem/wvdial.log." and the IMSI. Returns 1 when it was read, 2 while the link is
+    // still coming up, -1 when the log cannot be read or the dialler is disconnecting.
+    int AssignConnectInfo();
+
+    // Opens the serial port at the device path node: 9600 baud, hardware flow control, and a lock
+    // file in "/var/lock". A channel that is open already is replaced but stays open until
+    // CloseFileDevice.
+    int OpenFileDevice(const std::string& node);
+    // Closes the record's channel, if it is open.
+    void CloseFileDevice();
+    // Ends a half-typed command line in the modem and discards input until 100 ms pass without any.
+    // Fails when no channel is open, or when the modem is not quiet within 10 s.
+    int DrainDeviceBuffer();
+    // Sends cmd and a carriage return under the modem's semaphore and collects the reply, at most
+    // 1024 bytes, until 200 ms pass without any; -1 when none begins within 1000 ms. reply then
+    // holds its lines, each ended by a line feed, without blank lines and lines that repeat cmd. A
+    // line that was cut off before its end is dropped. Whether the modem reported an error is for
+    // the caller to see: that is a reply too.
+    int ModemCmd(const std::string& cmd, std::string& reply);
+    // Opens the port at node, sends cmd and prints the dialogue on standard output. Returns -1 when
+    // the port cannot be opened, else the result of ModemCmd. Closes the channel.
+    int TestATCmd(const std::string& cmd, const std::string& node);
+
+    // SIM and PIN. The operations that change something return 0 when it is done or need not be,
+    // -1 when it was refused or could not be sent, -2 when the modem did not answer OK, 2 when
+    // busy.
+
+    // Asks for the SIM status, unless busy. Returns 1 ready, 0 PIN or PUK required, 2 SIM busy or
+    // error, -1 unknown.
+    int UpdateSIMStatus();
+    // UpdateSIMStatus and the name of the status: "ready", "pin_protect", "puk_protect" or
+    // "no_sim". err is set when the status is not known.
+    std::string GetPINStatus(bool& err);
+    // Whether the SIM was ready when it was last asked; sends nothing. err is set when it was
+    // neither ready nor waiting for a PIN or PUK.
+    bool IsPINReady(bool& err);
+    // Whether the SIM is protected by a PIN: 1 yes, 0 no (and while busy), -1 failure.
+    int GetPINEnable();
+    int PINGetEnableProtection();
+    // Switches PIN protection; the SIM must be ready.
+    int ChangePINEnable(const std::string& pin, bool enable);
+    // Changes the PIN; the SIM must be ready.
+    int ChangePIN(const std::string& oldPin, const std::string& newPin);
+    // ChangePINEnable, then ChangePIN unless newPin is empty.
+    int PINSet(const std::string& pin, const std::string& newPin, bool enable);
+    // Enters the PIN, unless the SIM is ready already.
+    int PINUnlock(const std::string& pin);
+    // Sets a new PIN with the PUK; the SIM must be waiting for its PUK.
+    int ChangePINWithPUK(const std::string& puk, const std::string& newPin);
+    int PUKSet(const std::string& puk, const std::string& newPin);
+    // Attempts left, or -1; the last known number, 0 at first, when busy or without a usable SIM.
+    int PINGetAttemptRemain();
+    int PUKGetAttemptRemain();
+
+    // Information. The SIM must be ready for all but the vendor and product name.
+    std::string GetDefaultAPN(bool& err);
+    // Empty, without err, while the SIM is not ready.
+    std::string GetDefaultISP(bool& err);
+    // The location of the operator by the APN database, empty when it is not listed.
+    std::string GetDefaultLocation(bool& err);
+    // "true" or "false"; asked only while connected.
+    std::string GetRoaming(bool& err);
+    std::string GetIMSI(bool& err);
+    std::string GetProductName(bool& err);
+    std::string GetVendorName(bool& err);
+    // Asks for the signal strength and keeps it; 0 also when there was nothing to ask.
+    int GetRSSI();
+    // Signal strength in percent of the scale of TS 27.007, 8.5 (0 to 31); 0 when it is not known.
+    int GetSignalQuality(bool& err);
+    // Sets +CFUN to level ("1": full functionality). 0 also when the modem does not know +CFUN;
+    // 2 when busy.
+    int SetHardwareFuncLvl(const std::string& level);
+    // Switches unsolicited reports. 0 also when the modem cannot; 2 when busy.
+    int SetUnsolicitedReports(bool enable);
+    // Reads the APN database "/usr/tavi/etc/usbmodem/wcdma_list.json" into out: an array of
+    // {"id": LOCATION, "isp": [{"name": OPERATOR}, ...]}. Returns false, with out untouched, when
+    // the file cannot be read or is not JSON.
+    bool ReadAPNData(Json::Value& out);
+
+  private:
+    enum InitState { kNotInited, kInited, kInitFailed };
+    enum SIMStatus { kReady, kPINRequired, kPUKRequired, kSIMBusy, kSIMError, kSIMUnknown };
+    enum NetStatus { kConnected, kConnecting, kReconnecting, kDisconnected, kConnectionLost };
+
+    using Command = std::string (USBModem_ATIF::*)();
+    using Parser = int (USBModem_ATIF::*)(const std::string& reply, std::string& result);
+
+    USBModem_ATIF& CommandSet() const;
+    bool FindPortsAndPrepare();
+    bool Open(const std::string& node, std::string& error);
+    int Exchange(const std::string& cmd, std::string& reply);
+    int QuerySIMStatus(std::string& reply);
+    int EnterPIN(const std::string& pin);
+    int EnterPUK(const std::string& puk, const std::string& newPin);
+    int AttemptRemain(Parser parser, int& cache);
+    bool Refresh(Command command, Parser parser, std::string& cache,
+                 void (*logParseFailure)(const char* reply));
+
+    unsigned int interfaceId_;
+    int initState_ = kNotInited;
+    int simStatus_ = kSIMUnknown;
+    int netStatus_ = kDisconnected;
+    std::string infoPath_;
+    std::string connectNode_;
+    std::string queryNode_;
+    std::string pidFile_;
+    int connectFailedAttempts_ = 0;
+    int rssi_ = 0;
+    int pinAttemptsRemaining_ = 0;
+    int pukAttemptsRemaining_ = 0;
+    std::string vendorName_;
+    std::string productName_;
+    std::string imsi_;
+    std::string roaming_ = "false";
+    std::string defaultISP_;
+    std::string defaultAPN_;
+    std::string netIFName_;
+    std::string netLocalIP_;
+    std::string profilePath_;
+    semaphore::Semaphore semaphore_;
+    bool busy_ = false;
+    bool newPlugIn_ = true;
+    int errorCounter_ = 0;
+    std::shared_ptr<WvModem> device_;
+    std::shared_ptr<USBModem_ATIF> atInterface_;
+    std::vector<std::shared_ptr<WvModem>> replacedDevices_;
+};
+
+// The null object: what a lookup returns that found no modem. It has no device id and is never
+// initialised; its operations fail as those of a modem without a channel.
+class TAVIWIRELESS_API USBModemNull : public USBModem {
+  public:
+    USBModemNull();
+    ~USBModemNull() override;
+    std::string GetDevId() const override;
+    bool IsNull() const override;
+    bool IsInited() const override;
+    bool IsInfoExist() const override;
+};
+
+}  // namespace taviwireless::usbmodem_lib
+
+#endif

@@ -1,0 +1,48 @@
+#ifndef TAVIWIRELESS_USBMODEM_LIST_H
+#define TAVIWIRELESS_USBMODEM_LIST_H
+
+#include <taviwireless/export.h>
+#include <taviwireless/usbmodem.h>
+
+#include <string>
+#include <vector>
+
+namespace taviwireless::usbmodem_lib {
+
+// The modems that are plugged in, in the order in which they were found. Owns their records.
+//
+// A list has no lock: it belongs to the thread that owns it. References to records stay valid until
+// the next SearchInfoPath or Update.
+class TAVIWIRELESS_API USBModemList {
+  public:
+    USBModemList();
+    virtual ~USBModemList();
+
+    // Adds a record for every info file "/tmp/usbmodem.info" + n that has none yet. Names are
+    // exact: no leading zeros, nothing behind the number. Returns 0, or -1 when "/tmp/" cannot be
+    // listed.
+    int SearchInfoPath();
+
+    // Brings the list up to date: SearchInfoPath, drop the modems whose info file is gone, and
+    // InitInfo for each that is not initialised. Of two modems unplugged at once whose records are
+    // neighbours, the second is dropped by the next call.
+    // Returns 0, or -1 as soon as one modem cannot be initialised (up to six seconds); those behind
+    // it wait for the next call.
+    int Update();
+
+    // The modem with this device id or interface id, else nullObject. Borrowed from the list.
+    USBModem& FindUSBModem(const std::string& devId);
+    USBModem& FindUSBModem(int interfaceId);
+
+    std::vector<USBModem>::iterator begin() { return records_.begin(); }
+    std::vector<USBModem>::iterator end() { return records_.end(); }
+
+    static USBModemNull nullObject;
+
+  private:
+    std::vector<USBModem> records_;
+};
+
+}  // namespace taviwireless::usbmodem_lib
+
+#endif

@@ -1,0 +1,259 @@
+// What the modem knows about itself and its network.
+#include <json/json.h>
+#include <taviwireless/usbmodem.h>
+#include <taviwireless/usbmodem_atif.h>
+
+#include <fstream>
+
+#include "common/log.h"
+#include "usbmodem/text.h"
+
+namespace taviwireless::usbmodem_lib {
+
+namespace {
+
+constexpr char kAPNDatabase[] = "/usr/tavi/etc/usbmodem/wcdma_list.json";
+
+constexpr int kMinRSSI = 0;
+constexpr int kMaxRSSI = 31;
+constexpr int kUnknownRSSI = 99;
+
+constexpr int kBusy = 2;
+
+// Whether one of the operators of a location has this name.
+bool HasOperator(const Json::Value& location, const std::string& name) {
+    if (!location["isp"].isArray()) {
+        return false;
+    }
+    for (const Json::Value& isp : location["isp"]) {
+        if (isp.isObject() && isp.isMember("name") &&
+            isp["name"].isConvertibleTo(Json::stringValue) && isp["name"].asString() == name) {
+            return true;
+        }
+    }
+    return false;
+}
+
+// Returns the id of the first location that lists the operator; empty when none does.
+std::string FindLocation(const Json::Value& locations, const std::string& name) {
+    if (!locations.isArray()) {
+        return "";
+    }
+    for (const Json::Value& location : locations) {
+        if (location.isObject() && location.isMember("id") && location.isMember("isp") &&
+            location["id"].isConvertibleTo(Json::stringValue) && HasOperator(location, name)) {
+            return location["id"].asString();
+        }
+    }
+    return "";
+}
+
+}  // namespace
+
+bool USBModem::Refresh(Command command, Parser parser, std::string& cache,
+                       void (*logParseFailure)(const char* reply)) {
+    const std::string cmd = (CommandSet().*command)();
+    std::string reply;
+    if (ModemCmd(cmd, reply) != 0) {
+        TAVI_LOG_ERROR("error on sending commmand %s", cmd.c_str());
+        return false;
+    }
+    if ((CommandSet().*parser)(reply, cache) != 0) {
+        logParseFailure(reply.c_str());
+        return false;
+    }
+    return true;
+}
+
+std::string USBModem::GetDefaultAPN(bool& err) {
+    if (busy_) {
+        return defaultAPN_;
+    }
+    if (simStatus_ != kReady) {
+        TAVI_LOG_ERROR("cannot get default APN when PIN is not ready");
+        err = true;
+    } else if (!Refresh(&USBModem_ATIF::GetATCommandGetDefaultAPN,
+                        &USBModem_ATIF::ParseRetStringDefaultAPN, defaultAPN_,
+                        [](const char* reply) {
+                            TAVI_LOG_ERROR("error on reading default APN, ret: %s", reply);
+                        })) {
+        err = true;
+    }
+    return defaultAPN_;
+}
+
+std::string USBModem::GetDefaultISP(bool& err) {
+    if (busy_) {
+        return defaultISP_;
+    }
+    if (simStatus_ != kReady) {
+        defaultISP_.clear();
+    } else if (!Refresh(&USBModem_ATIF::GetATCommandGetDefaultISP,
+                        &USBModem_ATIF::ParseRetStringDefaultISP, defaultISP_,
+                        [](const char* reply) {
+                            TAVI_LOG_ERROR("error on reading ISP, ret: %s", reply);
+                        })) {
+        err = true;
+    }
+    return defaultISP_;
+}
+
+std::string USBModem::GetDefaultLocation(bool& err) {
+    bool ispFailed = false;
+    const std::string isp = GetDefaultISP(ispFailed);
+    err = err || ispFailed;
+    if (ispFailed || isp.empty()) {
+        TAVI_LOG_ERROR("No ISP");
+        return "";
+    }
+    Json::Value locations;
+    if (!ReadAPNData(locations)) {
+        TAVI_LOG_ERROR("Failed to read APN data");
+        err = true;
+        return "";
+    }
+    err = false;  // alone among the queries, this one also clears it
+    return FindLocation(locations, isp);
+}
+
+std::string USBModem::GetRoaming(bool& err) {
+    if (!busy_ && netStatus_ == kConnected &&
+        !Refresh(&USBModem_ATIF::GetATCommandGetRoaming, &USBModem_ATIF::ParseRetStringGetRoaming,
+                 roaming_, [](const char*) { TAVI_LOG_ERROR("error on parsing roaming stats"); })) {
+        err = true;
+    }
+    return roaming_;
+}
+
+std::string USBModem::GetIMSI(bool& err) {
+    if (!busy_ &&
+        (simStatus_ != kReady ||
+         !Refresh(&USBModem_ATIF::GetATCommandGetIMSI, &USBModem_ATIF::ParseRetStringDefaultFormat,
+                  imsi_, [](const char* reply) {
+                      TAVI_LOG_ERROR("error on parsing string, ret %s", reply);
+                  }))) {
+        err = true;
+    }
+    return imsi_;
+}
+
+std::string USBModem::GetProductName(bool& err) {
+    if (!busy_ &&
+        !Refresh(&USBModem_ATIF::GetATCommandGetProductName,
+                 &USBModem_ATIF::ParseRetStringDefaultFormat, productName_, [](const char* reply) {
+                     TAVI_LOG_ERROR("error on parsing product name, ret: [%s]", reply);
+                 })) {
+        err = true;
+    }
+    return productName_;
+}
+
+std::string USBModem::GetVendorName(bool& err) {
+    if (!busy_ &&
+        !Refresh(&USBModem_ATIF::GetATCommandGetVendorName,
+                 &USBModem_ATIF::ParseRetStringDefaultFormat, vendorName_,
+                 [](const char* reply) { TAVI_LOG_ERROR("error on parsing %s", reply); })) {
+        err = true;
+    }
+    return vendorName_;
+}
+
+int USBModem::GetRSSI() {
+    if (busy_ || simStatus_ != kReady) {
+        return 0;
+    }
+    std::string reply;
+    std::string rssi;
+    if (ModemCmd(CommandSet().GetATCommandGetRSSI(), reply) != 0 ||
+        CommandSet().ParseRetStringGetRSSI(reply, rssi) != 0) {
+        return -1;
+    }
+    rssi_ = ToInt(rssi);
+    return 0;
+}
+
+int USBModem::GetSignalQuality(bool& err) {
+    if (simStatus_ != kReady) {
+        return 0;
+    }
+    if (GetRSSI() != 0) {
+        TAVI_LOG_ERROR("error on getting RSSI: %d", rssi_);
+        err = true;
+        return 0;
+    }
+    if (rssi_ == kUnknownRSSI) {
+        rssi_ = 0;
+    }
+    if (rssi_ < kMinRSSI || rssi_ > kMaxRSSI) {
+        TAVI_LOG_ERROR("returned RSSI %d is not in range %d ~ %d", rssi_, kMinRSSI, kMaxRSSI);
+        err = true;
+        return 0;
+    }
+    return rssi_ * 100 / kMaxRSSI;
+}
+
+int USBModem::SetHardwareFuncLvl(const std::string& level) {
+    if (busy_) {
+        return kBusy;
+    }
+    std::string reply;
+    if (ModemCmd(CommandSet().GetATCommandGetHardwareFuncLvl(), reply) != 0 ||
+        CommandSet().ParseRetStringIsOK(reply) != 0) {
+        TAVI_LOG_ERROR("Not support AT+CFUN?, skip setting hardware function lvl");
+        return 0;
+    }
+    if (ModemCmd(CommandSet().GetATCommandSetHardwareFuncLvl(level), reply) != 0) {
+        TAVI_LOG_ERROR("error on modem cmd: AT+CFUN=%s", level.c_str());
+        return -1;
+    }
+    if (CommandSet().ParseRetStringIsOK(reply) != 0) {
+        TAVI_LOG_ERROR("error on setting hardware function lvl, ret: %s", reply.c_str());
+        return -1;
+    }
+    return 0;
+}
+
+int USBModem::SetUnsolicitedReports(bool enable) {
+    if (busy_) {
+        return kBusy;
+    }
+    const std::string query = CommandSet().GetATCommandGetUnsolicitedReports();
+    std::string reply;
+    std::string setting;
+    if (query.empty() || ModemCmd(query, reply) != 0 ||
+        CommandSet().ParseRetStringDefaultFormat(reply, setting) != 0) {
+        TAVI_LOG_ERROR("skip unsolicited reports setting, not supported");
+        return 0;
+    }
+    // The whole reply is searched, not the value alone: a digit anywhere in it counts. Kept.
+    if (reply.find(enable ? '1' : '0') != std::string::npos) {
+        return 0;
+    }
+    if (ModemCmd(CommandSet().GetATCommandSetUnsolicitedReports(enable), reply) != 0) {
+        TAVI_LOG_ERROR("error on modem cmd: change unsolicited reports setting");
+        return -1;
+    }
+    if (CommandSet().ParseRetStringIsOK(reply) != 0) {
+        TAVI_LOG_ERROR("error on changing unsolicited reports setting, ret: %s", reply.c_str());
+        return -1;
+    }
+    return 0;
+}
+
+bool USBModem::ReadAPNData(Json::Value& out) {
+    std::ifstream file(kAPNDatabase);
+    Json::Value root;
+    try {
+        std::string errors;
+        if (Json::parseFromStream(Json::CharReaderBuilder(), file, &root, &errors)) {
+            out = root;
+            return true;
+        }
+    } catch (const Json::Exception&) {
+        // nested too deeply
+    }
+    TAVI_LOG_ERROR("Failed to parse json file [%s]", kAPNDatabase);
+    return false;
+}
+
+}  // namespace taviwireless::usbmodem_lib

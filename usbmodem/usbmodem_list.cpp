@@ -1,0 +1,108 @@
+#include <tavicore/error.h>
+#include <tavicore/file.h>
+#include <taviwireless/usbmodem_list.h>
+
+#include <cerrno>
+#include <climits>
+#include <cstdlib>
+#include <cstring>
+#include <optional>
+
+#include "common/log.h"
+#include "common/sz_list.h"
+
+namespace taviwireless::usbmodem_lib {
+
+namespace {
+
+constexpr char kInfoDirectory[] = "/tmp/";
+constexpr char kInfoName[] = "usbmodem.info";
+
+// Returns the interface id in the name of an info file; nothing for the names of other files, such
+// as backup copies and numbers with leading zeros. -1 is not taken: it has always meant "no
+// number".
+std::optional<int> ParseInterfaceId(const std::string& name) {
+    if (name.rfind(kInfoName, 0) != 0) {
+        return std::nullopt;
+    }
+    const long number = std::strtol(name.c_str() + std::strlen(kInfoName), nullptr, 10);
+    if (number < INT_MIN || number > INT_MAX || number == -1 ||
+        name != kInfoName + std::to_string(number)) {
+        return std::nullopt;
+    }
+    return static_cast<int>(number);
+}
+
+}  // namespace
+
+USBModemNull USBModemList::nullObject;
+
+USBModemList::USBModemList() = default;
+
+USBModemList::~USBModemList() = default;
+
+int USBModemList::SearchInfoPath() {
+    SzList names(1024);
+    if (!names) {
+        TAVI_LOG_ERROR("Failed to alloc for pFolderList");
+        VEXACErrSet(VEXAC_ERR_OUT_OF_MEMORY);
+        return -1;
+    }
+    if (VEXACFileEnumDir(kInfoDirectory, kInfoName, names.Address(), VEXAC_ENUM_FILES) < 0) {
+        TAVI_LOG_ERROR("Failed to enum all files under %s", kInfoDirectory);
+        return -1;
+    }
+    if (names.Count() < 0) {
+        TAVI_LOG_ERROR("number of file grep from %s: %d", kInfoDirectory, names.Count());
+        return -1;
+    }
+    for (int i = 0; i < names.Count(); ++i) {
+        const std::string name = names[i];
+        const std::optional<int> interfaceId = ParseInterfaceId(name);
+        if (interfaceId && FindUSBModem(*interfaceId).IsNull()) {
+            records_.emplace_back(*interfaceId, kInfoDirectory + name);
+        }
+    }
+    return 0;
+}
+
+int USBModemList::Update() {
+    if (SearchInfoPath() != 0) {
+        TAVI_LOG_ERROR("Failed to search info path");
+        return -1;
+    }
+    // The record that moves into a freed place is not looked at until the next call. Kept: clients
+    // may count on seeing modems go one by one.
+    for (size_t i = 0; i < records_.size(); ++i) {
+        if (!records_.at(i).IsInfoExist()) {
+            records_.erase(records_.begin() + static_cast<std::ptrdiff_t>(i));
+        }
+    }
+    for (USBModem& modem : records_) {
+        if (!modem.IsInited() && modem.InitInfo() < 0) {
+            TAVI_LOG_ERROR("Failed to init info [%d]", static_cast<int>(modem.GetIfid()));
+            return -1;
+        }
+    }
+    return 0;
+}
+
+USBModem& USBModemList::FindUSBModem(const std::string& devId) {
+    for (USBModem& modem : records_) {
+        if (modem.GetDevId() == devId) {
+            return modem;
+        }
+    }
+    return nullObject;
+}
+
+USBModem& USBModemList::FindUSBModem(int interfaceId) {
+    for (USBModem& modem : records_) {
+        if (modem.GetIfid() == static_cast<unsigned int>(interfaceId)) {
+            return modem;
+        }
+    }
+    return nullObject;
+}
+
+}  // namespace taviwireless::usbmodem_lib

@@ -1,0 +1,154 @@
+// Which of the modem's serial ports does what, and making a new record usable.
+#include <tavicore/file.h>
+#include <taviwireless/usbmodem.h>
+#include <taviwireless/usbmodem_atif.h>
+#include <unistd.h>
+
+#include <fstream>
+#include <iterator>
+#include <sstream>
+
+#include "common/log.h"
+#include "usbmodem/info_file.h"
+#include "usbmodem/text.h"
+
+namespace taviwireless::usbmodem_lib {
+
+namespace {
+
+constexpr char kNodePrefix[] = "/dev/ttyUSB";
+constexpr char kDialLogPrefix[] = "/var/lib/usbmodem/wvdial.log.";
+
+// A modem that was just plugged in may need a few seconds until its ports answer.
+constexpr int kAttempts = 3;
+constexpr unsigned int kAttemptPause = 1;  // seconds
+
+// Calls assign until it succeeds, kAttempts times at most, with a pause after each failure.
+template <typename Assign, typename LogFailure>
+void Retry(Assign assign, LogFailure logFailure) {
+    for (int attempt = 0; attempt < kAttempts && assign() != 0; ++attempt) {
+        logFailure(attempt);
+        sleep(kAttemptPause);
+    }
+}
+
+}  // namespace
+
+int USBModem::AssignConnectNode() {
+    connectNode_.clear();
+    const std::string number = ReadInfo(infoPath_, "CONNECTNODE");
+    if (number.empty()) {
+        TAVI_LOG_ERROR("error on parsing CONNECTNODE from %s", infoPath_.c_str());
+        CloseFileDevice();
+        return -1;
+    }
+    const std::string node = kNodePrefix + number;
+    std::string reply;
+    if (OpenFileDevice(node) != 0 || QuerySIMStatus(reply) != 0) {
+        TAVI_LOG_ERROR("warning: cannot test CONNECTNODE %s", node.c_str());
+    }
+    connectNode_ = node;
+    CloseFileDevice();
+    return 0;
+}
+
+int USBModem::AssignQuaryNode() {
+    queryNode_.clear();
+    const std::string numbers = ReadInfo(infoPath_, "DEVICENODE");
+    if (numbers.empty()) {
+        TAVI_LOG_ERROR("error on parsing DEVICENODE from %s", infoPath_.c_str());
+        return -1;
+    }
+    std::istringstream stream(numbers);
+    for (std::string number; std::getline(stream, number, ',');) {
+        const std::string node = kNodePrefix + number;
+        if (node == connectNode_ || OpenFileDevice(node) != 0) {
+            continue;
+        }
+        std::string reply;
+        if (QuerySIMStatus(reply) == 0) {
+            queryNode_ = node;  // and its channel stays open for all that is asked later
+            return 0;
+        }
+        CloseFileDevice();
+    }
+    TAVI_LOG_ERROR("Cannot find any device for quary node");
+    return -1;
+}
+
+int USBModem::AssignConnectInfo() {
+    const std::string path = kDialLogPrefix + imsi_;
+    if (VEXACFileExist(path.c_str()) != 1) {
+        TAVI_LOG_ERROR("Error on file %s, not exist", path.c_str());
+        return -1;
+    }
+    std::ifstream file(path);
+    if (!file) {
+        TAVI_LOG_ERROR("Error on file open: %s", path.c_str());
+        return -1;
+    }
+    const std::string log{std::istreambuf_iterator<char>(file), {}};
+    if (Contains(log, "Disconnecting")) {
+        return -1;
+    }
+    if (!Contains(log, "secondary DNS address")) {
+        return 2;
+    }
+    // Without "Using interface" this wraps to index 14 and reads a word of some other line. Kept:
+    // the dialler names the interface before the addresses, so such a log is none of its own.
+    constexpr char kUsing[] = "Using interface";
+    std::istringstream rest(log.substr(log.find(kUsing) + sizeof kUsing - 1));
+    netIFName_.clear();
+    rest >> netIFName_;
+    return 1;
+}
+
+int USBModem::InitInfo() {
+    if (!FindPortsAndPrepare()) {
+        initState_ = kInitFailed;
+        CloseFileDevice();
+        UnsetATInterface();
+        return -1;
+    }
+    UpdateSIMStatus();
+    if (simStatus_ == kSIMBusy || simStatus_ == kSIMError) {
+        TAVI_LOG_ERROR("Warning: sim error or busy detected when init");
+    } else if (simStatus_ == kSIMUnknown) {
+        TAVI_LOG_ERROR("Warning: unexpect sim result when init");
+    }
+    initState_ = kInited;
+    return 0;
+}
+
+bool USBModem::FindPortsAndPrepare() {
+    SetATInterface();
+    connectNode_.clear();
+    Retry([this] { return AssignConnectNode(); },
+          [](int attempt) {
+              TAVI_LOG_ERROR("no respond when get connect node, sleep 1 sec [%d]", attempt);
+          });
+    if (connectNode_.empty()) {
+        TAVI_LOG_ERROR("failed on parsing connect device node");
+        return false;
+    }
+    queryNode_.clear();
+    Retry([this] { return AssignQuaryNode(); },
+          [](int attempt) {
+              TAVI_LOG_ERROR("No respond on setting quary device node, wait 1 sec [%d]", attempt);
+          });
+    if (queryNode_.empty()) {
+        TAVI_LOG_ERROR("failed on parsing quary device node");
+        return false;
+    }
+    if (SetHardwareFuncLvl("1") != 0) {
+        TAVI_LOG_ERROR("failed on setting hardware function lvl");
+        return false;
+    }
+    if (SetUnsolicitedReports(false) < 0) {
+        TAVI_LOG_ERROR("failed on disabling Unsolicited Reports");
+        return false;
+    }
+    return true;
+}
+
+}  // namespace taviwireless::usbmodem_lib

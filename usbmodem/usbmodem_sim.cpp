@@ -1,0 +1,244 @@
+// The lock state of the SIM: PIN, PUK and PIN protection.
+#include <taviwireless/usbmodem.h>
+#include <taviwireless/usbmodem_atif.h>
+
+#include "common/log.h"
+#include "usbmodem/loggable.h"
+#include "usbmodem/text.h"
+
+namespace taviwireless::usbmodem_lib {
+
+namespace {
+
+constexpr int kRefused = -1;
+constexpr int kNotOK = -2;
+constexpr int kBusy = 2;
+
+}  // namespace
+
+int USBModem::QuerySIMStatus(std::string& reply) {
+    return ModemCmd(CommandSet().GetATCommandQuarySIMStatus(), reply);
+}
+
+int USBModem::UpdateSIMStatus() {
+    if (!busy_) {
+        std::string reply;
+        simStatus_ = QuerySIMStatus(reply) == 0 ? CommandSet().ParseRetStringQuarySIMStatus(reply)
+                                                : static_cast<int>(kSIMUnknown);
+    }
+    switch (simStatus_) {
+        case kReady:
+            return 1;
+        case kPINRequired:
+        case kPUKRequired:
+            return 0;
+        case kSIMBusy:
+        case kSIMError:
+            return 2;
+        default:
+            TAVI_LOG_ERROR("error on getting PIN status");
+            return -1;
+    }
+}
+
+std::string USBModem::GetPINStatus(bool& err) {
+    UpdateSIMStatus();
+    switch (simStatus_) {
+        case kReady:
+            return "ready";
+        case kPINRequired:
+            return "pin_protect";
+        case kPUKRequired:
+            return "puk_protect";
+        case kSIMBusy:
+        case kSIMError:
+            return "no_sim";
+        default:
+            TAVI_LOG_ERROR("error value on PINStatus, %d", simStatus_);
+            err = true;
+            return "no_sim";
+    }
+}
+
+bool USBModem::IsPINReady(bool& err) {
+    if (simStatus_ != kReady && simStatus_ != kPINRequired && simStatus_ != kPUKRequired) {
+        TAVI_LOG_ERROR("error SIM stats, PIN is not ready");
+        err = true;
+    }
+    return simStatus_ == kReady;
+}
+
+int USBModem::GetPINEnable() {
+    if (busy_) {
+        return 0;
+    }
+    const std::string cmd = CommandSet().GetATCommandGetPINEnable();
+    std::string reply;
+    if (ModemCmd(cmd, reply) != 0) {
+        TAVI_LOG_ERROR("error on modem cmd %s", cmd.c_str());
+        return -1;
+    }
+    if (Contains(reply, "+CLCK: 1")) {
+        return 1;
+    }
+    if (Contains(reply, "+CLCK: 0")) {
+        return 0;
+    }
+    return Contains(reply, "+CME ERROR: SIM PIN required") ? 1 : -1;
+}
+
+int USBModem::PINGetEnableProtection() {
+    return GetPINEnable();
+}
+
+int USBModem::ChangePINEnable(const std::string& pin, bool enable) {
+    if (busy_) {
+        return kBusy;
+    }
+    if (simStatus_ != kReady) {
+        TAVI_LOG_ERROR("Cannot change enable when SIM is not ready");
+        return kRefused;
+    }
+    const int current = GetPINEnable();
+    if (current < 0) {
+        TAVI_LOG_ERROR("error on getting current PIN enable setting");
+        return kRefused;
+    }
+    if ((current == 1) == enable) {
+        return 0;
+    }
+    std::string reply;
+    if (ModemCmd(CommandSet().GetATCommandChangePINEnable(enable ? "1" : "0", pin), reply) != 0) {
+        TAVI_LOG_ERROR("error on modem cmd: enable pin protection");
+        return kRefused;
+    }
+    if (CommandSet().ParseRetStringIsOK(reply) != 0) {
+        TAVI_LOG_ERROR("error on enable PIN protection, ret: %s", LoggableReply(reply).c_str());
+        return kNotOK;
+    }
+    return 0;
+}
+
+int USBModem::ChangePIN(const std::string& oldPin, const std::string& newPin) {
+    if (busy_) {
+        return kBusy;
+    }
+    if (simStatus_ != kReady) {
+        TAVI_LOG_ERROR("Cannot change PIN when SIM is not ready");
+        return kRefused;
+    }
+    if (oldPin.empty() || newPin.empty()) {
+        TAVI_LOG_ERROR("error on change pin: input args should not be null");
+        return kRefused;
+    }
+    std::string reply;
+    if (ModemCmd(CommandSet().GetATCommandChangePINCode(oldPin, newPin), reply) != 0) {
+        TAVI_LOG_ERROR("error on modem cmd: change pin");
+        return kRefused;
+    }
+    if (CommandSet().ParseRetStringIsOK(reply) != 0) {
+        TAVI_LOG_ERROR("error on changing PIN, ret: %s", LoggableReply(reply).c_str());
+        return kNotOK;
+    }
+    return 0;
+}
+
+int USBModem::PINSet(const std::string& pin, const std::string& newPin, bool enable) {
+    newPlugIn_ = false;
+    int result = ChangePINEnable(pin, enable);
+    if (result != 0) {
+        TAVI_LOG_ERROR("failed on PIN enable");
+    } else if (!newPin.empty()) {
+        result = ChangePIN(pin, newPin);
+        if (result != 0) {
+            TAVI_LOG_ERROR("failed on change PIN");
+        }
+    }
+    UpdateSIMStatus();
+    return result;
+}
+
+int USBModem::PINUnlock(const std::string& pin) {
+    newPlugIn_ = false;
+    const int result = busy_ ? kBusy : EnterPIN(pin);
+    UpdateSIMStatus();
+    return result;
+}
+
+int USBModem::EnterPIN(const std::string& pin) {
+    std::string reply;
+    if (QuerySIMStatus(reply) != 0) {
+        TAVI_LOG_ERROR("error on checking PIN stats, ret: %s", reply.c_str());
+        return kRefused;
+    }
+    if (Contains(reply, "+CPIN: READY")) {
+        return 0;
+    }
+    if (ModemCmd(CommandSet().GetATCommandSetSIMPIN(pin), reply) != 0) {
+        TAVI_LOG_ERROR("error on entering PIN, ret: %s", LoggableReply(reply).c_str());
+        return kRefused;
+    }
+    if (CommandSet().ParseRetStringIsOK(reply) != 0) {
+        TAVI_LOG_ERROR("Cannot find OK in respond of PIN unlock, ret: %s",
+                       LoggableReply(reply).c_str());
+        return kNotOK;
+    }
+    return 0;
+}
+
+int USBModem::ChangePINWithPUK(const std::string& puk, const std::string& newPin) {
+    newPlugIn_ = false;
+    const int result = busy_ ? kBusy : EnterPUK(puk, newPin);
+    UpdateSIMStatus();
+    return result;
+}
+
+int USBModem::EnterPUK(const std::string& puk, const std::string& newPin) {
+    if (simStatus_ != kPUKRequired) {
+        TAVI_LOG_ERROR("Cannot set PUK at this SIM stat");
+        return kRefused;
+    }
+    std::string reply;
+    if (ModemCmd(CommandSet().GetATCommandSetSIMPUK(puk, newPin), reply) != 0) {
+        TAVI_LOG_ERROR("error on modem cmd: change pin with puk");
+        return kRefused;
+    }
+    if (CommandSet().ParseRetStringIsOK(reply) != 0) {
+        TAVI_LOG_ERROR("error on changing pin with puk, ret: %s", LoggableReply(reply).c_str());
+        return kNotOK;
+    }
+    return 0;
+}
+
+int USBModem::PUKSet(const std::string& puk, const std::string& newPin) {
+    return ChangePINWithPUK(puk, newPin);
+}
+
+int USBModem::PINGetAttemptRemain() {
+    return AttemptRemain(&USBModem_ATIF::ParseRetStringPINRemainAttempt, pinAttemptsRemaining_);
+}
+
+int USBModem::PUKGetAttemptRemain() {
+    return AttemptRemain(&USBModem_ATIF::ParseRetStringPUKRemainAttempt, pukAttemptsRemaining_);
+}
+
+int USBModem::AttemptRemain(Parser parser, int& cache) {
+    if (busy_ || simStatus_ >= kSIMBusy) {
+        return cache;
+    }
+    const std::string cmd = CommandSet().GetATCommandPINPUKAttempt();
+    std::string reply;
+    if (ModemCmd(cmd, reply) != 0) {
+        TAVI_LOG_ERROR("error on sending commmand %s", cmd.c_str());
+        return -1;
+    }
+    std::string count;
+    if ((CommandSet().*parser)(reply, count) != 0) {
+        TAVI_LOG_ERROR("error on parsing AT command ret string: %s", reply.c_str());
+        return -1;
+    }
+    cache = ToInt(count);
+    return cache;
+}
+
+}  // namespace taviwireless::usbmodem_lib
