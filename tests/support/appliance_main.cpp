@@ -1,0 +1,35 @@
+// main() of the test programs that touch system paths: every case runs in an appliance root.
+#include <gmock/gmock.h>
+
+#include <cstdio>
+#include <cstring>
+#include <exception>
+
+#include "platform/root/appliance_root.h"
+
+namespace {
+
+// CTest lists the cases when the program is built, perhaps where no root can be entered.
+bool OnlyLists(int argc, char** argv) {
+    for (int i = 1; i < argc; ++i) {
+        if (strcmp(argv[i], "--gtest_list_tests") == 0) {
+            return true;
+        }
+    }
+    return false;
+}
+
+}  // namespace
+
+int main(int argc, char** argv) {
+    if (!OnlyLists(argc, argv)) {
+        try {
+            taviwireless::EnterApplianceRoot();
+        } catch (const std::exception& error) {
+            fprintf(stderr, "%s\n", error.what());
+            return taviwireless::kApplianceRootFailed;
+        }
+    }
+    testing::InitGoogleMock(&argc, argv);
+    return RUN_ALL_TESTS();
+}

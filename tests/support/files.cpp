@@ -1,0 +1,63 @@
+#include "tests/support/files.h"
+
+#include <sys/stat.h>
+
+#include <cerrno>
+#include <filesystem>
+#include <fstream>
+#include <iterator>
+#include <system_error>
+
+namespace taviwireless::test {
+namespace {
+
+[[noreturn]] void Fail(const std::string& what) {
+    throw std::system_error(errno, std::generic_category(), what);
+}
+
+void Write(const std::string& path, const std::string& text, std::ios::openmode mode) {
+    std::ofstream file(path, mode | std::ios::binary);
+    if (!file || !file.write(text.data(), text.size()) || !file.flush()) {
+        Fail("Cannot write " + path);
+    }
+}
+
+}  // namespace
+
+void WriteFile(const std::string& path, const std::string& text) {
+    const auto folder = std::filesystem::path(path).parent_path();
+    if (!folder.empty()) {
+        MakeDirectories(folder);
+    }
+    Write(path, text, std::ios::trunc);
+}
+
+void AppendFile(const std::string& path, const std::string& text) {
+    Write(path, text, std::ios::app);
+}
+
+std::string ReadFile(const std::string& path) {
+    std::ifstream file(path, std::ios::binary);
+    if (!file) {
+        Fail("Cannot read " + path);
+    }
+    return {std::istreambuf_iterator<char>(file), std::istreambuf_iterator<char>()};
+}
+
+void MakeDirectories(const std::string& path) {
+    std::filesystem::create_directories(path);
+}
+
+mode_t FileMode(const std::string& path) {
+    struct stat status {};
+    if (stat(path.c_str(), &status) != 0) {
+        Fail("Cannot look at " + path);
+    }
+    return status.st_mode & 07777;
+}
+
+bool Exists(const std::string& path) {
+    return std::filesystem::exists(path);
+}
+
+}  // namespace taviwireless::test

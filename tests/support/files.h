@@ -1,0 +1,32 @@
+#ifndef TAVIWIRELESS_TESTS_SUPPORT_FILES_H
+#define TAVIWIRELESS_TESTS_SUPPORT_FILES_H
+
+#include <sys/types.h>
+
+#include <string>
+
+// Files as tests need them. Every function throws std::system_error, naming the path, when it
+// cannot do its work, so that a test fails where its situation could not be built.
+namespace taviwireless::test {
+
+// Writes `text` as the whole content of `path`, creating the file and the directories above it.
+void WriteFile(const std::string& path, const std::string& text);
+
+// Appends `text` to `path`; the file is created when it is not there, its directory is not.
+void AppendFile(const std::string& path, const std::string& text);
+
+// The whole content of `path`. Reads up to the end, so files of /proc and /sys work too.
+std::string ReadFile(const std::string& path);
+
+// Creates `path` and every directory above it that is missing.
+void MakeDirectories(const std::string& path);
+
+// The permission bits of `path` itself (07777); links are followed.
+mode_t FileMode(const std::string& path);
+
+// True when `path` names something; a link that leads nowhere names nothing.
+bool Exists(const std::string& path);
+
+}  // namespace taviwireless::test
+
+#endif

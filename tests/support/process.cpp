@@ -1,0 +1,261 @@
+#include "tests/support/process.h"
+
+#include <fcntl.h>
+#include <poll.h>
+#include <spawn.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <cerrno>
+#include <csignal>
+#include <filesystem>
+#include <stdexcept>
+#include <system_error>
+#include <thread>
+#include <utility>
+
+namespace taviwireless::test {
+namespace {
+
+using Clock = std::chrono::steady_clock;
+using Milliseconds = Process::Milliseconds;
+
+class Descriptor {
+  public:
+    explicit Descriptor(int number = -1) : number_(number) {}
+    Descriptor(Descriptor&& other) noexcept : number_(other.Release()) {}
+    Descriptor& operator=(Descriptor&& other) noexcept {
+        std::swap(number_, other.number_);
+        return *this;
+    }
+    ~Descriptor() { Close(); }
+
+    int Number() const { return number_; }
+    int Release() { return std::exchange(number_, -1); }
+    void Close() {
+        if (number_ >= 0) {
+            close(Release());
+        }
+    }
+
+  private:
+    int number_;
+};
+
+struct Pipe {
+    Descriptor reading;
+    Descriptor writing;
+
+    // Both ends close on exec, so that programs started meanwhile do not hold them open.
+    Pipe() {
+        int ends[2];
+        if (pipe2(ends, O_CLOEXEC) != 0) {
+            throw std::system_error(errno, std::generic_category(), "Cannot make a pipe");
+        }
+        reading = Descriptor(ends[0]);
+        writing = Descriptor(ends[1]);
+    }
+};
+
+// A child that no longer reads must show as a failed write, not end the test.
+void IgnoreBrokenPipes() {
+    signal(SIGPIPE, SIG_IGN);
+}
+
+// Starts `argv` with the given descriptors as 0, 1 and 2; a negative one is inherited.
+pid_t Spawn(const std::vector<std::string>& argv, int input, int output, int error) {
+    std::vector<char*> arguments;
+    for (const auto& argument : argv) {
+        arguments.push_back(const_cast<char*>(argument.c_str()));
+    }
+    arguments.push_back(nullptr);
+
+    posix_spawn_file_actions_t actions;
+    posix_spawn_file_actions_init(&actions);
+    const int wanted[] = {input, output, error};
+    for (int number = 0; number < 3; ++number) {
+        if (wanted[number] >= 0) {
+            posix_spawn_file_actions_adddup2(&actions, wanted[number], number);
+        }
+    }
+    posix_spawnattr_t attributes;
+    posix_spawnattr_init(&attributes);
+    sigset_t defaults;
+    sigemptyset(&defaults);
+    sigaddset(&defaults, SIGPIPE);
+    posix_spawnattr_setsigdefault(&attributes, &defaults);
+    posix_spawnattr_setflags(&attributes, POSIX_SPAWN_SETSIGDEF);
+
+    pid_t pid = -1;
+    const int failure =
+        posix_spawnp(&pid, arguments[0], &actions, &attributes, arguments.data(), environ);
+    posix_spawnattr_destroy(&attributes);
+    posix_spawn_file_actions_destroy(&actions);
+    if (failure != 0) {
+        throw std::system_error(failure, std::generic_category(), "Cannot run " + argv[0]);
+    }
+    return pid;
+}
+
+int ExitStatus(int waitStatus) {
+    return WIFSIGNALED(waitStatus) ? 128 + WTERMSIG(waitStatus) : WEXITSTATUS(waitStatus);
+}
+
+int TimeLeft(Clock::time_point deadline) {
+    const auto left = std::chrono::ceil<Milliseconds>(deadline - Clock::now());
+    return left.count() > 0 ? static_cast<int>(left.count()) : 0;
+}
+
+// Appends what can be read now to `text`; false at the end.
+bool ReadMore(int descriptor, std::string* text) {
+    char buffer[4096];
+    const ssize_t count = read(descriptor, buffer, sizeof buffer);
+    if (count < 0) {
+        return errno == EINTR || errno == EAGAIN;
+    }
+    text->append(buffer, count);
+    return count > 0;
+}
+
+// Writes as much of `text` as fits, and removes it; false when nobody reads any more.
+bool WriteMore(int descriptor, std::string* text) {
+    const ssize_t count = write(descriptor, text->data(), text->size());
+    if (count < 0) {
+        return errno == EINTR || errno == EAGAIN;
+    }
+    text->erase(0, count);
+    return true;
+}
+
+// The exit status once the child has ended; nothing when it has not by the deadline.
+std::optional<int> WaitUntil(Clock::time_point deadline, pid_t pid) {
+    for (;;) {
+        int waitStatus = 0;
+        if (waitpid(pid, &waitStatus, WNOHANG) == pid) {
+            return ExitStatus(waitStatus);
+        }
+        if (Clock::now() >= deadline) {
+            return std::nullopt;
+        }
+        std::this_thread::sleep_for(Milliseconds(1));
+    }
+}
+
+}  // namespace
+
+std::string BuiltProgram(const std::string& name) {
+    return std::filesystem::read_symlink("/proc/self/exe").parent_path() / name;
+}
+
+Process::Process(const std::vector<std::string>& argv) {
+    IgnoreBrokenPipes();
+    Pipe input;
+    Pipe output;
+    pid_ = Spawn(argv, input.reading.Number(), output.writing.Number(), -1);
+    input_ = input.writing.Release();
+    output_ = output.reading.Release();
+}
+
+Process::~Process() {
+    CloseInput();
+    close(output_);
+    if (!status_) {
+        kill(pid_, SIGKILL);
+        Wait();
+    }
+}
+
+std::optional<std::string> Process::ReadLine(Milliseconds patience) {
+    const auto deadline = Clock::now() + patience;
+    for (;;) {
+        const auto end = unread_.find('\n');
+        if (end != std::string::npos) {
+            std::string line = unread_.substr(0, end);
+            unread_.erase(0, end + 1);
+            return line;
+        }
+        if (atEnd_) {
+            return unread_.empty() ? std::nullopt : std::optional(std::exchange(unread_, {}));
+        }
+        pollfd readable{output_, POLLIN, 0};
+        if (poll(&readable, 1, TimeLeft(deadline)) > 0) {
+            atEnd_ = !ReadMore(output_, &unread_);
+        } else if (Clock::now() >= deadline) {
+            return std::nullopt;
+        }
+    }
+}
+
+bool Process::WriteLine(const std::string& line) {
+    std::string text = line + "\n";
+    while (!text.empty()) {
+        if (!WriteMore(input_, &text)) {
+            return false;
+        }
+    }
+    return true;
+}
+
+void Process::CloseInput() {
+    if (input_ >= 0) {
+        close(std::exchange(input_, -1));
+    }
+}
+
+void Process::Signal(int number) {
+    if (!status_) {  // afterwards the number may be another process's
+        kill(pid_, number);
+    }
+}
+
+std::optional<int> Process::Wait(Milliseconds patience) {
+    if (!status_) {
+        status_ = WaitUntil(Clock::now() + patience, pid_);
+    }
+    return status_;
+}
+
+RunResult RunProgram(const std::vector<std::string>& argv, const std::string& input) {
+    constexpr Milliseconds kRunPatience{30000};
+    IgnoreBrokenPipes();
+    Pipe in, out, err;
+    const pid_t pid = Spawn(argv, in.reading.Number(), out.writing.Number(), err.writing.Number());
+    in.reading.Close();
+    out.writing.Close();
+    err.writing.Close();
+    fcntl(in.writing.Number(), F_SETFL, O_NONBLOCK);
+
+    RunResult result{};
+    std::string unwritten = input;
+    const auto deadline = Clock::now() + kRunPatience;
+    bool late = false;
+    while (!late && (out.reading.Number() >= 0 || err.reading.Number() >= 0)) {
+        if (unwritten.empty()) {
+            in.writing.Close();
+        }
+        pollfd ends[] = {{in.writing.Number(), POLLOUT, 0},
+                         {out.reading.Number(), POLLIN, 0},
+                         {err.reading.Number(), POLLIN, 0}};
+        late = poll(ends, 3, TimeLeft(deadline)) == 0;
+        if (ends[0].revents != 0 && !WriteMore(in.writing.Number(), &unwritten)) {
+            unwritten.clear();
+        }
+        if (ends[1].revents != 0 && !ReadMore(out.reading.Number(), &result.out)) {
+            out.reading.Close();
+        }
+        if (ends[2].revents != 0 && !ReadMore(err.reading.Number(), &result.err)) {
+            err.reading.Close();
+        }
+    }
+    const auto status = late ? std::nullopt : WaitUntil(deadline, pid);
+    if (!status) {
+        kill(pid, SIGKILL);
+        waitpid(pid, nullptr, 0);
+        throw std::runtime_error(argv[0] + " did not end within 30 s; it printed: " + result.out +
+                                 result.err);
+    }
+    result.status = *status;
+    return result;
+}
+
+}  // namespace taviwireless::test

@@ -1,0 +1,68 @@
+#ifndef TAVIWIRELESS_TESTS_SUPPORT_PROCESS_H
+#define TAVIWIRELESS_TESTS_SUPPORT_PROCESS_H
+
+#include <sys/types.h>
+
+#include <chrono>
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace taviwireless::test {
+
+// The path of a program of this project, built into the same directory as the running test.
+std::string BuiltProgram(const std::string& name);
+
+// A program that runs beside the test, with its standard input and output connected to it; its
+// standard error is the test's own. The destructor kills it and waits for it.
+class Process {
+  public:
+    using Milliseconds = std::chrono::milliseconds;
+    static constexpr Milliseconds kPatience{10000};  // far above what anything here needs
+
+    // Starts argv[0], found along PATH when it holds no slash. Throws std::system_error when it
+    // cannot be run.
+    explicit Process(const std::vector<std::string>& argv);
+    ~Process();
+    Process(const Process&) = delete;
+    Process& operator=(const Process&) = delete;
+
+    pid_t Pid() const { return pid_; }
+
+    // The next line of its output without the line's end. Nothing when the time is over, or at the
+    // end of the output once its last line (ended or not) was returned; AtEnd() tells which.
+    std::optional<std::string> ReadLine(Milliseconds patience = kPatience);
+    bool AtEnd() const { return atEnd_ && unread_.empty(); }
+
+    // Writes `line` and a line's end to its input. False when it no longer reads.
+    bool WriteLine(const std::string& line);
+    void CloseInput();
+
+    void Signal(int number);
+
+    // Waits for its end. The exit status, 128 + N when signal N killed it, nothing when the time is
+    // over. May be called again.
+    std::optional<int> Wait(Milliseconds patience = kPatience);
+
+  private:
+    pid_t pid_ = -1;
+    int input_ = -1;
+    int output_ = -1;
+    std::string unread_;
+    bool atEnd_ = false;
+    std::optional<int> status_;
+};
+
+struct RunResult {
+    int status;  // exit status, or 128 + N when signal N killed it
+    std::string out;
+    std::string err;
+};
+
+// Runs a program to its end with `input` on its standard input. One that has not ended (with its
+// output closed by everything it started) within 30 s is killed, and std::runtime_error thrown.
+RunResult RunProgram(const std::vector<std::string>& argv, const std::string& input = "");
+
+}  // namespace taviwireless::test
+
+#endif
