@@ -1,0 +1,199 @@
+// modemsim: simulated USB 3G modems on real serial lines.
+#include <signal.h>
+#include <sys/signalfd.h>
+#include <unistd.h>
+
+#include <CLI/CLI.hpp>
+#include <algorithm>
+#include <iostream>
+#include <stdexcept>
+
+#include "sim/control.h"
+#include "sim/simulator.h"
+#include "sim/words.h"
+
+namespace {
+
+using namespace taviwireless::sim;
+
+constexpr int kFailed = 1;
+constexpr int kBadUsage = 2;
+
+struct Options {
+    std::vector<std::string> modems;
+    std::vector<std::string> ttys;
+    std::vector<std::string> faults;
+    Places places;
+    bool control = false;
+    std::string log;
+};
+
+std::string Footer() {
+    std::string known;
+    for (const auto& name : Personality::Known()) {
+        known += " " + name;
+    }
+    return "A modem is written PERSONALITY[,NAME=VALUE]... Personalities:" + known +
+           ", or the path of a\n"
+           "JSON file like them (with a / in it). NAME is one of\n"
+           "  id=N               the number in usbmodem.infoN (the next free one)\n"
+           "  ports=N or ROLES   that many ports, or roles such as dial/mute/at, in order\n"
+           "  pin=PIN            a SIM card that asks for this PIN; with lock=off it does not\n"
+           "  puk=, attempts=, puk_attempts=, sim=ready|absent|busy|failure\n"
+           "  fault=FAULT        misbehaves from the start\n"
+           "  imsi, operator, apn, signal, roaming=yes|no, vendor, product ... variables of the\n"
+           "                     personality\n"
+           "Faults:\n" +
+           FaultHelp() + "Commands with --control, each answered with ok or error:\n" +
+           Control::Help() +
+           "Examples:\n"
+           "  modemsim                                 one modem; prints its ports\n"
+           "  modemsim --modem 12d1,pin=1234 --log -   a locked SIM card; shows what is said\n"
+           "  modemsim --link-dir /dev --info-dir /tmp --modem 12d1 --modem 2001,id=5\n"
+           "                                           two modems as plugged into this machine\n"
+           "  modemsim --tty /dev/ttyGS0,/dev/ttyGS1   answers on a USB gadget's serial ports\n";
+}
+
+void Define(CLI::App& app, Options& options) {
+    // Without the descriptions that would go into the help behind the type.
+    const CLI::Validator existing = CLI::Validator(CLI::ExistingDirectory).description("");
+    const CLI::Validator number = CLI::Validator(CLI::Range(0, 999)).description("");
+    app.description("Simulates USB 3G modems on serial lines, until a signal ends it.");
+    app.footer(Footer);
+    app.set_help_flag("-h,--help", "Print this help");
+    app.add_option("-m,--modem", options.modems, "A modem; may be repeated (one generic modem)")
+        ->type_name("MODEM")
+        ->allow_extra_args(false);
+    app.add_option("--tty", options.ttys,
+                   "Ttys to use instead of new pseudo-terminals; the first --tty is for the first "
+                   "--modem and so on; such a modem gets no links and no info file")
+        ->type_name("PATH[,PATH...]")
+        ->allow_extra_args(false);
+    CLI::Option* linkDir =
+        app.add_option("--link-dir", options.places.linkDir,
+                       "Link the ports as DIR/ttyUSB0 and so on, while this runs")
+            ->type_name("DIR")
+            ->check(existing);
+    app.add_option("--first-port", options.places.firstPort, "Begin with this number instead of 0")
+        ->type_name("N")
+        ->check(number);
+    app.add_option("--info-dir", options.places.infoDir,
+                   "Write DIR/usbmodem.infoN for each modem, while this runs")
+        ->type_name("DIR")
+        ->check(existing)
+        ->needs(linkDir);
+    app.add_option("--fault", options.faults, "Make modem ID misbehave from the start")
+        ->type_name("ID:FAULT")
+        ->allow_extra_args(false);
+    app.add_flag("--control", options.control, "Take commands from standard input");
+    app.add_option("--log", options.log,
+                   "Append what is said to FILE (- for standard error), PINs included")
+        ->type_name("FILE");
+}
+
+void AddModems(const Options& options, Simulator& simulator) {
+    std::vector<std::string> modems = options.modems;
+    modems.resize(std::max({modems.size(), options.ttys.size(), size_t{1}}), "generic");
+    for (size_t index = 0; index < modems.size(); ++index) {
+        try {
+            ModemDescription description = ParseModemDescription(modems[index]);
+            if (index < options.ttys.size()) {
+                description.ttys = Split(options.ttys[index], ',');
+            }
+            simulator.Add(description);
+        } catch (const std::invalid_argument& error) {
+            throw std::invalid_argument("Cannot use the modem '" + modems[index] +
+                                        "': " + error.what() + ".");
+        }
+    }
+}
+
+void AddFaults(const Options& options, Simulator& simulator) {
+    Control control(simulator);
+    for (const auto& fault : options.faults) {
+        const size_t colon = fault.find(':');
+        if (colon == std::string::npos) {
+            throw std::invalid_argument("--fault takes ID:FAULT, not '" + fault + "'.");
+        }
+        try {
+            control.AddFault(fault.substr(0, colon), fault.substr(colon + 1));
+        } catch (const std::invalid_argument& error) {
+            throw std::invalid_argument("Cannot use --fault '" + fault + "': " + error.what() +
+                                        ".");
+        }
+    }
+}
+
+// Readable when this program is told to end, so that links and info files are removed then.
+Descriptor EndSignals() {
+    sigset_t signals;
+    sigemptyset(&signals);
+    for (const int number : {SIGINT, SIGTERM, SIGHUP}) {
+        sigaddset(&signals, number);
+    }
+    sigprocmask(SIG_BLOCK, &signals, nullptr);
+    signal(SIGPIPE, SIG_IGN);
+    return Descriptor(signalfd(-1, &signals, SFD_CLOEXEC));
+}
+
+// Carries out the commands of standard input; returns when it ends or says quit.
+void RunControl(Simulator& simulator, int stop) {
+    Control control(simulator);
+    std::string typed;
+    char buffer[4096];
+    while (simulator.ServeUntil(STDIN_FILENO, stop)) {
+        const ssize_t count = read(STDIN_FILENO, buffer, sizeof buffer);
+        if (count <= 0) {
+            return;
+        }
+        typed.append(buffer, count);
+        for (size_t end; (end = typed.find('\n')) != std::string::npos;) {
+            std::cout << control.Execute(typed.substr(0, end)) << std::flush;
+            typed.erase(0, end + 1);
+            if (control.Quits()) {
+                return;
+            }
+        }
+    }
+}
+
+void Run(const Options& options) {
+    const Descriptor stop = EndSignals();
+    Simulator simulator(options.places,
+                        options.log.empty() ? Transcript() : Transcript(options.log));
+    AddModems(options, simulator);
+    AddFaults(options, simulator);
+    for (const auto& modem : simulator.Modems()) {
+        std::cout << modem->Describe();
+    }
+    std::cout << "ready" << std::endl;
+    if (options.control) {
+        RunControl(simulator, stop.Get());
+    } else {
+        simulator.ServeUntil(-1, stop.Get());
+    }
+}
+
+}  // namespace
+
+int main(int argc, char** argv) {
+    Options options;
+    CLI::App app;
+    try {
+        Define(app, options);
+        app.parse(argc, argv);
+        Run(options);
+    } catch (const CLI::CallForHelp& help) {
+        return app.exit(help);
+    } catch (const CLI::ParseError& error) {
+        std::cerr << "modemsim: " << error.what() << " (see modemsim --help)\n";
+        return kBadUsage;
+    } catch (const std::invalid_argument& error) {
+        std::cerr << "modemsim: " << error.what() << "\n";
+        return kBadUsage;
+    } catch (const std::exception& error) {
+        std::cerr << "modemsim: " << error.what() << "\n";
+        return kFailed;
+    }
+    return 0;
+}

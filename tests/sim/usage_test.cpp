@@ -1,0 +1,129 @@
+// What the program says to a person: help, and one sentence for each mistake.
+#include <gmock/gmock.h>
+
+#include "tests/support/files.h"
+#include "tests/support/modem_simulator.h"
+
+namespace taviwireless::test {
+namespace {
+
+using testing::AllOf;
+using testing::EndsWith;
+using testing::HasSubstr;
+using testing::StartsWith;
+
+RunResult RunModemsim(std::vector<std::string> arguments, const std::string& input = "") {
+    arguments.insert(arguments.begin(), BuiltProgram("modemsim"));
+    return RunProgram(arguments, input);
+}
+
+TEST(Usage, HelpNamesPersonalitiesFaultsCommandsAndExamples) {
+    const RunResult result = RunModemsim({"--help"});
+    EXPECT_EQ(result.status, 0);
+    for (const char* part : {"--link-dir", "12d1 2001 generic", "pieces=BYTES[/MS]",
+                             "received ID[.PORT]", "modemsim --link-dir /dev"}) {
+        EXPECT_THAT(result.out, HasSubstr(part));
+    }
+}
+
+TEST(Usage, AWrongOptionEndsWithOneSentenceAndStatus2) {
+    const struct {
+        std::vector<std::string> arguments;
+        const char* sentence;
+    } kMistakes[] = {
+        {{"--nonsense"}, "--nonsense"},
+        {{"--info-dir", "/tmp"}, "--link-dir"},
+        {{"--link-dir", "/nowhere"}, "/nowhere"},
+        {{"--modem", "9999"}, "9999.json cannot be opened"},
+        {{"--modem", "generic,color=red"}, "there is no setting 'color'; there are pin, puk"},
+        {{"--modem", "generic,quick"}, "'quick' has no value"},
+        {{"--modem", "generic,pin=12"}, "a PIN has 4 to 8 digits"},
+        {{"--modem", "generic,ports=99"}, "1 to 16 ports"},
+        {{"--modem", "generic,ports=dial/quick"}, "a port is dial, at or mute, not 'quick'"},
+        {{"--modem", "generic,roaming=1"}, "roaming is yes or no"},
+        {{"--modem", "generic,fault=slow"}, "the fault is written slow=MS"},
+        {{"--modem", "generic,fault=silent=1"}, "the fault is written silent"},
+        {{"--modem", "generic,id=3", "--modem", "generic,id=3"}, "two modems have the id 3"},
+        {{"--fault", "silent"}, "--fault takes ID:FAULT"},
+        {{"--fault", "4:silent"}, "there is no modem 4"},
+        {{"--fault", "0.7:silent"}, "modem 0 has no port 7"},
+        {{"--fault", "0:slow=soon"}, "the argument is a number up to 999999, not 'soon'"},
+        {{"--modem", "generic,ports=at/at", "--tty", "/dev/null"}, "2 ports, but 1 ttys"},
+    };
+    for (const auto& mistake : kMistakes) {
+        SCOPED_TRACE(mistake.sentence);
+        const RunResult result = RunModemsim(mistake.arguments);
+        EXPECT_EQ(result.status, 2);
+        EXPECT_EQ(result.out, "");
+        EXPECT_THAT(result.err, AllOf(StartsWith("modemsim: "), HasSubstr(mistake.sentence)));
+        EXPECT_EQ(result.err.find('\n'), result.err.size() - 1);
+    }
+}
+
+TEST(Usage, AMalformedPersonalityIsNamedWithThePlaceInIt) {
+    const struct {
+        const char* text;
+        const char* sentence;
+    } kMistakes[] = {
+        {"{\"extends\": \"generic\",\n ports}", "Line 2, Column 2"},
+        {"[]", "at the top: an object"},
+        {"{}", "at the top: ports and vendor_id"},
+        {R"({"extends": 3})", "at extends: a text"},
+        {R"({"extends": "/tmp/p.json"})", "in a circle"},
+        {R"({"extends": "generic", "ports": []})", "at ports: a list"},
+        {R"({"extends": "generic", "ports": ["modem"]})", "'modem' is none of at, dial, mute"},
+        {R"({"extends": "generic", "variables": {"echo": null}})", "'echo' is needed"},
+        {R"({"extends": "generic", "errors": {"sim_pin": "x"}})", "at errors / sim_pin: a number"},
+        {R"({"extends": "generic", "errors": {"sim_pin": null}})", "'sim_pin' is needed"},
+        {R"({"extends": "generic", "comands": {}})", "at comands: there is no such section"},
+        {R"({"extends": "generic", "commands": {"AT+X": {"reply": ["{no}"]}}})",
+         "at commands / AT+X: there is no variable 'no'"},
+        {R"({"extends": "generic", "commands": {"AT+X": {"reply": "x"}}})",
+         "at commands / AT+X / reply: reply (a list)"},
+        {R"({"extends": "generic", "commands": {"AT+X": {"effect": "explode"}}})",
+         "at commands / AT+X / effect: 'explode' is none of change_pin, dial"},
+        {R"({"extends": "generic", "commands": {"AT+X": {"needs": 1}}})",
+         "at commands / AT+X / needs: a text"},
+        {R"({"extends": "generic", "commands": {"AT+X=*": {"set": {"no": 1}}}})",
+         "at commands / AT+X=*: there is no variable 'no'"},
+    };
+    for (const auto& mistake : kMistakes) {
+        SCOPED_TRACE(mistake.text);
+        WriteFile("/tmp/p.json", mistake.text);
+        const RunResult result = RunModemsim({"--modem", "/tmp/p.json"});
+        EXPECT_EQ(result.status, 2);
+        EXPECT_THAT(result.err, AllOf(StartsWith("modemsim: "), HasSubstr("/tmp/p.json"),
+                                      HasSubstr(mistake.sentence), EndsWith(".\n")));
+        EXPECT_EQ(result.err.find('\n'), result.err.size() - 1);
+    }
+}
+
+TEST(Usage, AFailureOfTheMachineEndsWithStatus1) {
+    EXPECT_EQ(RunModemsim({"--tty", "/dev/nowhere"}).err,
+              "modemsim: Cannot open /dev/nowhere: No such file or directory.\n");
+    EXPECT_EQ(RunModemsim({"--tty", "/dev/null"}).status, 1);
+    EXPECT_EQ(RunModemsim({"--log", "/nowhere/log"}).status, 1);
+}
+
+TEST(Control, AnswersEachLineWithOkOrError) {
+    const RunResult result =
+        RunModemsim({"--control"},
+                    "set 0 signal 31\n\nnonsense\nreceived 0\nreply 0 AT \"\\\"\n"
+                    "set 5 signal 1\nfault 0.x silent\nfault 0\nquit\nset 0 signal 1\n");
+    EXPECT_EQ(result.status, 0);
+    EXPECT_THAT(result.out,
+                EndsWith("ready\n"
+                         "ok\n"
+                         "error: something is missing; see help\n"
+                         "error: there is no command 'nonsense'; see help\n"
+                         "[]\nok\n"
+                         "error: a text as JSON is expected, such as \"\\r\\nOK\\r\\n\"\n"
+                         "error: there is no modem 5\n"
+                         "error: a port is a number up to 999999, not 'x'\n"
+                         "error: there is no fault ''; there are silent, slow, pieces, "
+                         "unsolicited, error, long, babble, vanish, noecho, garbage, off\n"
+                         "ok\n"));
+}
+
+}  // namespace
+}  // namespace taviwireless::test
