@@ -1,0 +1,61 @@
+#include "cli/output.h"
+
+#include <json/json.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <cstdio>
+#include <iostream>
+
+namespace taviwireless::cli {
+
+namespace {
+
+// Characters of UTF-8 text, which is what a terminal gives a column each in nearly all names.
+size_t Width(const std::string& text) {
+    return static_cast<size_t>(
+        std::count_if(text.begin(), text.end(), [](char c) { return (c & 0xC0) != 0x80; }));
+}
+
+}  // namespace
+
+void Print(const Table& table) {
+    std::vector<size_t> widths;
+    for (const auto& row : table) {
+        widths.resize(std::max(widths.size(), row.size()));
+        for (size_t column = 0; column < row.size(); ++column) {
+            widths[column] = std::max(widths[column], Width(row[column]));
+        }
+    }
+    for (const auto& row : table) {
+        std::string line;
+        for (size_t column = 0; column < row.size(); ++column) {
+            line += row[column] + std::string(widths[column] - Width(row[column]) + 2, ' ');
+        }
+        line.erase(line.find_last_not_of(' ') + 1);
+        std::cout << line << '\n';
+    }
+}
+
+void Print(const Json::Value& document) {
+    Json::StreamWriterBuilder builder;
+    builder["indentation"] = "  ";
+    builder["enableYAMLCompatibility"] = true;  // "key": value, without a blank before the colon
+    std::cout << Json::writeString(builder, document) << '\n';
+}
+
+std::string Printable(const std::string& text) {
+    std::string printable = text;
+    std::replace_if(
+        printable.begin(), printable.end(), [](unsigned char c) { return c < 0x20 || c == 0x7F; },
+        '?');
+    return printable;
+}
+
+void ShowProgress(const std::string& text) {
+    if (isatty(STDERR_FILENO)) {
+        std::fprintf(stderr, "\r\033[K%s", text.c_str());
+    }
+}
+
+}  // namespace taviwireless::cli

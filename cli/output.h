@@ -1,0 +1,30 @@
+#ifndef TAVIWIRELESS_CLI_OUTPUT_H
+#define TAVIWIRELESS_CLI_OUTPUT_H
+
+#include <json/forwards.h>
+
+#include <string>
+#include <vector>
+
+namespace taviwireless::cli {
+
+// Rows of cells, each column as wide as its widest cell; the first row is the heading.
+using Table = std::vector<std::vector<std::string>>;
+
+// Prints the table on standard output.
+void Print(const Table& table);
+
+// Prints the document on standard output.
+void Print(const Json::Value& document);
+
+// Returns text with control characters replaced by "?": what a modem sends may not steer the
+// terminal.
+std::string Printable(const std::string& text);
+
+// Shows on standard error what is being waited for, one line that each call replaces; the empty
+// text removes it. Nothing is shown unless standard error is a terminal.
+void ShowProgress(const std::string& text);
+
+}  // namespace taviwireless::cli
+
+#endif
