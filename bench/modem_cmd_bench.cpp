@@ -1,0 +1,99 @@
+// What USBModem::ModemCmd costs above the waits that the serial line demands: 100 ms of silence
+// before the command and 200 ms after the reply. The modem is a child process that answers each
+// command at once over a pseudo-terminal.
+#include <benchmark/benchmark.h>
+#include <fcntl.h>
+#include <signal.h>
+#include <stdlib.h>
+#include <sys/prctl.h>
+#include <taviwireless/usbmodem.h>
+#include <unistd.h>
+
+#include <chrono>
+#include <stdexcept>
+#include <string>
+
+#include "platform/root/appliance_root.h"
+
+namespace {
+
+using Clock = std::chrono::steady_clock;
+using taviwireless::usbmodem_lib::USBModem;
+
+constexpr double kDemandedWaits = 0.300;  // seconds
+
+// Answers every line that is a command; never returns.
+[[noreturn]] void AnswerAtOnce(int line) {
+    std::string command;
+    for (char c; read(line, &c, 1) == 1;) {
+        if (c != '\r') {
+            command += c;
+            continue;
+        }
+        if (!command.empty()) {
+            const std::string reply = command + "\r\r\n+CSQ: 17,99\r\n\r\nOK\r\n";
+            (void)!write(line, reply.data(), reply.size());
+        }
+        command.clear();
+    }
+    _exit(0);
+}
+
+// A pseudo-terminal with a modem behind it that lives as long as this object.
+class AnsweringModem {
+  public:
+    AnsweringModem() : line_(posix_openpt(O_RDWR | O_NOCTTY | O_CLOEXEC)) {
+        if (line_ < 0 || grantpt(line_) != 0 || unlockpt(line_) != 0) {
+            throw std::runtime_error("cannot open a pseudo-terminal");
+        }
+        node_ = ptsname(line_);
+        child_ = fork();
+        if (child_ == 0) {
+            prctl(PR_SET_PDEATHSIG, SIGKILL);
+            AnswerAtOnce(line_);
+        }
+    }
+    ~AnsweringModem() {
+        kill(child_, SIGKILL);
+        close(line_);
+    }
+    AnsweringModem(const AnsweringModem&) = delete;
+    AnsweringModem& operator=(const AnsweringModem&) = delete;
+
+    const std::string& Node() const { return node_; }
+
+  private:
+    int line_;
+    std::string node_;
+    pid_t child_ = -1;
+};
+
+void ModemCmd(benchmark::State& state) {
+    AnsweringModem answering;
+    USBModem modem(1, "/tmp/usbmodem.info1");
+    if (modem.OpenFileDevice(answering.Node()) != 0) {
+        state.SkipWithError("cannot open the line");
+        return;
+    }
+    std::string reply;
+    const auto begin = Clock::now();
+    for (auto _ : state) {
+        if (modem.ModemCmd("AT+CSQ", reply) != 0 || reply != "+CSQ: 17,99\nOK\n") {
+            state.SkipWithError("wrong reply");
+            return;
+        }
+    }
+    const double each = std::chrono::duration<double>(Clock::now() - begin).count() /
+                        static_cast<double>(state.iterations());
+    state.counters["added_ms"] = (each - kDemandedWaits) * 1000;
+}
+
+BENCHMARK(ModemCmd)->Unit(benchmark::kMillisecond)->UseRealTime()->Iterations(20);
+
+}  // namespace
+
+int main(int argc, char** argv) {
+    taviwireless::EnterApplianceRoot();
+    benchmark::Initialize(&argc, argv);
+    benchmark::RunSpecifiedBenchmarks();
+}

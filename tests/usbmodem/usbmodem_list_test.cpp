@@ -1,0 +1,184 @@
+// Discovery: which files are modems, what an update does with them, and what it opens.
+#include <dlfcn.h>
+#include <tavicore/error.h>
+#include <tavicore/file.h>
+#include <tavicore/szlist.h>
+#include <taviwireless/usbmodem_list.h>
+
+#include <cstdlib>
+#include <filesystem>
+
+#include "tests/support/files.h"
+#include "tests/support/sleep_capture.h"
+#include "tests/usbmodem/opened_modem.h"
+
+namespace {
+
+int listedWith = 0;   // what listing a directory returns instead of listing it, when negative
+bool noList = false;  // whether there is no memory for a string list
+
+template <typename Function>
+Function* Next(const char* name) {
+    return reinterpret_cast<Function*>(dlsym(RTLD_NEXT, name));
+}
+
+}  // namespace
+
+// In place of the SDK's, for the library as well.
+int VEXACFileEnumDir(const char* directory, const char* name, VEXACSzList** list, int flags) {
+    if (listedWith < 0) {
+        return listedWith;
+    }
+    return Next<decltype(VEXACFileEnumDir)>("VEXACFileEnumDir")(directory, name, list, flags);
+}
+
+VEXACSzList* VEXACSzListAlloc(int size) {
+    return noList ? nullptr : Next<decltype(VEXACSzListAlloc)>("VEXACSzListAlloc")(size);
+}
+
+namespace taviwireless::test {
+namespace {
+
+using testing::ElementsAre;
+using testing::IsEmpty;
+using usbmodem_lib::USBModem;
+using usbmodem_lib::USBModemList;
+
+std::vector<std::string> DevIds(USBModemList& list) {
+    std::vector<std::string> ids;
+    for (const USBModem& modem : list) {
+        ids.push_back(modem.GetDevId());
+    }
+    return ids;
+}
+
+void WriteInfoFiles(const std::vector<std::string>& names) {
+    for (const std::string& name : names) {
+        WriteFile("/tmp/" + name, "CONNECTNODE=0\n");
+    }
+}
+
+TEST(Search, TakesExactlyTheNamesOfInfoFiles) {
+    WriteInfoFiles({"usbmodem.info0", "usbmodem.info1", "usbmodem.info12",
+                    "usbmodem.info2147483647", "usbmodem.info-5", "usbmodem.info-2147483648"});
+    WriteInfoFiles({"usbmodem.info", "usbmodem.info01", "usbmodem.info+3", "usbmodem.info-1",
+                    "usbmodem.info-0", "usbmodem.info-", "usbmodem.info4.bak", "usbmodem.info 5",
+                    "usbmodem.info6 ", "usbmodem.info0x7", "usbmodem.info4294967295",
+                    "usbmodem.info4294967296", "usbmodem.info2147483648",
+                    "usbmodem.info99999999999999999999", "usbmodem.info8\n", "Usbmodem.info9",
+                    "xusbmodem.info10", "usbmodem.infos", ".usbmodem.info11"});
+    MakeDirectories("/tmp/usbmodem.info13");
+    USBModemList list;
+    EXPECT_EQ(list.SearchInfoPath(), 0);
+    EXPECT_THAT(DevIds(list),
+                testing::UnorderedElementsAre("usbmodem0", "usbmodem1", "usbmodem12",
+                                              "usbmodem2147483647", "usbmodem4294967291",
+                                              "usbmodem2147483648"));
+}
+
+TEST(Search, AddsOnlyWhatIsNew) {
+    LogCapture log;
+    WriteInfoFiles({"usbmodem.info1"});
+    USBModemList list;
+    EXPECT_EQ(list.SearchInfoPath(), 0);
+    list.FindUSBModem(1).SetNotNewPlugIn();
+    WriteInfoFiles({"usbmodem.info0"});
+    EXPECT_EQ(list.SearchInfoPath(), 0);
+    EXPECT_EQ(list.SearchInfoPath(), 0);
+    EXPECT_THAT(DevIds(list), ElementsAre("usbmodem1", "usbmodem0"));
+    EXPECT_FALSE(list.FindUSBModem(1).IsNewPlugIn());
+    EXPECT_TRUE(list.FindUSBModem(0).IsNewPlugIn());
+    EXPECT_FALSE(list.FindUSBModem(0).IsInited());
+    EXPECT_TRUE(list.FindUSBModem(0).IsInfoExist());
+    EXPECT_EQ(log.Text(), "");
+}
+
+TEST(Search, FailsWithoutMemoryForTheNames) {
+    LogCapture log;
+    USBModemList list;
+    noList = true;
+    VEXACErrSet(0);
+    EXPECT_EQ(list.Update(), -1);
+    EXPECT_EQ(VEXACErrGet(), 512);
+    EXPECT_TRUE(log.Has("Failed to alloc for pFolderList"));
+    EXPECT_TRUE(log.Has("Failed to search info path"));
+}
+
+TEST(Search, FailsWhenTheFolderCannotBeListed) {
+    LogCapture log;
+    WriteInfoFiles({"usbmodem.info1"});
+    USBModemList list;
+    ASSERT_EQ(list.SearchInfoPath(), 0);
+    std::filesystem::remove(kInfo1);
+    listedWith = -1;
+    EXPECT_EQ(list.Update(), -1);
+    EXPECT_TRUE(log.Has("usbmodem_list.cpp:"));
+    EXPECT_TRUE(log.Has("Failed to enum all files under /tmp/"));
+    EXPECT_TRUE(log.Has("Failed to search info path"));
+    EXPECT_THAT(DevIds(list), ElementsAre("usbmodem1"));  // nothing is dropped then
+}
+
+TEST(Find, GivesTheRecordOfAnIdOrTheNullObject) {
+    WriteInfoFiles({"usbmodem.info0", "usbmodem.info1", "usbmodem.info-5"});
+    USBModemList list;
+    ASSERT_EQ(list.SearchInfoPath(), 0);
+    EXPECT_EQ(list.FindUSBModem("usbmodem0").GetIfid(), 0u);
+    EXPECT_EQ(&list.FindUSBModem("usbmodem1"), &list.FindUSBModem(1));
+    EXPECT_EQ(list.FindUSBModem(-5).GetDevId(), "usbmodem4294967291");
+    for (const char* devId : {"", "usbmodem", "usbmodem2", "usbmodem01", "USBMODEM1", "usbmodem1 "}) {
+        SCOPED_TRACE(devId);
+        EXPECT_TRUE(list.FindUSBModem(devId).IsNull());
+        EXPECT_EQ(&list.FindUSBModem(devId), &USBModemList::nullObject);
+    }
+    EXPECT_TRUE(list.FindUSBModem(2).IsNull());
+}
+
+// Two modems; the info file of each names its own ports.
+struct TwoModems {
+    ModemSimulator simulator{{"--modem", "generic,id=1", "--modem", "2001,id=2"}};
+    SleepCapture sleeps;
+    LogCapture log;
+    USBModemList list;
+};
+
+TEST(Update, InitialisesEachNewModemOnce) {
+    TwoModems modems;
+    EXPECT_EQ(modems.list.Update(), 0);
+    EXPECT_TRUE(modems.list.FindUSBModem(1).IsInited());
+    EXPECT_TRUE(modems.list.FindUSBModem(2).IsInited());
+    EXPECT_THAT(modems.simulator.Received("1"), testing::Not(IsEmpty()));
+    EXPECT_THAT(modems.simulator.Received("2"), testing::Not(IsEmpty()));
+    EXPECT_EQ(modems.list.Update(), 0);
+    EXPECT_THAT(modems.simulator.Received("1"), IsEmpty());
+    EXPECT_THAT(modems.simulator.Received("2"), IsEmpty());
+    EXPECT_THAT(modems.sleeps.Calls(), IsEmpty());
+}
+
+TEST(Update, StopsAtTheFirstModemThatCannotBeInitialised) {
+    TwoModems modems;
+    WriteFile(kInfo1, "USB_ID_VENDOR=ffff\nCONNECTNODE=0\nDEVICENODE=0\n");
+    EXPECT_EQ(modems.list.Update(), -1);
+    EXPECT_TRUE(modems.log.Has("Failed to init info [1]"));
+    EXPECT_FALSE(modems.list.FindUSBModem(1).IsInited());
+    EXPECT_FALSE(modems.list.FindUSBModem(2).IsInited());
+    EXPECT_THAT(modems.simulator.Received("2"), IsEmpty());
+    std::filesystem::remove(kInfo1);
+    EXPECT_EQ(modems.list.Update(), 0);
+    EXPECT_THAT(DevIds(modems.list), ElementsAre("usbmodem2"));
+    EXPECT_TRUE(modems.list.FindUSBModem(2).IsInited());
+}
+
+TEST(Update, DropsOneOfTwoNeighboursThatAreGoneAndTheOtherTheNextTime) {
+    TwoModems modems;
+    ASSERT_EQ(modems.list.Update(), 0);
+    std::filesystem::remove(kInfo1);
+    std::filesystem::remove("/tmp/usbmodem.info2");
+    EXPECT_EQ(modems.list.Update(), 0);
+    EXPECT_THAT(DevIds(modems.list), ElementsAre("usbmodem2"));
+    EXPECT_FALSE(modems.list.FindUSBModem(2).IsInfoExist());
+    EXPECT_EQ(modems.list.Update(), 0);
+    EXPECT_THAT(DevIds(modems.list), IsEmpty());
+}
+
+}  // namespace
+}  // namespace taviwireless::test

@@ -1,0 +1,329 @@
+// Finding the ports of a modem and making its record usable.
+#include <dlfcn.h>
+#include <fcntl.h>
+#include <sys/socket.h>
+#include <sys/un.h>
+#include <unistd.h>
+
+#include <cstdarg>
+#include <cstring>
+#include <set>
+
+#include "tests/support/descriptors.h"
+#include "tests/support/files.h"
+#include "tests/support/sleep_capture.h"
+#include "tests/usbmodem/opened_modem.h"
+
+namespace {
+
+std::set<std::string> openedPorts;  // every serial port that this process has tried to open
+
+int PassOn(const char* function, const char* path, int flags, mode_t mode) {
+    const std::string name = path;
+    if (name.rfind("/dev/tty", 0) == 0) {
+        openedPorts.insert(name);
+    }
+    const auto next =
+        reinterpret_cast<int (*)(const char*, int, ...)>(dlsym(RTLD_NEXT, function));
+    return next(path, flags, mode);
+}
+
+mode_t ModeOf(int flags, va_list arguments) {
+    return (flags & (O_CREAT | O_TMPFILE)) != 0 ? va_arg(arguments, mode_t) : 0;
+}
+
+}  // namespace
+
+// In place of the C library's, for the libraries as well.
+#define TAKEN_OVER extern "C" __attribute__((visibility("default")))
+TAKEN_OVER int open(const char* path, int flags, ...) {
+    va_list arguments;
+    va_start(arguments, flags);
+    const mode_t mode = ModeOf(flags, arguments);
+    va_end(arguments);
+    return PassOn("open", path, flags, mode);
+}
+
+TAKEN_OVER int open64(const char* path, int flags, ...) {
+    va_list arguments;
+    va_start(arguments, flags);
+    const mode_t mode = ModeOf(flags, arguments);
+    va_end(arguments);
+    return PassOn("open64", path, flags, mode);
+}
+
+namespace taviwireless::test {
+namespace {
+
+using testing::ElementsAre;
+using testing::IsEmpty;
+using usbmodem_lib::USBModem;
+
+constexpr char kMute[] = "No respond on modem cmd AT+CPIN?";
+
+// A simulated modem, its record as new, and no real sleeping.
+struct NewModem {
+    explicit NewModem(const std::string& description)
+        : simulator({"--modem", description + ",id=1"}), record(1, kInfo1) {}
+
+    ModemSimulator simulator;
+    SleepCapture sleeps;
+    LogCapture log;
+    USBModem record;
+};
+
+TEST(ConnectNode, IsTheNumberOfTheInfoFileAndIsTested) {
+    NewModem modem("generic,ports=dial/at");
+    const auto before = OpenDescriptors();
+    EXPECT_EQ(modem.record.AssignConnectNode(), 0);
+    EXPECT_EQ(modem.log.Text(), "");
+    EXPECT_THAT(modem.simulator.Received("1.0"), ElementsAre("AT+CPIN?"));
+    EXPECT_THAT(modem.simulator.Received("1.1"), IsEmpty());
+    EXPECT_EQ(OpenDescriptors(), before);
+}
+
+TEST(ConnectNode, ThatDoesNotAnswerOrIsNotThereIsTakenWithAWarning) {
+    NewModem modem("generic,ports=dial/at");
+    modem.simulator.Fault("1.0", "silent");
+    for (const char* number : {"0", "77"}) {
+        SCOPED_TRACE(number);
+        modem.log.Clear();
+        WriteFile(kInfo1, "CONNECTNODE=" + std::string(number) + "\nDEVICENODE=" + number + ",1\n");
+        EXPECT_EQ(modem.record.AssignConnectNode(), 0);
+        EXPECT_TRUE(modem.log.Has(std::string("warning: cannot test CONNECTNODE /dev/ttyUSB") +
+                                  number))
+            << modem.log.Text();
+        EXPECT_EQ(modem.record.AssignQuaryNode(), 0);  // which passes the dial port over
+        EXPECT_THAT(modem.simulator.Received("1.1"), ElementsAre("AT+CPIN?"));
+        modem.simulator.Received("1.0");
+        modem.record.CloseFileDevice();
+    }
+}
+
+TEST(ConnectNode, CannotBeAssignedWithoutItsNumber) {
+    LogCapture log;
+    USBModem record(1, kInfo1);
+    EXPECT_EQ(record.AssignConnectNode(), -1);
+    WriteFile(kInfo1, "CONNECTNODE=\n");
+    EXPECT_EQ(record.AssignConnectNode(), -1);
+    EXPECT_EQ(log.Count(std::string("error on parsing CONNECTNODE from ") + kInfo1), 2);
+    EXPECT_EQ(record.AssignQuaryNode(), -1);
+    EXPECT_TRUE(log.Has(std::string("error on parsing DEVICENODE from ") + kInfo1));
+}
+
+TEST(QueryNode, IsTheFirstPortThatAnswersAndOnlyItStaysOpen) {
+    NewModem modem("generic,ports=dial/mute/at/at");
+    ASSERT_EQ(modem.record.AssignConnectNode(), 0);
+    modem.log.Clear();
+    const auto before = OpenDescriptors();
+    EXPECT_EQ(modem.record.AssignQuaryNode(), 0);
+    EXPECT_EQ(modem.log.Lines().size(), 1u) << modem.log.Text();
+    EXPECT_TRUE(modem.log.Has(kMute));
+    EXPECT_EQ(OpenDescriptors().size(), before.size() + 1);
+    std::string reply;
+    EXPECT_EQ(modem.record.ModemCmd("AT+CGMM", reply), 0);
+    EXPECT_THAT(modem.simulator.Received("1.2"), ElementsAre("AT+CPIN?", "AT+CGMM"));
+    EXPECT_THAT(modem.simulator.Received("1.3"), IsEmpty());
+    modem.record.CloseFileDevice();
+    EXPECT_EQ(OpenDescriptors(), before);
+}
+
+TEST(QueryNode, IsNotThereWhenNoOtherPortAnswers) {
+    NewModem modem("generic,ports=dial/mute");
+    for (const char* numbers : {"0", "0,1", ",,", "0,77,"}) {
+        SCOPED_TRACE(numbers);
+        WriteFile(kInfo1, std::string("CONNECTNODE=0\nDEVICENODE=") + numbers + "\n");
+        if (numbers == std::string("0")) {
+            ASSERT_EQ(modem.record.AssignConnectNode(), 0);
+        }
+        modem.log.Clear();
+        const auto before = OpenDescriptors();
+        EXPECT_EQ(modem.record.AssignQuaryNode(), -1);
+        EXPECT_TRUE(modem.log.Has("Cannot find any device for quary node"));
+        EXPECT_EQ(OpenDescriptors(), before);
+    }
+}
+
+TEST(Init, AsksForEverythingOnceInItsOrder) {
+    NewModem modem("12d1,ports=dial/at");
+    EXPECT_TRUE(modem.record.IsNewPlugIn());
+    EXPECT_EQ(modem.record.InitInfo(), 0);
+    EXPECT_TRUE(modem.record.IsInited());
+    EXPECT_TRUE(modem.record.IsNewPlugIn());
+    EXPECT_THAT(modem.simulator.Received("1.0"), ElementsAre("AT+CPIN?"));
+    EXPECT_THAT(modem.simulator.Received("1.1"),
+                ElementsAre("AT+CPIN?", "AT+CFUN?", "AT+CFUN=1", "AT^CURC?", "AT^CURC=0", "AT+CPIN?"));
+    EXPECT_THAT(modem.sleeps.Calls(), IsEmpty());
+    EXPECT_EQ(modem.log.Text(), "");
+}
+
+TEST(Init, SucceedsWhateverTheSIMStatus) {
+    const struct {
+        const char* reply;
+        const char* log;
+    } kReplies[] = {
+        {"+CPIN: SIM PUK", ""},
+        {"+CME ERROR: SIM BUSY", "Warning: sim error or busy detected when init"},
+        {"+CME ERROR: SIM not inserted", "Warning: sim error or busy detected when init"},
+        {"OK", "Warning: unexpect sim result when init"},
+    };
+    NewModem modem("generic,ports=dial/at");
+    modem.simulator.Fault("1", "error=AT+CFUN?");  // saves one command each time
+    for (const auto& row : kReplies) {
+        SCOPED_TRACE(row.reply);
+        modem.log.Clear();
+        modem.simulator.Reply("1", "AT+CPIN?", Framed({row.reply}));
+        USBModem record(1, kInfo1);
+        EXPECT_EQ(record.InitInfo(), 0);
+        EXPECT_TRUE(record.IsInited());
+        EXPECT_EQ(modem.log.Count("Warning: "), *row.log == '\0' ? 0 : 1) << modem.log.Text();
+        EXPECT_TRUE(modem.log.Has(row.log));
+    }
+}
+
+TEST(Init, TriesThreeTimesForEachPortWithASecondBetween) {
+    const struct {
+        const char* info;
+        const char* attempt;
+        const char* failure;
+    } kInfos[] = {
+        {"USB_ID_VENDOR=12d1\n", "no respond when get connect node, sleep 1 sec [",
+         "failed on parsing connect device node"},
+        {"CONNECTNODE=77\n", "No respond on setting quary device node, wait 1 sec [",
+         "failed on parsing quary device node"},
+        {"CONNECTNODE=77\nDEVICENODE=77\n", "No respond on setting quary device node, wait 1 sec [",
+         "failed on parsing quary device node"},
+    };
+    for (const auto& row : kInfos) {
+        SCOPED_TRACE(row.info);
+        SleepCapture sleeps;
+        LogCapture log;
+        WriteFile(kInfo1, row.info);
+        USBModem record(1, kInfo1);
+        const auto before = OpenDescriptors();
+        EXPECT_EQ(record.InitInfo(), -1);
+        EXPECT_FALSE(record.IsInited());
+        EXPECT_THAT(sleeps.Calls(), ElementsAre(1, 1, 1));
+        EXPECT_EQ(log.Count(row.attempt), 3);
+        for (const char* index : {"0]", "1]", "2]"}) {
+            EXPECT_EQ(log.Count(row.attempt + std::string(index)), 1) << log.Text();
+        }
+        EXPECT_EQ(log.Count(row.failure), 1);
+        EXPECT_EQ(log.Has("Cannot parsing USB_ID_VENDOR from /tmp/usbmodem.info1"),
+                  strstr(row.info, "USB_ID_VENDOR") == nullptr);
+        EXPECT_EQ(OpenDescriptors(), before);
+    }
+}
+
+TEST(Init, TakesAPortThatComesWhileItWaits) {
+    ModemSimulator simulator({"--modem", "generic,id=1,ports=dial/at"});
+    WriteFile(kInfo1, "CONNECTNODE=0\nDEVICENODE=0,1\n");
+    simulator.Unplug("1.1");
+    WriteFile(kInfo1, "CONNECTNODE=0\nDEVICENODE=0,1\n");
+    LogCapture log;
+    SleepCapture sleeps([&simulator](unsigned) { simulator.Plug("1.1"); });
+    USBModem record(1, kInfo1);
+    EXPECT_EQ(record.InitInfo(), 0);
+    EXPECT_THAT(sleeps.Calls(), ElementsAre(1));
+    EXPECT_TRUE(log.Has("modem Init failed: ")) << log.Text();
+}
+
+TEST(Init, CanBeRepeatedAfterItFailed) {
+    NewModem modem("generic,ports=dial/at");
+    const std::string info = ReadFile(kInfo1);
+    WriteFile(kInfo1, "CONNECTNODE=77\n");
+    EXPECT_EQ(modem.record.InitInfo(), -1);
+    WriteFile(kInfo1, info);
+    EXPECT_EQ(modem.record.InitInfo(), 0);
+    EXPECT_TRUE(modem.record.IsInited());
+}
+
+TEST(Init, FailsWithAClosedChannelWhenTheModemRefusesASetting) {
+    const struct {
+        const char* fault;
+        const char* log;
+    } kFaults[] = {{"error=AT+CFUN=1", "failed on setting hardware function lvl"},
+                   {"error=AT^CURC=0", "failed on disabling Unsolicited Reports"}};
+    for (const auto& row : kFaults) {
+        SCOPED_TRACE(row.fault);
+        NewModem modem("12d1,ports=dial/at");
+        modem.simulator.Fault("1", row.fault);
+        const auto before = OpenDescriptors();
+        EXPECT_EQ(modem.record.InitInfo(), -1);
+        EXPECT_TRUE(modem.log.Has(row.log)) << modem.log.Text();
+        EXPECT_FALSE(modem.record.IsInited());
+        EXPECT_EQ(OpenDescriptors(), before);
+    }
+}
+
+TEST(Init, OpensNoPortThatTheInfoFileDoesNotName) {
+    // Modem 2 has the ports 3 to 5, which belong to nobody as long as it has no info file.
+    ModemSimulator simulator({"--modem", "12d1,id=1", "--modem", "12d1,id=2"});
+    ASSERT_EQ(unlink("/tmp/usbmodem.info2"), 0);
+    ASSERT_TRUE(Exists("/dev/ttyUSB5"));
+    openedPorts.clear();
+    USBModem record(1, kInfo1);
+    EXPECT_EQ(record.InitInfo(), 0);
+    EXPECT_THAT(openedPorts, ElementsAre("/dev/ttyUSB0", "/dev/ttyUSB1", "/dev/ttyUSB2"));
+    EXPECT_THAT(simulator.Received("2"), IsEmpty());
+}
+
+constexpr char kDialLog[] = "/var/lib/usbmodem/wvdial.log.001010123456789";
+
+// A record that knows its IMSI.
+struct IdentifiedModem : OpenedModem {
+    IdentifiedModem() : OpenedModem("generic") {
+        record.UpdateSIMStatus();
+        bool err = false;
+        EXPECT_EQ(record.GetIMSI(err), "001010123456789");
+    }
+};
+
+TEST(ConnectInfo, IsReadFromTheDialLogOfTheCard) {
+    const struct {
+        const char* log;
+        int result;
+    } kLogs[] = {
+        {"", 2},
+        {"--> Carrier detected.\n--> Using interface ppp0\n", 2},
+        {"Using interface ppp0\nsecondary DNS address 8.8.4.4\n", 1},
+        {"--> Using interface\n\t ppp12 \nlocal  IP address\nsecondary DNS address 8.8.4.4\n", 1},
+        {"Using interface ppp0\nUsing interface ppp1\nsecondary DNS address\n", 1},
+        {"Using interface ppp0\nsecondary DNS address\nDisconnecting at ...\n", -1},
+        {"Disconnecting", -1},
+        {"secondary DNS address 8.8.4.4\n", 1},  // reads from character 14 on
+        {"secondary DNS address Using interface", 1},
+    };
+    IdentifiedModem modem;
+    for (const auto& row : kLogs) {
+        SCOPED_TRACE(row.log);
+        WriteFile(kDialLog, row.log);
+        EXPECT_EQ(modem.record.AssignConnectInfo(), row.result);
+        bool err = false;
+        EXPECT_EQ(modem.record.GetNetIFName(err), "");  // only while connected
+    }
+    EXPECT_EQ(modem.log.Text(), "");
+}
+
+TEST(ConnectInfo, CannotBeReadWithoutALog) {
+    IdentifiedModem modem;
+    EXPECT_EQ(modem.record.AssignConnectInfo(), -1);
+    EXPECT_TRUE(modem.log.Has(std::string("Error on file ") + kDialLog + ", not exist"));
+
+    // A file that is there and cannot be opened, whoever asks.
+    const int socketFile = socket(AF_UNIX, SOCK_STREAM, 0);
+    sockaddr_un address{};
+    address.sun_family = AF_UNIX;
+    strcpy(address.sun_path, kDialLog);
+    ASSERT_EQ(bind(socketFile, reinterpret_cast<sockaddr*>(&address), sizeof address), 0);
+    EXPECT_EQ(modem.record.AssignConnectInfo(), -1);
+    EXPECT_TRUE(modem.log.Has(std::string("Error on file open: ") + kDialLog));
+    close(socketFile);
+    unlink(kDialLog);
+
+    MakeDirectories(kDialLog);  // can be opened, but not read
+    EXPECT_EQ(modem.record.AssignConnectInfo(), -1);
+}
+
+}  // namespace
+}  // namespace taviwireless::test

@@ -1,0 +1,241 @@
+// The record itself: defaults, copies, and what it keeps while a list of records grows and shrinks.
+#include <taviwireless/usbmodem_list.h>
+
+#include <filesystem>
+#include <type_traits>
+
+#include "tests/support/descriptors.h"
+#include "tests/support/files.h"
+#include "tests/support/sleep_capture.h"
+#include "tests/usbmodem/opened_modem.h"
+
+namespace taviwireless::test {
+namespace {
+
+using testing::ElementsAre;
+using testing::IsEmpty;
+using usbmodem_lib::USBModem;
+using usbmodem_lib::USBModemList;
+using usbmodem_lib::USBModemNull;
+
+// A vector that grows moves its elements only if that cannot fail.
+static_assert(std::is_nothrow_move_constructible_v<USBModem>);
+static_assert(std::is_nothrow_move_assignable_v<USBModem>);
+static_assert(std::has_virtual_destructor_v<USBModem>);
+
+std::string AskFor(USBModem& record, const std::string& command) {
+    std::string reply;
+    return record.ModemCmd(command, reply) == 0 ? reply : "no reply";
+}
+
+TEST(Record, StartsWithNothingKnown) {
+    LogCapture log;
+    const auto before = OpenDescriptors();
+    USBModem record(4294967291u, "/tmp/usbmodem.info-5");
+    EXPECT_EQ(record.GetIfid(), 4294967291u);
+    EXPECT_EQ(record.GetDevId(), "usbmodem4294967291");
+    EXPECT_FALSE(record.IsNull());
+    EXPECT_FALSE(record.IsInited());
+    EXPECT_FALSE(record.IsInfoExist());
+    EXPECT_FALSE(record.IsError());
+    EXPECT_FALSE(record.IsUSBModemBusy());
+    EXPECT_TRUE(record.IsNewPlugIn());
+    EXPECT_EQ(record.GetConnectFailedAttempt(), 0);
+    EXPECT_EQ(record.PINGetAttemptRemain(), 0);
+    EXPECT_EQ(record.PUKGetAttemptRemain(), 0);
+    bool err = false;
+    EXPECT_EQ(record.GetNetIFName(err), "");
+    EXPECT_EQ(record.GetNetLocalIP(err), "");
+    EXPECT_EQ(record.GetRoaming(err), "false");
+    EXPECT_FALSE(err);
+    EXPECT_EQ(log.Text(), "");
+    EXPECT_EQ(OpenDescriptors(), before);
+}
+
+TEST(Record, IsAnErrorFromTheSixthCountOn) {
+    USBModem record(1, kInfo1);
+    for (int count = 1; count <= 7; ++count) {
+        EXPECT_EQ(record.IncreaseErrorCounter(), count);
+        EXPECT_EQ(record.IsError(), count >= 6) << count;
+    }
+}
+
+TEST(Record, IsThereWhileItsInfoFileIs) {
+    USBModem record(1, kInfo1);
+    WriteFile(kInfo1, "");
+    EXPECT_TRUE(record.IsInfoExist());
+    std::filesystem::remove(kInfo1);
+    EXPECT_FALSE(record.IsInfoExist());
+}
+
+TEST(Record, TakesTheCommandSetOfItsVendor) {
+    const struct {
+        const char* info;
+        const char* unsolicited;  // whether this vendor's can be switched: what is logged
+        bool isMissing;
+    } kInfos[] = {
+        {"USB_ID_VENDOR=2001\n", "", false},
+        {"USB_ID_VENDOR=12D1\n", "Unknown vendor id 12D1, assign default ATIF", false},
+        {"USB_ID_VENDOR=\n", "Unknown vendor id , assign default ATIF", true},
+        {"", "Unknown vendor id , assign default ATIF", true},
+    };
+    USBModem record(1, kInfo1);
+    for (const auto& row : kInfos) {
+        SCOPED_TRACE(row.info);
+        WriteFile(kInfo1, row.info);
+        LogCapture log;
+        record.SetATInterface();
+        EXPECT_TRUE(log.Has(row.unsolicited) || *row.unsolicited == '\0') << log.Text();
+        EXPECT_EQ(log.Has("Cannot parsing USB_ID_VENDOR from /tmp/usbmodem.info1"), row.isMissing);
+        EXPECT_EQ(log.Lines().size(), (*row.unsolicited != '\0') + (row.isMissing ? 1u : 0u));
+    }
+    record.UnsetATInterface();
+    record.UnsetATInterface();
+}
+
+TEST(NullObject, IsNoModemAndFailsCleanly) {
+    LogCapture log;
+    USBModemNull& none = USBModemList::nullObject;
+    EXPECT_EQ(none.GetDevId(), "");
+    EXPECT_TRUE(none.IsNull());
+    EXPECT_FALSE(none.IsInited());
+    EXPECT_FALSE(none.IsInfoExist());
+    EXPECT_EQ(none.GetIfid(), 0u);
+    bool err = false;
+    EXPECT_EQ(none.GetPINStatus(err), "no_sim");
+    EXPECT_TRUE(err);
+    err = false;
+    EXPECT_EQ(none.GetProductName(err), "");
+    EXPECT_TRUE(err);
+    EXPECT_EQ(none.PINUnlock("1234"), -1);
+    EXPECT_EQ(none.GetPINEnable(), -1);
+    EXPECT_EQ(none.DrainDeviceBuffer(), -1);
+    none.CloseFileDevice();
+    EXPECT_TRUE(log.Has("Error on executing modem cmd with a null modem or null command"));
+    EXPECT_FALSE(log.Has("1234"));
+}
+
+// What a record answers without asking the modem.
+std::vector<std::string> CachedNames(USBModem& record) {
+    bool err = false;
+    std::vector<std::string> names;
+    for (auto query : {&USBModem::GetIMSI, &USBModem::GetDefaultAPN, &USBModem::GetProductName,
+                       &USBModem::GetVendorName}) {
+        names.push_back((record.*query)(err));
+    }
+    return names;
+}
+
+TEST(Copy, HasTheStateButNotTheNames) {
+    OpenedModem modem("generic");
+    ASSERT_EQ(modem.record.UpdateSIMStatus(), 1);
+    CachedNames(modem.record);
+    ASSERT_EQ(modem.record.PINGetAttemptRemain(), 3);
+    modem.record.SetNotNewPlugIn();
+    for (int i = 0; i < 6; ++i) {
+        modem.record.IncreaseErrorCounter();
+    }
+    USBModem copy(modem.record);
+    modem.record.CloseFileDevice();
+    copy.CloseFileDevice();  // from here on every query gives what is kept
+    EXPECT_EQ(copy.GetDevId(), "usbmodem1");
+    EXPECT_TRUE(copy.IsInfoExist());
+    EXPECT_TRUE(copy.IsError());
+    EXPECT_FALSE(copy.IsNewPlugIn());
+    EXPECT_EQ(copy.IsInited(), modem.record.IsInited());
+    bool err = false;
+    EXPECT_TRUE(copy.IsPINReady(err));
+    EXPECT_THAT(CachedNames(copy), ElementsAre("", "", "", ""));
+
+    USBModem assigned(2, "/tmp/usbmodem.info2");
+    assigned = modem.record;
+    EXPECT_EQ(assigned.GetDevId(), "usbmodem1");
+    EXPECT_THAT(CachedNames(assigned),
+                ElementsAre("001010123456789", "internet", "3G Modem", "Generic"));
+    assigned = *&assigned;
+    EXPECT_EQ(CachedNames(assigned)[0], "001010123456789");
+}
+
+TEST(Copy, SharesTheChannelUntilTheLastOneIsGone) {
+    OpenedModem modem("generic");
+    const auto open = OpenDescriptors();
+    std::string vendor = "Generic\nOK\n";
+    {
+        USBModem copy(modem.record);
+        USBModem assigned(2, "/tmp/usbmodem.info2");
+        assigned = copy;
+        EXPECT_EQ(AskFor(copy, "AT+CGMI"), vendor);
+        copy.CloseFileDevice();
+        EXPECT_EQ(AskFor(assigned, "AT+CGMI"), vendor);
+        EXPECT_EQ(OpenDescriptors(), open);
+    }
+    EXPECT_EQ(OpenDescriptors(), open);
+    EXPECT_EQ(AskFor(modem.record, "AT+CGMI"), vendor);
+    USBModem last(std::move(modem.record));
+    EXPECT_EQ(OpenDescriptors(), open);
+    EXPECT_EQ(AskFor(last, "AT+CGMI"), vendor);
+    last.CloseFileDevice();
+    EXPECT_EQ(OpenDescriptors().size(), open.size() - 1);
+}
+
+TEST(Copy, ThatIsAssignedOverReleasesItsOwnChannel) {
+    ModemSimulator simulator({"--modem", "generic,id=1", "--modem", "2001,id=2"});
+    const auto before = OpenDescriptors();
+    USBModem first(1, kInfo1);
+    USBModem second(2, "/tmp/usbmodem.info2");
+    ASSERT_EQ(first.OpenFileDevice("/dev/ttyUSB1"), 0);
+    ASSERT_EQ(second.OpenFileDevice("/dev/ttyUSB3"), 0);
+    EXPECT_EQ(OpenDescriptors().size(), before.size() + 2);
+    first = second;
+    EXPECT_EQ(OpenDescriptors().size(), before.size() + 1);
+    EXPECT_EQ(AskFor(first, "AT+CGMM"), "+CGMM: 3G Stick\nOK\n");
+    first = USBModem(1, kInfo1);
+    second = USBModem(1, kInfo1);
+    EXPECT_EQ(OpenDescriptors(), before);
+}
+
+// Two modems that are initialised and asked, and a list that then grows far beyond them.
+TEST(List, KeepsChannelsAndNamesOfItsRecordsWhileItGrowsAndShrinks) {
+    const auto before = OpenDescriptors();
+    ModemSimulator simulator({"--modem", "generic,id=1,fault=error=AT+CFUN?",
+                              "--modem", "generic,id=2,fault=error=AT+CFUN?,product=second"});
+    SleepCapture sleeps;
+    {
+        const auto closed = OpenDescriptors();
+        USBModemList list;
+        ASSERT_EQ(list.Update(), 0);
+        bool err = false;
+        for (int id : {1, 2}) {
+            list.FindUSBModem(id).GetIMSI(err);
+        }
+        const auto open = OpenDescriptors();
+        EXPECT_EQ(open.size(), closed.size() + 2);
+
+        for (int id = 10; id < 50; ++id) {
+            WriteFile("/tmp/usbmodem.info" + std::to_string(id), "");
+            ASSERT_EQ(list.SearchInfoPath(), 0);
+        }
+        EXPECT_EQ(OpenDescriptors(), open);
+        EXPECT_EQ(AskFor(list.FindUSBModem(1), "AT+CGMM"), "3G Modem\nOK\n");
+        EXPECT_EQ(AskFor(list.FindUSBModem(2), "AT+CGMM"), "second\nOK\n");
+
+        for (int id = 10; id < 50; ++id) {
+            std::filesystem::remove("/tmp/usbmodem.info" + std::to_string(id));
+        }
+        std::filesystem::remove(kInfo1);
+        for (int i = 0; i < 8; ++i) {
+            list.Update();
+        }
+        EXPECT_EQ(list.end() - list.begin(), 1);
+        EXPECT_EQ(OpenDescriptors().size(), open.size() - 1);
+        USBModem& second = list.FindUSBModem(2);
+        EXPECT_TRUE(second.IsInited());
+        EXPECT_EQ(AskFor(second, "AT+CGMM"), "second\nOK\n");
+        second.CloseFileDevice();
+        EXPECT_EQ(second.GetIMSI(err), "001010123456789");  // as it was asked before all this
+        EXPECT_EQ(OpenDescriptors(), closed);
+    }
+}
+
+}  // namespace
+}  // namespace taviwireless::test
