@@ -27,13 +27,13 @@ constexpr int kApplianceRootFailed = 70;
 // /dev: null, zero, full, random, urandom, tty, a pts of its own with ptmx, shm, fd, stdin, stdout,
 //     stderr. None of the machine's devices; links such as /dev/ttyUSB0 can be made.
 // Fresh: /proc and /sys. /sys/class/net shows the network inside: lo, which is up.
-// Private: System V and POSIX IPC, process numbers, network devices, addresses and abstract
-// sockets. Unchanged: everything else (/home, /root, /opt, ...), the environment, open descriptors,
-// and the
-//     current directory, which is entered anew by its path ("/" if that path is no more).
-//     When the running executable or the current directory lies below a directory that is private
-//     and empty, the topmost directory on the way to it stays visible and is the real one: with a
-//     checkout in /tmp/clone, /tmp holds "clone" alone.
+// Private: System V and POSIX IPC, process numbers, network devices, addresses, abstract sockets.
+//
+// Unchanged: everything else (/home, /root, /opt, ...), the environment, open descriptors, and the
+// current directory, which is entered anew by its path ("/" if that path is no more). When the
+// running executable or the current directory lies below a directory that is private and empty, the
+// topmost directory on the way to it stays visible and is the real one: with a checkout in
+// /tmp/clone, /tmp holds "clone" alone.
 //
 // Without root, only the caller's own user and group exist: changing owners fails, and files of the
 // machine's root cannot be changed in place, but can be removed and created in folders at most

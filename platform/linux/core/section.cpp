@@ -2,6 +2,7 @@
 #include <strings.h>
 #include <tavicore/section.h>
 
+#include <algorithm>
 #include <optional>
 #include <set>
 #include <string>
@@ -131,15 +132,20 @@ void AppendSection(std::string* text, const std::string& name, const Lines& pair
     *text += "[" + name + "]\n" + Join(pairs);
 }
 
-// Replaces all pairs of the section; its comments and blank lines stay.
-void ReplacePairs(Lines& lines, Section section, const Lines& newPairs) {
-    for (size_t i = section.end; i-- > section.begin;) {
-        if (ReadKey(lines[i])) {
-            lines.erase(lines.begin() + static_cast<std::ptrdiff_t>(i));
-            --section.end;
-        }
+// Puts newPairs in the place of the section's first pair and takes its old pairs away; comments and
+// blank lines stay.
+void ReplacePairs(Lines& lines, const Section& section, const Lines& newPairs) {
+    const auto isPair = [](const std::string& line) { return ReadKey(line).has_value(); };
+    const auto begin = lines.begin() + static_cast<std::ptrdiff_t>(section.begin);
+    const auto end = lines.begin() + static_cast<std::ptrdiff_t>(section.end);
+    const auto first = std::find_if(begin, end, isPair);
+    if (first == end) {
+        InsertAtEnd(lines, section, newPairs);
+        return;
     }
-    InsertAtEnd(lines, section, newPairs);
+    const auto place = first - lines.begin();
+    lines.erase(std::remove_if(first, end, isPair), end);
+    lines.insert(lines.begin() + place, newPairs.begin(), newPairs.end());
 }
 
 // Puts newLine in the place of the key's first line, or at the end of the section; the key's

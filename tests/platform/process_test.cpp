@@ -1,0 +1,95 @@
+#include <fcntl.h>
+#include <gmock/gmock.h>
+#include <signal.h>
+#include <sys/wait.h>
+#include <tavicore/error.h>
+#include <tavicore/process.h>
+#include <unistd.h>
+
+#include "tests/support/descriptors.h"
+#include "tests/support/files.h"
+
+namespace taviwireless::test {
+namespace {
+
+constexpr char kPidFile[] = "/tmp/pid";
+
+// Waits, up to five seconds, until the process named in the pid file has the wanted state.
+bool WaitUntilAlive(int alive) {
+    for (int i = 0; i < 500 && VEXACProcAliveByPidFile(kPidFile) != alive; ++i) {
+        usleep(10000);
+    }
+    return VEXACProcAliveByPidFile(kPidFile) == alive;
+}
+
+TEST(Process, AChildThatNobodyWaitsForIsKnownByItsPidFile) {
+    const auto before = OpenDescriptors();
+    const pid_t child = VEXACProcForkChildNoWait();
+    if (child == 0) {
+        VEXACProcPidFileCreate(kPidFile);
+        for (;;) {
+            pause();
+        }
+    }
+    ASSERT_GT(child, 0);
+    EXPECT_TRUE(WaitUntilAlive(1));
+    EXPECT_EQ(VEXACReadPidFile(kPidFile), child);
+    EXPECT_EQ(VEXACProcSignalByPidFile(kPidFile, SIGTERM), 0);
+    EXPECT_TRUE(WaitUntilAlive(0));
+    EXPECT_EQ(waitpid(-1, nullptr, WNOHANG), -1);  // no zombie of ours
+    EXPECT_EQ(errno, ECHILD);
+    EXPECT_EQ(VEXACProcSignalByPidFile(kPidFile, SIGTERM), -1);
+    EXPECT_EQ(VEXACErrGet(), VEXAC_ERR_NOT_FOUND);
+    EXPECT_EQ(OpenDescriptors(), before);
+}
+
+TEST(Process, AStalePidFileDoesNotHarmWhoHasTheNumberNow) {
+    const std::string self = std::to_string(getpid());
+    WriteFile(kPidFile, self + "\n1\n");  // started at tick 1, which this process did not
+    EXPECT_EQ(VEXACProcAliveByPidFile(kPidFile), 0);
+    EXPECT_EQ(VEXACProcSignalByPidFile(kPidFile, SIGKILL), -1);
+    WriteFile(kPidFile, self + "\n");  // of a writer that records no start time
+    EXPECT_EQ(VEXACProcAliveByPidFile(kPidFile), 1);
+}
+
+TEST(Process, AZombieIsNotAlive) {
+    const pid_t child = fork();
+    if (child == 0) {
+        _exit(0);
+    }
+    siginfo_t info;
+    waitid(P_PID, static_cast<id_t>(child), &info, WEXITED | WNOWAIT);
+    WriteFile(kPidFile, std::to_string(child));
+    EXPECT_EQ(VEXACProcAliveByPidFile(kPidFile), 0);
+    waitpid(child, nullptr, 0);
+}
+
+TEST(Process, WhatIsNoProcessIdIsZero) {
+    for (const char* text : {"", "\n", "abc", "-5", "0", "99999999999999999999", "4294967297"}) {
+        WriteFile(kPidFile, text);
+        EXPECT_EQ(VEXACReadPidFile(kPidFile), 0) << text;
+        EXPECT_EQ(VEXACProcAliveByPidFile(kPidFile), 0) << text;
+        EXPECT_EQ(VEXACProcSignalByPidFile(kPidFile, SIGKILL), -1) << text;
+    }
+}
+
+TEST(Exec, GivesTheExitStatus) {
+    EXPECT_EQ(VEXACExec("/bin/true", nullptr), 0);
+    EXPECT_EQ(VEXACExec("sh", "-c", "exit $#", "sh", "a b", "c", "d", nullptr), 3);
+    EXPECT_EQ(VEXACExec("/bin/sh", "-c", "kill -9 $$", nullptr), -1);
+    EXPECT_EQ(VEXACExec("/no/such/program", nullptr), -1);
+    EXPECT_EQ(VEXACExec(nullptr, nullptr), -1);
+}
+
+TEST(Exec, TheProgramInheritsNoDescriptorAndNoIgnoredSignal) {
+    const int leak = open("/dev/null", O_RDONLY);  // deliberately not closed on exec
+    signal(SIGTERM, SIG_IGN);
+    EXPECT_EQ(VEXACExec("sh", "-c", "ls /proc/self/fd > /tmp/fds; kill -TERM $$; exit 0", nullptr),
+              -1);
+    signal(SIGTERM, SIG_DFL);
+    EXPECT_EQ(ReadFile("/tmp/fds"), "0\n1\n2\n3\n");  // 3 is the one that ls reads
+    close(leak);
+}
+
+}  // namespace
+}  // namespace taviwireless::test

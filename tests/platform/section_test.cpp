@@ -1,0 +1,122 @@
+#include <gmock/gmock.h>
+#include <tavicore/error.h>
+#include <tavicore/section.h>
+
+#include <vector>
+
+#include "tests/support/files.h"
+
+namespace taviwireless::test {
+namespace {
+
+constexpr char kFile[] = "/tmp/sections";
+constexpr char kFormat[] = "\t%s=%s\n";
+
+using Pairs = std::vector<std::pair<std::string, std::string>>;
+
+class Hash {
+  public:
+    Hash() = default;
+    explicit Hash(const Pairs& pairs) {
+        for (const auto& [key, value] : pairs) {
+            VEXACSzHashSetValue(&hash_, key.c_str(), value.c_str());
+        }
+    }
+    ~Hash() { VEXACSzHashFree(hash_); }
+    VEXACSzHash** Address() { return &hash_; }
+    const VEXACSzHash* Get() const { return hash_; }
+    const char* operator[](const char* key) const { return VEXACSzHashGetValue(hash_, key); }
+
+  private:
+    VEXACSzHash* hash_ = VEXACSzHashAlloc(64);
+};
+
+constexpr char kText[] =
+    "stray=0\n"
+    "[One]\n"
+    "\tKEY= \"as it stands\" \n"
+    "# KEY=comment\n"
+    "\n"
+    "; of Two\n"
+    " [two] \r\n"
+    "KEY=a=b\r\n"
+    "KEY=second\n"
+    "[no header\n"
+    "UTF=\xc3\xbc\xff\n"
+    "no pair\n"
+    "[a]b]\n"
+    "[]\n"
+    "LAST=1";
+
+TEST(Section, ReadsSectionsAmongMalformedLines) {
+    WriteFile(kFile, kText);
+    VEXACSzList* names = VEXACSzListAlloc(64);
+    ASSERT_EQ(VEXACFileEnumSection(kFile, &names), 4);
+    const char* kNames[] = {"One", "two", "a]b", ""};
+    for (int i = 0; i < 4; ++i) {
+        EXPECT_STREQ(VEXACSzListGet(names, i), kNames[i]);
+    }
+    VEXACSzListFree(names);
+    Hash two;
+    EXPECT_EQ(VEXACFileGetSection(kFile, "TWO", two.Address()), 1);  // another letter case
+    EXPECT_STREQ(two["KEY"], "a=b");
+    EXPECT_STREQ(two["UTF"], "\xc3\xbc\xff");
+    EXPECT_EQ(two["stray"], nullptr);
+    EXPECT_EQ(VEXACFileGetSection(kFile, "three", two.Address()), 0);
+    char value[32];
+    EXPECT_EQ(VEXACFileGetSectionValue(kFile, "One", "KEY", value, sizeof value), 0);
+    EXPECT_STREQ(value, " \"as it stands\" ");
+    EXPECT_EQ(VEXACFileGetSectionValue(kFile, "", "LAST", value, 2), 0);
+    EXPECT_STREQ(value, "1");
+    EXPECT_EQ(VEXACFileGetSectionValue(kFile, "", "LAST", value, 1), -1);
+    EXPECT_EQ(VEXACErrGet(), VEXAC_ERR_TOO_LONG);
+    EXPECT_EQ(VEXACFileGetSectionValue(kFile, "One", "LAST", value, sizeof value), -1);
+    EXPECT_EQ(VEXACErrGet(), VEXAC_ERR_NOT_FOUND);
+}
+
+TEST(Section, AnExactNameGoesBeforeOneOfAnotherCase) {
+    WriteFile(kFile, "[a]\nK=lower\n[A]\nK=upper\n");
+    Hash hash;
+    EXPECT_EQ(VEXACFileGetSection(kFile, "A", hash.Address()), 1);
+    EXPECT_STREQ(hash["K"], "upper");
+}
+
+TEST(Section, WritesLeaveEverythingElseAsItStands) {
+    const std::string one = "; top\n[one]\n#c\n\ta=1\n\tb=2\n\n# two\n";
+    const std::string two = "[two]\nx=\xff\n";
+    WriteFile(kFile, one + two);
+    EXPECT_EQ(VEXACFileSetSectionValue(kFile, "one", "c", " 3 ", kFormat), 0);
+    EXPECT_EQ(ReadFile(kFile), "; top\n[one]\n#c\n\ta=1\n\tb=2\n\tc= 3 \n\n# two\n" + two);
+    EXPECT_EQ(VEXACFileSetSection(kFile, "ONE", nullptr, Hash(Pairs{{"b", "9"}, {"n", ""}}).Get(),
+                                  kFormat),
+              1);
+    EXPECT_EQ(ReadFile(kFile), "; top\n[one]\n#c\n\tb=9\n\tn=\n\n# two\n" + two);
+    EXPECT_EQ(VEXACFileAddSection(kFile, "new", Hash(Pairs{{"z", "1"}, {"a", "2"}}).Get(), kFormat),
+              1);
+    EXPECT_EQ(ReadFile(kFile),
+              "; top\n[one]\n#c\n\tb=9\n\tn=\n\n# two\n" + two + "[new]\n\tz=1\n\ta=2\n");
+    EXPECT_EQ(VEXACFileAddSection(kFile, "new", Hash().Get(), kFormat), -1);
+    EXPECT_EQ(VEXACFileSetSection(kFile, "none", nullptr, Hash().Get(), kFormat), 0);
+}
+
+TEST(Section, RefusesWhatWouldForgeALine) {
+    WriteFile(kFile, "[one]\n\ta=1\n");
+    const struct {
+        const char* section;
+        const char* key;
+        const char* value;
+    } kRows[] = {{"one", "a", "x\n[two]"}, {"one", "a\nb", "x"}, {"one", "[a", "x"},
+                 {"one", "", "x"},         {"one", "a=b", "x"},  {"one", "#a", "x"},
+                 {"one\n[two", "a", "x"},  {"", "a", "x"}};
+    for (const auto& row : kRows) {
+        EXPECT_EQ(VEXACFileSetSectionValue(kFile, row.section, row.key, row.value, kFormat), -1);
+        EXPECT_EQ(VEXACErrGet(), VEXAC_ERR_BAD_PARAMETER);
+    }
+    EXPECT_EQ(VEXACFileAddSection(kFile, "x", Hash(Pairs{{"a", "1\n2"}}).Get(), kFormat), -1);
+    EXPECT_EQ(VEXACFileSetSection(kFile, "one", nullptr, Hash(Pairs{{"a", "1\n2"}}).Get(), kFormat),
+              -1);
+    EXPECT_EQ(ReadFile(kFile), "[one]\n\ta=1\n");
+}
+
+}  // namespace
+}  // namespace taviwireless::test
