@@ -1,5 +1,7 @@
 #include "usbmodem/loggable.h"
 
+#include <algorithm>
+#include <iterator>
 #include <sstream>
 
 namespace taviwireless::usbmodem_lib {
@@ -9,6 +11,14 @@ namespace {
 // What stands in front of the secrets in the commands that carry them.
 constexpr const char* kBeforeSecrets[] = {"AT+CPIN=", "AT+CPWD=\"SC\",", "AT+CLCK=\"SC\",0,",
                                           "AT+CLCK=\"SC\",1,"};
+
+// How the lines begin that a modem writes itself.
+constexpr const char* kOwnLines[] = {"OK", "ERROR", "+CME ERROR:", "+CPIN: ", "BUSY"};
+
+bool IsModemsOwn(const std::string& line) {
+    return std::any_of(std::begin(kOwnLines), std::end(kOwnLines),
+                       [&line](const char* begin) { return line.rfind(begin, 0) == 0; });
+}
 
 }  // namespace
 
@@ -25,9 +35,8 @@ std::string LoggableReply(const std::string& reply) {
     std::istringstream lines(reply);
     std::string loggable;
     for (std::string line; std::getline(lines, line);) {
-        const size_t equals = line.find('=');
-        loggable += equals == std::string::npos ? line : line.substr(0, equals) + "=***";
-        loggable += '\n';
+        line.erase(0, line.find_first_not_of('\r'));  // left over from the end of an echo
+        loggable += IsModemsOwn(line) ? line + '\n' : "***\n";
     }
     return loggable;
 }

@@ -9,8 +9,8 @@ namespace taviwireless::usbmodem_lib {
 // Returns an AT command with "***" in place of the PINs and PUKs in it.
 std::string LoggableCommand(const std::string& command);
 
-// Returns the reply to a command that carried a PIN or PUK with "***" in place of what follows the
-// first "=" of each line: a modem may repeat the command damaged, so that it is not known as its
+// Returns the reply to a command that carried a PIN or PUK with "***" in place of every line that
+// is no result or status: a modem may repeat the command damaged, so that it is not known as its
 // echo.
 std::string LoggableReply(const std::string& reply);
 

@@ -4,6 +4,7 @@
 
 #include <chrono>
 #include <cstdio>
+#include <optional>
 
 #include "common/log.h"
 #include "usbmodem/loggable.h"
@@ -27,14 +28,18 @@ bool WaitReadable(WvModem& modem, time_t milliseconds) {
     return modem.select(milliseconds, true, false);
 }
 
-// Reads until the reply ends or kMaxReply bytes are there, and returns what was read.
-std::string ReadReply(WvModem& modem) {
+// Reads until the reply ends or kMaxReply bytes are there, and returns what was read; nothing when
+// no byte came.
+std::optional<std::string> ReadReply(WvModem& modem) {
     const auto limit = Clock::now() + kTalkLimit;
     char buffer[kMaxReply + 1] = {};
     size_t count = modem.read(buffer, kMaxReply);
     while (count < kMaxReply && modem.isok() && Clock::now() < limit &&
            WaitReadable(modem, kReplyQuiet)) {
         count += modem.read(buffer + count, kMaxReply - count);
+    }
+    if (count == 0) {
+        return std::nullopt;
     }
     return buffer;  // a zero byte ends the reply
 }
@@ -136,12 +141,13 @@ int USBModem::Exchange(const std::string& cmd, std::string& reply) {
     }
     const std::string line = cmd + '\r';
     device_->write(line.data(), line.size());
-    const std::string data = WaitReadable(*device_, kFirstByteWait) ? ReadReply(*device_) : "";
-    if (data.empty()) {  // also when the modem was unplugged, which wakes the wait
+    const std::optional<std::string> data =
+        WaitReadable(*device_, kFirstByteWait) ? ReadReply(*device_) : std::nullopt;
+    if (!data) {  // also when the modem was unplugged, which wakes the wait
         TAVI_LOG_ERROR("No respond on modem cmd %s", LoggableCommand(cmd).c_str());
         return -1;
     }
-    reply = CleanReply(data, cmd);
+    reply = CleanReply(*data, cmd);
     return 0;
 }
 

@@ -5,7 +5,6 @@
 #include <unistd.h>
 
 #include <fstream>
-#include <iterator>
 #include <sstream>
 
 #include "common/log.h"
@@ -83,11 +82,12 @@ int USBModem::AssignConnectInfo() {
         return -1;
     }
     std::ifstream file(path);
-    if (!file) {
+    std::string log;
+    std::getline(file, log, '\0');  // all of it, a text; iterators would throw when reading fails
+    if (!file.is_open() || file.bad()) {
         TAVI_LOG_ERROR("Error on file open: %s", path.c_str());
         return -1;
     }
-    const std::string log{std::istreambuf_iterator<char>(file), {}};
     if (Contains(log, "Disconnecting")) {
         return -1;
     }

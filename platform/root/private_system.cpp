@@ -94,7 +94,7 @@ class Kept {
     void BringBack() const {
         const std::string link = "/proc/self/fd/" + std::to_string(handle_);
         MakeMountPoint(fs::is_directory(link));
-        if (mount(link.c_str(), path_.c_str(), nullptr, MS_BIND | MS_REC, nullptr) != 0) {
+        if (mount(link.c_str(), path_.c_str(), "none", MS_BIND | MS_REC, nullptr) != 0) {
             Fail("keep " + path_ + " visible");
         }
     }
@@ -245,7 +245,7 @@ void BringLoopbackUp() {
 }  // namespace
 
 void SetUpPrivateSystem(bool inUserNamespace) {
-    if (mount(nullptr, "/", nullptr, MS_REC | MS_PRIVATE, nullptr) != 0) {
+    if (mount("none", "/", "none", MS_REC | MS_PRIVATE, nullptr) != 0) {
         Fail("detach the mounts from the machine's");
     }
     for (const Mount& mounted : kKernelFileSystems) {

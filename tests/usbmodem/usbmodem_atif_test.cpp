@@ -93,9 +93,9 @@ TEST(Atif, IsChosenByTheExactVendorId) {
         EXPECT_TRUE(typeid(*set) == vendor.type) << typeid(*set).name();
         const bool isUnknown = vendor.type == typeid(USBModem_ATIF);
         EXPECT_EQ(log.Lines().size(), isUnknown ? 1u : 0u);
-        EXPECT_EQ(log.Has(std::string(" Unknown vendor id ") + vendor.vendorId +
-                          ", assign default ATIF"),
-                  isUnknown);
+        EXPECT_EQ(
+            log.Has(std::string(" Unknown vendor id ") + vendor.vendorId + ", assign default ATIF"),
+            isUnknown);
     }
 }
 
@@ -103,7 +103,8 @@ TEST(Atif, ItsVendorTableIsFilledOnceByTheFirstOfManyThreads) {
     EXPECT_THAT(USBModem_ATIF::vendorTable, testing::IsEmpty());
     std::vector<std::thread> threads;
     for (int i = 0; i < 8; ++i) {
-        threads.emplace_back([] { EXPECT_NE(dynamic_cast<USBModem_ATIF_Huawei*>(Create("12d1").get()), nullptr); });
+        threads.emplace_back(
+            [] { EXPECT_NE(dynamic_cast<USBModem_ATIF_Huawei*>(Create("12d1").get()), nullptr); });
     }
     for (std::thread& thread : threads) {
         thread.join();
@@ -244,8 +245,8 @@ TEST(OkParser, WantsOkAndNoError) {
     const struct {
         const char* reply;
         int status;
-    } kReplies[] = {{"OK\n", 0},    {"+CFUN: 1\nOK\n", 0}, {"ERROR\nOK\n", -1},  {"OK\nERROR\n", -1},
-                    {"ok\n", -1},   {"ERROR\n", -1},       {"+CFUN: 1\n", -1},   {"LOOK\n", 0}};
+    } kReplies[] = {{"OK\n", 0},  {"+CFUN: 1\nOK\n", 0}, {"ERROR\nOK\n", -1}, {"OK\nERROR\n", -1},
+                    {"ok\n", -1}, {"ERROR\n", -1},       {"+CFUN: 1\n", -1},  {"LOOK\n", 0}};
     USBModem_ATIF set;
     LogCapture log;
     for (const auto& reply : kReplies) {

@@ -1,7 +1,8 @@
 // The serial channel: opening, draining, one command and its reply, and modems that misbehave.
 #include <sys/resource.h>
 #include <sys/sem.h>
-#include <taviwireless/usbmodem_atif.h>
+#include <sys/wait.h>
+#include <unistd.h>
 
 #include <chrono>
 
@@ -73,6 +74,21 @@ TEST(Channel, ReplacesAnOpenOneAndKeepsThatUntilBothAreClosed) {
     record.CloseFileDevice();
     record.CloseFileDevice();
     EXPECT_EQ(OpenDescriptors(), before);
+}
+
+TEST(Channel, IsNotOpenedWhileAnotherProcessHasIt) {
+    OpenedModem modem;
+    const pid_t other = fork();
+    if (other == 0) {
+        USBModem record(1, kInfo1);
+        const bool isRefused = record.OpenFileDevice(kQueryPort) == -1;
+        _exit(isRefused && modem.log.Has("modem Init failed: ") ? 0 : 1);
+    }
+    int status = -1;
+    EXPECT_EQ(waitpid(other, &status, 0), other);
+    EXPECT_EQ(status, 0);
+    std::string reply;
+    EXPECT_EQ(modem.record.ModemCmd("AT", reply), 0);
 }
 
 TEST(Channel, CanBeOpenedAgainAndAgain) {
@@ -154,13 +170,14 @@ void CheckReplies(bool echo, const std::vector<ReplyCase>& cases) {
 }
 
 TEST(Reply, HasNeitherBlankLinesNorEchoes) {
-    CheckReplies(true, {{"usual", Framed({"+CSQ: 17,99", "OK"}), "+CSQ: 17,99\nOK\n"},
-                        {"the echo alone", "", ""},
-                        {"blank lines alone", "\r\n\r\n\r\n", ""},
-                        {"more echoes", Framed({"A", "AT+CSQ", "B", "xAT+CSQ=y", "OK"}), "A\nB\nOK\n"},
-                        {"an unsolicited line", Framed({"^RSSI:21", "+CSQ: 17,99", "OK"}),
-                         "^RSSI:21\n+CSQ: 17,99\nOK\n"},
-                        {"a line within a line", "\r\nA\rB\r\nOK\r\n", "A\nB\rOK\n"}});
+    CheckReplies(true,
+                 {{"usual", Framed({"+CSQ: 17,99", "OK"}), "+CSQ: 17,99\nOK\n"},
+                  {"the echo alone", "", ""},
+                  {"blank lines alone", "\r\n\r\n\r\n", ""},
+                  {"more echoes", Framed({"A", "AT+CSQ", "B", "xAT+CSQ=y", "OK"}), "A\nB\nOK\n"},
+                  {"an unsolicited line", Framed({"^RSSI:21", "+CSQ: 17,99", "OK"}),
+                   "^RSSI:21\n+CSQ: 17,99\nOK\n"},
+                  {"a line within a line", "\r\nA\rB\r\nOK\r\n", "A\nB\rOK\n"}});
 }
 
 TEST(Reply, EndsAtAnEmptyLineAZeroByteOrACutLine) {
@@ -207,9 +224,13 @@ TEST(Reply, IsPutTogetherFromItsPieces) {
 }
 
 // Everything that carries a PIN or PUK: 1357, 2468 or 98765432.
-const std::vector<std::string> kSecretCommands = {
-    "AT+CPIN=1357", "AT+CPIN=\"1357\"", "AT+CPIN=98765432,2468", "AT+CPIN=\"98765432\",\"2468\"",
-    "AT+CPWD=\"SC\",\"1357\",\"2468\"", "AT+CLCK=\"SC\",1,\"1357\"", "AT+CLCK=\"SC\",0,\"1357\""};
+const std::vector<std::string> kSecretCommands = {"AT+CPIN=1357",
+                                                  "AT+CPIN=\"1357\"",
+                                                  "AT+CPIN=98765432,2468",
+                                                  "AT+CPIN=\"98765432\",\"2468\"",
+                                                  "AT+CPWD=\"SC\",\"1357\",\"2468\"",
+                                                  "AT+CLCK=\"SC\",1,\"1357\"",
+                                                  "AT+CLCK=\"SC\",0,\"1357\""};
 
 bool HasSecret(const std::string& text) {
     return text.find("1357") != std::string::npos || text.find("2468") != std::string::npos ||
@@ -231,7 +252,8 @@ TEST(Secrets, AreNotLoggedWhenTheModemIsSilent) {
 TEST(Secrets, AreNotLoggedWhenTheModemRepeatsThemDamaged) {
     OpenedModem modem("generic,pin=1357,attempts=9");
     modem.simulator.Fault("1", "noecho");
-    for (const char* echo : {"T+CPIN=1357", "AT+CPIN1357", "AT+C", "1357\"", "+CPIN=1357", "1357"}) {
+    for (const char* echo :
+         {"T+CPIN=1357", "AT+CPIN1357", "AT+C", "1357\"", "+CPIN=1357", "1357"}) {
         SCOPED_TRACE(echo);
         modem.log.Clear();
         modem.simulator.ReplyOnce("1", "AT+CPIN=*",

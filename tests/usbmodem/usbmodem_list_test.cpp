@@ -70,10 +70,9 @@ TEST(Search, TakesExactlyTheNamesOfInfoFiles) {
     MakeDirectories("/tmp/usbmodem.info13");
     USBModemList list;
     EXPECT_EQ(list.SearchInfoPath(), 0);
-    EXPECT_THAT(DevIds(list),
-                testing::UnorderedElementsAre("usbmodem0", "usbmodem1", "usbmodem12",
-                                              "usbmodem2147483647", "usbmodem4294967291",
-                                              "usbmodem2147483648"));
+    EXPECT_THAT(DevIds(list), testing::UnorderedElementsAre(
+                                  "usbmodem0", "usbmodem1", "usbmodem12", "usbmodem2147483647",
+                                  "usbmodem4294967291", "usbmodem2147483648"));
 }
 
 TEST(Search, AddsOnlyWhatIsNew) {
@@ -125,7 +124,8 @@ TEST(Find, GivesTheRecordOfAnIdOrTheNullObject) {
     EXPECT_EQ(list.FindUSBModem("usbmodem0").GetIfid(), 0u);
     EXPECT_EQ(&list.FindUSBModem("usbmodem1"), &list.FindUSBModem(1));
     EXPECT_EQ(list.FindUSBModem(-5).GetDevId(), "usbmodem4294967291");
-    for (const char* devId : {"", "usbmodem", "usbmodem2", "usbmodem01", "USBMODEM1", "usbmodem1 "}) {
+    for (const char* devId :
+         {"", "usbmodem", "usbmodem2", "usbmodem01", "USBMODEM1", "usbmodem1 "}) {
         SCOPED_TRACE(devId);
         EXPECT_TRUE(list.FindUSBModem(devId).IsNull());
         EXPECT_EQ(&list.FindUSBModem(devId), &USBModemList::nullObject);

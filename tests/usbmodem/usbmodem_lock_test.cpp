@@ -26,8 +26,7 @@ extern "C" __attribute__((visibility("default"))) int select(int count, fd_set* 
     static const auto next = reinterpret_cast<decltype(&select)>(dlsym(RTLD_NEXT, "select"));
     timeval shortened{0, kShortWait};
     const bool isQuietWait = timeout != nullptr && timeout->tv_sec == 0 &&
-                             timeout->tv_usec > kShortWait &&
-                             timeout->tv_usec <= kLongestQuietWait;
+                             timeout->tv_usec > kShortWait && timeout->tv_usec <= kLongestQuietWait;
     return next(count, readable, writable, exceptional, isQuietWait ? &shortened : timeout);
 }
 

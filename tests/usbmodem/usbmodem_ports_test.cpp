@@ -7,6 +7,7 @@
 
 #include <cstdarg>
 #include <cstring>
+#include <filesystem>
 #include <set>
 
 #include "tests/support/descriptors.h"
@@ -23,8 +24,7 @@ int PassOn(const char* function, const char* path, int flags, mode_t mode) {
     if (name.rfind("/dev/tty", 0) == 0) {
         openedPorts.insert(name);
     }
-    const auto next =
-        reinterpret_cast<int (*)(const char*, int, ...)>(dlsym(RTLD_NEXT, function));
+    const auto next = reinterpret_cast<int (*)(const char*, int, ...)>(dlsym(RTLD_NEXT, function));
     return next(path, flags, mode);
 }
 
@@ -90,8 +90,8 @@ TEST(ConnectNode, ThatDoesNotAnswerOrIsNotThereIsTakenWithAWarning) {
         modem.log.Clear();
         WriteFile(kInfo1, "CONNECTNODE=" + std::string(number) + "\nDEVICENODE=" + number + ",1\n");
         EXPECT_EQ(modem.record.AssignConnectNode(), 0);
-        EXPECT_TRUE(modem.log.Has(std::string("warning: cannot test CONNECTNODE /dev/ttyUSB") +
-                                  number))
+        EXPECT_TRUE(
+            modem.log.Has(std::string("warning: cannot test CONNECTNODE /dev/ttyUSB") + number))
             << modem.log.Text();
         EXPECT_EQ(modem.record.AssignQuaryNode(), 0);  // which passes the dial port over
         EXPECT_THAT(modem.simulator.Received("1.1"), ElementsAre("AT+CPIN?"));
@@ -151,8 +151,8 @@ TEST(Init, AsksForEverythingOnceInItsOrder) {
     EXPECT_TRUE(modem.record.IsInited());
     EXPECT_TRUE(modem.record.IsNewPlugIn());
     EXPECT_THAT(modem.simulator.Received("1.0"), ElementsAre("AT+CPIN?"));
-    EXPECT_THAT(modem.simulator.Received("1.1"),
-                ElementsAre("AT+CPIN?", "AT+CFUN?", "AT+CFUN=1", "AT^CURC?", "AT^CURC=0", "AT+CPIN?"));
+    EXPECT_THAT(modem.simulator.Received("1.1"), ElementsAre("AT+CPIN?", "AT+CFUN?", "AT+CFUN=1",
+                                                             "AT^CURC?", "AT^CURC=0", "AT+CPIN?"));
     EXPECT_THAT(modem.sleeps.Calls(), IsEmpty());
     EXPECT_EQ(modem.log.Text(), "");
 }
@@ -307,10 +307,12 @@ TEST(ConnectInfo, IsReadFromTheDialLogOfTheCard) {
 
 TEST(ConnectInfo, CannotBeReadWithoutALog) {
     IdentifiedModem modem;
+    std::filesystem::remove_all(kDialLog);
     EXPECT_EQ(modem.record.AssignConnectInfo(), -1);
     EXPECT_TRUE(modem.log.Has(std::string("Error on file ") + kDialLog + ", not exist"));
 
     // A file that is there and cannot be opened, whoever asks.
+    MakeDirectories("/var/lib/usbmodem");
     const int socketFile = socket(AF_UNIX, SOCK_STREAM, 0);
     sockaddr_un address{};
     address.sun_family = AF_UNIX;

@@ -68,10 +68,10 @@ TEST(Record, IsThereWhileItsInfoFileIs) {
     EXPECT_FALSE(record.IsInfoExist());
 }
 
-TEST(Record, TakesTheCommandSetOfItsVendor) {
+TEST(Record, TakesTheGenericCommandSetForAnUnknownVendor) {
     const struct {
         const char* info;
-        const char* unsolicited;  // whether this vendor's can be switched: what is logged
+        const char* log;
         bool isMissing;
     } kInfos[] = {
         {"USB_ID_VENDOR=2001\n", "", false},
@@ -85,9 +85,9 @@ TEST(Record, TakesTheCommandSetOfItsVendor) {
         WriteFile(kInfo1, row.info);
         LogCapture log;
         record.SetATInterface();
-        EXPECT_TRUE(log.Has(row.unsolicited) || *row.unsolicited == '\0') << log.Text();
+        EXPECT_TRUE(log.Has(row.log) || *row.log == '\0') << log.Text();
         EXPECT_EQ(log.Has("Cannot parsing USB_ID_VENDOR from /tmp/usbmodem.info1"), row.isMissing);
-        EXPECT_EQ(log.Lines().size(), (*row.unsolicited != '\0') + (row.isMissing ? 1u : 0u));
+        EXPECT_EQ(log.Lines().size(), (*row.log != '\0') + (row.isMissing ? 1u : 0u));
     }
     record.UnsetATInterface();
     record.UnsetATInterface();
@@ -197,8 +197,8 @@ TEST(Copy, ThatIsAssignedOverReleasesItsOwnChannel) {
 // Two modems that are initialised and asked, and a list that then grows far beyond them.
 TEST(List, KeepsChannelsAndNamesOfItsRecordsWhileItGrowsAndShrinks) {
     const auto before = OpenDescriptors();
-    ModemSimulator simulator({"--modem", "generic,id=1,fault=error=AT+CFUN?",
-                              "--modem", "generic,id=2,fault=error=AT+CFUN?,product=second"});
+    ModemSimulator simulator({"--modem", "generic,id=1,fault=error=AT+CFUN?", "--modem",
+                              "generic,id=2,fault=error=AT+CFUN?,product=second"});
     SleepCapture sleeps;
     {
         const auto closed = OpenDescriptors();

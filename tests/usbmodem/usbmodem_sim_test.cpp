@@ -17,12 +17,9 @@ TEST(SIMStatus, IsNamedByTheReplyOfTheModem) {
         const char* name;
         bool err;
     } kReplies[] = {
-        {"+CPIN: READY", 1, "ready", false},
-        {"+CPIN: SIM PIN", 0, "pin_protect", false},
-        {"+CPIN: SIM PUK", 0, "puk_protect", false},
-        {"+CME ERROR: SIM BUSY", 2, "no_sim", false},
-        {"ERROR: SIM failure", 2, "no_sim", false},
-        {"OK", -1, "no_sim", true},
+        {"+CPIN: READY", 1, "ready", false},         {"+CPIN: SIM PIN", 0, "pin_protect", false},
+        {"+CPIN: SIM PUK", 0, "puk_protect", false}, {"+CME ERROR: SIM BUSY", 2, "no_sim", false},
+        {"ERROR: SIM failure", 2, "no_sim", false},  {"OK", -1, "no_sim", true},
     };
     OpenedModem modem("generic");
     for (const auto& reply : kReplies) {
@@ -124,8 +121,8 @@ TEST(PINProtection, TellsWhyItWasNotSwitched) {
     OpenedModem modem("12d1,pin=1234,lock=off");
     ASSERT_EQ(modem.record.UpdateSIMStatus(), 1);
     EXPECT_EQ(modem.record.ChangePINEnable("9999", true), -2);
-    EXPECT_TRUE(modem.log.Has(
-        "error on enable PIN protection, ret: +CME ERROR: incorrect password"));
+    EXPECT_TRUE(
+        modem.log.Has("error on enable PIN protection, ret: +CME ERROR: incorrect password"));
     modem.Answer(kQueryLock, {"OK"});
     EXPECT_EQ(modem.record.ChangePINEnable("1234", true), -1);
     EXPECT_TRUE(modem.log.Has("error on getting current PIN enable setting"));
@@ -166,9 +163,8 @@ TEST(PINSet, SwitchesTheProtectionAndThenChangesThePIN) {
     EXPECT_TRUE(modem.record.IsNewPlugIn());
     EXPECT_EQ(modem.record.PINSet("1234", "4321", true), 0);
     EXPECT_FALSE(modem.record.IsNewPlugIn());
-    EXPECT_THAT(modem.Received(),
-                ElementsAre(kQuery, kQueryLock, "AT+CLCK=\"SC\",1,\"1234\"",
-                            "AT+CPWD=\"SC\",\"1234\",\"4321\"", kQuery));
+    EXPECT_THAT(modem.Received(), ElementsAre(kQuery, kQueryLock, "AT+CLCK=\"SC\",1,\"1234\"",
+                                              "AT+CPWD=\"SC\",\"1234\",\"4321\"", kQuery));
     EXPECT_EQ(modem.record.PINSet("4321", "", false), 0);
     EXPECT_THAT(modem.Received(), ElementsAre(kQueryLock, "AT+CLCK=\"SC\",0,\"4321\"", kQuery));
     EXPECT_EQ(modem.log.Text(), "");

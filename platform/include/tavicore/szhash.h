@@ -20,22 +20,22 @@ typedef struct VEXACSzHash VEXACSzHash;
  * VEXAC_ERR_OUT_OF_MEMORY (VEXAC_ERR_BAD_PARAMETER for a negative size). The caller frees it with
  * VEXACSzHashFree.
  */
-TAVI_SDK_API VEXACSzHash *VEXACSzHashAlloc(int size);
+TAVI_SDK_API VEXACSzHash* VEXACSzHashAlloc(int size);
 
 /*
  * Stores copies of key and value in *hash; the value of a key that is already there is replaced and
  * the key keeps its place. Returns 0, or -1 with the hash as it was.
  */
-TAVI_SDK_API int VEXACSzHashSetValue(VEXACSzHash **hash, const char *key, const char *value);
+TAVI_SDK_API int VEXACSzHashSetValue(VEXACSzHash** hash, const char* key, const char* value);
 
 /*
- * Returns the value of key, or null when the key is not there. It is borrowed until the hash changes
- * or is freed.
+ * Returns the value of key, or null when the key is not there. It is borrowed until the hash
+ * changes or is freed.
  */
-TAVI_SDK_API const char *VEXACSzHashGetValue(const VEXACSzHash *hash, const char *key);
+TAVI_SDK_API const char* VEXACSzHashGetValue(const VEXACSzHash* hash, const char* key);
 
 /* Frees the hash, its keys and values; null is accepted. */
-TAVI_SDK_API void VEXACSzHashFree(VEXACSzHash *hash);
+TAVI_SDK_API void VEXACSzHashFree(VEXACSzHash* hash);
 
 #ifdef __cplusplus
 }

@@ -22,22 +22,22 @@ typedef struct VEXACSzList {
  * VEXAC_ERR_OUT_OF_MEMORY (VEXAC_ERR_BAD_PARAMETER for a negative size). The caller frees it with
  * VEXACSzListFree.
  */
-TAVI_SDK_API VEXACSzList *VEXACSzListAlloc(int size);
+TAVI_SDK_API VEXACSzList* VEXACSzListAlloc(int size);
 
 /*
  * Appends a copy of text to *list. Returns the index of the new string (0 or more), or -1 with the
  * list as it was.
  */
-TAVI_SDK_API int VEXACSzListPush(VEXACSzList **list, const char *text);
+TAVI_SDK_API int VEXACSzListPush(VEXACSzList** list, const char* text);
 
 /*
  * Returns string number index (from 0), or null when there is none. It is borrowed until the list
  * changes or is freed.
  */
-TAVI_SDK_API const char *VEXACSzListGet(const VEXACSzList *list, int index);
+TAVI_SDK_API const char* VEXACSzListGet(const VEXACSzList* list, int index);
 
 /* Frees the list and its strings; null is accepted. */
-TAVI_SDK_API void VEXACSzListFree(VEXACSzList *list);
+TAVI_SDK_API void VEXACSzListFree(VEXACSzList* list);
 
 #ifdef __cplusplus
 }

@@ -26,8 +26,8 @@ void RequireAll(const Pointers*... pointers) {
     }
 }
 
-// Runs the body of an SDK function, whose callers are C: an exception becomes the error code and the
-// result `failed`.
+// Runs the body of an SDK function, whose callers are C: an exception becomes the error code and
+// the result `failed`.
 template <typename Result, typename Body>
 Result Guarded(Result failed, Body body) {
     try {
