@@ -38,7 +38,6 @@ void Port::Forget() {
 }
 
 Port::Outcome Port::Work(Clock::time_point now) {
-    const bool hadClient = line_->HasClient();
     const SerialLine::Input input = line_->Read();
     if (input.hasNewClient) {
         Forget();
@@ -51,7 +50,7 @@ Port::Outcome Port::Work(Clock::time_point now) {
     if (input.isReleased && !vanishAt_) {
         Forget();
     }
-    if (hadClient && input.isReleased) {
+    if (input.mayBeLate) {
         settledAt_ = now + kSettling;
     } else if (settledAt_ && now >= *settledAt_) {
         settledAt_.reset();

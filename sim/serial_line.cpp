@@ -68,6 +68,11 @@ bool OpenWatch::TakeReopened(int watch) {
     return reopened;
 }
 
+bool OpenWatch::HasNews(int watch) {
+    ReadEvents();
+    return files_.at(watch).news;
+}
+
 bool OpenWatch::HasNews() const {
     return std::any_of(files_.begin(), files_.end(),
                        [](const auto& file) { return file.second.news; });
@@ -170,9 +175,11 @@ SerialLine::Input SerialLine::Read() {
         return input;
     }
     // Looked at after reading: who sent something had opened the line before.
+    const bool hadNews = watch_.HasNews(watchId_);
     input.hasNewClient = watch_.TakeReopened(watchId_);
     const bool hadClient = std::exchange(hasClient_, IsOpened());
     input.isReleased = !hasClient_;
+    input.mayBeLate = input.isReleased && (hadClient || hadNews);
     if (input.hasNewClient || (hadClient && !hasClient_)) {
         Refresh();
         hasClient_ = IsOpened();  // perhaps by the next one already

@@ -21,6 +21,7 @@ class OpenWatch {
     // True while something happened to a file that nobody has asked about since; reading the events
     // of one file takes those of all, so the OpenWatch itself does not wake for them again.
     bool HasNews() const;
+    bool HasNews(int watch);
     // True, once, when the file was closed and then opened.
     bool TakeReopened(int watch);
     // Begins anew: what was done to the file up to now does not count.
@@ -57,7 +58,8 @@ class SerialLine {
         std::string bytes;
         bool isHungUp = false;      // a given tty is gone
         bool hasNewClient = false;  // the bytes may be of another client than those before
-        bool isReleased = false;    // the client of the bytes, if any, is gone
+        bool isReleased = false;    // the client of the bytes, if any, is gone ...
+        bool mayBeLate = false;     // ... and only just, so that more may arrive without notice
     };
     Input Read();
 

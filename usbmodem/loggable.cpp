@@ -4,6 +4,8 @@
 #include <iterator>
 #include <sstream>
 
+#include "usbmodem/text.h"
+
 namespace taviwireless::usbmodem_lib {
 
 namespace {
@@ -21,6 +23,11 @@ bool IsModemsOwn(const std::string& line) {
 }
 
 }  // namespace
+
+bool CarriesSecret(const std::string& line) {
+    return std::any_of(std::begin(kBeforeSecrets), std::end(kBeforeSecrets),
+                       [&line](const char* before) { return Contains(line, before); });
+}
 
 std::string LoggableCommand(const std::string& command) {
     for (const std::string prefix : kBeforeSecrets) {

@@ -6,6 +6,9 @@
 // PINs and PUKs never reach the log or a terminal.
 namespace taviwireless::usbmodem_lib {
 
+// Whether the line holds a command that carries a PIN or PUK.
+bool CarriesSecret(const std::string& line);
+
 // Returns an AT command with "***" in place of the PINs and PUKs in it.
 std::string LoggableCommand(const std::string& command);
 

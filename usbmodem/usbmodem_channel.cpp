@@ -56,8 +56,10 @@ std::string CleanReply(const std::string& data, const std::string& cmd) {
         }
         const bool isCut = end == std::string::npos && line.find('\r') == std::string::npos;
         begin = end == std::string::npos ? data.size() : end + 1;
-        // A cut line is dropped: half a number would pass for a whole one.
-        if (isCut || line.find(cmd) != std::string::npos || line[0] == '\r') {
+        // A cut line is dropped: half a number would pass for a whole one. So is the late echo of
+        // an earlier command with a PIN, which would reach the log with the reply.
+        if (isCut || line.find(cmd) != std::string::npos || line[0] == '\r' ||
+            CarriesSecret(line)) {
             continue;
         }
         const size_t carriageReturn = line.find('\r');
