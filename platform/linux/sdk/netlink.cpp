@@ -1,0 +1,48 @@
+#include "sdk/netlink.h"
+
+#include <arpa/inet.h>
+#include <netlink/route/addr.h>
+
+#include "core/failure.h"
+
+namespace tavisdk {
+
+void Require(int result) {
+    if (result < 0) {
+        throw tavicore::Failure{VEXAC_ERR_IO};
+    }
+}
+
+Socket OpenRouteSocket() {
+    Socket socket(nl_socket_alloc());
+    if (!socket) {
+        throw tavicore::Failure{VEXAC_ERR_OUT_OF_MEMORY};
+    }
+    Require(nl_connect(socket.get(), NETLINK_ROUTE));
+    return socket;
+}
+
+std::string ToText(nl_addr* address) {
+    char text[INET_ADDRSTRLEN] = {};
+    if (address != nullptr && nl_addr_get_family(address) == AF_INET) {
+        inet_ntop(AF_INET, nl_addr_get_binary_addr(address), text, sizeof text);
+    }
+    return text;
+}
+
+InterfaceAddress FindAddress(nl_sock* socket, unsigned int interfaceIndex) {
+    nl_cache* addresses = nullptr;
+    Require(rtnl_addr_alloc_cache(socket, &addresses));
+    const Cache cache(addresses);
+    for (nl_object* object = nl_cache_get_first(addresses); object != nullptr;
+         object = nl_cache_get_next(object)) {
+        auto* address = reinterpret_cast<rtnl_addr*>(object);
+        if (rtnl_addr_get_ifindex(address) == static_cast<int>(interfaceIndex) &&
+            rtnl_addr_get_family(address) == AF_INET) {
+            return {ToText(rtnl_addr_get_local(address)), ToText(rtnl_addr_get_peer(address))};
+        }
+    }
+    return {};
+}
+
+}  // namespace tavisdk

@@ -1,0 +1,45 @@
+#ifndef TAVISDK_NETLINK_H
+#define TAVISDK_NETLINK_H
+
+#include <netlink/cache.h>
+#include <netlink/netlink.h>
+#include <netlink/route/route.h>
+
+#include <functional>
+#include <memory>
+#include <string>
+
+// libnl's objects as owners, and the questions that the network calls share. Everything here throws
+// tavicore::Failure.
+namespace tavisdk {
+
+struct Release {
+    void operator()(nl_sock* socket) const { nl_socket_free(socket); }
+    void operator()(nl_cache* cache) const { nl_cache_free(cache); }
+    void operator()(nl_addr* address) const { nl_addr_put(address); }
+    void operator()(rtnl_route* route) const { rtnl_route_put(route); }
+};
+
+using Socket = std::unique_ptr<nl_sock, Release>;
+using Cache = std::unique_ptr<nl_cache, Release>;
+using Address = std::unique_ptr<nl_addr, Release>;
+using Route = std::unique_ptr<rtnl_route, Release>;
+
+// Throws when the result of a libnl call is a failure.
+void Require(int result);
+
+Socket OpenRouteSocket();
+
+// The IPv4 addresses of an interface, both ends of a point-to-point link; empty where there is
+// none.
+struct InterfaceAddress {
+    std::string local;
+    std::string peer;
+};
+InterfaceAddress FindAddress(nl_sock* socket, unsigned int interfaceIndex);
+
+std::string ToText(nl_addr* address);
+
+}  // namespace tavisdk
+
+#endif
