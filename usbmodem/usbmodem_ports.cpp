@@ -9,6 +9,7 @@
 
 #include "common/log.h"
 #include "usbmodem/info_file.h"
+#include "usbmodem/state_files.h"
 #include "usbmodem/text.h"
 
 namespace taviwireless::usbmodem_lib {
@@ -16,7 +17,6 @@ namespace taviwireless::usbmodem_lib {
 namespace {
 
 constexpr char kNodePrefix[] = "/dev/ttyUSB";
-constexpr char kDialLogPrefix[] = "/var/lib/usbmodem/wvdial.log.";
 
 // A modem that was just plugged in may need a few seconds until its ports answer.
 constexpr int kAttempts = 3;

@@ -14,6 +14,10 @@ namespace Json {
 class Value;
 }
 
+namespace taviwireless {
+class SzHash;
+}
+
 namespace taviwireless::usbmodem_lib {
 
 class USBModem_ATIF;
@@ -171,7 +175,91 @@ class TAVIWIRELESS_API USBModem {
     // the file cannot be read or is not JSON.
     bool ReadAPNData(Json::Value& out);
 
+    // Profile: what a connection of this SIM needs, kept in the section "USBModem Profile" of
+    // "/var/lib/usbmodem/usbmodem.profile." and the IMSI. The file has mode 0600, since it holds
+    // the password; a new SIM gets one with defaults at its first read or write.
+    //   number "*99#"   user, pass "Unknown"   IMSI   default_gw "false"
+    //   location, apn   of the modem           isp    operator, and " - " and the APN
+    // A value with a line break is refused; one of 1024 bytes or more cannot be read back.
+
+    // Finds the SIM's file and writes it anew with defaults.
+    int ResetProfile();
+    int SetProfileToDefault();
+    // Makes sure that there is a file with mode 0600. A file once found is kept although the SIM
+    // may have changed since; only ResetProfile looks again.
+    int InitProfile();
+    int SetProfileWithKey(const std::string& key, const std::string& value);
+    // Empty, without err, when the SIM is busy or missing.
+    std::string GetProfileWithKey(const std::string& key, bool& err);
+
+    int SetProfilePhone(const std::string& number);
+    std::string GetProfilePhone(bool& err);
+    int SetProfileUsername(const std::string& user);
+    std::string GetProfileUsername(bool& err);
+    int SetProfilePassword(const std::string& password);
+    std::string GetProfilePassword(bool& err);
+    int SetProfileAPN(const std::string& apn);
+    std::string GetProfileAPN(bool& err);
+    int SetProfileISP(const std::string& isp);
+    std::string GetProfileISP(bool& err);
+    int SetProfileLocation(const std::string& location);
+    std::string GetProfileLocation(bool& err);
+    // "true": the connection takes the default route; anything else: it does not.
+    int SetProfileDefaultGW(const std::string& flag);
+    std::string GetProfileDefaultGW(bool& err);
+    std::string GetProfileIMSI(bool& err);
+
+    // Connection: the dialler "/usr/tavi/bin/wvdial" runs as a process of its own, known by its pid
+    // file "/var/lib/usbmodem/usbmodem.pid." and the interface id, with its log in
+    // "/var/lib/usbmodem/wvdial.log." and the IMSI. So any process can ask about a connection, or
+    // end it. The state of the link is derived anew at every look: is the dialler alive, what does
+    // its log say, has the interface an address?
+
+    // Starts the dialler with the settings of the profile, and makes the modem busy until
+    // UpdateNetStatus sees the link settle. Loads the PPP modules, empties the dialler's log, and
+    // sees to the default route: with the profile's "default_gw" "true" the link may take it, and
+    // the gateway in force is saved. Returns 1 when the dialler was started; below 0 on failure,
+    // which counts as a failed attempt: the SIM is not ready, there is a connection already, the
+    // profile cannot be read, ...
+    int NetConnect();
+    // Ends the dialler (SIGTERM), and gives the default route back if the profile says that the
+    // link took it. Returns -1 when there is no dialler, or the route could not be given back.
+    int NetDisconnect();
+    // Looks at the link. Returns 1 when it is settled (up, down or lost: the modem is not busy any
+    // more), 2 while it comes up, -1 on error. A dialler that gives up while it connects is ended.
+    int UpdateNetStatus();
+    // "connected", "connecting" (also when the address was lost while the dialler runs),
+    // "disconnected", or "connection_lost" after failed attempts; empty with err set on failure.
+    std::string GetNetStatus(bool& err);
+    bool IsNetDisconnected(bool& err);
+    // Looks at the link; always 0.
+    int GetLinkStats();
+    // Reads the address of the connection's interface; 0 also when there is none.
+    int UpdateIP();
+
+    // Adds the line "nodefaultroute" to "/etc/ppp/peers/wvdial", or with flag "true" removes it.
+    int SetDefaultRoute(const std::string& flag);
+    // Saves the default gateway in force in "/etc/ppp/usbmodem_backup_gw"; -1 when there is none.
+    int BackupDefaultRoute();
+    // Sets the saved gateway again, that of "/tmp/pppoe_gw_backup" if there is one; if it cannot be
+    // set, the configured one.
+    int RestoreDefaultRoute();
+    // Loads the kernel's PPP modules from "/lib/modules". Returns the result of the last one.
+    int InsertPPPModules();
+    // Runs program detached, its standard error in logFile (created with mode 0600), its pid in
+    // pidFile, with these arguments and the dialler's fixed ones. Returns 1 when it was forked.
+    int BackgroundExec(const std::string& program, const std::string& init1,
+                       const std::string& init2, const std::string& baud, const std::string& modem,
+                       const std::string& phone, const std::string& username,
+                       const std::string& password, const std::string& pidFile,
+                       const std::string& logFile);
+    // Writes what is known of the modem into "/var/lib/usbmodem/usbmodem.conf." and the interface
+    // id.
+    int TestConfToFile();
+
   private:
+    struct DialSettings;
+
     enum InitState { kNotInited, kInited, kInitFailed };
     enum SIMStatus { kReady, kPINRequired, kPUKRequired, kSIMBusy, kSIMError, kSIMUnknown };
     enum NetStatus { kConnected, kConnecting, kReconnecting, kDisconnected, kConnectionLost };
@@ -187,6 +275,11 @@ class TAVIWIRELESS_API USBModem {
     int EnterPIN(const std::string& pin);
     int EnterPUK(const std::string& puk, const std::string& newPin);
     int AttemptRemain(Parser parser, int& cache);
+    bool ComputeProfilePath();
+    void FillDefaults(SzHash& profile);
+    std::string PidFilePath() const;
+    bool PrepareToDial(DialSettings& settings);
+    void ReadDialSettings(DialSettings& settings, bool& err);
     bool Refresh(Command command, Parser parser, std::string& cache,
                  void (*logParseFailure)(const char* reply));
 

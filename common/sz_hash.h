@@ -1,0 +1,30 @@
+#ifndef TAVIWIRELESS_COMMON_SZ_HASH_H
+#define TAVIWIRELESS_COMMON_SZ_HASH_H
+
+#include <tavicore/szhash.h>
+
+#include <string>
+
+namespace taviwireless {
+
+// An SDK string hash that frees itself.
+class SzHash {
+  public:
+    explicit SzHash(int size) : hash_(VEXACSzHashAlloc(size)) {}
+    ~SzHash() { VEXACSzHashFree(hash_); }
+    SzHash(const SzHash&) = delete;
+    SzHash& operator=(const SzHash&) = delete;
+
+    explicit operator bool() const { return hash_ != nullptr; }
+    const VEXACSzHash* Get() const { return hash_; }
+    void Set(const char* key, const std::string& value) {
+        VEXACSzHashSetValue(&hash_, key, value.c_str());
+    }
+
+  private:
+    VEXACSzHash* hash_;
+};
+
+}  // namespace taviwireless
+
+#endif

@@ -1,0 +1,328 @@
+// Dialling over a simulated modem: with the real dialler and a stand-in for pppd, and with a
+// dialler that does as it is told.
+#include <gmock/gmock.h>
+#include <signal.h>
+#include <sys/mount.h>
+#include <sys/stat.h>
+#include <tavicore/error.h>
+#include <tavicore/process.h>
+#include <taviwireless/usbmodem.h>
+#include <unistd.h>
+
+#include <chrono>
+#include <thread>
+
+#include "tests/support/descriptors.h"
+#include "tests/support/files.h"
+#include "tests/support/log_capture.h"
+#include "tests/support/modem_simulator.h"
+
+namespace taviwireless::test {
+namespace {
+
+using testing::HasSubstr;
+using usbmodem_lib::USBModem;
+
+constexpr char kLog[] = "/var/lib/usbmodem/wvdial.log.001010123456789";
+constexpr char kPidFile[] = "/var/lib/usbmodem/usbmodem.pid.0";
+constexpr char kPeer[] = "/etc/ppp/peers/wvdial";
+constexpr char kBackup[] = "/etc/ppp/usbmodem_backup_gw";
+constexpr char kDialler[] = "/usr/tavi/bin/wvdial";
+
+void Shell(const std::string& command) {
+    const RunResult result = RunProgram({"sh", "-c", command});
+    EXPECT_EQ(result.status, 0) << command << ": " << result.err;
+}
+
+// An initialised modem 0, whose dialler is a script: it records its arguments, then the body runs.
+struct DialledModem {
+    explicit DialledModem(const std::string& body = "exec sleep 1000")
+        : simulator({"--modem", "12d1"}), record(0, "/tmp/usbmodem.info0") {
+        WriteFile(kPeer, "noauth\n");
+        WriteFile(kDialler, "#!/bin/bash\nprintf '%s\\n' \"$@\" > /tmp/arguments\n" + body + "\n");
+        chmod(kDialler, 0755);
+        EXPECT_EQ(record.InitInfo(), 0);
+        log.Clear();
+    }
+    ~DialledModem() { record.NetDisconnect(); }
+
+    std::string Status() {
+        bool err = false;
+        const std::string status = record.GetNetStatus(err);
+        EXPECT_FALSE(err);
+        return status;
+    }
+    // Looks at the link until it has this state, for 15 s at most.
+    bool BecomesStatus(const std::string& status) {
+        for (int i = 0; i < 300; ++i) {
+            record.UpdateNetStatus();
+            if (Status() == status) {
+                record.UpdateNetStatus();  // the look that found it does not count as settled
+                return true;
+            }
+            std::this_thread::sleep_for(std::chrono::milliseconds(50));
+        }
+        return false;
+    }
+    std::string Interface() {
+        bool err = false;
+        return record.GetNetIFName(err);
+    }
+    std::string Address() {
+        bool err = false;
+        return record.GetNetLocalIP(err);
+    }
+
+    ModemSimulator simulator;
+    USBModem record;
+    LogCapture log;
+};
+
+void UseRealDialler() {
+    Shell("cp " TAVI_SOURCE_DIR "/platform/root/wvdial /usr/tavi/bin/wvdial");
+    Shell("cp " TAVI_SOURCE_DIR "/sim/pppd /usr/sbin/pppd");
+}
+
+TEST(Connection, LivesItsLifeWithTheRealDialler) {
+    DialledModem modem;
+    UseRealDialler();
+    EXPECT_EQ(modem.Status(), "disconnected");
+    EXPECT_EQ(modem.record.NetConnect(), 1);
+    EXPECT_TRUE(modem.record.IsUSBModemBusy());
+    EXPECT_FALSE(modem.record.IsNewPlugIn());
+    EXPECT_EQ(modem.Status(), "connecting");
+    modem.simulator.Received("0.2");
+    bool err = false;
+    EXPECT_EQ(modem.record.GetVendorName(err), "");  // never asked for before, and not now
+    EXPECT_EQ(modem.record.PINUnlock("1"), 2);       // busy
+    EXPECT_EQ(modem.simulator.Received("0.2").size(), 0u);
+
+    ASSERT_TRUE(modem.BecomesStatus("connected")) << ReadFile(kLog);
+    EXPECT_FALSE(modem.record.IsUSBModemBusy());
+    EXPECT_EQ(modem.Interface(), "ppp0");
+    EXPECT_EQ(modem.Address(), "10.64.64.64");
+    EXPECT_EQ(modem.record.GetRoaming(err), "false");
+
+    Shell("ip address flush dev ppp0");
+    EXPECT_EQ(modem.record.UpdateNetStatus(), 1);
+    EXPECT_EQ(modem.Status(), "connecting");
+    EXPECT_EQ(modem.Address(), "");
+    Shell("ip address add 10.64.64.70 peer 10.64.64.65 dev ppp0");
+    EXPECT_EQ(modem.Status(), "connected");
+    EXPECT_EQ(modem.Address(), "10.64.64.70");
+
+    kill(VEXACReadPidFile(kPidFile), SIGKILL);
+    Shell("pkill pppd; while ip link show ppp0 2> /dev/null; do sleep 0.1; done > /dev/null");
+    EXPECT_TRUE(modem.BecomesStatus("disconnected"));
+    unlink(kPeer);
+    EXPECT_EQ(modem.record.NetConnect(), -1);
+    EXPECT_EQ(modem.record.GetConnectFailedAttempt(), 1);
+    EXPECT_EQ(modem.Status(), "connection_lost");
+    WriteFile(kPeer, "noauth\n");
+    EXPECT_EQ(modem.record.NetConnect(), 1);
+    ASSERT_TRUE(modem.BecomesStatus("connected")) << ReadFile(kLog);
+    EXPECT_EQ(modem.record.GetConnectFailedAttempt(), 0);
+    EXPECT_EQ(modem.record.NetDisconnect(), 0);
+    EXPECT_TRUE(modem.BecomesStatus("disconnected"));
+    EXPECT_EQ(modem.Interface(), "");
+    EXPECT_FALSE(Exists(kPidFile));
+}
+
+TEST(Dialling, GivesTheDiallerItsSettingsInOrder) {
+    DialledModem modem;
+    ASSERT_EQ(modem.record.SetProfileUsername("$(touch /tmp/ran) a"), 0);
+    ASSERT_EQ(modem.record.SetProfileAPN(""), 0);
+    ASSERT_EQ(modem.record.SetProfilePhone(""), 0);
+    EXPECT_EQ(modem.record.NetConnect(), 1);
+    for (int i = 0; i < 100 && !Exists("/tmp/arguments"); ++i) {
+        std::this_thread::sleep_for(std::chrono::milliseconds(10));
+    }
+    std::this_thread::sleep_for(std::chrono::milliseconds(50));
+    EXPECT_EQ(ReadFile("/tmp/arguments"),
+              "Init1=ATZ\nInit2=AT+CGDCONT=1,\"ip\",\"internet\"\nBaud=460800\nPhone=*99#\n"
+              "Modem=/dev/ttyUSB0\nUsername=$(touch /tmp/ran) a\nPassword=Unknown\n"
+              "Dial Attempts=1\nAuto Reconnect=1\nStupid Mode=1\n");
+    EXPECT_FALSE(Exists("/tmp/ran"));
+    EXPECT_EQ(ReadFile(kPeer), "noauth\nnodefaultroute\n");
+}
+
+TEST(Dialling, TheDiallerHasNothingOfItsCallersAndLeavesNoZombie) {
+    DialledModem modem("ls -l /proc/self/fd > /tmp/fds; exec sleep 1000");
+    const auto before = OpenDescriptors();
+    EXPECT_EQ(modem.record.NetConnect(), 1);
+    EXPECT_EQ(OpenDescriptors(), before);
+    const pid_t dialler = VEXACReadPidFile(kPidFile);
+    EXPECT_NE(getsid(dialler), getsid(0));
+    for (int i = 0; i < 100 && (!Exists("/tmp/fds") || ReadFile("/tmp/fds").empty()); ++i) {
+        std::this_thread::sleep_for(std::chrono::milliseconds(10));
+    }
+    const std::string descriptors = ReadFile("/tmp/fds");
+    EXPECT_THAT(descriptors, HasSubstr("2 -> " + std::string(kLog)));
+    EXPECT_THAT(descriptors, testing::Not(HasSubstr("/dev/pts")));
+    EXPECT_THAT(descriptors, testing::Not(HasSubstr("pipe:")));
+    EXPECT_EQ(modem.record.NetDisconnect(), 0);
+    EXPECT_TRUE(modem.BecomesStatus("disconnected"));
+    EXPECT_EQ(waitpid(-1, nullptr, WNOHANG), 0);  // the simulator lives; nobody else is ours
+}
+
+TEST(Dialling, ADiallerThatCannotRunLeavesItsReasonInTheLog) {
+    DialledModem modem;
+    unlink(kDialler);
+    EXPECT_EQ(modem.record.NetConnect(), 1);
+    EXPECT_TRUE(modem.BecomesStatus("disconnected"));
+    EXPECT_FALSE(modem.record.IsUSBModemBusy());
+    EXPECT_EQ(ReadFile(kLog), "cannot run /usr/tavi/bin/wvdial: No such file or directory\n");
+}
+
+TEST(Dialling, FailsWithTheReasonAndCountsTheAttempt) {
+    DialledModem modem;
+    EXPECT_EQ(modem.record.NetConnect(), 1);
+    EXPECT_EQ(modem.record.NetConnect(), -1);
+    EXPECT_TRUE(modem.log.Has("usbmodem0 is not disconnected"));
+    EXPECT_EQ(modem.record.GetConnectFailedAttempt(), 1);
+    EXPECT_EQ(modem.record.NetDisconnect(), 0);
+    ASSERT_TRUE(modem.BecomesStatus("connection_lost"));
+
+    const struct {
+        const char* name;
+        std::string situation;
+        std::string message;
+    } kRows[] = {
+        {"no gateway to save", "", "Get default gateway failed"},
+        {"no peer file", std::string("rm ") + kPeer, "failed on set default route"},
+    };
+    ASSERT_EQ(modem.record.SetProfileDefaultGW("true"), 0);
+    int attempts = 1;
+    for (const auto& row : kRows) {
+        SCOPED_TRACE(row.name);
+        Shell(row.situation);
+        modem.log.Clear();
+        EXPECT_EQ(modem.record.NetConnect(), -1);
+        EXPECT_TRUE(modem.log.Has(row.message)) << modem.log.Text();
+        EXPECT_EQ(modem.record.GetConnectFailedAttempt(), ++attempts);
+        EXPECT_FALSE(modem.record.IsUSBModemBusy());
+    }
+    modem.simulator.Set("0", "sim", "absent");
+    EXPECT_EQ(modem.record.NetConnect(), -1);
+    EXPECT_TRUE(modem.log.Has("Net connect failed: PIN is not ready"));
+}
+
+TEST(Dialling, AFullDiskFailsAndALaterConnectWorks) {
+    DialledModem modem;
+    MakeDirectories("/var/lib/usbmodem");
+    ASSERT_EQ(mount("tiny", "/var/lib/usbmodem", "tmpfs", 0, "size=8k"), 0);
+    ASSERT_EQ(modem.record.InitProfile(), 0);
+    Shell("head -c 100000 /dev/zero > /var/lib/usbmodem/filler; true");
+    EXPECT_EQ(modem.record.NetConnect(), 1);  // the log is empty, the pid file cannot be written
+    EXPECT_EQ(modem.Status(), "disconnected");
+    modem.record.UpdateNetStatus();
+    Shell("pkill sleep; rm /var/lib/usbmodem/filler");
+    EXPECT_EQ(modem.record.NetConnect(), 1);
+    EXPECT_EQ(modem.Status(), "connecting");
+}
+
+TEST(Link, ADiallerThatGivesUpOrWritesAnUnreadableLogIsEnded) {
+    for (const std::string& body :
+         {std::string("echo '--> Disconnecting at noon' >&2; exec sleep 1000"),
+          "rm " + std::string(kLog) + "; mkdir " + kLog + "; exec sleep 1000"}) {
+        SCOPED_TRACE(body);
+        Shell("rm -rf " + std::string(kLog));
+        DialledModem modem(body);
+        EXPECT_EQ(modem.record.NetConnect(), 1);
+        EXPECT_TRUE(modem.BecomesStatus("disconnected"));
+        EXPECT_FALSE(modem.record.IsUSBModemBusy());
+        EXPECT_FALSE(Exists(kPidFile));
+    }
+}
+
+TEST(Link, ALogThatNeverCompletesStaysConnecting) {
+    DialledModem modem("echo '--> Using interface ppp0' >&2; exec sleep 1000");
+    EXPECT_EQ(modem.record.NetConnect(), 1);
+    for (int i = 0; i < 5; ++i) {
+        EXPECT_EQ(modem.record.UpdateNetStatus(), 2);
+    }
+    EXPECT_EQ(modem.Status(), "connecting");
+    EXPECT_TRUE(modem.record.IsUSBModemBusy());
+}
+
+TEST(Link, WithoutTheWordForTheInterfaceCharacterFourteenIsWhereItIsRead) {
+    DialledModem modem("echo '01234567890123wlan7 secondary DNS address' >&2; exec sleep 1000");
+    EXPECT_EQ(modem.record.NetConnect(), 1);
+    for (int i = 0; i < 100 && ReadFile(kLog).empty(); ++i) {
+        std::this_thread::sleep_for(std::chrono::milliseconds(10));
+    }
+    EXPECT_EQ(modem.record.UpdateNetStatus(), 2);
+    Shell("ip link add wlan7 type veth peer name far7; ip address add 10.7.7.7/24 dev wlan7");
+    EXPECT_EQ(modem.record.UpdateNetStatus(), 1);
+    EXPECT_EQ(modem.Interface(), "wlan7");
+    EXPECT_EQ(modem.Address(), "10.7.7.7");
+}
+
+TEST(HangingUp, DoesNotHarmWhoHasTheDiallersNumberNow) {
+    DialledModem modem;
+    EXPECT_EQ(modem.record.NetDisconnect(), -1);
+    EXPECT_TRUE(
+        modem.log.Has("failed on disconnect, cannot find pidfile " + std::string(kPidFile)));
+    Process innocent({"sleep", "1000"});
+    WriteFile(kPidFile, std::to_string(innocent.Pid()) + "\n1\n");
+    EXPECT_EQ(modem.record.NetDisconnect(), -1);
+    EXPECT_TRUE(modem.log.Has("failed on disconnect with sending signal 15 with pidfile "));
+    EXPECT_EQ(modem.Status(), "disconnected");
+    EXPECT_FALSE(innocent.Wait(std::chrono::milliseconds(100)).has_value());
+}
+
+struct RoutedModem : DialledModem {
+    RoutedModem() {
+        Shell(
+            "ip link add eth7 type veth peer name far7; ip address add 10.7.0.2/24 dev eth7;"
+            "ip link set eth7 up; ip link set far7 up; ip route add default via 10.7.0.1");
+    }
+    std::string Default() { return RunProgram({"ip", "route", "show", "default"}).out; }
+};
+
+TEST(DefaultRoute, IsSavedAndGivenBack) {
+    RoutedModem modem;
+    ASSERT_EQ(modem.record.SetProfileDefaultGW("true"), 0);
+    EXPECT_EQ(modem.record.NetConnect(), 1);
+    EXPECT_EQ(ReadFile(kBackup), "10.7.0.1\n");
+    EXPECT_EQ(ReadFile(kPeer), "noauth\n");
+    Shell("ip route delete default");
+    EXPECT_EQ(modem.record.NetDisconnect(), 0);
+    EXPECT_THAT(modem.Default(), HasSubstr("default via 10.7.0.1"));
+
+    WriteFile("/tmp/pppoe_gw_backup", "10.7.0.9\n");  // goes before our own
+    EXPECT_EQ(modem.record.RestoreDefaultRoute(), 0);
+    EXPECT_THAT(modem.Default(), HasSubstr("default via 10.7.0.9"));
+}
+
+TEST(DefaultRoute, ThatCannotBeGivenBackFallsBackToTheConfiguredOne) {
+    RoutedModem modem;
+    EXPECT_EQ(modem.record.RestoreDefaultRoute(), -1);
+    EXPECT_TRUE(modem.log.Has("Backup gateway is not existed (" + std::string(kBackup) + ")"));
+    WriteFile(kBackup, "no address\n");
+    EXPECT_EQ(modem.record.RestoreDefaultRoute(), -1);
+    EXPECT_TRUE(modem.log.Has("File format error (no address)"));
+    WriteFile(kBackup, "192.168.99.1\n");  // behind no link
+    EXPECT_NE(modem.record.RestoreDefaultRoute(), 0);
+    EXPECT_TRUE(modem.log.Has("Get default gateway failed"));
+    WriteFile("/etc/sysconfig/network", "GATEWAY=10.7.0.9\n");
+    EXPECT_EQ(modem.record.RestoreDefaultRoute(), 0);
+    EXPECT_TRUE(modem.log.Has("Failed to set default gateway (192.168.99.1), try default gateway"));
+    EXPECT_THAT(modem.Default(), HasSubstr("default via 10.7.0.9"));
+    EXPECT_EQ(modem.record.SetDefaultRoute(""), -1);
+    EXPECT_EQ(modem.record.SetDefaultRoute("True"), 0);  // only "true" lets the link take the route
+    EXPECT_EQ(ReadFile(kPeer), "noauth\nnodefaultroute\n");
+}
+
+TEST(StateFile, HoldsWhatIsKnownOfTheModem) {
+    DialledModem modem;
+    EXPECT_EQ(modem.record.InitProfile(), 0);
+    EXPECT_EQ(modem.record.TestConfToFile(), 0);
+    EXPECT_EQ(ReadFile("/var/lib/usbmodem/usbmodem.conf.0"),
+              "InterfaceID=\"0\"\nConnectUSB=\"/dev/ttyUSB0\"\nQuaryUSB=\"/dev/ttyUSB2\"\n"
+              "PINVerified=\"0\"\nisConnected=\"disconnected\"\n"
+              "PidFile=\"/var/lib/usbmodem/usbmodem.pid.0\"\n");
+}
+
+}  // namespace
+}  // namespace taviwireless::test

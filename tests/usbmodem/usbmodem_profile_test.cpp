@@ -1,0 +1,116 @@
+// The connection profile of the SIM, over a simulated modem.
+#include <gmock/gmock.h>
+#include <sys/mount.h>
+#include <sys/stat.h>
+
+#include "tests/support/files.h"
+#include "tests/usbmodem/opened_modem.h"
+
+namespace taviwireless::test {
+namespace {
+
+constexpr char kDirectory[] = "/var/lib/usbmodem";
+constexpr char kProfile[] = "/var/lib/usbmodem/usbmodem.profile.262019876543210";
+
+struct ReadyModem : OpenedModem {
+    explicit ReadyModem(const std::string& settings = "")
+        : OpenedModem("generic,imsi=262019876543210,operator=Nordnetz" + settings) {
+        record.UpdateSIMStatus();
+        Received();
+        log.Clear();
+    }
+};
+
+TEST(Profile, OfANewSIMHoldsTheDefaultsOfTheModem) {
+    WriteFile("/usr/tavi/etc/usbmodem/wcdma_list.json",
+              R"([{"id": "Germany", "isp": [{"name": "Nordnetz"}]}])");
+    ReadyModem modem;
+    bool err = false;
+    EXPECT_EQ(modem.record.GetProfilePhone(err), "*99#");
+    EXPECT_FALSE(err);
+    EXPECT_EQ(ReadFile(kProfile),
+              "[USBModem Profile]\nnumber=*99#\nuser=Unknown\npass=Unknown\nIMSI=262019876543210\n"
+              "default_gw=false\nlocation=Germany\napn=internet\nisp=Nordnetz - internet\n");
+    EXPECT_EQ(FileMode(kProfile), 0600u);
+    EXPECT_EQ(FileMode(kDirectory), 0755u);  // 0775 less the umask
+}
+
+TEST(Profile, TheOperatorStandsAloneWithoutAnAPN) {
+    ReadyModem modem(",apn=");
+    bool err = false;
+    EXPECT_EQ(modem.record.GetProfileISP(err), "Nordnetz");
+    EXPECT_EQ(modem.record.GetProfileAPN(err), "");
+    EXPECT_FALSE(err);
+}
+
+TEST(Profile, ValuesComeBackAsTheyWentIn) {
+    ReadyModem modem;
+    bool err = false;
+    for (const std::string value : {" a b ", "\"quoted\"", "a=b=c", "[USBModem Profile]",
+                                    "# no comment", "\xc3\xbc\xff", "", "%s%n"}) {
+        EXPECT_EQ(modem.record.SetProfilePassword(value), 0);
+        EXPECT_EQ(modem.record.GetProfilePassword(err), value);
+    }
+    EXPECT_EQ(modem.record.SetProfileAPN("x\npass=forged"), -1);
+    EXPECT_TRUE(modem.log.Has("failed on get key value apn"));
+    EXPECT_EQ(modem.record.GetProfileAPN(err), "internet");
+    EXPECT_FALSE(err);
+    EXPECT_EQ(modem.record.SetProfileUsername(std::string(1024, 'u')), 0);
+    EXPECT_EQ(modem.record.GetProfileUsername(err), "");  // does not fit into what is read
+    EXPECT_TRUE(err);
+}
+
+TEST(Profile, ItsModeIsRestoredAndWritesKeepIt) {
+    ReadyModem modem;
+    ASSERT_EQ(modem.record.InitProfile(), 0);
+    ASSERT_EQ(chmod(kProfile, 0644), 0);
+    EXPECT_EQ(modem.record.SetProfileDefaultGW("true"), 0);
+    EXPECT_EQ(FileMode(kProfile), 0600u);
+}
+
+TEST(Profile, TwoSIMsNeverTouchEachOthersFile) {
+    ReadyModem modem;
+    ASSERT_EQ(modem.record.SetProfileUsername("first"), 0);
+    const std::string first = ReadFile(kProfile);
+    modem.simulator.Set("1", "imsi", "208011234567890");
+    EXPECT_EQ(modem.record.ResetProfile(), 0);
+    EXPECT_EQ(modem.record.SetProfileUsername("second"), 0);
+    EXPECT_EQ(ReadFile(kProfile), first);
+    bool err = false;
+    EXPECT_EQ(modem.record.GetProfileIMSI(err), "208011234567890");
+}
+
+TEST(Profile, WithoutAUsableSIMThereIsNone) {
+    for (const std::string sim : {"busy", "absent"}) {
+        ReadyModem modem(",sim=" + sim);
+        bool err = false;
+        EXPECT_EQ(modem.record.GetProfilePhone(err), "");
+        EXPECT_FALSE(err);
+        EXPECT_EQ(modem.log.Text(), "");
+        EXPECT_EQ(modem.record.SetProfilePhone("1"), -1);
+        EXPECT_TRUE(modem.log.Has("failed on init profile"));
+    }
+    OpenedModem unknown;  // its SIM status was never asked
+    bool err = false;
+    EXPECT_EQ(unknown.record.GetProfilePhone(err), "");
+    EXPECT_TRUE(err);
+    EXPECT_TRUE(unknown.log.Has("sim status is busy or error, cannot get key number"));
+}
+
+TEST(Profile, ADiskThatIsFullOrNoDiskFailsAndALaterResetWorks) {
+    ReadyModem modem;
+    WriteFile(kDirectory, "a file in the directory's place");
+    EXPECT_EQ(modem.record.SetProfileToDefault(), -1);
+    EXPECT_TRUE(modem.log.Has("Error on reset profile: makedir /var/lib/usbmodem failed"));
+    unlink(kDirectory);
+    MakeDirectories(kDirectory);
+    ASSERT_EQ(mount("tiny", kDirectory, "tmpfs", 0, "size=4k,nr_inodes=3"), 0);
+    WriteFile(std::string(kDirectory) + "/filler", std::string(4096, 'x'));
+    EXPECT_EQ(modem.record.ResetProfile(), -1);
+    EXPECT_TRUE(modem.log.Has("Error on reset profile: section USBModem Profile in profile "));
+    unlink((std::string(kDirectory) + "/filler").c_str());
+    EXPECT_EQ(modem.record.ResetProfile(), 0);
+}
+
+}  // namespace
+}  // namespace taviwireless::test

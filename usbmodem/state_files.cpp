@@ -1,0 +1,14 @@
+#include "usbmodem/state_files.h"
+
+#include <tavicore/file.h>
+
+namespace taviwireless::usbmodem_lib {
+
+bool MakeEmptyFile(const std::string& path) {
+    if (VEXACFileExist(path.c_str()) == 1) {
+        VEXACSysUnlink(path.c_str());
+    }
+    return VEXACFileTouch(path.c_str()) == 0;
+}
+
+}  // namespace taviwireless::usbmodem_lib

@@ -1,0 +1,111 @@
+// The state of the link, derived from the dialler's process, its log and the interface's address.
+#include <tavicore/file.h>
+#include <tavicore/process.h>
+#include <tavisdk/network.h>
+#include <taviwireless/usbmodem.h>
+
+#include "common/log.h"
+
+namespace taviwireless::usbmodem_lib {
+
+int USBModem::GetLinkStats() {
+    const std::string pidFile = PidFilePath();
+    const bool alive =
+        VEXACFileExist(pidFile.c_str()) == 1 && VEXACProcAliveByPidFile(pidFile.c_str()) == 1;
+    if (!alive) {
+        netStatus_ = connectFailedAttempts_ < 1 ? kDisconnected : kConnectionLost;
+        return 0;
+    }
+    if (UpdateIP() != 0) {
+        TAVI_LOG_ERROR("failed to update ip");
+        return 0;
+    }
+    if (!netIFName_.empty() && !netLocalIP_.empty()) {
+        netStatus_ = kConnected;
+    } else if (netStatus_ == kConnected || netStatus_ == kReconnecting) {
+        netStatus_ = kReconnecting;
+    } else {
+        netStatus_ = kConnecting;
+    }
+    return 0;
+}
+
+int USBModem::UpdateIP() {
+    if (netIFName_.empty()) {
+        return 0;
+    }
+    netLocalIP_.clear();
+    TAVINetIFInfo info;
+    switch (TAVINetIFGetInfo(netIFName_.c_str(), &info)) {
+        case 0:
+            return 0;
+        case 1:
+            netLocalIP_ = info.address;
+            return 0;
+        default:
+            TAVI_LOG_ERROR("error on updating ip for if %s", netIFName_.c_str());
+            return -1;
+    }
+}
+
+int USBModem::UpdateNetStatus() {
+    if (GetLinkStats() != 0) {
+        TAVI_LOG_ERROR("failed on getting link stats");
+        return -1;
+    }
+    switch (netStatus_) {
+        case kConnecting:
+            if (AssignConnectInfo() == -1) {
+                NetDisconnect();
+            }
+            return 2;
+        case kConnected:
+            connectFailedAttempts_ = 0;
+            busy_ = false;
+            return 1;
+        case kReconnecting:
+        case kDisconnected:
+        case kConnectionLost:
+            busy_ = false;
+            return 1;
+        default:
+            TAVI_LOG_ERROR("unexpected result of net stats");
+            return -1;
+    }
+}
+
+std::string USBModem::GetNetStatus(bool& err) {
+    if (GetLinkStats() != 0) {
+        TAVI_LOG_ERROR("failed on getting link stats");
+        err = true;
+        return "";
+    }
+    switch (netStatus_) {
+        case kConnected:
+            return "connected";
+        case kConnecting:
+        case kReconnecting:
+            return "connecting";
+        case kDisconnected:
+            return "disconnected";
+        case kConnectionLost:
+            return "connection_lost";
+        default:
+            err = true;
+            return "";
+    }
+}
+
+bool USBModem::IsNetDisconnected(bool& err) {
+    if (GetLinkStats() != 0) {
+        TAVI_LOG_ERROR("failed on getting link stats");
+        err = true;
+        return false;
+    }
+    if (netStatus_ < kConnected || netStatus_ > kConnectionLost) {
+        err = true;
+    }
+    return netStatus_ == kDisconnected || netStatus_ == kConnectionLost;
+}
+
+}  // namespace taviwireless::usbmodem_lib

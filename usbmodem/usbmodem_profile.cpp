@@ -1,0 +1,184 @@
+// The connection profile of the SIM: one section file per IMSI.
+#include <sys/stat.h>
+#include <tavicore/file.h>
+#include <tavicore/section.h>
+#include <taviwireless/usbmodem.h>
+
+#include "common/log.h"
+#include "common/sz_hash.h"
+#include "usbmodem/state_files.h"
+
+namespace taviwireless::usbmodem_lib {
+
+namespace {
+
+constexpr char kSection[] = "USBModem Profile";
+constexpr char kLineFormat[] = "%s=%s\n";
+constexpr mode_t kDirectoryMode = 0775;
+constexpr mode_t kProfileMode = 0600;  // it holds the password
+
+constexpr char kDefaultNumber[] = "*99#";
+constexpr char kDefaultUser[] = "Unknown";
+
+}  // namespace
+
+bool USBModem::ComputeProfilePath() {
+    bool failed = false;
+    profilePath_ = kProfilePrefix + GetIMSI(failed);
+    if (failed) {
+        profilePath_.clear();
+    }
+    return !failed;
+}
+
+int USBModem::ResetProfile() {
+    if (!ComputeProfilePath()) {
+        return -1;
+    }
+    if (VEXACFileCheckDir(kStateDirectory) != 1 && mkdir(kStateDirectory, kDirectoryMode) != 0) {
+        TAVI_LOG_ERROR("Error on reset profile: makedir %s failed", kStateDirectory);
+        return -1;
+    }
+    const char* path = profilePath_.c_str();
+    // Closed to others before the first byte is in it; every later write keeps the mode.
+    if (!MakeEmptyFile(profilePath_) || chmod(path, kProfileMode) != 0) {
+        TAVI_LOG_ERROR("Error on reset profile: touch profile %s", path);
+    }
+    SzHash profile(1024);
+    if (!profile) {
+        TAVI_LOG_ERROR("Error on reset profile: hash alloc");
+        return -1;
+    }
+    FillDefaults(profile);
+    if (VEXACFileAddSection(path, kSection, profile.Get(), kLineFormat) != 1) {
+        TAVI_LOG_ERROR("Error on reset profile: section %s in profile %s", kSection, path);
+        return -1;
+    }
+    return 0;
+}
+
+// Query errors are ignored: an empty value is written as it is.
+void USBModem::FillDefaults(SzHash& profile) {
+    bool ignored = false;
+    profile.Set("number", kDefaultNumber);
+    profile.Set("user", kDefaultUser);
+    profile.Set("pass", kDefaultUser);
+    profile.Set("IMSI", GetIMSI(ignored));
+    profile.Set("default_gw", "false");
+    profile.Set("location", GetDefaultLocation(ignored));
+    const std::string isp = GetDefaultISP(ignored);
+    const std::string apn = GetDefaultAPN(ignored);
+    profile.Set("apn", apn);
+    profile.Set("isp", isp.empty() || apn.empty() ? isp : isp + " - " + apn);
+}
+
+int USBModem::SetProfileToDefault() {
+    return ResetProfile();
+}
+
+int USBModem::InitProfile() {
+    if (profilePath_.empty() && !ComputeProfilePath()) {
+        return -1;
+    }
+    if (VEXACFileExist(profilePath_.c_str()) != 1 && ResetProfile() < 0) {
+        TAVI_LOG_ERROR("Error on init profile: reset %s", profilePath_.c_str());
+        return -1;
+    }
+    if (chmod(profilePath_.c_str(), kProfileMode) != 0) {
+        TAVI_LOG_ERROR("Failed to chmod for file [%s]", profilePath_.c_str());
+        return -1;
+    }
+    return 0;
+}
+
+int USBModem::SetProfileWithKey(const std::string& key, const std::string& value) {
+    if (InitProfile() < 0) {
+        TAVI_LOG_ERROR("failed on init profile");
+        return -1;
+    }
+    if (VEXACFileSetSectionValue(profilePath_.c_str(), kSection, key.c_str(), value.c_str(),
+                                 kLineFormat) != 0) {
+        TAVI_LOG_ERROR("failed on get key value %s", key.c_str());  // the getter's message. Kept.
+        return -1;
+    }
+    return 0;
+}
+
+std::string USBModem::GetProfileWithKey(const std::string& key, bool& err) {
+    if (simStatus_ == kSIMBusy || simStatus_ == kSIMError) {
+        return "";
+    }
+    if (simStatus_ < kReady || simStatus_ > kSIMError) {
+        TAVI_LOG_ERROR("sim status is busy or error, cannot get key %s", key.c_str());
+        err = true;
+    }
+    char value[1024] = {};
+    if (InitProfile() == 0 && VEXACFileGetSectionValue(profilePath_.c_str(), kSection, key.c_str(),
+                                                       value, sizeof value) != 0) {
+        TAVI_LOG_ERROR("failed on get key value %s", key.c_str());
+        err = true;
+    }
+    return value;
+}
+
+int USBModem::SetProfilePhone(const std::string& number) {
+    return SetProfileWithKey("number", number);
+}
+
+std::string USBModem::GetProfilePhone(bool& err) {
+    return GetProfileWithKey("number", err);
+}
+
+int USBModem::SetProfileUsername(const std::string& user) {
+    return SetProfileWithKey("user", user);
+}
+
+std::string USBModem::GetProfileUsername(bool& err) {
+    return GetProfileWithKey("user", err);
+}
+
+int USBModem::SetProfilePassword(const std::string& password) {
+    return SetProfileWithKey("pass", password);
+}
+
+std::string USBModem::GetProfilePassword(bool& err) {
+    return GetProfileWithKey("pass", err);
+}
+
+int USBModem::SetProfileAPN(const std::string& apn) {
+    return SetProfileWithKey("apn", apn);
+}
+
+std::string USBModem::GetProfileAPN(bool& err) {
+    return GetProfileWithKey("apn", err);
+}
+
+int USBModem::SetProfileISP(const std::string& isp) {
+    return SetProfileWithKey("isp", isp);
+}
+
+std::string USBModem::GetProfileISP(bool& err) {
+    return GetProfileWithKey("isp", err);
+}
+
+int USBModem::SetProfileLocation(const std::string& location) {
+    return SetProfileWithKey("location", location);
+}
+
+std::string USBModem::GetProfileLocation(bool& err) {
+    return GetProfileWithKey("location", err);
+}
+
+int USBModem::SetProfileDefaultGW(const std::string& flag) {
+    return SetProfileWithKey("default_gw", flag);
+}
+
+std::string USBModem::GetProfileDefaultGW(bool& err) {
+    return GetProfileWithKey("default_gw", err);
+}
+
+std::string USBModem::GetProfileIMSI(bool& err) {
+    return GetProfileWithKey("IMSI", err);
+}
+
+}  // namespace taviwireless::usbmodem_lib
