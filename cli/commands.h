@@ -11,7 +11,7 @@ class App;
 namespace taviwireless::cli {
 
 // What the program ends with.
-enum ExitStatus { kSuccess = 0, kFailure = 1, kUsage = 2, kNotFound = 3 };
+enum ExitStatus { kSuccess = 0, kFailure = 1, kUsage = 2, kNotFound = 3, kBusy = 4 };
 
 // A failure to report: one plain sentence, and what the program ends with.
 class CommandError : public std::runtime_error {
@@ -29,9 +29,11 @@ struct Options {
     bool json = false;
 };
 
-// Adds "modem" and its commands. A command runs while the arguments are parsed and throws
+// Each adds a group of commands. A command runs while the arguments are parsed and throws
 // CommandError when it fails.
 void AddModemCommands(CLI::App& app, const Options& options);
+void AddConnectionCommands(CLI::App& modem, const Options& options);
+void AddProfileCommands(CLI::App& modem, const Options& options);
 
 }  // namespace taviwireless::cli
 

@@ -13,7 +13,8 @@ using namespace taviwireless::cli;
 namespace {
 
 constexpr char kFooter[] =
-    "Exit status: 0 done, 1 failed, 2 wrong usage, 3 no such modem.\n"
+    "Exit status: 0 done, 1 failed, 2 wrong usage, 3 no such modem, 4 busy: it has a "
+    "connection already.\n"
     "With --json, a failure is {\"error\": SENTENCE} on standard output.\n"
     "Details of failures are in the system log; --verbose shows them here as well.";
 

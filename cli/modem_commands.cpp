@@ -10,6 +10,7 @@
 
 #include "cli/commands.h"
 #include "cli/output.h"
+#include "cli/plugged_modem.h"
 
 namespace taviwireless::cli {
 
@@ -139,9 +140,7 @@ std::string AttemptsText(const ModemState& state) {
 
 void List(const Options& options) {
     USBModemList list;
-    if (list.SearchInfoPath() != 0) {
-        throw CommandError(kFailure, "cannot look for modems in /tmp/");
-    }
+    FindModems(list);
     // Each modem is initialised on its own: one that is dead does not hide those behind it.
     Json::Value documents(Json::arrayValue);
     Table table{{"DEVICE", "VENDOR", "PRODUCT", "IMSI", "OPERATOR", "SIGNAL", "SIM", "PIN LOCK",
@@ -165,20 +164,8 @@ void List(const Options& options) {
 
 void Show(const Options& options, const std::string& id) {
     USBModemList list;
-    if (list.SearchInfoPath() != 0) {
-        throw CommandError(kFailure, "cannot look for modems in /tmp/");
-    }
-    USBModem& modem = list.FindUSBModem(id);
-    if (modem.IsNull()) {
-        throw CommandError(kNotFound,
-                           "there is no modem " + Printable(id) +
-                               "; taviwireless modem list shows those that are plugged in");
-    }
+    USBModem& modem = InitialisedModem(list, id);
     ModemState state = Read(modem);
-    if (state.sim == "no_answer") {
-        throw CommandError(kFailure, "modem " + id + " does not answer on any of its ports; " +
-                                         "unplug it and plug it in again");
-    }
     if (state.carrier) {
         state.location = Ask(modem, &USBModem::GetDefaultLocation);
     }
@@ -215,6 +202,9 @@ void AddModemCommands(CLI::App& app, const Options& options) {
     auto id = std::make_shared<std::string>();
     show->add_option("ID", *id, "Device id, such as usbmodem0")->required();
     show->callback([&options, id] { Show(options, *id); });
+
+    AddProfileCommands(*modem, options);
+    AddConnectionCommands(*modem, options);
 }
 
 }  // namespace taviwireless::cli
