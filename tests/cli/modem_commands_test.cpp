@@ -15,10 +15,11 @@ using testing::StartsWith;
 constexpr int kFailure = 1;
 constexpr int kUsage = 2;
 constexpr int kNotFound = 3;
+constexpr int kBusy = 4;
 
-RunResult Cli(std::vector<std::string> arguments) {
+RunResult Cli(std::vector<std::string> arguments, const std::string& input = "") {
     arguments.insert(arguments.begin(), BuiltProgram("taviwireless"));
-    return RunProgram(arguments);
+    return RunProgram(arguments, input);
 }
 
 Json::Value Parse(const std::string& text) {
@@ -101,6 +102,69 @@ TEST(ModemCommands, AModemThatDoesNotAnswerIsAFailureOfShow) {
     EXPECT_EQ(result.err,
               "taviwireless: modem usbmodem0 does not answer on any of its ports; unplug it and "
               "plug it in again\n");
+}
+
+TEST(ProfileCommands, SetShowAndResetAProfile) {
+    ModemSimulator simulator({"--modem", "generic"});
+    EXPECT_EQ(
+        Cli({"modem", "profile", "set", "usbmodem0", "user=a b", "pass"}, "s3cret  =\n").status, 0);
+    const RunResult hidden = Cli({"modem", "profile", "show", "usbmodem0"});
+    EXPECT_THAT(hidden.out, HasSubstr("User           a b\nPassword       ********\n"));
+    const Json::Value shown =
+        Parse(Cli({"--json", "modem", "profile", "show", "usbmodem0", "--show-secrets"}).out);
+    EXPECT_EQ(shown["pass"], "s3cret  =");
+    EXPECT_EQ(Cli({"modem", "profile", "reset", "usbmodem0"}).status, 0);
+    EXPECT_THAT(Cli({"modem", "profile", "show", "usbmodem0"}).out,
+                HasSubstr("User           Unknown\n"));
+}
+
+TEST(ProfileCommands, AMistakeChangesNothing) {
+    const struct {
+        std::string setting;
+        std::string sentence;
+    } kCases[] = {
+        {"apn=x\npass=y", "the value of apn holds a line break"},
+        {"IMSI=1", "a profile has no setting IMSI; there are number, user, pass, apn"},
+        {"default_gw=yes", "default_gw is true or false"},
+        {"user=" + std::string(1024, 'u'), "the value of user is longer than 1023 bytes"}};
+    for (const auto& wrong : kCases) {
+        const RunResult result =
+            Cli({"modem", "profile", "set", "usbmodem0", "number=1", wrong.setting});
+        EXPECT_EQ(result.status, kUsage);
+        EXPECT_THAT(result.err, HasSubstr(wrong.sentence));
+    }
+}
+
+// With a dialler that says at once what the real one says in the end.
+TEST(ConnectionCommands, ConnectShowTheStateAndHangUp) {
+    WriteFile("/etc/ppp/peers/wvdial", "noauth\n");
+    WriteFile(
+        "/usr/tavi/bin/wvdial",
+        "#!/bin/sh\necho '--> Using interface lo secondary DNS address' >&2\nexec sleep 1000\n");
+    RunProgram({"chmod", "755", "/usr/tavi/bin/wvdial"});
+    ModemSimulator simulator({"--modem", "generic"});
+    const Json::Value connected = Parse(Cli({"--json", "modem", "connect", "usbmodem0"}).out);
+    EXPECT_EQ(connected["net_status"], "connected");
+    EXPECT_EQ(connected["ip"], "127.0.0.1");
+    EXPECT_EQ(Cli({"modem", "connect", "usbmodem0"}).status, kBusy);
+    EXPECT_EQ(Cli({"modem", "status", "usbmodem0"}).out, "usbmodem0: connected, 127.0.0.1 on lo\n");
+    EXPECT_EQ(Cli({"modem", "disconnect", "usbmodem0"}).status, 0);
+    EXPECT_EQ(Cli({"modem", "status", "usbmodem0"}).out, "usbmodem0: disconnected\n");
+    EXPECT_EQ(Cli({"modem", "disconnect", "usbmodem0"}).status, kFailure);
+}
+
+TEST(ConnectionCommands, ADiallerThatGivesUpOrTakesTooLongIsAFailure) {
+    WriteFile("/etc/ppp/peers/wvdial", "noauth\n");
+    ModemSimulator simulator({"--modem", "generic"});
+    const RunResult gaveUp = Cli({"modem", "connect", "usbmodem0"});
+    EXPECT_EQ(gaveUp.status, kFailure);
+    EXPECT_THAT(gaveUp.err, HasSubstr("the dialler of usbmodem0 gave up; its log is in"));
+    WriteFile("/usr/tavi/bin/wvdial", "#!/bin/sh\nexec sleep 1000\n");
+    RunProgram({"chmod", "755", "/usr/tavi/bin/wvdial"});
+    const RunResult late = Cli({"modem", "connect", "usbmodem0", "--timeout", "1"});
+    EXPECT_EQ(late.status, kFailure);
+    EXPECT_THAT(late.err, HasSubstr("usbmodem0 is not connected after 1 s; it goes on trying"));
+    EXPECT_EQ(Cli({"modem", "connect", "usbmodem0", "--no-wait"}).status, kBusy);
 }
 
 TEST(ModemCommands, NoModemIsNoFailure) {
