@@ -1,13 +1,10 @@
-#include <fcntl.h>
 #include <gmock/gmock.h>
-#include <sys/file.h>
 #include <sys/stat.h>
 #include <tavicore/error.h>
 #include <tavicore/file.h>
 #include <tavicore/keyvalue.h>
 #include <tavicore/process.h>
 #include <tavicore/section.h>
-#include <unistd.h>
 
 #include <functional>
 
@@ -15,21 +12,6 @@
 
 namespace taviwireless::test {
 namespace {
-
-TEST(File, ExistsAndDirectoriesAreTold) {
-    MakeDirectories("/tmp/d");
-    EXPECT_EQ(VEXACFileTouch("/tmp/f"), 0);
-    EXPECT_EQ(FileMode("/tmp/f"), 0644u);
-    EXPECT_EQ(VEXACFileExist("/tmp/f") + VEXACFileExist("/tmp/d"), 2);
-    EXPECT_EQ(VEXACFileCheckDir("/tmp/d"), 1);
-    EXPECT_EQ(VEXACFileCheckDir("/tmp/f") + VEXACFileExist("/tmp/none") + VEXACFileExist(nullptr),
-              0);
-    EXPECT_EQ(VEXACSysRename("/tmp/f", "/tmp/g"), 0);
-    EXPECT_EQ(VEXACSysUnlink("/tmp/g"), 0);
-    EXPECT_EQ(VEXACSysUnlink("/tmp/g"), -1);
-    EXPECT_EQ(VEXACErrGet(), VEXAC_ERR_NOT_FOUND);
-    EXPECT_EQ(VEXACFileTouch("/tmp/none/f"), -1);
-}
 
 TEST(File, ListsFilesByTheBeginningOfTheirNames) {
     for (const char* name : {"x10", "x2", "x", "ax", "y"}) {
@@ -53,18 +35,6 @@ TEST(File, LinesAreRemovedAndAdded) {
     EXPECT_EQ(ReadFile("/tmp/lines"), "b\na \nc\n");
     EXPECT_EQ(VEXACFileAddLine("/tmp/lines", nullptr, "c\nd", 1), -1);
     EXPECT_EQ(VEXACFileRemoveLine("/tmp/none", "a"), -1);
-}
-
-TEST(File, ALockIsGivenBackAndTheDescriptorStaysOpen) {
-    const int file = open("/tmp/lock", O_RDWR | O_CREAT, 0600);
-    ASSERT_EQ(flock(file, LOCK_EX), 0);
-    EXPECT_EQ(VEXACFileCloseLock(file), 0);
-    const int other = open("/tmp/lock", O_RDWR);
-    EXPECT_EQ(flock(other, LOCK_EX | LOCK_NB), 0);
-    EXPECT_EQ(write(file, "x", 1), 1);
-    close(file);
-    close(other);
-    EXPECT_EQ(VEXACFileCloseLock(-1), -1);
 }
 
 // Whatever stands where a file should be: no call hangs, crashes or succeeds.

@@ -74,13 +74,6 @@ TEST(Section, ReadsSectionsAmongMalformedLines) {
     EXPECT_EQ(VEXACErrGet(), VEXAC_ERR_NOT_FOUND);
 }
 
-TEST(Section, AnExactNameGoesBeforeOneOfAnotherCase) {
-    WriteFile(kFile, "[a]\nK=lower\n[A]\nK=upper\n");
-    Hash hash;
-    EXPECT_EQ(VEXACFileGetSection(kFile, "A", hash.Address()), 1);
-    EXPECT_STREQ(hash["K"], "upper");
-}
-
 TEST(Section, WritesLeaveEverythingElseAsItStands) {
     const std::string one = "; top\n[one]\n#c\n\ta=1\n\tb=2\n\n# two\n";
     const std::string two = "[two]\nx=\xff\n";
