@@ -6,6 +6,10 @@
 // text is only ever an argument.
 #define TAVI_LOG_ERROR(...) ::taviwireless::WriteLog(LOG_ERR, __FILE_NAME__, __LINE__, __VA_ARGS__)
 
+// The same at debug priority.
+#define TAVI_LOG_DEBUG(...) \
+    ::taviwireless::WriteLog(LOG_DEBUG, __FILE_NAME__, __LINE__, __VA_ARGS__)
+
 #include <syslog.h>
 
 namespace taviwireless {

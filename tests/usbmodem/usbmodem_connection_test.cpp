@@ -7,6 +7,7 @@
 #include <tavicore/error.h>
 #include <tavicore/process.h>
 #include <taviwireless/usbmodem.h>
+#include <taviwireless/usbmodem_enum_if.h>
 #include <unistd.h>
 
 #include <chrono>
@@ -304,6 +305,20 @@ TEST(DefaultRoute, ThatCannotBeGivenBackFallsBackToTheConfiguredOne) {
     EXPECT_EQ(modem.record.SetDefaultRoute(""), -1);
     EXPECT_EQ(modem.record.SetDefaultRoute("True"), 0);  // only "true" lets the link take the route
     EXPECT_EQ(ReadFile(kPeer), "noauth\nnodefaultroute\n");
+}
+
+TEST(Interfaces, OfModemsAreThoseFromUnitOneHundredOn) {
+    VEXACSzList* list = VEXACSzListAlloc(64);
+    EXPECT_EQ(TAVIUSBModemEnumIf(&list), 0);
+    Shell(
+        "for name in ppp0 ppp99 ppp100 ppp101 ppp-x pppoe1; do"
+        " ip link add $name type veth peer name far-$name; done");
+    EXPECT_EQ(TAVIUSBModemEnumIf(&list), 2);
+    EXPECT_STREQ(VEXACSzListGet(list, 0), "ppp100");
+    EXPECT_STREQ(VEXACSzListGet(list, 1), "ppp101");
+    VEXACSzListFree(list);
+    EXPECT_EQ(TAVIUSBModemEnumIf(nullptr), -1);
+    EXPECT_EQ(VEXACErrGet(), 0x0D00);
 }
 
 TEST(StateFile, HoldsWhatIsKnownOfTheModem) {

@@ -18,10 +18,11 @@ constexpr char kNetworkFile[] = "/etc/sysconfig/network";
 constexpr char kInterfaceFiles[] = "/etc/sysconfig/network-scripts";
 constexpr char kGatewayKey[] = "GATEWAY";
 
+// A route with a type of service carries the packets marked so, and is the default of no others.
 bool IsDefault(rtnl_route* route) {
     nl_addr* destination = rtnl_route_get_dst(route);
     return rtnl_route_get_table(route) == RT_TABLE_MAIN &&
-           rtnl_route_get_type(route) == RTN_UNICAST &&
+           rtnl_route_get_type(route) == RTN_UNICAST && rtnl_route_get_tos(route) == 0 &&
            (destination == nullptr || nl_addr_get_prefixlen(destination) == 0);
 }
 
@@ -83,18 +84,20 @@ bool ReadGateway(const std::string& file, char* gateway, size_t size) {
 }
 
 bool ReadGatewayOfInterfaces(char* gateway, size_t size) {
-    VEXACSzList* names = VEXACSzListAlloc(1024);
-    bool isFound = false;
-    if (names != nullptr &&
-        VEXACFileEnumDir(kInterfaceFiles, "ifcfg-", &names, VEXAC_ENUM_FILES) > 0) {
-        for (int i = 0; i < names->count && !isFound; ++i) {
-            const std::string file = std::string(kInterfaceFiles) + '/' + VEXACSzListGet(names, i);
-            isFound = VEXACFileCheckKeyValue(file.c_str(), "ONBOOT", "no", 0) == 0 &&
-                      ReadGateway(file, gateway, size);
+    VEXACSzList* list = VEXACSzListAlloc(1024);
+    if (list == nullptr) {
+        throw Failure{VEXAC_ERR_OUT_OF_MEMORY};
+    }
+    VEXACFileEnumDir(kInterfaceFiles, "ifcfg-", &list, VEXAC_ENUM_FILES);  // no folder, no names
+    const std::unique_ptr<VEXACSzList, decltype(&VEXACSzListFree)> names(list, VEXACSzListFree);
+    for (int i = 0; i < names->count; ++i) {
+        const std::string file = std::string(kInterfaceFiles) + '/' + VEXACSzListGet(list, i);
+        if (VEXACFileCheckKeyValue(file.c_str(), "ONBOOT", "no", 0) == 0 &&
+            ReadGateway(file, gateway, size)) {
+            return true;
         }
     }
-    VEXACSzListFree(names);
-    return isFound;
+    return false;
 }
 
 }  // namespace
@@ -121,16 +124,16 @@ int TAVINetDefaultGatewaySet(const char* gateway) {
         const Socket socket = OpenRouteSocket();
         const Route old = FindDefaultRoute(socket.get());
         const Route route(rtnl_route_alloc());
-        rtnl_nexthop* hop = rtnl_route_nh_alloc();
-        if (!route || hop == nullptr) {
+        NextHop hop(rtnl_route_nh_alloc());
+        if (!route || !hop) {
             throw Failure{VEXAC_ERR_OUT_OF_MEMORY};
         }
         rtnl_route_set_family(route.get(), AF_INET);
         Require(rtnl_route_set_dst(route.get(), everywhere.get()));
         // The same metric, so that it takes the old route's place instead of standing beside it.
         rtnl_route_set_priority(route.get(), old ? rtnl_route_get_priority(old.get()) : 0);
-        rtnl_route_nh_set_gateway(hop, address.get());
-        rtnl_route_add_nexthop(route.get(), hop);  // owns hop now
+        rtnl_route_nh_set_gateway(hop.get(), address.get());
+        rtnl_route_add_nexthop(route.get(), hop.release());  // it owns the hop now
         Require(rtnl_route_add(socket.get(), route.get(), NLM_F_CREATE | NLM_F_REPLACE));
         return 0;
     });

@@ -18,12 +18,14 @@ struct Release {
     void operator()(nl_cache* cache) const { nl_cache_free(cache); }
     void operator()(nl_addr* address) const { nl_addr_put(address); }
     void operator()(rtnl_route* route) const { rtnl_route_put(route); }
+    void operator()(rtnl_nexthop* hop) const { rtnl_route_nh_free(hop); }
 };
 
 using Socket = std::unique_ptr<nl_sock, Release>;
 using Cache = std::unique_ptr<nl_cache, Release>;
 using Address = std::unique_ptr<nl_addr, Release>;
 using Route = std::unique_ptr<rtnl_route, Release>;
+using NextHop = std::unique_ptr<rtnl_nexthop, Release>;
 
 // Throws when the result of a libnl call is a failure.
 void Require(int result);

@@ -1,0 +1,24 @@
+#ifndef TAVIWIRELESS_USBMODEM_ENUM_IF_H
+#define TAVIWIRELESS_USBMODEM_ENUM_IF_H
+
+#include <tavicore/szlist.h>
+#include <taviwireless/export.h>
+
+#ifdef __cplusplus
+extern "C" {
+#endif
+
+/*
+ * Appends to *list the names of the PPP interfaces that belong to USB modems: by convention those
+ * with unit numbers from 100 on, such as "ppp100"; lower ones are other PPP links of the system.
+ * Reads
+ * "/sys/class/net". Returns the number of names appended (0 or more), or -1: for a null list with
+ * the SDK's error code 0x0D00, otherwise with a line in the log.
+ */
+TAVIWIRELESS_API int TAVIUSBModemEnumIf(VEXACSzList** list);
+
+#ifdef __cplusplus
+}
+#endif
+
+#endif
