@@ -2,8 +2,8 @@
 #define TAVIWIRELESS_COMMON_LOG_H
 
 // Writes one line at error priority to the system log: "FILE:LINE message". FILE is the source file
-// without its folder. The format is printf's, "%m" included; it is always a literal, and foreign
-// text is only ever an argument.
+// without its folder. The format is printf's; it is always a literal, and foreign text is only ever
+// an argument.
 #define TAVI_LOG_ERROR(...) ::taviwireless::WriteLog(LOG_ERR, __FILE_NAME__, __LINE__, __VA_ARGS__)
 
 // The same at debug priority.

@@ -55,48 +55,6 @@ TEST(Fault, ChangesTheReplyAndCanBeTakenAway) {
     EXPECT_EQ(client.ReadUntilQuiet(), "");
 }
 
-TEST(Fault, OfOnePortLeavesTheOthersAlone) {
-    ModemSimulator simulator({"--fault", "0.1:silent"});
-    Client mute(1);
-    mute.Write("AT\r");
-    EXPECT_EQ(Client(0).Ask("AT"), "AT\r\r\nOK\r\n");
-    EXPECT_EQ(mute.ReadUntilQuiet(), "");
-    EXPECT_THAT(simulator.Received("0.1"), testing::ElementsAre("AT"));
-}
-
-TEST(Fault, SlowWaitsBeforeTheReplyButNotTheEcho) {
-    ModemSimulator simulator({"--modem", "generic,fault=slow=300"});
-    Client client(1);
-    const auto begin = Clock::now();
-    client.Write("AT\r");
-    std::string echo;
-    client.ReadMore(Client::kPatience, &echo);
-    EXPECT_EQ(echo, "AT\r");
-    EXPECT_EQ(client.ReadReply(), "\r\nOK\r\n");
-    EXPECT_GE(Clock::now() - begin, milliseconds(300));
-}
-
-TEST(Fault, PiecesComeWithGapsBetweenThem) {
-    ModemSimulator simulator({"--fault", "0:pieces=8/150"});
-    Client client(1);
-    client.Ask("ATE0");
-    client.Write("AT+CSQ\r");
-    for (const std::string piece : {"\r\n+CSQ: ", "17,99\r\n\r", "\nOK\r\n"}) {
-        std::string part;
-        client.ReadMore(Client::kPatience, &part);
-        EXPECT_EQ(part, piece);
-    }
-}
-
-TEST(Fault, LongFillsTheReplyBeforeItsResult) {
-    ModemSimulator simulator({"--fault", "0:long=3000"});
-    const std::string reply = Client(1).Ask("AT+CSQ");
-    EXPECT_GE(reply.size(), 3000u);
-    EXPECT_LT(reply.size(), 3200u);
-    EXPECT_THAT(reply, StartsWith("AT+CSQ\r\r\n+CSQ: 17,99\r\n\r\n^FILL: "));
-    EXPECT_THAT(reply, EndsWith("\r\n\r\nOK\r\n"));
-}
-
 TEST(Fault, BabbleNeverPausesAndStillAnswers) {
     ModemSimulator simulator({"--fault", "0:babble"});
     Client client(1);
@@ -110,18 +68,6 @@ TEST(Fault, BabbleNeverPausesAndStillAnswers) {
     simulator.Fault("0", "off");
     client.ReadUntilQuiet();
     EXPECT_EQ(client.Ask("AT+CSQ"), kEchoed);
-}
-
-TEST(Fault, WhatAClientDoesNotReadIsLostAndHarmsNobody) {
-    ModemSimulator simulator({"--fault", "0:long=20000"});
-    Client deaf(1);
-    for (int i = 0; i < 20; ++i) {
-        deaf.Write("AT\r");
-    }
-    EXPECT_THAT(Client(0).Ask("AT+CSQ"), EndsWith("OK\r\n"));
-    simulator.Fault("0", "off");
-    deaf.ReadUntilQuiet(500);
-    EXPECT_EQ(deaf.Ask("AT+CSQ"), kEchoed);
 }
 
 TEST(Fault, VanishUnplugsTheModemWithinAReply) {
@@ -154,24 +100,6 @@ TEST(Reply, IsWhatWasGivenUntilItIsTakenBack) {
     EXPECT_EQ(client.Ask("AT+CSQ"), "AT+CSQ\r" + text);
     simulator.Command("reply 0 AT+CSQ off");
     EXPECT_EQ(client.Ask("AT+CSQ"), kEchoed);
-}
-
-TEST(Reply, OnceAnswersOnce) {
-    ModemSimulator simulator;
-    Client client(1);
-    simulator.ReplyOnce("0", "AT+CLCK=\"SC\",1*", "\r\nOK\r\n");
-    EXPECT_EQ(client.Ask("AT+CLCK=\"SC\",1,\"9999\""), "AT+CLCK=\"SC\",1,\"9999\"\r\r\nOK\r\n");
-    EXPECT_THAT(client.Ask("AT+CLCK=\"SC\",1,\"9999\""), HasSubstr("incorrect password"));
-}
-
-TEST(Reply, GoesOnlyToWhoeverHasThePortOpenWhenItIsSent) {
-    ModemSimulator simulator;
-    simulator.Send("0", "lost");
-    Client client(1);
-    simulator.Send("0.1", "\r\nRING\r\n");
-    std::string text;
-    client.ReadMore(Client::kPatience, &text);
-    EXPECT_EQ(text, "\r\nRING\r\n");
 }
 
 }  // namespace

@@ -58,37 +58,6 @@ TEST(Line, IsFramedAndEchoedLikeAModems) {
     EXPECT_EQ(client.ReadUntilQuiet(), "");
 }
 
-TEST(Line, ACommandMayArriveByteByByte) {
-    ModemSimulator simulator;
-    Client client(1);
-    for (const char c : std::string("AT")) {
-        client.Write(std::string(1, c));
-        std::string echo;
-        client.ReadMore(Client::kPatience, &echo);
-        EXPECT_EQ(echo, std::string(1, c));
-    }
-    EXPECT_EQ(client.Ask(""), "\r\r\nOK\r\n");
-}
-
-TEST(Line, AMutePortTakesCommandsAndSaysNothing) {
-    ModemSimulator simulator({"--modem", "12d1"});
-    Client client(1);
-    client.Write("AT\r");
-    EXPECT_EQ(client.ReadUntilQuiet(), "");
-    EXPECT_THAT(simulator.Received("0.1"), ElementsAre("AT"));
-}
-
-TEST(Line, ReceivedListsEachCommandOnce) {
-    ModemSimulator simulator;
-    Client client(1);
-    client.Write("\r\r");
-    client.Ask("AT+CPIN=\"1234\"");
-    client.Ask("AT");
-    EXPECT_THAT(simulator.Received("0.0"), ElementsAre());
-    EXPECT_THAT(simulator.Received("0"), ElementsAre("AT+CPIN=\"1234\"", "AT"));
-    EXPECT_THAT(simulator.Received("0"), ElementsAre());
-}
-
 TEST(Line, OutlivesItsClientsAndKeepsNothingForTheNext) {
     ModemSimulator simulator;
     for (int round = 0; round < 50; ++round) {
@@ -102,15 +71,6 @@ TEST(Line, OutlivesItsClientsAndKeepsNothingForTheNext) {
         ASSERT_EQ(client.Ask("AT+CSQ"), "AT+CSQ\r\r\n+CSQ: 17,99\r\n\r\nOK\r\n");
         simulator.Received("0");
     }
-}
-
-TEST(Line, TwoPortsTalkAtTheSameTime) {
-    ModemSimulator simulator;
-    Client dial(0);
-    Client query(1);
-    dial.Write("AT+CG");
-    EXPECT_EQ(query.Ask("AT"), "AT\r\r\nOK\r\n");
-    EXPECT_EQ(dial.Ask("MM"), "AT+CGMM\r\r\n3G Modem\r\n\r\nOK\r\n");
 }
 
 TEST(Line, DialledPortCarriesDataUntilItIsEscapedFromOrReopened) {
@@ -150,17 +110,6 @@ TEST(Line, CostsNothingWhileNobodyTalks) {
     const long before = TicksUsed(simulator.Pid());
     std::this_thread::sleep_for(std::chrono::milliseconds(500));
     EXPECT_LE(TicksUsed(simulator.Pid()) - before, 2);  // of 50
-}
-
-TEST(Line, LogShowsWhatWasSaidWithPort) {
-    ModemSimulator simulator({"--log", "/tmp/log"});
-    Client(1).Ask("AT+CSQ");
-    simulator.Received("0");  // by now it has written the log too
-    std::ostringstream log;
-    log << std::ifstream("/tmp/log").rdbuf();
-    EXPECT_THAT(log.str(),
-                testing::ContainsRegex("^[0-9:.]{12} 0\\.1 < AT\\+CSQ\\\\r\n"
-                                       "[0-9:.]{12} 0\\.1 > AT\\+CSQ\\\\r\\\\r\\\\n\\+CSQ: 17,99"));
 }
 
 }  // namespace

@@ -85,18 +85,6 @@ TEST_P(PersonalityTest, AnswersEveryQueryInTheShapeThatIsRead) {
               std::string(GetParam()) == "generic" ? "false" : "true");
 }
 
-TEST_P(PersonalityTest, CountsAttemptsWhereTheyAreRead) {
-    Personality modem(GetParam());
-    modem.Simulator().Set("0", "pin_attempts", "2");
-    modem.Simulator().Set("0", "puk_attempts", "7");
-    const std::string query = modem.Commands().GetATCommandPINPUKAttempt();
-    for (const std::string locked : {"off", "on"}) {
-        modem.Simulator().Set("0", "lock", locked);
-        EXPECT_EQ(std::stoi(modem.Parse(query, &USBModem_ATIF::ParseRetStringPINRemainAttempt)), 2);
-        EXPECT_EQ(std::stoi(modem.Parse(query, &USBModem_ATIF::ParseRetStringPUKRemainAttempt)), 7);
-    }
-}
-
 TEST_P(PersonalityTest, CarriesOutEverySetting) {
     Personality modem(GetParam());
     USBModem_ATIF& set = modem.Commands();
@@ -115,15 +103,6 @@ TEST_P(PersonalityTest, CarriesOutEverySetting) {
     EXPECT_EQ(set.ParseRetStringQuarySIMStatus(modem.Ask(set.GetATCommandQuarySIMStatus())), 2);
     EXPECT_EQ(set.ParseRetStringIsOK(modem.Ask(set.GetATCommandSetSIMPUK("12345678", "4321"))), 0);
     EXPECT_EQ(set.ParseRetStringQuarySIMStatus(modem.Ask(set.GetATCommandQuarySIMStatus())), 0);
-}
-
-TEST_P(PersonalityTest, OpensALockedCardWithItsPin) {
-    ModemSimulator simulator({"--modem", std::string(GetParam()) + ",pin=1234,ports=at"});
-    std::unique_ptr<USBModem_ATIF, DeleteCommandSet> set(USBModem_ATIF::CreateATIF(GetParam()));
-    Client client(0);
-    EXPECT_EQ(set->ParseRetStringQuarySIMStatus(client.Ask(set->GetATCommandQuarySIMStatus())), 1);
-    EXPECT_EQ(set->ParseRetStringIsOK(client.Ask(set->GetATCommandSetSIMPIN("1234"))), 0);
-    EXPECT_EQ(set->ParseRetStringQuarySIMStatus(client.Ask(set->GetATCommandQuarySIMStatus())), 0);
 }
 
 TEST_P(PersonalityTest, HasADialPortAndAnotherThatAnswers) {

@@ -38,17 +38,6 @@ TEST(Plug, WritesAnInfoFilePerModemAndCountsPortsOverAll) {
     EXPECT_THAT(Names("/tmp", "info"), UnorderedElementsAre("usbmodem.info0", "usbmodem.info7"));
 }
 
-TEST(Plug, TakesFreeNumbersAndReplacesLinksThatLeadNowhere) {
-    WriteFile("/dev/ttyUSB0", "");
-    fs::create_symlink("/dev/nowhere", "/dev/ttyUSB1");
-    {
-        ModemSimulator simulator;
-        EXPECT_EQ(ReadFile("/tmp/usbmodem.info0"),
-                  "USB_ID_VENDOR=ffff\nCONNECTNODE=1\nDEVICENODE=1,2\n");
-    }
-    EXPECT_THAT(Names("/dev", "ttyUSB"), UnorderedElementsAre("ttyUSB0"));
-}
-
 TEST(Plug, UnpluggingHangsClientsUpAndPluggingStartsAfresh) {
     ModemSimulator simulator({"--modem", "generic", "--modem", "generic"});
     Client client(1);
@@ -64,15 +53,6 @@ TEST(Plug, UnpluggingHangsClientsUpAndPluggingStartsAfresh) {
     simulator.Plug("0");
     EXPECT_EQ(Client(1).Ask("AT"), "AT\r\r\nOK\r\n");
     EXPECT_TRUE(Exists("/tmp/usbmodem.info0"));
-}
-
-TEST(Plug, OnePortCanGoAndComeAlone) {
-    ModemSimulator simulator;
-    simulator.Unplug("0.0");
-    EXPECT_THAT(Names("/dev", "ttyUSB"), UnorderedElementsAre("ttyUSB1"));
-    EXPECT_TRUE(Exists("/tmp/usbmodem.info0"));
-    simulator.Plug("0.0");
-    EXPECT_EQ(Client(0).Ask("AT"), "AT\r\r\nOK\r\n");
 }
 
 TEST(Plug, NothingStaysBehindAfterASignalOrTheEndOfItsInput) {

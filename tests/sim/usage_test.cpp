@@ -17,15 +17,6 @@ RunResult RunModemsim(std::vector<std::string> arguments, const std::string& inp
     return RunProgram(arguments, input);
 }
 
-TEST(Usage, HelpNamesPersonalitiesFaultsCommandsAndExamples) {
-    const RunResult result = RunModemsim({"--help"});
-    EXPECT_EQ(result.status, 0);
-    for (const char* part : {"--link-dir", "12d1 2001 generic", "pieces=BYTES[/MS]",
-                             "received ID[.PORT]", "modemsim --link-dir /dev"}) {
-        EXPECT_THAT(result.out, HasSubstr(part));
-    }
-}
-
 TEST(Usage, AWrongOptionEndsWithOneSentenceAndStatus2) {
     const struct {
         std::vector<std::string> arguments;
@@ -96,13 +87,6 @@ TEST(Usage, AMalformedPersonalityIsNamedWithThePlaceInIt) {
                                       HasSubstr(mistake.sentence), EndsWith(".\n")));
         EXPECT_EQ(result.err.find('\n'), result.err.size() - 1);
     }
-}
-
-TEST(Usage, AFailureOfTheMachineEndsWithStatus1) {
-    EXPECT_EQ(RunModemsim({"--tty", "/dev/nowhere"}).err,
-              "modemsim: Cannot open /dev/nowhere: No such file or directory.\n");
-    EXPECT_EQ(RunModemsim({"--tty", "/dev/null"}).status, 1);
-    EXPECT_EQ(RunModemsim({"--log", "/nowhere/log"}).status, 1);
 }
 
 TEST(Control, AnswersEachLineWithOkOrError) {

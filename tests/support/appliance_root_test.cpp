@@ -41,28 +41,7 @@ INSTANTIATE_TEST_SUITE_P(ApplianceRoot, PrivateFolder,
 
 class EmptyFolder : public testing::TestWithParam<const char*> {};
 
-TEST_P(EmptyFolder, HoldsNothingButTheWayToTheCheckout) {
-    const auto result = RunInside({"ls", "-A", GetParam()});
-    EXPECT_EQ(result.status, 0) << result.err;
-    const auto way = std::filesystem::path(BuiltProgram("")).lexically_relative(GetParam());
-    EXPECT_EQ(result.out, *way.begin() == ".." ? "" : way.begin()->string() + "\n");
-}
-
-INSTANTIATE_TEST_SUITE_P(ApplianceRoot, EmptyFolder,
-                         testing::Values("/tmp", "/var/tmp", "/run/lock", "/usr/tavi",
-                                         "/etc/hostapd", "/dev/shm"));
-
 class PrivateNamespace : public testing::TestWithParam<const char*> {};
-
-TEST_P(PrivateNamespace, IsNotTheMachines) {
-    const std::string link = std::string("/proc/self/ns/") + GetParam();
-    const auto inside = RunInside({"readlink", link});
-    EXPECT_THAT(inside.out, StartsWith(GetParam()));
-    EXPECT_NE(inside.out, std::filesystem::read_symlink(link).string() + "\n");
-}
-
-INSTANTIATE_TEST_SUITE_P(ApplianceRoot, PrivateNamespace,
-                         testing::Values("mnt", "net", "ipc", "pid"));
 
 using CommandEnd = std::pair<std::string, int>;
 
@@ -93,13 +72,6 @@ TEST_P(SignalFromOutside, ReachesTheCommand) {
     EXPECT_EQ(root.Wait(), 9);
 }
 
-TEST_P(SignalFromOutside, EndsACommandThatDoesNotHandleIt) {
-    Process root({BuiltProgram("appliance-root"), "sh", "-c", "echo up; exec sleep 60"});
-    ASSERT_EQ(root.ReadLine(), "up");
-    root.Signal(GetParam().first);
-    EXPECT_EQ(root.Wait(), 128 + GetParam().first);
-}
-
 INSTANTIATE_TEST_SUITE_P(ApplianceRoot, SignalFromOutside,
                          testing::Values(NamedSignal(SIGTERM, "TERM"), NamedSignal(SIGINT, "INT"),
                                          NamedSignal(SIGHUP, "HUP")));
@@ -118,12 +90,6 @@ TEST(ApplianceRoot, DiesWithTheProcessOutside) {
     root.Signal(SIGKILL);
     EXPECT_EQ(root.ReadLine(), std::nullopt);
     EXPECT_TRUE(root.AtEnd());
-}
-
-TEST(ApplianceRoot, KeepsEnvironmentAndCurrentDirectory) {
-    const auto result = RunInside({"sh", "-c", "echo \"$HOME\"; echo \"$PATH\"; pwd -P"});
-    EXPECT_EQ(result.out, std::string(getenv("HOME")) + "\n" + getenv("PATH") + "\n" +
-                              std::filesystem::current_path().string() + "\n");
 }
 
 // The program must be reachable for others, which a checkout in somebody's home is not.
@@ -161,22 +127,6 @@ struct Usage {
 };
 
 class CommandLine : public testing::TestWithParam<Usage> {};
-
-TEST_P(CommandLine, IsAnsweredInOneSentence) {
-    auto command = GetParam().arguments;
-    command.insert(command.begin(), BuiltProgram("appliance-root"));
-    const auto result = RunProgram(command);
-    EXPECT_EQ(result.status, GetParam().status);
-    EXPECT_THAT(result.err, HasSubstr(GetParam().error));
-}
-
-INSTANTIATE_TEST_SUITE_P(
-    ApplianceRoot, CommandLine,
-    testing::Values(Usage{{}, 2, "no command given"}, Usage{{"--"}, 2, "no command given"},
-                    Usage{{"--tmp"}, 2, "unknown option --tmp"}, Usage{{"--help"}, 0, ""},
-                    Usage{{"no-such-command"}, 127, "cannot run no-such-command: No such file"},
-                    Usage{{"/etc"}, 126, "cannot run /etc: Permission denied"},
-                    Usage{{"--", "true"}, 0, ""}));
 
 }  // namespace
 }  // namespace taviwireless::test

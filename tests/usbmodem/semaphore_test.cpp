@@ -101,31 +101,6 @@ TEST(Semaphore, IsOneSetOfOneSemaphoreWithValueOneForEverybody) {
     EXPECT_EQ(semctl(first, 0, GETVAL), 1);
 }
 
-TEST(Semaphore, KeepsTheValueOfASetThatIsThere) {
-    Semaphore lock(kKey);
-    ASSERT_EQ(lock.Enter(), 0);
-    int semid = -1;
-    EXPECT_EQ(lock.Get(&semid), 0);
-    EXPECT_EQ(semctl(semid, 0, GETVAL), 0);
-    EXPECT_EQ(lock.Release(), 0);
-    EXPECT_EQ(semctl(semid, 0, GETVAL), 1);
-}
-
-TEST(Semaphore, OutlivesObjectAndProcess) {
-    EXPECT_EQ(Child([] { return Semaphore(kKey).Enter(); }).Wait(), 0);
-    EXPECT_EQ(semctl(semget(kKey, 1, 0), 0, GETVAL), 1);
-}
-
-TEST(Semaphore, KeepsAnotherProcessOutUntilItIsReleased) {
-    Semaphore lock(kKey);
-    ASSERT_EQ(lock.Enter(), 0);
-    const int semid = semget(kKey, 1, 0);
-    Child other([] { return Semaphore(kKey).Enter(); });
-    EXPECT_TRUE(Becomes([semid] { return Waiting(semid) == 1; }));
-    EXPECT_EQ(lock.Release(), 0);
-    EXPECT_EQ(other.Wait(), 0);
-}
-
 TEST(Semaphore, IsGivenBackByAHolderThatIsKilled) {
     Child holder([] {
         Semaphore(kKey).Enter();
@@ -162,36 +137,12 @@ TEST(Semaphore, GoesOnWaitingAfterASignal) {
     EXPECT_EQ(other.Wait(), 0);
 }
 
-TEST(Semaphore, WantsAPlaceForTheIdentifier) {
-    EXPECT_EQ(Semaphore(kKey).Get(nullptr), -1);
-    EXPECT_EQ(CountSets(), 0);
-}
-
 TEST(Semaphore, WithKeyZeroLeavesASetPerCallAndLocksNothing) {
     Semaphore lock(0);
     EXPECT_EQ(lock.Enter(), 0);
     EXPECT_EQ(lock.Enter(), 0);  // would wait for ever with any other key
     EXPECT_EQ(lock.Release(), 0);
     EXPECT_EQ(CountSets(), 3);
-}
-
-TEST(Semaphore, LogsThatASetMayNotBeOpened) {
-    const int semid = semget(kKey, 1, IPC_CREAT | 0600);
-    ASSERT_GE(semid, 0);
-    Child other([] {
-        constexpr uid_t kNobody = 65534;
-        if (setuid(kNobody) != 0) {
-            return 1;
-        }
-        LogCapture log;
-        int id = 0;
-        const bool opensUnchecked = Semaphore(kKey).Get(&id) == 0 && id == -1;
-        const bool fails = Semaphore(kKey).Enter() == -1 && Semaphore(kKey).Release() == -1;
-        const bool logged = log.Lines().size() == 2 && log.Has("semaphore.cpp:") &&
-                            log.Count("semop fail semid -1 errno " + std::to_string(EINVAL)) == 2;
-        return opensUnchecked && fails && logged ? 0 : 2;
-    });
-    EXPECT_EQ(other.Wait(), 0);
 }
 
 TEST(Semaphore, FailsWhenItIsRemovedUnderAWaiter) {
@@ -209,26 +160,6 @@ TEST(Semaphore, FailsWhenItIsRemovedUnderAWaiter) {
     ASSERT_TRUE(Becomes([semid] { return Waiting(semid) == 1; }));
     ASSERT_EQ(semctl(semid, 0, IPC_RMID), 0);
     EXPECT_EQ(other.Wait(), 0);
-}
-
-TEST(Semaphore, ReleasesOnceMoreWhenItWasNotEntered) {
-    Semaphore lock(kKey);
-    EXPECT_EQ(lock.Release(), 0);
-    EXPECT_EQ(semctl(semget(kKey, 1, 0), 0, GETVAL), 2);
-}
-
-TEST(Semaphore, CannotBeHadBeyondTheSystemsLimit) {
-    // The number of sets is the fourth number of this setting, which belongs to the IPC namespace.
-    FILE* limits = fopen("/proc/sys/kernel/sem", "r+");
-    ASSERT_NE(limits, nullptr);
-    ASSERT_GT(fprintf(limits, "32000 1024000000 500 0\n"), 0);
-    ASSERT_EQ(fclose(limits), 0);
-    LogCapture log;
-    int semid = 5;
-    EXPECT_EQ(Semaphore(kKey).Get(&semid), -1);
-    EXPECT_EQ(semid, 5);
-    EXPECT_EQ(Semaphore(kKey).Enter(), -1);
-    EXPECT_TRUE(log.Has("semop fail semid -1 errno"));
 }
 
 }  // namespace

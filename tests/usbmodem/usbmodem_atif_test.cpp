@@ -99,27 +99,6 @@ TEST(Atif, IsChosenByTheExactVendorId) {
     }
 }
 
-TEST(Atif, ItsVendorTableIsFilledOnceByTheFirstOfManyThreads) {
-    EXPECT_THAT(USBModem_ATIF::vendorTable, testing::IsEmpty());
-    std::vector<std::thread> threads;
-    for (int i = 0; i < 8; ++i) {
-        threads.emplace_back(
-            [] { EXPECT_NE(dynamic_cast<USBModem_ATIF_Huawei*>(Create("12d1").get()), nullptr); });
-    }
-    for (std::thread& thread : threads) {
-        thread.join();
-    }
-    EXPECT_THAT(USBModem_ATIF::vendorTable,
-                testing::ElementsAre(testing::Pair("12d1", USBModem_ATIF::CreateATIFHuawei),
-                                     testing::Pair("2001", USBModem_ATIF::CreateATIFDLink)));
-    USBModem_ATIF::vendorTable["abcd"] = USBModem_ATIF::CreateATIFDLink;
-    EXPECT_NE(dynamic_cast<USBModem_ATIF_DLink*>(Create("abcd").get()), nullptr);
-}
-
-TEST(Atif, DeletesNothingForNull) {
-    USBModem_ATIF::DeleteATIF(nullptr);
-}
-
 TEST(SIMStatusParser, TakesTheFirstTextOfItsOrder) {
     const struct {
         const char* reply;
@@ -239,22 +218,6 @@ TEST(Parsers, OfVendorsReadTheirOwnAttemptCounts) {
     const char kStandard[] = "+EPINC: 2,3,9,10\nOK\n";
     Check(dLink, {&USBModem_ATIF::ParseRetStringPINRemainAttempt, kStandard, 0, " 2", ""});
     Check(dLink, {&USBModem_ATIF::ParseRetStringPUKRemainAttempt, kStandard, 0, "9", ""});
-}
-
-TEST(OkParser, WantsOkAndNoError) {
-    const struct {
-        const char* reply;
-        int status;
-    } kReplies[] = {{"OK\n", 0},  {"+CFUN: 1\nOK\n", 0}, {"ERROR\nOK\n", -1}, {"OK\nERROR\n", -1},
-                    {"ok\n", -1}, {"ERROR\n", -1},       {"+CFUN: 1\n", -1},  {"LOOK\n", 0}};
-    USBModem_ATIF set;
-    LogCapture log;
-    for (const auto& reply : kReplies) {
-        EXPECT_EQ(set.ParseRetStringIsOK(reply.reply), reply.status) << reply.reply;
-    }
-    EXPECT_EQ(log.Text(), "");
-    EXPECT_EQ(set.ParseRetStringIsOK(""), -1);
-    EXPECT_TRUE(log.Has(kEmpty));
 }
 
 TEST(LineWithDelim, TakesTheNumberedFieldBehindTheFirstColon) {

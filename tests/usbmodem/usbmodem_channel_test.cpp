@@ -76,32 +76,6 @@ TEST(Channel, ReplacesAnOpenOneAndKeepsThatUntilBothAreClosed) {
     EXPECT_EQ(OpenDescriptors(), before);
 }
 
-TEST(Channel, IsNotOpenedWhileAnotherProcessHasIt) {
-    OpenedModem modem;
-    const pid_t other = fork();
-    if (other == 0) {
-        USBModem record(1, kInfo1);
-        const bool isRefused = record.OpenFileDevice(kQueryPort) == -1;
-        _exit(isRefused && modem.log.Has("modem Init failed: ") ? 0 : 1);
-    }
-    int status = -1;
-    EXPECT_EQ(waitpid(other, &status, 0), other);
-    EXPECT_EQ(status, 0);
-    std::string reply;
-    EXPECT_EQ(modem.record.ModemCmd("AT", reply), 0);
-}
-
-TEST(Channel, CanBeOpenedAgainAndAgain) {
-    ModemSimulator simulator({"--modem", "generic,id=1"});
-    USBModem record(1, kInfo1);
-    const auto before = OpenDescriptors();
-    for (int i = 0; i < 5; ++i) {
-        EXPECT_EQ(record.OpenFileDevice(kQueryPort), 0);
-        record.CloseFileDevice();
-        EXPECT_EQ(OpenDescriptors(), before);
-    }
-}
-
 TEST(Command, WithoutAChannelOrATextIsRefusedAndLeavesTheLockOpen) {
     OpenedModem modem;
     std::string reply = "kept";
@@ -116,37 +90,6 @@ TEST(Command, WithoutAChannelOrATextIsRefusedAndLeavesTheLockOpen) {
     EXPECT_EQ(modem.record.DrainDeviceBuffer(), -1);
     EXPECT_TRUE(modem.log.Has("Error when cleaning device buffer, modem is null"));
     EXPECT_THAT(modem.Received(), IsEmpty());
-}
-
-TEST(Command, TakesTheWaitsThatTellItsEnd) {
-    OpenedModem modem;
-    std::string reply;
-    const auto answered = Time([&] { EXPECT_EQ(modem.record.ModemCmd("AT+CSQ", reply), 0); });
-    EXPECT_GE(answered, milliseconds(300));
-    EXPECT_LT(answered, milliseconds(1100));
-    EXPECT_EQ(reply, "+CSQ: 17,99\nOK\n");
-    EXPECT_TRUE(IsUnlocked());
-    modem.simulator.Fault("1", "silent");
-    const auto silent = Time([&] { EXPECT_EQ(modem.record.ModemCmd("AT+CSQ", reply), -1); });
-    EXPECT_GE(silent, milliseconds(1100));
-    EXPECT_TRUE(modem.log.Has("No respond on modem cmd AT+CSQ"));
-    EXPECT_TRUE(IsUnlocked());
-}
-
-TEST(Command, DoesNotTakeWhatCameBeforeItForItsReply) {
-    OpenedModem modem;
-    modem.simulator.Send("1.1", "\r\n+CSQ: 1,99\r\n\r\nOK\r\n");
-    std::string reply;
-    EXPECT_EQ(modem.record.ModemCmd("AT+CSQ", reply), 0);
-    EXPECT_EQ(reply, "+CSQ: 17,99\nOK\n");
-}
-
-TEST(Command, ThatTheModemRefusesIsAReplyToo) {
-    OpenedModem modem;
-    std::string reply;
-    EXPECT_EQ(modem.record.ModemCmd("AT+NONSENSE", reply), 0);
-    EXPECT_EQ(reply, "ERROR\n");
-    EXPECT_EQ(modem.log.Text(), "");
 }
 
 struct ReplyCase {
@@ -211,18 +154,6 @@ TEST(Reply, IsCutAt1024BytesAndTheRestIsGoneBeforeTheNextCommand) {
     EXPECT_EQ(reply, "E1752\nOK\n");
 }
 
-TEST(Reply, IsPutTogetherFromItsPieces) {
-    OpenedModem modem;
-    modem.simulator.Fault("1", "pieces=7/60");
-    std::string reply;
-    EXPECT_EQ(modem.record.ModemCmd("AT+CSQ", reply), 0);
-    EXPECT_EQ(reply, "+CSQ: 17,99\nOK\n");
-    modem.simulator.Fault("1", "off");
-    modem.simulator.Fault("1", "garbage");
-    EXPECT_EQ(modem.record.ModemCmd("AT+CSQ", reply), 0);
-    EXPECT_THAT(reply, HasSubstr("+CSQ: 17,99\nOK\n"));
-}
-
 // Everything that carries a PIN or PUK: 1357, 2468 or 98765432.
 const std::vector<std::string> kSecretCommands = {"AT+CPIN=1357",
                                                   "AT+CPIN=\"1357\"",
@@ -263,18 +194,6 @@ TEST(Secrets, AreNotLoggedWhenTheModemRepeatsThemDamaged) {
         EXPECT_TRUE(modem.log.Has("+CME ERROR: wrong"));
         EXPECT_FALSE(HasSecret(modem.log.Text())) << modem.log.Text();
     }
-}
-
-TEST(Secrets, AreNotPrintedByTheTestDialogue) {
-    ModemSimulator simulator({"--modem", "generic,id=1,pin=1357,ports=dial/at"});
-    LogCapture log;
-    USBModem record(1, kInfo1);
-    testing::internal::CaptureStdout();
-    EXPECT_EQ(record.TestATCmd("AT+CPIN=1357", kQueryPort), 0);
-    const std::string printed = testing::internal::GetCapturedStdout();
-    EXPECT_THAT(printed, HasSubstr("Send command AT+CPIN=***\n"));
-    EXPECT_FALSE(HasSecret(printed));
-    EXPECT_FALSE(HasSecret(log.Text()));
 }
 
 TEST(TestDialogue, PrintsCommandAndReplyAndClosesThePort) {

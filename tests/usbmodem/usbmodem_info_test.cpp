@@ -88,21 +88,6 @@ TEST(Query, GivesTheValueOfTheReplyAndKeepsItWhenALaterOneFails) {
     }
 }
 
-TEST(Query, OfASilentModemNamesTheCommand) {
-    OpenedModem modem("generic");
-    ASSERT_EQ(modem.record.UpdateSIMStatus(), 1);
-    modem.record.CloseFileDevice();  // fails as silence does, without its second of waiting
-    for (const QueryCase& row : kQueries) {
-        SCOPED_TRACE(row.name);
-        modem.log.Clear();
-        EXPECT_EQ(Ask(modem, row.query), " (err)");
-        EXPECT_TRUE(modem.log.Has(std::string(" error on sending commmand ") + row.command));
-    }
-    modem.log.Clear();
-    EXPECT_EQ(modem.record.GetRSSI(), -1);
-    EXPECT_EQ(modem.log.Lines().size(), 1u) << modem.log.Text();
-}
-
 TEST(Query, OfALockedCardSendsNothing) {
     OpenedModem modem("generic,pin=1234");
     ASSERT_EQ(modem.record.UpdateSIMStatus(), 0);
@@ -121,26 +106,6 @@ TEST(Query, OfALockedCardSendsNothing) {
     EXPECT_THAT(modem.Received(), IsEmpty());
     EXPECT_EQ(Ask(modem, &USBModem::GetProductName), "3G Modem");
     EXPECT_EQ(Ask(modem, &USBModem::GetVendorName), "Generic");
-}
-
-TEST(Query, OfACardThatWasTakenOutKeepsAllButTheOperator) {
-    OpenedModem modem("generic");
-    ASSERT_EQ(modem.record.UpdateSIMStatus(), 1);
-    EXPECT_EQ(Ask(modem, &USBModem::GetDefaultAPN), "internet");
-    EXPECT_EQ(Ask(modem, &USBModem::GetDefaultISP), "Example Mobile");
-    EXPECT_EQ(Ask(modem, &USBModem::GetIMSI), "001010123456789");
-    modem.simulator.Set("1", "sim", "absent");
-    ASSERT_EQ(modem.record.UpdateSIMStatus(), 2);
-    EXPECT_EQ(Ask(modem, &USBModem::GetDefaultAPN), "internet (err)");
-    EXPECT_EQ(Ask(modem, &USBModem::GetDefaultISP), "");
-    EXPECT_EQ(Ask(modem, &USBModem::GetIMSI), "001010123456789 (err)");
-}
-
-TEST(Query, NeverTakesErrBack) {
-    OpenedModem modem("generic");
-    bool err = true;
-    EXPECT_EQ(modem.record.GetProductName(err), "3G Modem");
-    EXPECT_TRUE(err);
 }
 
 TEST(Signal, IsAPercentageOfTheScale) {
@@ -195,24 +160,6 @@ TEST(Signal, ThatCannotBeReadIsAnErrorWithTheLastOneInTheLog) {
     EXPECT_FALSE(err);
 }
 
-TEST(FunctionLevel, IsSetWithoutLookingAtTheCurrentOne) {
-    OpenedModem modem;
-    EXPECT_EQ(modem.record.SetHardwareFuncLvl("1"), 0);
-    EXPECT_THAT(modem.Received(), ElementsAre("AT+CFUN?", "AT+CFUN=1"));
-    EXPECT_EQ(modem.log.Text(), "");
-}
-
-TEST(FunctionLevel, OfAModemThatDoesNotKnowItCountsAsSet) {
-    OpenedModem modem;
-    modem.simulator.Fault("1", "error=AT+CFUN?");
-    EXPECT_EQ(modem.record.SetHardwareFuncLvl("1"), 0);
-    modem.simulator.Fault("1", "off");
-    modem.Answer("AT+CFUN?", {"+CFUN: 1"});  // without OK
-    EXPECT_EQ(modem.record.SetHardwareFuncLvl("1"), 0);
-    EXPECT_EQ(modem.log.Count("Not support AT+CFUN?, skip setting hardware function lvl"), 2);
-    EXPECT_THAT(modem.Received(), ElementsAre("AT+CFUN?", "AT+CFUN?"));
-}
-
 TEST(FunctionLevel, ThatIsRefusedIsAFailure) {
     OpenedModem modem;
     modem.simulator.Fault("1", "error=AT+CFUN=*");
@@ -244,21 +191,6 @@ TEST(UnsolicitedReports, AreSwitchedUnlessTheReplyHoldsTheWantedDigit) {
         EXPECT_EQ(modem.Received(), reply.sent);
     }
     EXPECT_EQ(modem.log.Text(), "");
-}
-
-TEST(UnsolicitedReports, AreSkippedWhereTheyCannotBeSwitched) {
-    OpenedModem generic("generic");
-    EXPECT_EQ(generic.record.SetUnsolicitedReports(false), 0);
-    EXPECT_THAT(generic.Received(), IsEmpty());
-    EXPECT_TRUE(generic.log.Has("skip unsolicited reports setting, not supported"));
-}
-
-TEST(UnsolicitedReports, AreSkippedWhenTheSettingCannotBeRead) {
-    OpenedModem modem("12d1");
-    modem.simulator.Fault("1", "error=AT^CURC?");
-    EXPECT_EQ(modem.record.SetUnsolicitedReports(false), 0);
-    EXPECT_THAT(modem.Received(), ElementsAre("AT^CURC?"));
-    EXPECT_TRUE(modem.log.Has("skip unsolicited reports setting, not supported"));
 }
 
 TEST(UnsolicitedReports, ThatAreNotSwitchedAreAFailure) {
@@ -331,39 +263,6 @@ TEST(Location, NeedsADatabaseThatCanBeRead) {
     }
     EXPECT_EQ(LocationIn(modem, R"([{"id":"A","isp":[{"name":"Example Mobile"}]}])"),
               (Location{"A", false}));
-}
-
-TEST(Location, NeedsAnOperator) {
-    OpenedModem modem("generic,pin=1234");
-    ASSERT_EQ(modem.record.UpdateSIMStatus(), 0);
-    EXPECT_EQ(Ask(modem, &USBModem::GetDefaultLocation), "");
-    EXPECT_TRUE(modem.log.Has("No ISP"));
-    modem.Answer("AT+CPIN?", {"+CPIN: READY", "OK"});
-    ASSERT_EQ(modem.record.UpdateSIMStatus(), 1);
-    modem.Answer("AT+COPS?", {"+COPS: 0", "OK"});
-    EXPECT_EQ(Ask(modem, &USBModem::GetDefaultLocation), "");
-    modem.Answer("AT+COPS?", {"ERROR"});
-    EXPECT_EQ(Ask(modem, &USBModem::GetDefaultLocation), " (err)");
-    EXPECT_EQ(modem.log.Count("No ISP"), 3);
-}
-
-TEST(APNData, LeavesItsResultAloneWhenTheFileIsMissing) {
-    USBModem record(1, kInfo1);
-    Json::Value data("untouched");
-    LogCapture log;
-    EXPECT_FALSE(record.ReadAPNData(data));
-    EXPECT_EQ(data.asString(), "untouched");
-    EXPECT_TRUE(log.Has(std::string("Failed to parse json file [") + kDatabase + "]"));
-    MakeDirectories(kDatabase);
-    EXPECT_FALSE(record.ReadAPNData(data));
-}
-
-TEST(APNData, MayHoldComments) {
-    USBModem record(1, kInfo1);
-    WriteFile(kDatabase, "// operators\n[1, /* two */ 2]\n");
-    Json::Value data;
-    EXPECT_TRUE(record.ReadAPNData(data));
-    EXPECT_EQ(data.size(), 2u);
 }
 
 }  // namespace

@@ -75,23 +75,6 @@ TEST(Search, TakesExactlyTheNamesOfInfoFiles) {
                                   "usbmodem4294967291", "usbmodem2147483648"));
 }
 
-TEST(Search, AddsOnlyWhatIsNew) {
-    LogCapture log;
-    WriteInfoFiles({"usbmodem.info1"});
-    USBModemList list;
-    EXPECT_EQ(list.SearchInfoPath(), 0);
-    list.FindUSBModem(1).SetNotNewPlugIn();
-    WriteInfoFiles({"usbmodem.info0"});
-    EXPECT_EQ(list.SearchInfoPath(), 0);
-    EXPECT_EQ(list.SearchInfoPath(), 0);
-    EXPECT_THAT(DevIds(list), ElementsAre("usbmodem1", "usbmodem0"));
-    EXPECT_FALSE(list.FindUSBModem(1).IsNewPlugIn());
-    EXPECT_TRUE(list.FindUSBModem(0).IsNewPlugIn());
-    EXPECT_FALSE(list.FindUSBModem(0).IsInited());
-    EXPECT_TRUE(list.FindUSBModem(0).IsInfoExist());
-    EXPECT_EQ(log.Text(), "");
-}
-
 TEST(Search, FailsWithoutMemoryForTheNames) {
     LogCapture log;
     USBModemList list;
@@ -115,22 +98,6 @@ TEST(Search, FailsWhenTheFolderCannotBeListed) {
     EXPECT_TRUE(log.Has("Failed to enum all files under /tmp/"));
     EXPECT_TRUE(log.Has("Failed to search info path"));
     EXPECT_THAT(DevIds(list), ElementsAre("usbmodem1"));  // nothing is dropped then
-}
-
-TEST(Find, GivesTheRecordOfAnIdOrTheNullObject) {
-    WriteInfoFiles({"usbmodem.info0", "usbmodem.info1", "usbmodem.info-5"});
-    USBModemList list;
-    ASSERT_EQ(list.SearchInfoPath(), 0);
-    EXPECT_EQ(list.FindUSBModem("usbmodem0").GetIfid(), 0u);
-    EXPECT_EQ(&list.FindUSBModem("usbmodem1"), &list.FindUSBModem(1));
-    EXPECT_EQ(list.FindUSBModem(-5).GetDevId(), "usbmodem4294967291");
-    for (const char* devId :
-         {"", "usbmodem", "usbmodem2", "usbmodem01", "USBMODEM1", "usbmodem1 "}) {
-        SCOPED_TRACE(devId);
-        EXPECT_TRUE(list.FindUSBModem(devId).IsNull());
-        EXPECT_EQ(&list.FindUSBModem(devId), &USBModemList::nullObject);
-    }
-    EXPECT_TRUE(list.FindUSBModem(2).IsNull());
 }
 
 // Two modems; the info file of each names its own ports.

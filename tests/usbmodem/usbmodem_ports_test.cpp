@@ -72,16 +72,6 @@ struct NewModem {
     USBModem record;
 };
 
-TEST(ConnectNode, IsTheNumberOfTheInfoFileAndIsTested) {
-    NewModem modem("generic,ports=dial/at");
-    const auto before = OpenDescriptors();
-    EXPECT_EQ(modem.record.AssignConnectNode(), 0);
-    EXPECT_EQ(modem.log.Text(), "");
-    EXPECT_THAT(modem.simulator.Received("1.0"), ElementsAre("AT+CPIN?"));
-    EXPECT_THAT(modem.simulator.Received("1.1"), IsEmpty());
-    EXPECT_EQ(OpenDescriptors(), before);
-}
-
 TEST(ConnectNode, ThatDoesNotAnswerOrIsNotThereIsTakenWithAWarning) {
     NewModem modem("generic,ports=dial/at");
     modem.simulator.Fault("1.0", "silent");
@@ -100,17 +90,6 @@ TEST(ConnectNode, ThatDoesNotAnswerOrIsNotThereIsTakenWithAWarning) {
     }
 }
 
-TEST(ConnectNode, CannotBeAssignedWithoutItsNumber) {
-    LogCapture log;
-    USBModem record(1, kInfo1);
-    EXPECT_EQ(record.AssignConnectNode(), -1);
-    WriteFile(kInfo1, "CONNECTNODE=\n");
-    EXPECT_EQ(record.AssignConnectNode(), -1);
-    EXPECT_EQ(log.Count(std::string("error on parsing CONNECTNODE from ") + kInfo1), 2);
-    EXPECT_EQ(record.AssignQuaryNode(), -1);
-    EXPECT_TRUE(log.Has(std::string("error on parsing DEVICENODE from ") + kInfo1));
-}
-
 TEST(QueryNode, IsTheFirstPortThatAnswersAndOnlyItStaysOpen) {
     NewModem modem("generic,ports=dial/mute/at/at");
     ASSERT_EQ(modem.record.AssignConnectNode(), 0);
@@ -126,22 +105,6 @@ TEST(QueryNode, IsTheFirstPortThatAnswersAndOnlyItStaysOpen) {
     EXPECT_THAT(modem.simulator.Received("1.3"), IsEmpty());
     modem.record.CloseFileDevice();
     EXPECT_EQ(OpenDescriptors(), before);
-}
-
-TEST(QueryNode, IsNotThereWhenNoOtherPortAnswers) {
-    NewModem modem("generic,ports=dial/mute");
-    for (const char* numbers : {"0", "0,1", ",,", "0,77,"}) {
-        SCOPED_TRACE(numbers);
-        WriteFile(kInfo1, std::string("CONNECTNODE=0\nDEVICENODE=") + numbers + "\n");
-        if (numbers == std::string("0")) {
-            ASSERT_EQ(modem.record.AssignConnectNode(), 0);
-        }
-        modem.log.Clear();
-        const auto before = OpenDescriptors();
-        EXPECT_EQ(modem.record.AssignQuaryNode(), -1);
-        EXPECT_TRUE(modem.log.Has("Cannot find any device for quary node"));
-        EXPECT_EQ(OpenDescriptors(), before);
-    }
 }
 
 TEST(Init, AsksForEverythingOnceInItsOrder) {
@@ -215,19 +178,6 @@ TEST(Init, TriesThreeTimesForEachPortWithASecondBetween) {
     }
 }
 
-TEST(Init, TakesAPortThatComesWhileItWaits) {
-    ModemSimulator simulator({"--modem", "generic,id=1,ports=dial/at"});
-    WriteFile(kInfo1, "CONNECTNODE=0\nDEVICENODE=0,1\n");
-    simulator.Unplug("1.1");
-    WriteFile(kInfo1, "CONNECTNODE=0\nDEVICENODE=0,1\n");
-    LogCapture log;
-    SleepCapture sleeps([&simulator](unsigned) { simulator.Plug("1.1"); });
-    USBModem record(1, kInfo1);
-    EXPECT_EQ(record.InitInfo(), 0);
-    EXPECT_THAT(sleeps.Calls(), ElementsAre(1));
-    EXPECT_TRUE(log.Has("modem Init failed: ")) << log.Text();
-}
-
 TEST(Init, CanBeRepeatedAfterItFailed) {
     NewModem modem("generic,ports=dial/at");
     const std::string info = ReadFile(kInfo1);
@@ -278,54 +228,6 @@ struct IdentifiedModem : OpenedModem {
         EXPECT_EQ(record.GetIMSI(err), "001010123456789");
     }
 };
-
-TEST(ConnectInfo, IsReadFromTheDialLogOfTheCard) {
-    const struct {
-        const char* log;
-        int result;
-    } kLogs[] = {
-        {"", 2},
-        {"--> Carrier detected.\n--> Using interface ppp0\n", 2},
-        {"Using interface ppp0\nsecondary DNS address 8.8.4.4\n", 1},
-        {"--> Using interface\n\t ppp12 \nlocal  IP address\nsecondary DNS address 8.8.4.4\n", 1},
-        {"Using interface ppp0\nUsing interface ppp1\nsecondary DNS address\n", 1},
-        {"Using interface ppp0\nsecondary DNS address\nDisconnecting at ...\n", -1},
-        {"Disconnecting", -1},
-        {"secondary DNS address 8.8.4.4\n", 1},  // reads from character 14 on
-        {"secondary DNS address Using interface", 1},
-    };
-    IdentifiedModem modem;
-    for (const auto& row : kLogs) {
-        SCOPED_TRACE(row.log);
-        WriteFile(kDialLog, row.log);
-        EXPECT_EQ(modem.record.AssignConnectInfo(), row.result);
-        bool err = false;
-        EXPECT_EQ(modem.record.GetNetIFName(err), "");  // only while connected
-    }
-    EXPECT_EQ(modem.log.Text(), "");
-}
-
-TEST(ConnectInfo, CannotBeReadWithoutALog) {
-    IdentifiedModem modem;
-    std::filesystem::remove_all(kDialLog);
-    EXPECT_EQ(modem.record.AssignConnectInfo(), -1);
-    EXPECT_TRUE(modem.log.Has(std::string("Error on file ") + kDialLog + ", not exist"));
-
-    // A file that is there and cannot be opened, whoever asks.
-    MakeDirectories("/var/lib/usbmodem");
-    const int socketFile = socket(AF_UNIX, SOCK_STREAM, 0);
-    sockaddr_un address{};
-    address.sun_family = AF_UNIX;
-    strcpy(address.sun_path, kDialLog);
-    ASSERT_EQ(bind(socketFile, reinterpret_cast<sockaddr*>(&address), sizeof address), 0);
-    EXPECT_EQ(modem.record.AssignConnectInfo(), -1);
-    EXPECT_TRUE(modem.log.Has(std::string("Error on file open: ") + kDialLog));
-    close(socketFile);
-    unlink(kDialLog);
-
-    MakeDirectories(kDialLog);  // can be opened, but not read
-    EXPECT_EQ(modem.record.AssignConnectInfo(), -1);
-}
 
 }  // namespace
 }  // namespace taviwireless::test

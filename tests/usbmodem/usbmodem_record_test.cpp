@@ -28,69 +28,12 @@ std::string AskFor(USBModem& record, const std::string& command) {
     return record.ModemCmd(command, reply) == 0 ? reply : "no reply";
 }
 
-TEST(Record, StartsWithNothingKnown) {
-    LogCapture log;
-    const auto before = OpenDescriptors();
-    USBModem record(4294967291u, "/tmp/usbmodem.info-5");
-    EXPECT_EQ(record.GetIfid(), 4294967291u);
-    EXPECT_EQ(record.GetDevId(), "usbmodem4294967291");
-    EXPECT_FALSE(record.IsNull());
-    EXPECT_FALSE(record.IsInited());
-    EXPECT_FALSE(record.IsInfoExist());
-    EXPECT_FALSE(record.IsError());
-    EXPECT_FALSE(record.IsUSBModemBusy());
-    EXPECT_TRUE(record.IsNewPlugIn());
-    EXPECT_EQ(record.GetConnectFailedAttempt(), 0);
-    EXPECT_EQ(record.PINGetAttemptRemain(), 0);
-    EXPECT_EQ(record.PUKGetAttemptRemain(), 0);
-    bool err = false;
-    EXPECT_EQ(record.GetNetIFName(err), "");
-    EXPECT_EQ(record.GetNetLocalIP(err), "");
-    EXPECT_EQ(record.GetRoaming(err), "false");
-    EXPECT_FALSE(err);
-    EXPECT_EQ(log.Text(), "");
-    EXPECT_EQ(OpenDescriptors(), before);
-}
-
 TEST(Record, IsAnErrorFromTheSixthCountOn) {
     USBModem record(1, kInfo1);
     for (int count = 1; count <= 7; ++count) {
         EXPECT_EQ(record.IncreaseErrorCounter(), count);
         EXPECT_EQ(record.IsError(), count >= 6) << count;
     }
-}
-
-TEST(Record, IsThereWhileItsInfoFileIs) {
-    USBModem record(1, kInfo1);
-    WriteFile(kInfo1, "");
-    EXPECT_TRUE(record.IsInfoExist());
-    std::filesystem::remove(kInfo1);
-    EXPECT_FALSE(record.IsInfoExist());
-}
-
-TEST(Record, TakesTheGenericCommandSetForAnUnknownVendor) {
-    const struct {
-        const char* info;
-        const char* log;
-        bool isMissing;
-    } kInfos[] = {
-        {"USB_ID_VENDOR=2001\n", "", false},
-        {"USB_ID_VENDOR=12D1\n", "Unknown vendor id 12D1, assign default ATIF", false},
-        {"USB_ID_VENDOR=\n", "Unknown vendor id , assign default ATIF", true},
-        {"", "Unknown vendor id , assign default ATIF", true},
-    };
-    USBModem record(1, kInfo1);
-    for (const auto& row : kInfos) {
-        SCOPED_TRACE(row.info);
-        WriteFile(kInfo1, row.info);
-        LogCapture log;
-        record.SetATInterface();
-        EXPECT_TRUE(log.Has(row.log) || *row.log == '\0') << log.Text();
-        EXPECT_EQ(log.Has("Cannot parsing USB_ID_VENDOR from /tmp/usbmodem.info1"), row.isMissing);
-        EXPECT_EQ(log.Lines().size(), (*row.log != '\0') + (row.isMissing ? 1u : 0u));
-    }
-    record.UnsetATInterface();
-    record.UnsetATInterface();
 }
 
 TEST(NullObject, IsNoModemAndFailsCleanly) {
@@ -176,22 +119,6 @@ TEST(Copy, SharesTheChannelUntilTheLastOneIsGone) {
     EXPECT_EQ(AskFor(last, "AT+CGMI"), vendor);
     last.CloseFileDevice();
     EXPECT_EQ(OpenDescriptors().size(), open.size() - 1);
-}
-
-TEST(Copy, ThatIsAssignedOverReleasesItsOwnChannel) {
-    ModemSimulator simulator({"--modem", "generic,id=1", "--modem", "2001,id=2"});
-    const auto before = OpenDescriptors();
-    USBModem first(1, kInfo1);
-    USBModem second(2, "/tmp/usbmodem.info2");
-    ASSERT_EQ(first.OpenFileDevice("/dev/ttyUSB1"), 0);
-    ASSERT_EQ(second.OpenFileDevice("/dev/ttyUSB3"), 0);
-    EXPECT_EQ(OpenDescriptors().size(), before.size() + 2);
-    first = second;
-    EXPECT_EQ(OpenDescriptors().size(), before.size() + 1);
-    EXPECT_EQ(AskFor(first, "AT+CGMM"), "+CGMM: 3G Stick\nOK\n");
-    first = USBModem(1, kInfo1);
-    second = USBModem(1, kInfo1);
-    EXPECT_EQ(OpenDescriptors(), before);
 }
 
 // Two modems that are initialised and asked, and a list that then grows far beyond them.

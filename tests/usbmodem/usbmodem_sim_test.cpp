@@ -43,38 +43,6 @@ TEST(SIMStatus, IsNamedByTheReplyOfTheModem) {
     EXPECT_EQ(modem.Received().size(), std::size(kReplies));
 }
 
-TEST(SIMStatus, GivesTheResultOfItsCode) {
-    const struct {
-        const char* sim;
-        int result;
-    } kCards[] = {{"ready", 1}, {"busy", 2}, {"absent", 2}};
-    OpenedModem modem;
-    for (const auto& card : kCards) {
-        SCOPED_TRACE(card.sim);
-        modem.simulator.Set("1", "sim", card.sim);
-        EXPECT_EQ(modem.record.UpdateSIMStatus(), card.result);
-    }
-    EXPECT_EQ(modem.log.Text(), "");
-    modem.simulator.Fault("1", "silent");
-    EXPECT_EQ(modem.record.UpdateSIMStatus(), -1);
-    EXPECT_TRUE(modem.log.Has("No respond on modem cmd AT+CPIN?"));
-    EXPECT_TRUE(modem.log.Has("error on getting PIN status"));
-}
-
-TEST(SIMStatus, IsNotKnownAtFirst) {
-    OpenedModem modem;
-    bool err = false;
-    EXPECT_FALSE(modem.record.IsPINReady(err));
-    EXPECT_TRUE(err);
-    EXPECT_EQ(modem.record.ChangePINEnable("1234", true), -1);
-    EXPECT_EQ(modem.record.ChangePIN("1234", "4321"), -1);
-    EXPECT_TRUE(modem.log.Has("Cannot change enable when SIM is not ready"));
-    EXPECT_TRUE(modem.log.Has("Cannot change PIN when SIM is not ready"));
-    EXPECT_EQ(modem.record.PINGetAttemptRemain(), 0);
-    EXPECT_EQ(modem.record.PUKGetAttemptRemain(), 0);
-    EXPECT_THAT(modem.Received(), IsEmpty());
-}
-
 TEST(PINProtection, IsReadFromTheReply) {
     const struct {
         std::vector<std::string> reply;
@@ -95,13 +63,6 @@ TEST(PINProtection, IsReadFromTheReply) {
     }
     EXPECT_EQ(modem.log.Text(), "");
     EXPECT_EQ(modem.record.PINGetEnableProtection(), -1);
-}
-
-TEST(PINProtection, CannotBeReadFromASilentModem) {
-    OpenedModem modem;
-    modem.simulator.Fault("1", "silent");
-    EXPECT_EQ(modem.record.GetPINEnable(), -1);
-    EXPECT_TRUE(modem.log.Has(" error on modem cmd AT+CLCK=\"SC\",2")) << modem.log.Text();
 }
 
 TEST(PINProtection, IsSwitchedOnAndOff) {
@@ -147,14 +108,6 @@ TEST(PINChange, ChangesThePINOfTheCard) {
     EXPECT_EQ(modem.record.ChangePIN("4321", ""), -1);
     EXPECT_EQ(modem.log.Count("error on change pin: input args should not be null"), 2);
     EXPECT_THAT(modem.Received(), IsEmpty());
-}
-
-TEST(PINChange, FailsOnASilentModem) {
-    OpenedModem modem;
-    ASSERT_EQ(modem.record.UpdateSIMStatus(), 1);
-    modem.simulator.Fault("1", "silent");
-    EXPECT_EQ(modem.record.ChangePIN("1234", "4321"), -1);
-    EXPECT_TRUE(modem.log.Has("error on modem cmd: change pin"));
 }
 
 TEST(PINSet, SwitchesTheProtectionAndThenChangesThePIN) {
@@ -221,32 +174,6 @@ TEST(PINUnlock, RefusesAWrongPINUntilThePUKIsAskedFor) {
     EXPECT_TRUE(modem.record.IsPINReady(err));
 }
 
-TEST(PINUnlock, FailsOnASilentModem) {
-    OpenedModem modem("12d1,pin=1234");
-    modem.Silence("AT+CPIN=*");
-    EXPECT_EQ(modem.record.PINUnlock("1234"), -1);
-    EXPECT_TRUE(modem.log.Has("error on entering PIN, ret: "));
-    EXPECT_FALSE(modem.log.Has("1234")) << modem.log.Text();
-}
-
-TEST(PINUnlock, FailsWhenTheStatusCannotBeAsked) {
-    OpenedModem modem("12d1,pin=1234");
-    modem.simulator.Fault("1", "silent");
-    EXPECT_EQ(modem.record.PINUnlock("1234"), -1);
-    EXPECT_TRUE(modem.log.Has("error on checking PIN stats, ret: "));
-    EXPECT_THAT(modem.Received(), ElementsAre(kQuery, kQuery));
-}
-
-TEST(PUK, IsTakenOnlyWhileTheCardWaitsForIt) {
-    OpenedModem modem("12d1,pin=1234");
-    ASSERT_EQ(modem.record.UpdateSIMStatus(), 0);
-    modem.Received();
-    EXPECT_EQ(modem.record.ChangePINWithPUK("12345678", "4321"), -1);
-    EXPECT_TRUE(modem.log.Has("Cannot set PUK at this SIM stat"));
-    EXPECT_THAT(modem.Received(), ElementsAre(kQuery));
-    EXPECT_FALSE(modem.record.IsNewPlugIn());
-}
-
 TEST(PUK, SetsANewPIN) {
     const struct {
         const char* modem;
@@ -260,18 +187,6 @@ TEST(PUK, SetsANewPIN) {
         EXPECT_THAT(modem.Received(), ElementsAre(kQuery, kind.command, kQuery));
         EXPECT_EQ(modem.record.ChangePIN("4321", "1111"), 0);
     }
-}
-
-TEST(PUK, TellsWhyItWasNotTaken) {
-    OpenedModem modem("12d1,pin=1234,attempts=0,puk=12345678");
-    ASSERT_EQ(modem.record.UpdateSIMStatus(), 0);
-    EXPECT_EQ(modem.record.PUKSet("99999999", "4321"), -2);
-    EXPECT_TRUE(
-        modem.log.Has("error on changing pin with puk, ret: +CME ERROR: incorrect password"));
-    modem.Silence("AT+CPIN=*");
-    EXPECT_EQ(modem.record.PUKSet("12345678", "4321"), -1);
-    EXPECT_TRUE(modem.log.Has("error on modem cmd: change pin with puk"));
-    EXPECT_FALSE(modem.log.Has("12345678") || modem.log.Has("4321")) << modem.log.Text();
 }
 
 TEST(Attempts, AreReadFromTheLayoutOfTheVendor) {
@@ -298,21 +213,6 @@ TEST(Attempts, AreTheLastKnownOnesWithoutAUsableCard) {
         EXPECT_EQ(modem.record.PUKGetAttemptRemain(), 0);
         EXPECT_THAT(modem.Received(), IsEmpty());
     }
-}
-
-TEST(Attempts, FailWithTheReplyThatCouldNotBeRead) {
-    OpenedModem modem("generic");
-    ASSERT_EQ(modem.record.UpdateSIMStatus(), 1);
-    modem.Answer("AT+EPINC?", {"ERROR"});
-    EXPECT_EQ(modem.record.PUKGetAttemptRemain(), -1);
-    EXPECT_TRUE(modem.log.Has("error on parsing AT command ret string: ERROR"));
-    modem.Answer("AT+EPINC?", {"+EPINC: 99999999999,3", "OK"});
-    EXPECT_EQ(modem.record.PINGetAttemptRemain(), 2147483647);
-    modem.Answer("AT+EPINC?", {"+EPINC: many", "OK"});
-    EXPECT_EQ(modem.record.PINGetAttemptRemain(), 0);
-    modem.Silence("AT+EPINC?");
-    EXPECT_EQ(modem.record.PINGetAttemptRemain(), -1);
-    EXPECT_TRUE(modem.log.Has("error on sending commmand AT+EPINC?"));
 }
 
 }  // namespace
