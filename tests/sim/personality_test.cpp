@@ -85,49 +85,6 @@ TEST_P(PersonalityTest, AnswersEveryQueryInTheShapeThatIsRead) {
               std::string(GetParam()) == "generic" ? "false" : "true");
 }
 
-TEST_P(PersonalityTest, CarriesOutEverySetting) {
-    Personality modem(GetParam());
-    USBModem_ATIF& set = modem.Commands();
-    const std::string commands[] = {
-        set.GetATCommandGetHardwareFuncLvl(),          set.GetATCommandSetHardwareFuncLvl("1"),
-        set.GetATCommandChangePINEnable("1", "1234"),  set.GetATCommandGetPINEnable(),
-        set.GetATCommandChangePINCode("1234", "5678"), set.GetATCommandGetUnsolicitedReports(),
-        set.GetATCommandSetUnsolicitedReports(false),
-    };
-    for (const auto& command : commands) {
-        EXPECT_TRUE(command.empty() || set.ParseRetStringIsOK(modem.Ask(command)) == 0) << command;
-    }
-    EXPECT_THAT(modem.Ask(set.GetATCommandGetPINEnable()), testing::HasSubstr("+CLCK: 1"));
-    modem.Simulator().Unplug("0.0");
-    modem.Simulator().Set("0", "pin_attempts", "0");
-    EXPECT_EQ(set.ParseRetStringQuarySIMStatus(modem.Ask(set.GetATCommandQuarySIMStatus())), 2);
-    EXPECT_EQ(set.ParseRetStringIsOK(modem.Ask(set.GetATCommandSetSIMPUK("12345678", "4321"))), 0);
-    EXPECT_EQ(set.ParseRetStringQuarySIMStatus(modem.Ask(set.GetATCommandQuarySIMStatus())), 0);
-}
-
-TEST_P(PersonalityTest, HasADialPortAndAnotherThatAnswers) {
-    ModemSimulator simulator({"--modem", GetParam()});
-    std::istringstream ports(simulator.Command("plug 0"));  // "modem 0 port 2 at /dev/pts/7 ..."
-    std::multiset<std::string> roles;
-    std::string word, role, path, link;
-    while (ports >> word >> word >> word >> word >> role >> path >> link) {
-        roles.insert(role);
-        Client client(link);
-        if (role == "mute") {
-            client.Write("AT\r");
-            EXPECT_EQ(client.ReadUntilQuiet(), "");
-        } else {
-            EXPECT_EQ(client.Ask("AT"), "AT\r\r\nOK\r\n");
-        }
-        const bool isInfoDial =
-            ReadFile("/tmp/usbmodem.info0").find("CONNECTNODE=" + link.substr(11) + "\n") !=
-            std::string::npos;
-        EXPECT_EQ(isInfoDial, role == "dial");
-    }
-    EXPECT_EQ(roles.count("dial"), 1u);
-    EXPECT_GE(roles.count("at"), 1u);
-}
-
 TEST(PersonalityFile, OfAPersonsOwnAddsToAnotherOne) {
     WriteFile("/tmp/mine.json", R"({"extends": "12d1", "vendor_id": "19d2", "ports": ["at"],
         "variables": {"band": "900"},

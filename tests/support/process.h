@@ -59,8 +59,8 @@ struct RunResult {
     std::string err;
 };
 
-// Runs a program to its end with `input` on its standard input. One that has not ended (with its
-// output closed by everything it started) within 30 s is killed, and std::runtime_error thrown.
+// Runs a program to its end with `input` on its standard input. One that has not ended within 30 s
+// is killed, and std::runtime_error thrown.
 RunResult RunProgram(const std::vector<std::string>& argv, const std::string& input = "");
 
 }  // namespace taviwireless::test
