@@ -15,33 +15,15 @@
 #include <thread>
 #include <utility>
 
+#include "platform/linux/core/unique_fd.h"
+
 namespace taviwireless::test {
 namespace {
 
 using Clock = std::chrono::steady_clock;
 using Milliseconds = Process::Milliseconds;
 
-class Descriptor {
-  public:
-    explicit Descriptor(int number = -1) : number_(number) {}
-    Descriptor(Descriptor&& other) noexcept : number_(other.Release()) {}
-    Descriptor& operator=(Descriptor&& other) noexcept {
-        std::swap(number_, other.number_);
-        return *this;
-    }
-    ~Descriptor() { Close(); }
-
-    int Number() const { return number_; }
-    int Release() { return std::exchange(number_, -1); }
-    void Close() {
-        if (number_ >= 0) {
-            close(Release());
-        }
-    }
-
-  private:
-    int number_;
-};
+using Descriptor = tavicore::UniqueFd;
 
 struct Pipe {
     Descriptor reading;
@@ -121,16 +103,16 @@ bool ReadMore(int descriptor, std::string* text) {
 // A file in memory with this text, to be read from its beginning.
 Descriptor MemoryFile(const std::string& text) {
     Descriptor file(memfd_create("program", MFD_CLOEXEC));
-    if (file.Number() < 0 || pwrite(file.Number(), text.data(), text.size(), 0) < 0) {
+    if (file.Get() < 0 || pwrite(file.Get(), text.data(), text.size(), 0) < 0) {
         throw std::system_error(errno, std::generic_category(), "Cannot make a file in memory");
     }
     return file;
 }
 
 std::string Content(const Descriptor& file) {
-    lseek(file.Number(), 0, SEEK_SET);
+    lseek(file.Get(), 0, SEEK_SET);
     std::string text;
-    while (ReadMore(file.Number(), &text)) {
+    while (ReadMore(file.Get(), &text)) {
     }
     return text;
 }
@@ -159,7 +141,7 @@ Process::Process(const std::vector<std::string>& argv) {
     IgnoreBrokenPipes();
     Pipe input;
     Pipe output;
-    pid_ = Spawn(argv, input.reading.Number(), output.writing.Number(), -1);
+    pid_ = Spawn(argv, input.reading.Get(), output.writing.Get(), -1);
     input_ = input.writing.Release();
     output_ = output.reading.Release();
 }
@@ -223,7 +205,7 @@ RunResult RunProgram(const std::vector<std::string>& argv, const std::string& in
     const Descriptor in = MemoryFile(input);
     const Descriptor out = MemoryFile("");
     const Descriptor err = MemoryFile("");
-    const pid_t pid = Spawn(argv, in.Number(), out.Number(), err.Number());
+    const pid_t pid = Spawn(argv, in.Get(), out.Get(), err.Get());
     const auto status = WaitUntil(Clock::now() + kRunPatience, pid);
     if (!status) {
         kill(pid, SIGKILL);

@@ -117,6 +117,7 @@ TEST(Reply, HasNeitherBlankLinesNorEchoes) {
                  {{"usual", Framed({"+CSQ: 17,99", "OK"}), "+CSQ: 17,99\nOK\n"},
                   {"the echo alone", "", ""},
                   {"blank lines alone", "\r\n\r\n\r\n", ""},
+                  {"the late echo of a PIN", Framed({"AT+CPIN=1357", "OK"}), "OK\n"},
                   {"more echoes", Framed({"A", "AT+CSQ", "B", "xAT+CSQ=y", "OK"}), "A\nB\nOK\n"},
                   {"an unsolicited line", Framed({"^RSSI:21", "+CSQ: 17,99", "OK"}),
                    "^RSSI:21\n+CSQ: 17,99\nOK\n"},
