@@ -48,8 +48,10 @@ TEST(Process, AStalePidFileDoesNotHarmWhoHasTheNumberNow) {
     WriteFile(kPidFile, self + "\n1\n");  // started at tick 1, which this process did not
     EXPECT_EQ(VEXACProcAliveByPidFile(kPidFile), 0);
     EXPECT_EQ(VEXACProcSignalByPidFile(kPidFile, SIGKILL), -1);
-    WriteFile(kPidFile, self + "\n");  // of a writer that records no start time
-    EXPECT_EQ(VEXACProcAliveByPidFile(kPidFile), 1);
+    for (const char* rest : {"\n", "\nsome remark\n"}) {  // writers that record no start time
+        WriteFile(kPidFile, self + rest);
+        EXPECT_EQ(VEXACProcAliveByPidFile(kPidFile), 1);
+    }
 }
 
 TEST(Process, WhatIsNoProcessIdIsZero) {

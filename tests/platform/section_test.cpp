@@ -41,7 +41,7 @@ constexpr char kText[] =
     " [two] \r\n"
     "KEY=a=b\r\n"
     "KEY=second\n"
-    "[no header\n"
+    "[no=header\n"
     "UTF=\xc3\xbc\xff\n"
     "no pair\n"
     "[a]b]\n"
@@ -62,6 +62,7 @@ TEST(Section, ReadsSectionsAmongMalformedLines) {
     EXPECT_STREQ(two["KEY"], "a=b");
     EXPECT_STREQ(two["UTF"], "\xc3\xbc\xff");
     EXPECT_EQ(two["stray"], nullptr);
+    EXPECT_EQ(two["[no"], nullptr);
     EXPECT_EQ(VEXACFileGetSection(kFile, "three", two.Address()), 0);
     char value[32];
     EXPECT_EQ(VEXACFileGetSectionValue(kFile, "One", "KEY", value, sizeof value), 0);
@@ -75,20 +76,22 @@ TEST(Section, ReadsSectionsAmongMalformedLines) {
 }
 
 TEST(Section, WritesLeaveEverythingElseAsItStands) {
-    const std::string one = "; top\n[one]\n#c\n\ta=1\n\tb=2\n\n# two\n";
+    const std::string one = "; top\n[one]\n[c=1\n\ta=1\n\tb=2\n\n# two\n";
     const std::string two = "[two]\nx=\xff\n";
     WriteFile(kFile, one + two);
     EXPECT_EQ(VEXACFileSetSectionValue(kFile, "one", "c", " 3 ", kFormat), 0);
-    EXPECT_EQ(ReadFile(kFile), "; top\n[one]\n#c\n\ta=1\n\tb=2\n\tc= 3 \n\n# two\n" + two);
+    EXPECT_EQ(ReadFile(kFile), "; top\n[one]\n[c=1\n\ta=1\n\tb=2\n\tc= 3 \n\n# two\n" + two);
     EXPECT_EQ(VEXACFileSetSection(kFile, "ONE", nullptr, Hash(Pairs{{"b", "9"}, {"n", ""}}).Get(),
                                   kFormat),
               1);
-    EXPECT_EQ(ReadFile(kFile), "; top\n[one]\n#c\n\tb=9\n\tn=\n\n# two\n" + two);
+    EXPECT_EQ(ReadFile(kFile), "; top\n[one]\n[c=1\n\tb=9\n\tn=\n\n# two\n" + two);
     EXPECT_EQ(VEXACFileAddSection(kFile, "new", Hash(Pairs{{"z", "1"}, {"a", "2"}}).Get(), kFormat),
               1);
     EXPECT_EQ(ReadFile(kFile),
-              "; top\n[one]\n#c\n\tb=9\n\tn=\n\n# two\n" + two + "[new]\n\tz=1\n\ta=2\n");
+              "; top\n[one]\n[c=1\n\tb=9\n\tn=\n\n# two\n" + two + "[new]\n\tz=1\n\ta=2\n");
     EXPECT_EQ(VEXACFileAddSection(kFile, "new", Hash().Get(), kFormat), -1);
+    EXPECT_EQ(VEXACFileAddSection(kFile, " blanks ", Hash().Get(), kFormat), 1);
+    EXPECT_EQ(VEXACFileSetSection(kFile, " blanks ", nullptr, Hash().Get(), kFormat), 1);
     EXPECT_EQ(VEXACFileSetSection(kFile, "none", nullptr, Hash().Get(), kFormat), 0);
 }
 

@@ -52,8 +52,11 @@ PidFile ReadPidFile(const char* file) {
     std::string_view rest = text;
     const std::string first(Readable(TakeLine(&rest)));
     const long pid = std::strtol(first.c_str(), nullptr, 10);
-    return {pid > 0 && pid <= INT_MAX ? static_cast<pid_t>(pid) : 0,
-            std::string(Readable(TakeLine(&rest)))};
+    std::string startTime(Readable(TakeLine(&rest)));
+    if (startTime.find_first_not_of("0123456789") != startTime.npos) {
+        startTime.clear();  // a remark of another writer
+    }
+    return {pid > 0 && pid <= INT_MAX ? static_cast<pid_t>(pid) : 0, startTime};
 }
 
 // Throws when the process is not there any more.

@@ -17,7 +17,8 @@ using namespace tavicore;
 
 namespace {
 
-constexpr char kCommentMarks[] = "#;";
+// A "[" that is no header lacks its closing bracket and is passed over.
+constexpr char kPassedOver[] = "#;[";
 
 using Lines = std::vector<std::string>;
 
@@ -47,7 +48,7 @@ std::optional<std::string> ReadHeader(std::string_view line) {
 }
 
 std::optional<Pair> ReadKey(std::string_view line) {
-    auto pair = ReadPair(line, kCommentMarks);
+    auto pair = ReadPair(line, kPassedOver);
     if (pair) {
         pair->key = TrimRight(pair->key);
     }
@@ -89,7 +90,7 @@ std::optional<Section> FindSection(const Lines& lines, const char* name) {
 }
 
 void CheckSectionName(std::string_view name) {
-    if (name.empty() || HasLineBreak(name) || name != TrimLeft(TrimRight(name))) {
+    if (name.empty() || HasLineBreak(name)) {
         throw Failure{VEXAC_ERR_BAD_PARAMETER};
     }
 }
