@@ -14,7 +14,6 @@
 namespace taviwireless::test {
 
 constexpr char kInfo1[] = "/tmp/usbmodem.info1";
-constexpr char kDialPort[] = "/dev/ttyUSB0";
 constexpr char kQueryPort[] = "/dev/ttyUSB1";
 
 // Lines as a modem sends them.
