@@ -1,5 +1,5 @@
 # What "cmake --install" installs: the library, the host edition of the SDK it runs on, headers,
-# programs, a pkg-config file and a CMake package.
+# programs, what starts the daemon, a pkg-config file and a CMake package.
 include(CMakePackageConfigHelpers)
 set(package_dir ${CMAKE_INSTALL_LIBDIR}/cmake/taviwireless)
 
@@ -9,17 +9,31 @@ if(NOT TAVI_SDK_ROOT)
   install(TARGETS tavicore tavisdk EXPORT taviwireless)
   install(DIRECTORY platform/include/ DESTINATION ${CMAKE_INSTALL_INCLUDEDIR})
 endif()
-install(TARGETS taviwireless_cli)
+install(TARGETS taviwireless_cli usbmodemd)
 if(TARGET modemsim)
   install(TARGETS modemsim)
   install(DIRECTORY sim/personalities/ DESTINATION ${CMAKE_INSTALL_DATADIR}/taviwireless/modemsim)
 endif()
 
-configure_file(packaging/taviwireless.pc.in taviwireless.pc @ONLY)
-install(FILES ${CMAKE_CURRENT_BINARY_DIR}/taviwireless.pc
-        DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig)
 install(EXPORT taviwireless NAMESPACE taviwireless:: DESTINATION ${package_dir}
-        FILE taviwirelessConfig.cmake)
+        FILE taviwirelessTargets.cmake)
+install(FILES packaging/taviwirelessConfig.cmake DESTINATION ${package_dir})
 write_basic_package_version_file(taviwirelessConfigVersion.cmake COMPATIBILITY SameMajorVersion)
 install(FILES ${CMAKE_CURRENT_BINARY_DIR}/taviwirelessConfigVersion.cmake
         DESTINATION ${package_dir})
+
+# These hold the prefix, which "cmake --install --prefix" may still change: so they are written when
+# the project is installed.
+function(tavi_install_configured file folder)
+  install(CODE "
+    set(PROJECT_VERSION \"${PROJECT_VERSION}\")
+    set(PROJECT_DESCRIPTION \"${PROJECT_DESCRIPTION}\")
+    set(CMAKE_INSTALL_BINDIR \"${CMAKE_INSTALL_BINDIR}\")
+    set(CMAKE_INSTALL_LIBDIR \"${CMAKE_INSTALL_LIBDIR}\")
+    set(CMAKE_INSTALL_INCLUDEDIR \"${CMAKE_INSTALL_INCLUDEDIR}\")
+    configure_file(\"${PROJECT_SOURCE_DIR}/packaging/${file}.in\"
+                   \"\$ENV{DESTDIR}\${CMAKE_INSTALL_PREFIX}/${folder}/${file}\" @ONLY)")
+endfunction()
+tavi_install_configured(taviwireless.pc ${CMAKE_INSTALL_LIBDIR}/pkgconfig)
+tavi_install_configured(com.merilond.usbmodem.service share/dbus-1/services)
+tavi_install_configured(usbmodemd.service lib/systemd/user)

@@ -1,7 +1,7 @@
 # libtaviwireless.so.4: the product, linked from the object libraries of its folders.
 add_library(taviwireless SHARED)
-target_link_libraries(taviwireless PRIVATE tavi_common tavi_usbmodem)
-target_link_libraries(taviwireless PUBLIC tavi::core tavi::sdk)
+target_link_libraries(taviwireless PRIVATE tavi_common tavi_usbmodem tavi_dbus)
+target_link_libraries(taviwireless PUBLIC tavi::core tavi::sdk PkgConfig::DBUS)
 target_include_directories(taviwireless PUBLIC
   $<BUILD_INTERFACE:${PROJECT_SOURCE_DIR}/include>
   $<INSTALL_INTERFACE:${CMAKE_INSTALL_INCLUDEDIR}>)

@@ -66,11 +66,7 @@ int USBModemList::SearchInfoPath() {
     return 0;
 }
 
-int USBModemList::Update() {
-    if (SearchInfoPath() != 0) {
-        TAVI_LOG_ERROR("Failed to search info path");
-        return -1;
-    }
+void USBModemList::DropUnplugged() {
     // The record that moves into a freed place is not looked at until the next call. Kept: clients
     // may count on seeing modems go one by one.
     for (size_t i = 0; i < records_.size(); ++i) {
@@ -78,6 +74,14 @@ int USBModemList::Update() {
             records_.erase(records_.begin() + static_cast<std::ptrdiff_t>(i));
         }
     }
+}
+
+int USBModemList::Update() {
+    if (SearchInfoPath() != 0) {
+        TAVI_LOG_ERROR("Failed to search info path");
+        return -1;
+    }
+    DropUnplugged();
     for (USBModem& modem : records_) {
         if (!modem.IsInited() && modem.InitInfo() < 0) {
             TAVI_LOG_ERROR("Failed to init info [%d]", static_cast<int>(modem.GetIfid()));

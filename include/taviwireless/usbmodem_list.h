@@ -12,7 +12,7 @@ namespace taviwireless::usbmodem_lib {
 // The modems that are plugged in, in the order in which they were found. Owns their records.
 //
 // A list has no lock: it belongs to the thread that owns it. References to records stay valid until
-// the next SearchInfoPath or Update.
+// the next SearchInfoPath, DropUnplugged or Update.
 class TAVIWIRELESS_API USBModemList {
   public:
     USBModemList();
@@ -23,9 +23,12 @@ class TAVIWIRELESS_API USBModemList {
     // listed.
     int SearchInfoPath();
 
-    // Brings the list up to date: SearchInfoPath, drop the modems whose info file is gone, and
-    // InitInfo for each that is not initialised. Of two modems unplugged at once whose records are
+    // Drops the modems whose info file is gone. Of two modems unplugged at once whose records are
     // neighbours, the second is dropped by the next call.
+    void DropUnplugged();
+
+    // Brings the list up to date: SearchInfoPath, DropUnplugged, and InitInfo for each modem that is
+    // not initialised.
     // Returns 0, or -1 as soon as one modem cannot be initialised (up to six seconds); those behind
     // it wait for the next call.
     int Update();

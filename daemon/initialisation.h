@@ -1,0 +1,37 @@
+#ifndef TAVIWIRELESS_DAEMON_INITIALISATION_H
+#define TAVIWIRELESS_DAEMON_INITIALISATION_H
+
+#include <glib.h>
+#include <taviwireless/usbmodem_list.h>
+
+#include <optional>
+
+#include "daemon/info_files.h"
+#include "daemon/probe.h"
+
+namespace taviwireless::daemon {
+
+// Makes one modem of the list ready for use, and tries again with growing pauses while it does not
+// answer.
+class Initialisation {
+  public:
+    // Starts. The modem is looked up in list whenever something is done with it.
+    Initialisation(usbmodem_lib::USBModemList& list, int interfaceId);
+    ~Initialisation();
+    Initialisation(const Initialisation&) = delete;
+    Initialisation& operator=(const Initialisation&) = delete;
+
+  private:
+    void Try();
+    void Probed(bool answers);
+
+    usbmodem_lib::USBModemList& list_;
+    int interfaceId_;
+    guint pause_;  // seconds, before the next try
+    guint retry_ = 0;
+    std::optional<Probe> probe_;
+};
+
+}  // namespace taviwireless::daemon
+
+#endif

@@ -1,0 +1,155 @@
+// usbmodemd: serves the USB modems that are plugged in on the session bus.
+#include <glib-unix.h>
+#include <syslog.h>
+#include <taviwireless/usbmodem_server.h>
+#include <unistd.h>
+
+#include <cstdio>
+#include <cstdlib>
+#include <exception>
+#include <optional>
+#include <stdexcept>
+#include <string>
+
+#include "daemon/background.h"
+#include "daemon/info_file_watch.h"
+#include "daemon/modem_keeper.h"
+#include "daemon/probe.h"
+#include "daemon/semaphore_sets.h"
+#include "daemon/session_bus.h"
+
+using namespace taviwireless::daemon;
+using taviwireless::dbus::USBModemServer;
+
+namespace {
+
+constexpr char kName[] = "usbmodemd";
+constexpr char kService[] = "com.merilond.usbmodem";
+constexpr int kUsageError = 2;
+
+constexpr char kDescription[] =
+    "Serves the USB modems that are plugged in as com.merilond.usbmodem on the session bus.\n"
+    "A modem is plugged in while there is an info file \"/tmp/usbmodem.info\" and a number.\n"
+    "taviwireless modem shows what it serves; SIGTERM ends it, connections stay up.\n"
+    "\n"
+    "Exit status: 0 ended by SIGTERM or SIGINT, 1 failed, 2 wrong usage.";
+
+struct Options {
+    gboolean foreground = FALSE;
+    gboolean version = FALSE;
+    gint probe = -1;
+    gboolean isProbe = FALSE;
+};
+
+Options options;
+
+gboolean TakeProbe(const gchar*, const gchar* value, gpointer, GError**) {
+    options.probe = atoi(value);
+    options.isProbe = TRUE;
+    return TRUE;
+}
+
+// False after a message about wrong usage.
+bool ParseOptions(int argc, char** argv) {
+    const GOptionEntry entries[] = {
+        {"foreground", 'f', 0, G_OPTION_ARG_NONE, &options.foreground,
+         "Stay in the foreground and log to standard error as well", nullptr},
+        {"version", 0, 0, G_OPTION_ARG_NONE, &options.version, "Show the version", nullptr},
+        {"probe", 0, G_OPTION_FLAG_HIDDEN, G_OPTION_ARG_CALLBACK,
+         reinterpret_cast<gpointer>(TakeProbe), nullptr, nullptr},
+        {}};
+    GOptionContext* context = g_option_context_new(nullptr);
+    g_option_context_set_summary(context, kDescription);
+    g_option_context_add_main_entries(context, entries, nullptr);
+    GError* error = nullptr;
+    bool isRight = g_option_context_parse(context, &argc, &argv, &error);
+    if (!isRight) {
+        fprintf(stderr, "%s: %s; see %s --help\n", kName, error->message, kName);
+        g_error_free(error);
+    } else if (argc > 1) {
+        fprintf(stderr, "%s: there are no arguments such as %s; see %s --help\n", kName, argv[1],
+                kName);
+        isRight = false;
+    }
+    g_option_context_free(context);
+    return isRight;
+}
+
+// What GLib and dbus-glib have to say goes where everything else goes.
+void LogToSystem(const gchar* domain, GLogLevelFlags, const gchar* message, gpointer) {
+    syslog(LOG_WARNING, "%s: %s", domain != nullptr ? domain : "GLib", message);
+}
+
+void TakeName(USBModemServer& server, const SessionBus& bus) {
+    if (!server.Initialize()) {
+        throw std::runtime_error(std::string("the session bus refuses the name ") + kService);
+    }
+    const std::string owner = bus.OwnerOf(kService);
+    const char* self = server.GetConnectionName();
+    if (self == nullptr || owner != self) {
+        throw std::runtime_error(std::string(kService) +
+                                 " is served by another process already; end that first");
+    }
+}
+
+// Serves until a signal or the end of the bus. Returns the exit status.
+int Serve(std::optional<Background>& background) {
+    int status = EXIT_SUCCESS;
+    USBModemServer* running = nullptr;
+    SessionBus bus([] { RemovePrivateSemaphoreSets(getpid()); },
+                   [&] {
+                       syslog(LOG_ERR, "the session bus has gone away; ending");
+                       status = EXIT_FAILURE;
+                       running->QuitLoop();
+                   });
+    USBModemServer server;
+    running = &server;
+    TakeName(server, bus);
+    ModemKeeper keeper(*server.GetList());
+    InfoFileWatch watch([&keeper] { keeper.Rescan(); });
+    for (const int number : {SIGTERM, SIGINT}) {
+        g_unix_signal_add(
+            number,
+            [](gpointer ended) -> gboolean {
+                static_cast<USBModemServer*>(ended)->QuitLoop();
+                return G_SOURCE_CONTINUE;
+            },
+            &server);
+    }
+    if (background) {
+        background->Ready();
+    }
+    keeper.Rescan();
+    server.StartLoop();
+    return status;
+}
+
+}  // namespace
+
+int main(int argc, char** argv) {
+    if (!ParseOptions(argc, argv)) {
+        return kUsageError;
+    }
+    if (options.version) {
+        puts("usbmodemd " TAVI_VERSION);
+        return EXIT_SUCCESS;
+    }
+    openlog(kName, LOG_PID | (options.foreground ? LOG_PERROR : 0), LOG_DAEMON);
+    if (options.isProbe) {
+        return Probe::Run(options.probe);
+    }
+    g_log_set_default_handler(LogToSystem, nullptr);
+    try {
+        std::optional<Background> background;
+        if (!options.foreground) {
+            background.emplace();
+        }
+        return Serve(background);
+    } catch (const std::exception& error) {
+        syslog(LOG_ERR, "%s", error.what());
+        if (!options.foreground) {
+            fprintf(stderr, "%s: %s\n", kName, error.what());
+        }
+        return EXIT_FAILURE;
+    }
+}

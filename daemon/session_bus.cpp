@@ -1,0 +1,64 @@
+#include "daemon/session_bus.h"
+
+#include <glib.h>
+#include <taviwireless/dbus_client.h>
+
+#include <stdexcept>
+#include <utility>
+
+namespace taviwireless::daemon {
+
+SessionBus::SessionBus(std::function<void()> onServed, std::function<void()> onLost)
+    : onServed_(std::move(onServed)), onLost_(std::move(onLost)) {
+    DBusError error;
+    dbus_error_init(&error);
+    connection_ = dbus_bus_get(DBUS_BUS_SESSION, &error);
+    if (connection_ == nullptr) {
+        const std::string reason = error.message;
+        dbus_error_free(&error);
+        throw std::runtime_error("cannot reach the session bus (" + reason +
+                                 "); start one with dbus-run-session, or set "
+                                 "DBUS_SESSION_BUS_ADDRESS to the address of yours");
+    }
+    dbus_connection_set_exit_on_disconnect(connection_, FALSE);
+    dbus_connection_add_filter(connection_, Look, this, nullptr);
+}
+
+SessionBus::~SessionBus() {
+    if (served_ != 0) {
+        g_source_remove(served_);
+    }
+    dbus_connection_remove_filter(connection_, Look, this);
+    dbus_connection_unref(connection_);
+}
+
+std::string SessionBus::OwnerOf(const char* name) const {
+    dbus::DBusClient bus(DBUS_SERVICE_DBUS, DBUS_PATH_DBUS, DBUS_INTERFACE_DBUS, DBUS_BUS_SESSION);
+    constexpr int kDefaultTimeout = -1;
+    std::string owner;
+    if (bus.NewMessage("GetNameOwner") == 0 && bus.Append(name) == 0 &&
+        bus.SendMessage(true, kDefaultTimeout) == 0) {
+        bus.GetReply(owner);
+    }
+    return owner;
+}
+
+DBusHandlerResult SessionBus::Look(DBusConnection* /*connection*/, DBusMessage* message,
+                                   void* data) {
+    auto* self = static_cast<SessionBus*>(data);
+    if (dbus_message_is_signal(message, DBUS_INTERFACE_LOCAL, "Disconnected")) {
+        self->onLost_();
+    }
+    if (dbus_message_get_type(message) == DBUS_MESSAGE_TYPE_METHOD_CALL && self->served_ == 0) {
+        self->served_ = g_idle_add(
+            [](gpointer idle) -> gboolean {
+                static_cast<SessionBus*>(idle)->served_ = 0;
+                static_cast<SessionBus*>(idle)->onServed_();
+                return G_SOURCE_REMOVE;
+            },
+            self);
+    }
+    return DBUS_HANDLER_RESULT_NOT_YET_HANDLED;
+}
+
+}  // namespace taviwireless::daemon

@@ -1,0 +1,36 @@
+#ifndef TAVIWIRELESS_DAEMON_SESSION_BUS_H
+#define TAVIWIRELESS_DAEMON_SESSION_BUS_H
+
+#include <dbus/dbus.h>
+
+#include <functional>
+#include <string>
+
+namespace taviwireless::daemon {
+
+// The session bus as the daemon sees it: reached or not, lost, and who owns a name on it. It is the
+// connection that the service uses as well.
+class SessionBus {
+  public:
+    // Throws std::runtime_error when there is no bus. The first function is called after each call
+    // of a method was served, the second when the bus goes away.
+    SessionBus(std::function<void()> onServed, std::function<void()> onLost);
+    ~SessionBus();
+    SessionBus(const SessionBus&) = delete;
+    SessionBus& operator=(const SessionBus&) = delete;
+
+    // The unique name of the owner; empty when there is none.
+    std::string OwnerOf(const char* name) const;
+
+  private:
+    static DBusHandlerResult Look(DBusConnection* connection, DBusMessage* message, void* self);
+
+    std::function<void()> onServed_;
+    std::function<void()> onLost_;
+    DBusConnection* connection_;
+    unsigned int served_ = 0;  // GLib source, while one is waiting
+};
+
+}  // namespace taviwireless::daemon
+
+#endif

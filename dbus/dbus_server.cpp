@@ -1,0 +1,96 @@
+#include <memory>
+
+// The appliance's GLib wants types and threads initialised; later ones do both by themselves.
+#define GLIB_DISABLE_DEPRECATION_WARNINGS
+#include <dbus/dbus-glib-lowlevel.h>
+#include <taviwireless/dbus_server.h>
+
+#include "common/log.h"
+
+namespace taviwireless::dbus {
+
+namespace {
+
+constexpr char kBusService[] = "org.freedesktop.DBus";
+constexpr char kBusPath[] = "/org/freedesktop/DBus";
+
+}  // namespace
+
+DBusServer::DBusServer(const char* busName, const char* path, DBusBusType type)
+    : busType_(type), busName_(busName), path_(path) {
+    g_type_init();
+    connection_ = dbus_g_bus_get(busType_, nullptr);
+    if (connection_ != nullptr) {
+        proxy_ = dbus_g_proxy_new_for_name(connection_, kBusService, kBusPath, kBusService);
+    }
+}
+
+DBusServer::~DBusServer() {
+    if (proxy_ != nullptr) {
+        g_object_unref(proxy_);
+    }
+}
+
+bool DBusServer::initialize(GType type, const DBusGObjectInfo* info, GObject* object) {
+    if (proxy_ == nullptr) {
+        TAVI_LOG_ERROR("Failed to acquire %s: %s", busName_.c_str(), "there is no message bus");
+        return false;
+    }
+    dbus_g_object_type_install_info(type, info);
+    constexpr guint kNoFlags = 0;  // neither replacing nor replaceable
+    guint result = 0;              // not looked at: being second in the queue is no failure
+    GError* error = nullptr;
+    if (!dbus_g_proxy_call(proxy_, "RequestName", &error, G_TYPE_STRING, busName_.c_str(),
+                           G_TYPE_UINT, kNoFlags, G_TYPE_INVALID, G_TYPE_UINT, &result,
+                           G_TYPE_INVALID)) {
+        const std::unique_ptr<GError, decltype(&g_error_free)> owned(error, g_error_free);
+        TAVI_LOG_ERROR("Failed to acquire %s: %s", busName_.c_str(), error->message);
+        return false;
+    }
+    dbus_g_connection_register_g_object(connection_, path_.c_str(), object);
+    return true;
+}
+
+void DBusServer::StartLoop() {
+    if (loop_ != nullptr) {
+        return;
+    }
+    loop_ = g_main_loop_new(nullptr, FALSE);
+    if (!g_threads_got_initialized) {
+        g_thread_init(nullptr);
+    }
+    dbus_g_thread_init();
+    g_main_loop_run(loop_);
+    // QuitLoop has cleared the field, and the loop object stays: whoever quit it may still hold it.
+    if (loop_ != nullptr) {
+        g_main_loop_unref(loop_);
+        loop_ = nullptr;
+    }
+}
+
+void DBusServer::QuitLoop() {
+    if (loop_ != nullptr) {
+        g_main_loop_quit(loop_);
+        loop_ = nullptr;
+    }
+}
+
+const char* DBusServer::GetInterface() const {
+    return proxy_ != nullptr ? dbus_g_proxy_get_interface(proxy_) : nullptr;
+}
+
+const char* DBusServer::GetPath() const {
+    return proxy_ != nullptr ? dbus_g_proxy_get_path(proxy_) : nullptr;
+}
+
+const char* DBusServer::GetBusName() const {
+    return proxy_ != nullptr ? dbus_g_proxy_get_bus_name(proxy_) : nullptr;
+}
+
+const char* DBusServer::GetConnectionName() const {
+    return connection_ != nullptr
+               ? dbus_bus_get_unique_name(dbus_g_connection_get_connection(connection_))
+               : nullptr;
+}
+
+}  // namespace taviwireless::dbus

@@ -1,0 +1,19 @@
+#ifndef TAVIWIRELESS_DBUS_USBMODEM_DOCUMENTS_H
+#define TAVIWIRELESS_DBUS_USBMODEM_DOCUMENTS_H
+
+#include <taviwireless/usbmodem.h>
+
+#include <string>
+
+namespace taviwireless::dbus {
+
+// What GetProfile answers: the profile of the modem's SIM.
+std::string ProfileDocument(usbmodem_lib::USBModem& modem);
+
+// What GetUSBModem answers: the modem, its SIM, its connection and the profile. Looks at the link
+// first.
+std::string ModemDocument(usbmodem_lib::USBModem& modem);
+
+}  // namespace taviwireless::dbus
+
+#endif

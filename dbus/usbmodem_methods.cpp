@@ -1,0 +1,215 @@
+#include "dbus/usbmodem_methods.h"
+
+#include <unistd.h>
+
+#include <cstring>
+#include <initializer_list>
+#include <sstream>
+#include <string>
+
+#include "common/log.h"
+#include "dbus/usbmodem_documents.h"
+
+namespace taviwireless::dbus {
+
+namespace {
+
+using usbmodem_lib::USBModem;
+
+// The quark that clients know the service's errors by: GLib's own third, which no D-Bus name is
+// registered for, so that the error's name holds quark and code.
+constexpr GQuark kErrorDomain = 3;
+constexpr int kBadParameter = 1;
+constexpr int kModemFailed = -1;
+
+constexpr unsigned int kReconnectPause = 3;  // seconds, for the modem to get over the hang-up
+
+// Logs text and makes it the error, which the caller of the method sees. Returns FALSE, which is
+// what a method returns then.
+gboolean Fail(GError** error, int code, const std::string& text) {
+    TAVI_LOG_ERROR("%s", text.c_str());
+    g_set_error_literal(error, kErrorDomain, code, text.c_str());
+    return FALSE;
+}
+
+// The modem a method is for: known and ready for use. Null with the error set otherwise, and when
+// one of the arguments is missing.
+USBModem* ReadyModem(USBModemObject* object, std::initializer_list<const char*> arguments,
+                     GError** error) {
+    bool isComplete = object != nullptr;
+    for (const char* argument : arguments) {
+        isComplete = isComplete && argument != nullptr;
+    }
+    if (!isComplete) {
+        Fail(error, kBadParameter, "Bad parameter");
+        return nullptr;
+    }
+    const std::string devid = *arguments.begin();
+    USBModem& modem = object->list.FindUSBModem(devid);
+    if (modem.IsNull()) {
+        Fail(error, kModemFailed, "USBModem [" + devid + "] not found");
+        return nullptr;
+    }
+    if (!modem.IsInited()) {
+        Fail(error, kModemFailed, "USBModem [" + devid + "] not inited");
+        return nullptr;
+    }
+    return &modem;
+}
+
+// The end of a method that changes the SIM: result is the device layer's.
+gboolean Finish(int result, const char* failure, const char* devid, GError** error) {
+    return result >= 0 ? TRUE : Fail(error, -result, std::string(failure) + " [" + devid + "]");
+}
+
+// One line per modem that is ready for use.
+template <typename Describe>
+gboolean ListModems(USBModemObject* object, char** list, GError** error, Describe describe) {
+    if (object == nullptr) {
+        return Fail(error, kBadParameter, "Bad parameter");
+    }
+    std::string text;
+    for (USBModem& modem : object->list) {
+        if (!modem.IsNull() && modem.IsInited()) {
+            text += describe(modem) + '\n';
+        }
+    }
+    *list = g_strdup(text.c_str());
+    return TRUE;
+}
+
+// D-Bus carries UTF-8 only, and a modem may send anything.
+char* ToUTF8(const std::string& text) {
+    return g_utf8_make_valid(text.c_str(), static_cast<gssize>(text.size()));
+}
+
+constexpr const char* kProfileKeys[] = {"apn",  "number",   "user", "pass",
+                                        "IMSI", "location", "isp",  "default_gw"};
+
+// Sets what a line "KEY=VALUE" says. The key counts wherever it stands in the line: kept, clients
+// write lines such as "usbmodem_apn=x". A line without a key says nothing.
+bool SetProfileLine(USBModem& modem, const std::string& line, GError** error) {
+    for (const char* key : kProfileKeys) {
+        const std::string begin = std::string(key) + '=';
+        const size_t position = line.find(begin);
+        if (position == std::string::npos) {
+            continue;
+        }
+        const std::string value = line.substr(position + begin.size());
+        if (modem.SetProfileWithKey(key, value) < 0) {
+            const std::string shown = std::strcmp(key, "pass") == 0 ? "***" : value;
+            Fail(error, kModemFailed,
+                 "Failed to set " + modem.GetDevId() + ": (key,value) = (" + key + "," + shown +
+                     ")");
+            return false;
+        }
+        return true;
+    }
+    return true;
+}
+
+}  // namespace
+
+gboolean usbmodem_connect(USBModemObject* object, char* devid, GError** error) {
+    USBModem* modem = ReadyModem(object, {devid}, error);
+    if (modem == nullptr) {
+        return FALSE;
+    }
+    return modem->NetConnect() == 1
+               ? TRUE
+               : Fail(error, kModemFailed, std::string("Failed to connect [") + devid + "]");
+}
+
+gboolean usbmodem_disconnect(USBModemObject* object, char* devid, GError** error) {
+    USBModem* modem = ReadyModem(object, {devid}, error);
+    if (modem == nullptr) {
+        return FALSE;
+    }
+    return modem->NetDisconnect() >= 0
+               ? TRUE
+               : Fail(error, kModemFailed, std::string("Failed to disconnect [") + devid + "]");
+}
+
+gboolean usbmodem_get_usbmodem_list(USBModemObject* object, char** list, GError** error) {
+    return ListModems(object, list, error, [](USBModem& modem) { return modem.GetDevId(); });
+}
+
+gboolean usbmodem_get_usbmodem_if_list(USBModemObject* object, char** list, GError** error) {
+    return ListModems(object, list, error, [](USBModem& modem) {
+        bool ignored = false;
+        return modem.GetNetIFName(ignored);
+    });
+}
+
+gboolean usbmodem_get_usbmodem(USBModemObject* object, char* devid, char** document,
+                               GError** error) {
+    USBModem* modem = ReadyModem(object, {devid}, error);
+    if (modem == nullptr) {
+        return FALSE;
+    }
+    *document = ToUTF8(ModemDocument(*modem));
+    return TRUE;
+}
+
+gboolean usbmodem_get_profile(USBModemObject* object, char* devid, char** document,
+                              GError** error) {
+    USBModem* modem = ReadyModem(object, {devid}, error);
+    if (modem == nullptr) {
+        return FALSE;
+    }
+    *document = ToUTF8(ProfileDocument(*modem));
+    return TRUE;
+}
+
+gboolean usbmodem_set_profile(USBModemObject* object, char* devid, char* profile, GError** error) {
+    USBModem* modem = ReadyModem(object, {devid, profile}, error);
+    if (modem == nullptr) {
+        return FALSE;
+    }
+    const std::string id = std::string("[") + devid + "]";
+    bool isUnknown = false;
+    const bool wasConnected = !modem->IsNetDisconnected(isUnknown);
+    if (isUnknown) {
+        return Fail(error, kModemFailed, "Error on checking net status " + id);
+    }
+    if (wasConnected && modem->NetDisconnect() < 0) {
+        return Fail(error, kModemFailed, "Failed to disconnect " + id);
+    }
+    std::istringstream lines(profile);
+    for (std::string line; std::getline(lines, line);) {
+        if (!SetProfileLine(*modem, line, error)) {
+            return FALSE;
+        }
+    }
+    if (wasConnected) {
+        sleep(kReconnectPause);
+        const int result = modem->NetConnect();
+        if (result < 0) {
+            return Fail(error, -result, "Failed to Connect " + id);
+        }
+    }
+    return TRUE;
+}
+
+gboolean usbmodem_unlock_sim(USBModemObject* object, char* devid, char* pin, GError** error) {
+    USBModem* modem = ReadyModem(object, {devid, pin}, error);
+    return modem == nullptr ? FALSE
+                            : Finish(modem->PINUnlock(pin), "Failed to unlock PIN", devid, error);
+}
+
+gboolean usbmodem_unlock_pin(USBModemObject* object, char* devid, char* puk, char* pin,
+                             GError** error) {
+    USBModem* modem = ReadyModem(object, {devid, puk, pin}, error);
+    return modem == nullptr ? FALSE
+                            : Finish(modem->PUKSet(puk, pin), "Failed to unlock PIN", devid, error);
+}
+
+gboolean usbmodem_set_pin(USBModemObject* object, char* devid, char* oldpin, char* newpin,
+                          gboolean protection, GError** error) {
+    USBModem* modem = ReadyModem(object, {devid, oldpin, newpin}, error);
+    return modem == nullptr ? FALSE
+                            : Finish(modem->PINSet(oldpin, newpin, protection != 0),
+                                     "Failed to set PIN", devid, error);
+}
+
+}  // namespace taviwireless::dbus

@@ -1,0 +1,142 @@
+// What the service lives through on a customer's appliance at 3 a.m.
+#include <gmock/gmock.h>
+#include <sys/stat.h>
+#include <taviwireless/usbmodem_client.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <chrono>
+#include <filesystem>
+#include <future>
+#include <thread>
+
+#include "tests/support/bus.h"
+#include "tests/support/files.h"
+#include "tests/support/modem_simulator.h"
+
+namespace taviwireless::test {
+namespace {
+
+using dbus::USBModemClient;
+using testing::HasSubstr;
+
+// A bus, a service and one modem that is ready.
+struct RunningService {
+    explicit RunningService(const std::string& modem = "12d1")
+        : simulator({"--modem", modem + ",id=0,ports=dial/at"}) {
+        EXPECT_TRUE(service.Lists({"usbmodem0"}));
+    }
+    std::string ProcFile(const std::string& name) {
+        return "/proc/" + std::to_string(service.Daemon().Pid()) + "/" + name;
+    }
+    // Kilobytes that belong to the daemon alone.
+    long Memory() {
+        const std::string status = ReadFile(ProcFile("status"));
+        return std::stol(status.substr(status.find("RssAnon:") + 8));
+    }
+    long Descriptors() {
+        using Iterator = std::filesystem::directory_iterator;
+        return std::distance(Iterator(ProcFile("fd")), Iterator());
+    }
+    PrivateBus bus;
+    ModemSimulator simulator;
+    ModemService service;
+};
+
+TEST(Survival, AModemThatVanishesWithinACall) {
+    RunningService running;
+    running.simulator.Fault("0", "vanish=5");
+    const RunResult vanished = CallService({"GetUSBModem", "usbmodem0"});
+    EXPECT_THAT(vanished.out, HasSubstr("\"id\": \"usbmodem0\"")) << vanished.err;
+    EXPECT_TRUE(running.service.Lists({}));
+    EXPECT_THAT(CallService({"GetUSBModem", "usbmodem0"}).err, HasSubstr("not found"));
+    running.simulator.Fault("0", "off");
+    running.simulator.Plug("0");
+    EXPECT_TRUE(running.service.Lists({"usbmodem0"}));
+}
+
+TEST(Survival, APortThatGoesSilentCostsLessThanTheBusWaits) {
+    RunningService running;
+    running.simulator.Fault("0", "silent");
+    std::string document;
+    const auto begin = std::chrono::steady_clock::now();
+    EXPECT_EQ(USBModemClient().GetUSBModem("usbmodem0", document), 0);
+    EXPECT_LT(std::chrono::steady_clock::now() - begin, std::chrono::seconds(20));
+    EXPECT_THAT(document, HasSubstr("\"product\": \"\""));
+    running.simulator.Fault("0", "off");
+    EXPECT_EQ(USBModemClient().GetUSBModem("usbmodem0", document), 0);
+    EXPECT_THAT(document, HasSubstr("\"product\": \"E1752\""));
+}
+
+TEST(Survival, ACallerThatDoesNotWaitForItsReply) {
+    RunningService running;
+    for (int i = 0; i < 3; ++i) {
+        Process caller({"gdbus", "call", "--session", "-d", "com.merilond.usbmodem", "-o", "/",
+                        "-m", "com.merilond.usbmodem.GetUSBModem", "usbmodem0"});
+        std::this_thread::sleep_for(std::chrono::milliseconds(200));
+        caller.Signal(SIGKILL);
+    }
+    EXPECT_TRUE(running.service.Lists({"usbmodem0"}));
+}
+
+TEST(Survival, FiftyClientsAtOnce) {
+    RunningService running;
+    std::vector<std::future<RunResult>> calls;
+    for (int i = 0; i < 50; ++i) {
+        calls.push_back(std::async(std::launch::async, [i] {
+            return i % 2 == 0 ? CallService({"GetUSBModemList"})
+                              : CallService({"GetProfile", "usbmodem0"});
+        }));
+    }
+    for (size_t i = 0; i < calls.size(); ++i) {
+        EXPECT_THAT(calls[i].get().out, HasSubstr(i % 2 == 0 ? "usbmodem0" : "\"apn\": "));
+    }
+}
+
+TEST(Survival, ABusThatIsRestartedEndsItWithAMessage) {
+    PrivateBus bus;
+    const std::string command = BuiltProgram("usbmodemd") + " --foreground 2>&1";
+    ModemService service({"sh", "-c", "exec " + command});
+    bus.Restart();
+    EXPECT_EQ(service.Daemon().Wait(), 1);
+    EXPECT_THAT(service.Daemon().ReadLine().value_or(""),
+                HasSubstr("the session bus has gone away; ending"));
+}
+
+// While a connection comes up nothing is sent to the modem, so requests cost no waiting.
+TEST(Survival, TenThousandStatusRequestsWithoutGrowth) {
+    WriteFile("/etc/ppp/peers/wvdial", "noauth\n");
+    WriteFile("/usr/tavi/bin/wvdial", "#!/bin/sh\nexec sleep 1000\n");
+    chmod("/usr/tavi/bin/wvdial", 0755);
+    RunningService running;
+    USBModemClient client;
+    std::string document;
+    ASSERT_EQ(client.Connect("usbmodem0"), 0);
+    const auto ask = [&](int times) {
+        for (int i = 0; i < times; ++i) {
+            ASSERT_EQ(client.GetUSBModem("usbmodem0", document), 0);
+        }
+    };
+    ask(500);
+    ASSERT_THAT(document, HasSubstr("\"net_status\": \"connecting\""));
+    const long memory = running.Memory();
+    const long descriptors = running.Descriptors();
+    ask(10000);
+    EXPECT_LE(running.Memory(), memory + 64);  // kilobytes; 10,000 lost bytes-per-request show
+    EXPECT_EQ(running.Descriptors(), descriptors);
+}
+
+TEST(Survival, ALowLimitOnSemaphoreSets) {
+    WriteFile("/proc/sys/kernel/sem", "32000 1024000 500 24");
+    RunningService running;
+    std::string document;
+    for (int i = 0; i < 5; ++i) {  // more than 20 commands, of two sets each
+        ASSERT_EQ(USBModemClient().GetUSBModem("usbmodem0", document), 0);
+        EXPECT_THAT(document, HasSubstr("\"pin_remains\": 3"));
+    }
+    const std::string sets = ReadFile("/proc/sysvipc/sem");
+    EXPECT_EQ(std::count(sets.begin(), sets.end(), '\n'), 1) << sets;  // the heading alone
+}
+
+}  // namespace
+}  // namespace taviwireless::test
