@@ -1,8 +1,10 @@
 #ifndef TAVIWIRELESS_CLI_COMMANDS_H
 #define TAVIWIRELESS_CLI_COMMANDS_H
 
+#include <optional>
 #include <stdexcept>
 #include <string>
+#include <vector>
 
 namespace CLI {
 class App;
@@ -11,7 +13,14 @@ class App;
 namespace taviwireless::cli {
 
 // What the program ends with.
-enum ExitStatus { kSuccess = 0, kFailure = 1, kUsage = 2, kNotFound = 3, kBusy = 4 };
+enum ExitStatus {
+    kSuccess = 0,
+    kFailure = 1,
+    kUsage = 2,
+    kNotFound = 3,
+    kBusy = 4,
+    kNoService = 5
+};
 
 // A failure to report: one plain sentence, and what the program ends with.
 class CommandError : public std::runtime_error {
@@ -24,16 +33,34 @@ class CommandError : public std::runtime_error {
     ExitStatus status_;
 };
 
-// Options of every command.
+// What the command line says.
 struct Options {
     bool json = false;
+
+    // modem
+    bool direct = false;         // ask the modems themselves, not the service
+    std::string id;              // device id; empty when none was given
+    std::optional<int> timeout;  // seconds
+    bool showSecrets = false;
+    bool force = false;                 // use up the last attempt without a question
+    bool noWait = false;                // connect: return as soon as the dialler runs
+    std::vector<std::string> settings;  // profile set: KEY=VALUE or KEY
 };
 
 // Each adds a group of commands. A command runs while the arguments are parsed and throws
 // CommandError when it fails.
-void AddModemCommands(CLI::App& app, const Options& options);
-void AddConnectionCommands(CLI::App& modem, const Options& options);
-void AddProfileCommands(CLI::App& modem, const Options& options);
+void AddModemCommands(CLI::App& app, Options& options);
+void AddWatchCommand(CLI::App& modem, Options& options);
+void AddPINCommands(CLI::App& modem, Options& options);
+void AddProfileCommands(CLI::App& modem, Options& options);
+void AddConnectionCommands(CLI::App& modem, Options& options);
+
+// One command of those groups, with what all of them take.
+CLI::App& AddModemCommand(CLI::App& group, const char* name, const char* description,
+                          Options& options);
+// The same for a command about one modem.
+CLI::App& AddCommandWithID(CLI::App& group, const char* name, const char* description,
+                           Options& options);
 
 }  // namespace taviwireless::cli
 

@@ -4,69 +4,22 @@
 #include <CLI/CLI.hpp>
 #include <chrono>
 #include <iomanip>
-#include <iostream>
-#include <memory>
 #include <sstream>
 #include <thread>
 
 #include "cli/commands.h"
+#include "cli/deadline.h"
+#include "cli/modem_access.h"
 #include "cli/output.h"
-#include "cli/plugged_modem.h"
 
 namespace taviwireless::cli {
 
 namespace {
 
-using usbmodem_lib::USBModem;
-using usbmodem_lib::USBModemList;
 using Clock = std::chrono::steady_clock;
 
 constexpr std::chrono::milliseconds kLookPause{250};
-
-struct Arguments {
-    std::string id;
-    int timeout = 60;  // seconds
-    bool noWait = false;
-};
-
-struct Connection {
-    std::string status;  // "connected", "connecting", "disconnected", "connection_lost"
-    std::string interface;
-    std::string address;
-};
-
-// The modem, ready to look at its connection. The dialler's log is found by the IMSI: a look
-// without it would take a running connection for one that failed, and end it.
-USBModem& ConnectableModem(USBModemList& list, const std::string& id) {
-    USBModem& modem = InitialisedModem(list, id);
-    bool failed = false;
-    modem.GetIMSI(failed);
-    if (failed) {
-        ShowProgress("");
-        throw CommandError(kFailure, "the SIM of " + id +
-                                         " is not ready; taviwireless modem show " + id +
-                                         " tells what it waits for");
-    }
-    return modem;
-}
-
-// A new process knows nothing of a running connection: the first look finds the interface in the
-// dialler's log, the second its address.
-Connection Look(USBModem& modem) {
-    if (modem.UpdateNetStatus() == 2) {
-        modem.UpdateNetStatus();
-    }
-    bool failed = false;
-    Connection connection;
-    connection.status = modem.GetNetStatus(failed);
-    connection.interface = modem.GetNetIFName(failed);
-    connection.address = modem.GetNetLocalIP(failed);
-    if (failed) {
-        throw CommandError(kFailure,
-                           "cannot tell the state of the connection of " + modem.GetDevId());
-    }
-    return connection;
-}
+constexpr int kConnectTimeout = 60;  // seconds
 
 Json::Value ToJson(const std::string& id, const Connection& connection) {
     Json::Value document;
@@ -82,7 +35,7 @@ std::string ToText(const std::string& id, const Connection& connection) {
     if (!connection.address.empty()) {
         text += ", " + connection.address + " on " + connection.interface;
     }
-    return text;
+    return Printable(text);
 }
 
 double SecondsSince(Clock::time_point begin) {
@@ -95,104 +48,99 @@ std::string Seconds(double seconds, int digits) {
     return text.str();
 }
 
-// Waits until the link is up, the dialler gave up, or the time is over.
-Connection WaitUntilConnected(USBModem& modem, int timeout) {
+// Looks until the link is up or the dialler gave up; the deadline ends it otherwise.
+Connection WaitUntilConnected(ModemAccess& access, const std::string& id, bool noWait) {
     const auto begin = Clock::now();
     for (;;) {
-        const Connection connection = Look(modem);
-        if (connection.status == "connected") {
+        const Connection connection = access.LookAtConnection(id);
+        if (IsDisconnected(connection.status)) {
+            throw CommandError(kFailure, "the dialler of " + id +
+                                             " gave up, or could not be started; its log is in "
+                                             "/var/lib/usbmodem/, and the system log tells more");
+        }
+        if (noWait || connection.status == kConnected) {
             return connection;
         }
-        if (connection.status != "connecting") {
-            throw CommandError(kFailure, "the dialler of " + modem.GetDevId() +
-                                             " gave up; its log is in /var/lib/usbmodem/");
-        }
-        if (SecondsSince(begin) > timeout) {
-            throw CommandError(kFailure, modem.GetDevId() + " is not connected after " +
-                                             std::to_string(timeout) +
-                                             " s; it goes on trying until it is disconnected");
-        }
-        ShowProgress("Connecting " + modem.GetDevId() + " ... " + Seconds(SecondsSince(begin), 0));
+        ShowProgress("Connecting " + id + " ... " + Seconds(SecondsSince(begin), 0));
         std::this_thread::sleep_for(kLookPause);
     }
 }
 
-void Connect(const Options& options, const Arguments& arguments) {
-    USBModemList list;
-    USBModem& modem = ConnectableModem(list, arguments.id);
-    const auto begin = Clock::now();
-    bool failed = false;
-    if (!modem.IsNetDisconnected(failed)) {
-        throw CommandError(kBusy, arguments.id + " has a connection already; " +
+Connection Dial(ModemAccess& access, const Options& options, Deadline& deadline) {
+    const ModemState state = access.Look(options.id);
+    if (!IsDisconnected(state.netStatus)) {
+        throw CommandError(kBusy, options.id + " has a connection already; " +
                                       "taviwireless modem disconnect ends it");
     }
-    if (modem.NetConnect() != 1) {
-        throw CommandError(kFailure,
-                           "cannot connect " + arguments.id + "; --verbose shows the reason");
+    if (state.simStatus != kReady) {
+        throw CommandError(kFailure, "the SIM of " + options.id +
+                                         " is not ready; taviwireless modem show " + options.id +
+                                         " tells what it waits for");
     }
-    if (arguments.noWait) {
-        return;
-    }
-    const Connection connection = WaitUntilConnected(modem, arguments.timeout);
-    ShowProgress("");
+    access.Connect(options.id);
+    deadline.SetSentence(options.id + " is not connected after " +
+                         std::to_string(deadline.Seconds()) +
+                         " s; it goes on trying until it is disconnected");
+    return WaitUntilConnected(access, options.id, options.noWait);
+}
+
+void Connect(const Options& options) {
+    const auto access = MakeAccess(options);
+    Deadline deadline(options, kConnectTimeout);
+    const auto begin = Clock::now();
+    const Connection connection = deadline.Limit([&] { return Dial(*access, options, deadline); });
     const double seconds = SecondsSince(begin);
     if (options.json) {
-        Json::Value document = ToJson(arguments.id, connection);
+        Json::Value document = ToJson(options.id, connection);
         document["seconds"] = seconds;
         Print(document);
     } else {
-        std::cout << ToText(arguments.id, connection) << " after " << Seconds(seconds, 1) << '\n';
+        Print(Table{{ToText(options.id, connection) + " after " + Seconds(seconds, 1)}});
     }
 }
 
-void Disconnect(const Arguments& arguments) {
-    USBModemList list;
-    USBModem& modem = ConnectableModem(list, arguments.id);
-    ShowProgress("");
-    bool failed = false;
-    if (modem.IsNetDisconnected(failed)) {
-        throw CommandError(kFailure, arguments.id + " is not connected");
-    }
-    if (modem.NetDisconnect() != 0) {
-        throw CommandError(kFailure,
-                           "cannot disconnect " + arguments.id + "; --verbose shows the reason");
-    }
+void Disconnect(const Options& options) {
+    const auto access = MakeAccess(options);
+    const auto hangUp = [&] {
+        if (IsDisconnected(access->LookAtConnection(options.id).status)) {
+            throw CommandError(kFailure, options.id + " is not connected");
+        }
+        access->Disconnect(options.id);
+        const Connection connection = access->LookAtConnection(options.id);
+        if (!IsDisconnected(connection.status)) {
+            throw CommandError(kFailure,
+                               options.id + " is still connected; the system log tells why");
+        }
+        return connection;
+    };
+    const Connection connection = Deadline(options).Limit(hangUp);
+    options.json ? Print(ToJson(options.id, connection))
+                 : Print(Table{{ToText(options.id, connection)}});
 }
 
-void Status(const Options& options, const Arguments& arguments) {
-    USBModemList list;
-    USBModem& modem = ConnectableModem(list, arguments.id);
-    const Connection connection = Look(modem);
-    ShowProgress("");
-    if (options.json) {
-        Print(ToJson(arguments.id, connection));
-    } else {
-        std::cout << ToText(arguments.id, connection) << '\n';
-    }
+void Status(const Options& options) {
+    const auto access = MakeAccess(options);
+    const Connection connection =
+        Deadline(options).Limit([&] { return access->LookAtConnection(options.id); });
+    options.json ? Print(ToJson(options.id, connection))
+                 : Print(Table{{ToText(options.id, connection)}});
 }
 
 }  // namespace
 
-void AddConnectionCommands(CLI::App& modem, const Options& options) {
-    const auto arguments = std::make_shared<Arguments>();
-    const auto add = [&](const char* name, const char* description) {
-        CLI::App* command = modem.add_subcommand(name, description);
-        command->add_option("ID", arguments->id, "Device id, such as usbmodem0")->required();
-        return command;
-    };
+void AddConnectionCommands(CLI::App& modem, Options& options) {
+    CLI::App& connect =
+        AddCommandWithID(modem, "connect",
+                         "Dial, and wait until the link is up, at most 60 s or --timeout", options);
+    connect.add_flag("--no-wait", options.noWait, "Return as soon as the dialler runs");
+    connect.callback([&options] { Connect(options); });
 
-    CLI::App* connect = add("connect", "Dial, and wait until the link is up");
-    connect->add_flag("--no-wait", arguments->noWait, "Return as soon as the dialler runs");
-    connect->add_option("--timeout", arguments->timeout, "Seconds to wait")
-        ->check(CLI::Range(1, 3600))
-        ->capture_default_str();
-    connect->callback([&options, arguments] { Connect(options, *arguments); });
-
-    add("disconnect", "Hang up")->callback([arguments] { Disconnect(*arguments); });
-
-    add("status", "Show the state of the connection")->callback([&options, arguments] {
-        Status(options, *arguments);
+    AddCommandWithID(modem, "disconnect", "Hang up", options).callback([&options] {
+        Disconnect(options);
     });
+
+    AddCommandWithID(modem, "status", "Show the state of the connection", options)
+        .callback([&options] { Status(options); });
 }
 
 }  // namespace taviwireless::cli

@@ -1,5 +1,4 @@
 // taviwireless: the library's functions for a person or a script.
-#include <json/json.h>
 #include <syslog.h>
 
 #include <CLI/CLI.hpp>
@@ -14,18 +13,12 @@ namespace {
 
 constexpr char kFooter[] =
     "Exit status: 0 done, 1 failed, 2 wrong usage, 3 no such modem, 4 busy: it has a "
-    "connection already.\n"
+    "connection already, or is connecting; 5 the modem service is not running.\n"
     "With --json, a failure is {\"error\": SENTENCE} on standard output.\n"
     "Details of failures are in the system log; --verbose shows them here as well.";
 
 int Fail(const Options& options, ExitStatus status, const std::string& sentence) {
-    if (options.json) {
-        Json::Value document;
-        document["error"] = sentence;
-        Print(document);
-    } else {
-        std::cerr << "taviwireless: " << sentence << '\n';
-    }
+    PrintFailure(options.json, sentence);
     return status;
 }
 

@@ -19,7 +19,7 @@ size_t Width(const std::string& text) {
 
 }  // namespace
 
-void Print(const Table& table) {
+std::string ToText(const Table& table) {
     std::vector<size_t> widths;
     for (const auto& row : table) {
         widths.resize(std::max(widths.size(), row.size()));
@@ -27,21 +27,46 @@ void Print(const Table& table) {
             widths[column] = std::max(widths[column], Width(row[column]));
         }
     }
+    std::string text;
     for (const auto& row : table) {
         std::string line;
         for (size_t column = 0; column < row.size(); ++column) {
             line += row[column] + std::string(widths[column] - Width(row[column]) + 2, ' ');
         }
         line.erase(line.find_last_not_of(' ') + 1);
-        std::cout << line << '\n';
+        text += line + "\n";
     }
+    return text;
+}
+
+void Print(const Table& table) {
+    ShowProgress("");
+    std::cout << ToText(table);
 }
 
 void Print(const Json::Value& document) {
+    ShowProgress("");
     Json::StreamWriterBuilder builder;
     builder["indentation"] = "  ";
     builder["enableYAMLCompatibility"] = true;  // "key": value, without a blank before the colon
     std::cout << Json::writeString(builder, document) << '\n';
+}
+
+std::string ToLine(const Json::Value& document) {
+    Json::StreamWriterBuilder builder;
+    builder["indentation"] = "";
+    return Json::writeString(builder, document);
+}
+
+void PrintFailure(bool json, const std::string& sentence) {
+    ShowProgress("");
+    if (json) {
+        Json::Value document;
+        document["error"] = sentence;
+        Print(document);
+    } else {
+        std::cerr << "taviwireless: " << sentence << '\n';
+    }
 }
 
 std::string Printable(const std::string& text) {

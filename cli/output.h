@@ -11,11 +11,18 @@ namespace taviwireless::cli {
 // Rows of cells, each column as wide as its widest cell; the first row is the heading.
 using Table = std::vector<std::vector<std::string>>;
 
-// Prints the table on standard output.
-void Print(const Table& table);
+// The table as it is printed.
+std::string ToText(const Table& table);
 
-// Prints the document on standard output.
+// Print on standard output; what ShowProgress shows goes away.
+void Print(const Table& table);
 void Print(const Json::Value& document);
+
+// The document in one line, without its end.
+std::string ToLine(const Json::Value& document);
+
+// Reports a failure: {"error": SENTENCE} on standard output, or the sentence on standard error.
+void PrintFailure(bool json, const std::string& sentence);
 
 // Returns text with control characters replaced by "?": what a modem sends may not steer the
 // terminal.

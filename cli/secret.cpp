@@ -6,6 +6,7 @@
 #include <iostream>
 
 #include "cli/commands.h"
+#include "cli/output.h"
 
 namespace taviwireless::cli {
 
@@ -39,6 +40,7 @@ class NoEcho {
 
 std::string ReadSecret(const std::string& prompt) {
     if (isatty(STDIN_FILENO)) {
+        ShowProgress("");
         std::cerr << prompt << ": ";
     }
     const NoEcho noEcho;
@@ -47,6 +49,24 @@ std::string ReadSecret(const std::string& prompt) {
         throw CommandError(kFailure, "standard input ended before there was a line for: " + prompt);
     }
     return secret;
+}
+
+std::string ReadNewSecret(const std::string& prompt) {
+    const std::string secret = ReadSecret(prompt);
+    if (isatty(STDIN_FILENO) && ReadSecret(prompt + " again") != secret) {
+        throw CommandError(kUsage, "the two differ; nothing was sent to the modem");
+    }
+    return secret;
+}
+
+bool Confirm(const std::string& question, const std::string& withoutTerminal) {
+    if (!isatty(STDIN_FILENO)) {
+        throw CommandError(kFailure, withoutTerminal);
+    }
+    ShowProgress("");
+    std::cerr << question << " [yes/no] ";
+    std::string answer;
+    return std::getline(std::cin, answer) && answer == "yes";
 }
 
 }  // namespace taviwireless::cli

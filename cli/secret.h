@@ -9,6 +9,13 @@ namespace taviwireless::cli {
 // appears neither on the screen nor in a process list. Throws CommandError when there is none.
 std::string ReadSecret(const std::string& prompt);
 
+// ReadSecret, at a terminal twice: throws CommandError unless both are the same.
+std::string ReadNewSecret(const std::string& prompt);
+
+// Asks a question at the terminal; true when the answer is "yes". Nobody is asked when standard
+// input is none: throws CommandError with this sentence then.
+bool Confirm(const std::string& question, const std::string& withoutTerminal);
+
 }  // namespace taviwireless::cli
 
 #endif

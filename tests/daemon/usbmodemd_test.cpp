@@ -98,8 +98,8 @@ TEST(Usbmodemd, IntrospectionListsTheTenMethodsAndTheirArguments) {
 
 TEST(Usbmodemd, FollowsPluggingAndUnplugging) {
     PrivateBus bus;
-    ModemSimulator simulator(
-        {"--modem", "generic,id=0,fault=silent", "--modem", "12d1,id=1,ports=dial/at", "--modem", "2001,id=2,ports=dial/at"});
+    ModemSimulator simulator({"--modem", "generic,id=0,fault=silent", "--modem",
+                              "12d1,id=1,ports=dial/at", "--modem", "2001,id=2,ports=dial/at"});
     ModemService service;
     // The dead one, first in the list, does not keep those behind it from being served.
     EXPECT_TRUE(service.Lists({"usbmodem1", "usbmodem2"}));
@@ -127,10 +127,15 @@ TEST(Usbmodemd, EndsOnASignalAndReleasesEverything) {
     PrivateBus bus;
     ModemSimulator simulator({"--modem", "12d1,ports=dial/at"});
     for (const int number : {SIGTERM, SIGINT}) {
-        ModemService service;
+        ModemService service({"sh", "-c", "exec " + BuiltProgram("usbmodemd") + " -f 2>&1"});
         ASSERT_TRUE(service.Lists({"usbmodem0"}));
         service.Daemon().Signal(number);
         EXPECT_EQ(service.Daemon().Wait(), 0);
+        std::string log;
+        while (const auto line = service.Daemon().ReadLine()) {
+            log += *line + '\n';
+        }
+        EXPECT_THAT(log, HasSubstr(": usbmodem0 is ready\n"));
         EXPECT_FALSE(dbus::USBModemClient().IsServerReady());
         EXPECT_TRUE(std::filesystem::is_empty("/var/lock"));
     }

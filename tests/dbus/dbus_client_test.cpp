@@ -167,7 +167,8 @@ TEST(FrontEnd, TellsDoneFromFailedFromNotThere) {
     EXPECT_EQ(usbmodem_ui::Disconnect("usbmodem0"), 0);
     EXPECT_EQ(log.Text(), "");
 
-    ModemSimulator simulator({"--modem", "12d1,id=1,pin=1234,ports=dial/at", "--modem", "generic,id=3,ports=dial/at"});
+    ModemSimulator simulator(
+        {"--modem", "12d1,id=1,pin=1234,ports=dial/at", "--modem", "generic,id=3,ports=dial/at"});
     ModemService service;
     ASSERT_TRUE(service.Lists({"usbmodem1", "usbmodem3"}));
     EXPECT_EQ(usbmodem_ui::GetUSBModemList(list), 1);

@@ -1,34 +1,12 @@
-// Two processes that talk to one modem at the same time.
-#include <dlfcn.h>
+// Two processes that talk to one modem at the same time; see tests/support/short_waits.cpp for the
+// waits.
 #include <sys/prctl.h>
-#include <sys/select.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
 #include <csignal>
 
 #include "tests/usbmodem/opened_modem.h"
-
-namespace {
-
-constexpr suseconds_t kLongestQuietWait = 200000;  // µs
-constexpr suseconds_t kShortWait = 10000;          // µs
-
-}  // namespace
-
-// In place of the C library's, for the libraries as well: the waits for silence, before a command
-// and behind a reply, are cut to 10 ms, which saves a minute. What is checked stays as it was: the
-// simulated modem sends a reply in one piece, so no wait decides where a reply ends, and the wait
-// for its beginning (1 s) is not cut.
-extern "C" __attribute__((visibility("default"))) int select(int count, fd_set* readable,
-                                                             fd_set* writable, fd_set* exceptional,
-                                                             timeval* timeout) {
-    static const auto next = reinterpret_cast<decltype(&select)>(dlsym(RTLD_NEXT, "select"));
-    timeval shortened{0, kShortWait};
-    const bool isQuietWait = timeout != nullptr && timeout->tv_sec == 0 &&
-                             timeout->tv_usec > kShortWait && timeout->tv_usec <= kLongestQuietWait;
-    return next(count, readable, writable, exceptional, isQuietWait ? &shortened : timeout);
-}
 
 namespace taviwireless::test {
 namespace {

@@ -1,0 +1,71 @@
+#include "cli/deadline.h"
+
+#include <unistd.h>
+
+#include <iostream>
+
+#include "cli/output.h"
+
+namespace taviwireless::cli {
+
+Deadline::Deadline(const Options& options, std::optional<int> seconds)
+    : seconds_(options.timeout ? options.timeout : seconds), json_(options.json) {
+    if (seconds_) {
+        sentence_ = "not done within " + std::to_string(*seconds_) +
+                    " s; what was begun may still come to its end";
+        Restart();
+        watcher_ = std::thread([this] { Watch(); });
+    }
+}
+
+Deadline::~Deadline() {
+    if (watcher_.joinable()) {
+        {
+            const std::lock_guard lock(mutex_);
+            isOver_ = true;
+        }
+        changed_.notify_one();
+        watcher_.join();
+    }
+}
+
+void Deadline::Restart() {
+    const std::lock_guard lock(mutex_);
+    left_ = std::chrono::seconds(seconds_.value_or(0));
+}
+
+void Deadline::SetSentence(const std::string& sentence) {
+    const std::lock_guard lock(mutex_);
+    sentence_ = sentence;
+}
+
+void Deadline::Start() {
+    const std::lock_guard lock(mutex_);
+    end_ = Clock::now() + left_;
+    changed_.notify_one();
+}
+
+void Deadline::Stop() {
+    const std::lock_guard lock(mutex_);
+    left_ = *end_ - Clock::now();
+    end_.reset();
+    changed_.notify_one();
+}
+
+void Deadline::Watch() {
+    std::unique_lock lock(mutex_);
+    while (!isOver_) {
+        if (!end_) {
+            changed_.wait(lock);
+        } else if (Clock::now() < *end_) {
+            changed_.wait_until(lock, *end_);
+        } else {
+            // The lock stays held: the work cannot end, and report, at the same time.
+            PrintFailure(json_, sentence_);
+            std::cout.flush();
+            _exit(kFailure);
+        }
+    }
+}
+
+}  // namespace taviwireless::cli

@@ -1,0 +1,71 @@
+#ifndef TAVIWIRELESS_CLI_DEADLINE_H
+#define TAVIWIRELESS_CLI_DEADLINE_H
+
+#include <chrono>
+#include <condition_variable>
+#include <mutex>
+#include <optional>
+#include <string>
+#include <thread>
+
+#include "cli/commands.h"
+
+namespace taviwireless::cli {
+
+// The time that a command may take. A call of the library cannot be ended early, so when the time
+// is over while work is done, the failure is printed and the program ends there and then. The time
+// between two pieces of work, in which input is read, does not count.
+class Deadline {
+  public:
+    // What Options::timeout says, or these seconds; without both there is no limit.
+    explicit Deadline(const Options& options, std::optional<int> seconds = std::nullopt);
+    ~Deadline();
+    Deadline(const Deadline&) = delete;
+    Deadline& operator=(const Deadline&) = delete;
+
+    template <typename Work>
+    auto Limit(const Work& work) {
+        const Running running(*this);
+        return work();
+    }
+
+    // The whole time again, for a command that goes on for ever.
+    void Restart();
+
+    // What is printed when the time is over.
+    void SetSentence(const std::string& sentence);
+
+    int Seconds() const { return seconds_.value_or(0); }
+
+  private:
+    using Clock = std::chrono::steady_clock;
+
+    class Running {
+      public:
+        explicit Running(Deadline& deadline) : deadline_(deadline) { deadline_.Start(); }
+        ~Running() { deadline_.Stop(); }
+        Running(const Running&) = delete;
+        Running& operator=(const Running&) = delete;
+
+      private:
+        Deadline& deadline_;
+    };
+
+    void Start();
+    void Stop();
+    void Watch();
+
+    const std::optional<int> seconds_;
+    const bool json_;
+    std::mutex mutex_;  // guards what follows
+    std::condition_variable changed_;
+    std::string sentence_;
+    Clock::duration left_{};
+    std::optional<Clock::time_point> end_;  // while work is done
+    bool isOver_ = false;
+    std::thread watcher_;
+};
+
+}  // namespace taviwireless::cli
+
+#endif

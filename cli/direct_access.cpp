@@ -1,0 +1,199 @@
+// The modems themselves, through the layer that the service uses too.
+#include <taviwireless/usbmodem_list.h>
+
+#include <algorithm>
+#include <set>
+
+#include "cli/modem_access.h"
+#include "cli/output.h"
+
+namespace taviwireless::cli {
+
+namespace {
+
+using usbmodem_lib::USBModem;
+using usbmodem_lib::USBModemList;
+
+// The texts of a profile; roaming is asked of the modem.
+constexpr const char* kStoredKeys[] = {"location", "isp",  "apn",       "number",
+                                       "user",     "pass", "default_gw"};
+
+Profile ReadStoredProfile(USBModem& modem, bool& failed) {
+    Profile profile;
+    for (const char* key : kStoredKeys) {
+        profile[key] = modem.GetProfileWithKey(key, failed);
+    }
+    bool ignored = false;
+    profile["roaming"] = modem.GetRoaming(ignored);
+    return profile;
+}
+
+class DirectAccess : public ModemAccess {
+  public:
+    ModemState Look(const std::string& id) override {
+        const Connection connection = LookAtConnection(id);
+        USBModem& modem = Initialised(id);
+        ShowProgress("Reading " + id + " ...");
+        bool ignored = false;
+        ModemState state;
+        state.id = id;
+        state.netStatus = connection.status;
+        state.ip = connection.address;
+        state.vendor = modem.GetVendorName(ignored);
+        state.product = modem.GetProductName(ignored);
+        state.simStatus = modem.GetPINStatus(ignored);
+        state.signal = modem.GetSignalQuality(ignored);
+        state.carrier = modem.GetDefaultISP(ignored);
+        state.pinProtected = modem.PINGetEnableProtection() != 0;
+        state.pinRemains = modem.PINGetAttemptRemain();
+        state.pukRemains = modem.PUKGetAttemptRemain();
+        state.profile = ReadStoredProfile(modem, ignored);
+        return state;
+    }
+
+    // A new process knows nothing of a running connection: the first look finds the interface in
+    // the dialler's log, the second its address. The log is found by the IMSI: UpdateNetStatus
+    // without it would take a running connection for one that failed, and end it.
+    Connection LookAtConnection(const std::string& id) override {
+        USBModem& modem = Initialised(id);
+        if (hasIMSI_.count(id) != 0 && modem.UpdateNetStatus() == 2) {
+            modem.UpdateNetStatus();
+        }
+        bool failed = false;
+        Connection connection;
+        connection.status = modem.GetNetStatus(failed);
+        connection.interface = modem.GetNetIFName(failed);
+        connection.address = modem.GetNetLocalIP(failed);
+        if (failed) {
+            throw CommandError(kFailure, "cannot tell the state of the connection of " + id);
+        }
+        return connection;
+    }
+
+    std::vector<Interface> Interfaces() override {
+        std::vector<Interface> interfaces;
+        for (const std::string& id : ReadyModems()) {
+            interfaces.push_back({id, LookAtConnection(id).interface});
+        }
+        return interfaces;
+    }
+
+    int EnterPIN(const std::string& id, const std::string& pin) override {
+        return Initialised(id).PINUnlock(pin);
+    }
+
+    int EnterPUK(const std::string& id, const std::string& puk,
+                 const std::string& newPin) override {
+        return Initialised(id).PUKSet(puk, newPin);
+    }
+
+    int SetPIN(const std::string& id, const std::string& pin, const std::string& newPin,
+               bool protection) override {
+        return Initialised(id).PINSet(pin, newPin, protection);
+    }
+
+    Profile ReadProfile(const std::string& id) override {
+        bool failed = false;
+        Profile profile = ReadStoredProfile(Initialised(id), failed);
+        if (failed) {
+            throw ProfileUnreadableError(id);
+        }
+        return profile;
+    }
+
+    void ChangeProfile(const std::string& id, const std::vector<Setting>& settings) override {
+        USBModem& modem = Initialised(id);
+        for (const Setting& setting : settings) {
+            if (modem.SetProfileWithKey(setting.key, setting.value) != 0) {
+                throw CommandError(kFailure,
+                                   "cannot set " + setting.key + " in the profile of " + id +
+                                       "; is the SIM ready, and /var/lib/usbmodem writable?");
+            }
+        }
+    }
+
+    void ResetProfile(const std::string& id) override {
+        USBModem& modem = Initialised(id);
+        ShowProgress("Reading defaults from " + id + " ...");
+        if (modem.SetProfileToDefault() != 0) {
+            throw CommandError(kFailure, "cannot reset the profile of " + id +
+                                             "; is the SIM ready, and /var/lib/usbmodem writable?");
+        }
+    }
+
+    void Connect(const std::string& id) override {
+        if (Initialised(id).NetConnect() != 1) {
+            throw CommandError(kFailure, "cannot connect " + id + "; --verbose shows the reason");
+        }
+    }
+
+    void Disconnect(const std::string& id) override {
+        if (Initialised(id).NetDisconnect() != 0) {
+            throw CommandError(kFailure,
+                               "cannot disconnect " + id + "; --verbose shows the reason");
+        }
+    }
+
+  protected:
+    // Each modem is initialised on its own: one that is dead does not hide those behind it.
+    std::vector<std::string> ReadyModems() override {
+        Refresh();
+        std::vector<std::string> ready;
+        for (USBModem& modem : list_) {
+            if (Initialise(modem)) {
+                ready.push_back(modem.GetDevId());
+            }
+        }
+        return ready;
+    }
+
+  private:
+    // Follows what was plugged in and unplugged meanwhile.
+    void Refresh() {
+        if (std::any_of(list_.begin(), list_.end(),
+                        [](const USBModem& modem) { return !modem.IsInfoExist(); })) {
+            list_.DropUnplugged();
+            hasIMSI_.clear();
+        }
+        if (list_.SearchInfoPath() != 0) {
+            throw CommandError(kFailure, "cannot look for modems in /tmp/");
+        }
+    }
+
+    // Costs a modem that does not answer up to six seconds.
+    bool Initialise(USBModem& modem) {
+        if (modem.IsInited()) {
+            return true;
+        }
+        ShowProgress("Finding the ports of " + modem.GetDevId() + " ...");
+        return modem.InitInfo() == 0;
+    }
+
+    // Borrowed until the next call.
+    USBModem& Initialised(const std::string& id) {
+        Refresh();
+        USBModem& modem = list_.FindUSBModem(id);
+        if (modem.IsNull() || !Initialise(modem)) {
+            throw NotReadyError(id);
+        }
+        if (hasIMSI_.count(id) == 0) {
+            bool failed = false;
+            modem.GetIMSI(failed);
+            if (!failed) {
+                hasIMSI_.insert(id);
+            }
+        }
+        return modem;
+    }
+
+    USBModemList list_;
+    std::set<std::string> hasIMSI_;  // the modems whose IMSI is known
+};
+
+}  // namespace
+
+std::unique_ptr<ModemAccess> MakeDirectAccess() {
+    return std::make_unique<DirectAccess>();
+}
+
+}  // namespace taviwireless::cli

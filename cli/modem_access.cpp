@@ -1,0 +1,74 @@
+#include "cli/modem_access.h"
+
+#include <taviwireless/usbmodem_list.h>
+
+#include <algorithm>
+
+#include "cli/output.h"
+
+namespace taviwireless::cli {
+
+namespace {
+
+bool Contains(const std::vector<std::string>& ids, const std::string& id) {
+    return std::find(ids.begin(), ids.end(), id) != ids.end();
+}
+
+}  // namespace
+
+bool IsDisconnected(const std::string& netStatus) {
+    return netStatus == "disconnected" || netStatus == "connection_lost";
+}
+
+std::vector<ModemState> ModemAccess::LookAtAll() {
+    const std::vector<std::string> ready = ReadyModems();
+    std::vector<ModemState> states;
+    for (const std::string& id : PluggedModems()) {
+        ModemState state;
+        state.id = id;
+        try {
+            if (Contains(ready, id)) {
+                state = Look(id);
+            }
+        } catch (const CommandError& error) {
+            if (error.Status() == kNoService) {
+                throw;
+            }  // unplugged, or fallen silent, a moment ago: no reason to hide the others
+        }
+        states.push_back(state);
+    }
+    return states;
+}
+
+std::unique_ptr<ModemAccess> MakeAccess(const Options& options) {
+    return options.direct ? MakeDirectAccess() : MakeServiceAccess();
+}
+
+std::vector<std::string> PluggedModems() {
+    usbmodem_lib::USBModemList list;
+    if (list.SearchInfoPath() != 0) {
+        throw CommandError(kFailure, "cannot look for modems in /tmp/");
+    }
+    std::vector<std::string> ids;
+    for (const usbmodem_lib::USBModem& modem : list) {
+        ids.push_back(modem.GetDevId());
+    }
+    return ids;
+}
+
+CommandError NotReadyError(const std::string& id) {
+    if (Contains(PluggedModems(), id)) {
+        return {kFailure, "modem " + id +
+                              " is not ready: no port of it has answered yet; wait a moment, or "
+                              "unplug it and plug it in again"};
+    }
+    return {kNotFound, "there is no modem " + Printable(id) +
+                           "; taviwireless modem list shows those that are plugged in"};
+}
+
+CommandError ProfileUnreadableError(const std::string& id) {
+    return {kFailure, "cannot read the profile of " + id +
+                          "; is the SIM ready, and /var/lib/usbmodem readable?"};
+}
+
+}  // namespace taviwireless::cli

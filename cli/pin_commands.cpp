@@ -1,0 +1,231 @@
+// taviwireless modem unlock, pin and puk: what the SIM in a modem asks for.
+#include <json/json.h>
+
+#include <CLI/CLI.hpp>
+#include <algorithm>
+#include <iostream>
+
+#include "cli/commands.h"
+#include "cli/deadline.h"
+#include "cli/modem_access.h"
+#include "cli/secret.h"
+#include "cli/state_output.h"
+
+namespace taviwireless::cli {
+
+namespace {
+
+constexpr size_t kPINMin = 4;
+constexpr size_t kPINMax = 8;
+constexpr size_t kPUKLength = 8;
+
+// A code of another form is never sent: it would cost an attempt, or do worse in the command line
+// that it becomes a part of.
+void CheckForm(const std::string& code, const char* name, size_t min, size_t max) {
+    const bool isNumber =
+        std::all_of(code.begin(), code.end(), [](char c) { return c >= '0' && c <= '9'; });
+    if (!isNumber || code.size() < min || code.size() > max) {
+        const std::string length =
+            min == max ? std::to_string(max) : std::to_string(min) + " to " + std::to_string(max);
+        throw CommandError(kUsage, std::string("a ") + name + " has " + length +
+                                       " digits; nothing was sent to the modem");
+    }
+}
+
+std::string ReadPIN(const char* prompt) {
+    const std::string pin = ReadSecret(prompt);
+    CheckForm(pin, "PIN", kPINMin, kPINMax);
+    return pin;
+}
+
+std::string ReadNewPIN() {
+    const std::string pin = ReadNewSecret("New PIN");
+    CheckForm(pin, "PIN", kPINMin, kPINMax);
+    return pin;
+}
+
+std::string AttemptsLeft(int count) {
+    return count == 1 ? "1 attempt is left" : std::to_string(count) + " attempts are left";
+}
+
+// One of the commands here, on one modem.
+class PINCommand {
+  public:
+    explicit PINCommand(const Options& options)
+        : options_(options), access_(MakeAccess(options)), deadline_(options) {}
+
+    void Unlock() {
+        const ModemState state = Look();
+        if (state.simStatus == kReady) {
+            return Report(state, "the SIM is ready already; no PIN was needed");
+        }
+        Require(state, kWantsPIN);
+        ConfirmLastAttempt("PIN", state.pinRemains);
+        const std::string pin = ReadPIN("PIN");
+        Try("PIN", [&] { return access_->EnterPIN(options_.id, pin); });
+        ReportReady();
+    }
+
+    void UsePUK() {
+        const ModemState state = Look();
+        Require(state, kWantsPUK);
+        ConfirmLastAttempt("PUK", state.pukRemains);
+        const std::string puk = ReadSecret("PUK");
+        CheckForm(puk, "PUK", kPUKLength, kPUKLength);
+        const std::string pin = ReadNewPIN();
+        Try("PUK", [&] { return access_->EnterPUK(options_.id, puk, pin); });
+        ReportReady();
+    }
+
+    void ChangePIN() {
+        const ModemState state = Look();
+        Require(state, kReady);
+        if (!state.pinProtected) {
+            throw CommandError(kFailure,
+                               "a SIM changes its PIN only while it is protected by it; "
+                               "taviwireless modem pin protect " +
+                                   options_.id + " switches that on");
+        }
+        ConfirmLastAttempt("PIN", state.pinRemains);
+        const std::string oldPIN = ReadPIN("PIN");
+        const std::string newPIN = ReadNewPIN();
+        Try("PIN", [&] { return access_->SetPIN(options_.id, oldPIN, newPIN, true); });
+        Report(Look(), "the PIN is changed");
+    }
+
+    void Protect(bool on) {
+        const std::string done = on ? "protected by its PIN" : "not protected by its PIN";
+        const ModemState state = Look();
+        Require(state, kReady);
+        if (state.pinProtected == on) {
+            return Report(state, "the SIM is " + done + " already");
+        }
+        ConfirmLastAttempt("PIN", state.pinRemains);
+        const std::string pin = ReadPIN("PIN");
+        Try("PIN", [&] { return access_->SetPIN(options_.id, pin, "", on); });
+        const ModemState after = Look();
+        if (after.pinProtected != on) {
+            throw CommandError(kFailure, "the protection of the SIM of " + options_.id +
+                                             " is as before; --verbose shows why");
+        }
+        Report(after, "the SIM is " + done + " from now on");
+    }
+
+  private:
+    // While a modem dials, it would be left alone without a word.
+    ModemState Look() {
+        const ModemState state = deadline_.Limit([this] { return access_->Look(options_.id); });
+        if (state.netStatus == kConnecting) {
+            throw CommandError(kBusy, options_.id + " is connecting; try again when that is over");
+        }
+        return state;
+    }
+
+    void Require(const ModemState& state, const std::string& simStatus) const {
+        if (state.simStatus == simStatus) {
+            return;
+        }
+        const std::string sim = "the SIM of " + options_.id;
+        if (state.simStatus == kWantsPIN) {
+            throw CommandError(kFailure, sim + " wants its PIN; taviwireless modem unlock " +
+                                             options_.id + " enters it");
+        }
+        if (state.simStatus == kWantsPUK) {
+            throw CommandError(kFailure, sim + " wants its PUK; taviwireless modem puk " +
+                                             options_.id + " enters it");
+        }
+        throw CommandError(kFailure, state.simStatus == kReady
+                                         ? sim + " does not want its PUK"
+                                         : "there is no usable SIM in " + options_.id);
+    }
+
+    void ConfirmLastAttempt(const std::string& code, int remains) const {
+        if (remains != 1 || options_.force) {
+            return;
+        }
+        const std::string last = "the SIM of " + options_.id + " allows one more " + code;
+        const std::string loss = code == "PIN" ? "it wants its PUK" : "it is blocked for ever";
+        if (!Confirm(last + "; after a wrong one " + loss + ". Go on?",
+                     last + ", and after a wrong one " + loss + "; add --force to use it")) {
+            throw CommandError(kFailure, "nothing was sent to the modem");
+        }
+    }
+
+    template <typename Operation>
+    void Try(const std::string& code, const Operation& operation) {
+        ShowProgress("Telling " + options_.id + " ...");
+        const int result = deadline_.Limit(operation);
+        if (result == ModemAccess::kDone) {
+            return;
+        }
+        if (result != ModemAccess::kRefused) {
+            throw CommandError(kFailure, "could not send the " + code + " to " + options_.id +
+                                             "; --verbose shows why");
+        }
+        const ModemState state = Look();
+        const int remains = code == "PIN" ? state.pinRemains : state.pukRemains;
+        std::string sentence = options_.id + " refused the " + code;
+        if (remains >= 0) {
+            sentence += "; " + AttemptsLeft(remains);
+        }
+        if (code == "PIN" && state.simStatus == kWantsPUK) {
+            sentence += ", and the SIM wants its PUK: taviwireless modem puk " + options_.id;
+        }
+        throw CommandError(kFailure, sentence);
+    }
+
+    void ReportReady() {
+        const ModemState state = Look();
+        if (state.simStatus != kReady) {
+            throw CommandError(kFailure, "the SIM of " + options_.id +
+                                             " took the code but is not ready yet; taviwireless "
+                                             "modem show " +
+                                             options_.id + " tells its state");
+        }
+        Report(state, "the SIM is ready");
+    }
+
+    void Report(const ModemState& state, const std::string& sentence) const {
+        if (options_.json) {
+            Print(ToJson(state));
+        } else {
+            Print(Table{{state.id + ": " + sentence}});
+        }
+    }
+
+    const Options& options_;
+    const std::unique_ptr<ModemAccess> access_;
+    Deadline deadline_;
+};
+
+}  // namespace
+
+void AddPINCommands(CLI::App& modem, Options& options) {
+    const auto add = [&options](CLI::App& group, const char* name, const char* description,
+                                void (*run)(PINCommand & command)) {
+        CLI::App& command = AddCommandWithID(group, name, description, options);
+        command.add_flag("--force", options.force, "Use the last attempt without a question");
+        command.callback([&options, run] {
+            PINCommand pinCommand(options);
+            run(pinCommand);
+        });
+    };
+
+    add(modem, "unlock", "Enter the PIN; it is read from standard input",
+        [](PINCommand& command) { command.Unlock(); });
+
+    CLI::App* pin = modem.add_subcommand("pin", "PIN of the SIM; it is read from standard input");
+    pin->require_subcommand(1);
+    pin->fallthrough();
+    add(*pin, "set", "Change the PIN; the old one is read, then the new one",
+        [](PINCommand& command) { command.ChangePIN(); });
+    add(*pin, "protect", "Let the SIM ask for its PIN",
+        [](PINCommand& command) { command.Protect(true); });
+    add(*pin, "unprotect", "Let the SIM do without its PIN",
+        [](PINCommand& command) { command.Protect(false); });
+
+    add(modem, "puk", "Set a new PIN with the PUK; the PUK is read, then the PIN",
+        [](PINCommand& command) { command.UsePUK(); });
+}
+
+}  // namespace taviwireless::cli

@@ -1,0 +1,200 @@
+// The modems as the modem service knows them.
+#include <dbus/dbus.h>
+#include <taviwireless/usbmodem_ui.h>
+
+#include <algorithm>
+
+#include "cli/modem_access.h"
+#include "cli/output.h"
+#include "cli/service_document.h"
+
+namespace taviwireless::cli {
+
+namespace {
+
+// The service takes the first of these, in this order, that stands before a "=" anywhere in a line.
+constexpr const char* kServiceKeys[] = {"apn",  "number",   "user", "pass",
+                                        "IMSI", "location", "isp",  "default_gw"};
+
+// Hands a result of the front-end functions on unless the service could not be reached.
+int Reached(int result) {
+    if (result == 0) {
+        throw CommandError(kNoService,
+                           "the modem service is not running; usbmodemd starts it (or add "
+                           "--direct to do without it)");
+    }
+    return result;
+}
+
+void Sent(int result) {
+    if (Reached(result) < 0) {
+        throw CommandError(kFailure, "cannot send to the modem service; --verbose shows why");
+    }
+}
+
+int PINResult(int result) {
+    return Reached(result) > 0 ? ModemAccess::kDone : result;
+}
+
+std::vector<std::string> Lines(int (*get)(std::vector<std::string>& list)) {
+    std::vector<std::string> lines;
+    if (Reached(get(lines)) < 0) {
+        throw CommandError(kFailure, "the modem service does not answer; --verbose shows why");
+    }
+    return lines;
+}
+
+// The functions that ask for one modem take whatever they are given, and answer alike for a modem
+// that the service does not know and for a call that failed; so the id is looked up first.
+void RequireReady(const std::string& id) {
+    const auto ready = Lines(usbmodem_ui::GetUSBModemList);
+    if (std::find(ready.begin(), ready.end(), id) == ready.end()) {
+        throw NotReadyError(id);
+    }
+}
+
+std::string Document(std::string (*get)(const std::string& id), const std::string& id) {
+    RequireReady(id);
+    ShowProgress("Asking " + id + " ...");
+    std::string document = get(id);
+    if (document.empty()) {
+        throw CommandError(kFailure,
+                           "the modem service does not tell about " + id + "; --verbose shows why");
+    }
+    return document;
+}
+
+void CheckSetting(const Setting& setting) {
+    const std::string line = setting.key + "=" + setting.value;
+    if (!dbus_validate_utf8(line.c_str(), nullptr)) {
+        throw CommandError(kUsage, "the value of " + setting.key +
+                                       " is not UTF-8, which the modem service takes alone; add "
+                                       "--direct to set it");
+    }
+    for (const std::string key : kServiceKeys) {
+        const size_t position = line.find(key + "=");
+        if (position == 0) {
+            return;
+        }
+        if (position != std::string::npos) {
+            throw CommandError(kUsage, "the value of " + setting.key + " holds \"" + key +
+                                           "=\", which the modem service would take for a "
+                                           "setting of its own; add --direct to set it");
+        }
+    }
+}
+
+class ServiceAccess : public ModemAccess {
+  public:
+    ModemState Look(const std::string& id) override {
+        ModemState state = ReadModemDocument(Document(usbmodem_ui::GetUSBModem, id));
+        // The document is written from top to bottom, so that of a link that comes up meanwhile
+        // has its status but not its address yet.
+        if (state.netStatus == kConnected && state.ip.empty()) {
+            state = ReadModemDocument(Document(usbmodem_ui::GetUSBModem, id));
+        }
+        return state;
+    }
+
+    Connection LookAtConnection(const std::string& id) override {
+        const ModemState state = Look(id);
+        Connection connection{state.netStatus, "", state.ip};
+        if (!connection.address.empty()) {
+            for (const Interface& interface : KnownInterfaces()) {
+                connection.interface = interface.id == id ? interface.name : connection.interface;
+            }
+        }
+        return connection;
+    }
+
+    // The service knows an interface once it looked at the connection.
+    std::vector<Interface> Interfaces() override {
+        for (const std::string& id : ReadyModems()) {
+            Look(id);
+        }
+        return KnownInterfaces();
+    }
+
+    int EnterPIN(const std::string& id, const std::string& pin) override {
+        return PINResult(usbmodem_ui::UnlockSIM(id, pin));
+    }
+
+    int EnterPUK(const std::string& id, const std::string& puk,
+                 const std::string& newPin) override {
+        return PINResult(usbmodem_ui::UnlockPIN(id, puk, newPin));
+    }
+
+    int SetPIN(const std::string& id, const std::string& pin, const std::string& newPin,
+               bool protection) override {
+        return PINResult(usbmodem_ui::SetPIN(id, pin, newPin, protection));
+    }
+
+    // The service tells nothing of a profile that it cannot read: all texts are empty then, as in
+    // a profile that was emptied.
+    Profile ReadProfile(const std::string& id) override {
+        Profile profile = ReadProfileDocument(Document(usbmodem_ui::GetProfile, id));
+        const bool isEmpty = std::all_of(profile.begin(), profile.end(), [](const auto& entry) {
+            return entry.second.empty() || entry.first == "default_gw" || entry.first == "roaming";
+        });
+        if (isEmpty && Look(id).simStatus != kReady) {
+            throw ProfileUnreadableError(id);
+        }
+        return profile;
+    }
+
+    // The service gives no result; the profile read after it tells whether every setting arrived.
+    void ChangeProfile(const std::string& id, const std::vector<Setting>& settings) override {
+        std::string lines;
+        for (const Setting& setting : settings) {
+            CheckSetting(setting);
+            lines += setting.key + "=" + setting.value + "\n";
+        }
+        RequireReady(id);
+        ShowProgress("Setting the profile of " + id + " ...");
+        Sent(usbmodem_ui::SetProfile(id, lines));
+        Profile wanted = ReadProfileDocument(Document(usbmodem_ui::GetProfile, id));
+        const Profile now = wanted;
+        for (const Setting& setting : settings) {
+            wanted[setting.key] = setting.value;
+        }
+        if (wanted != now) {
+            throw CommandError(kFailure, "the modem service did not set the profile of " + id +
+                                             "; is the SIM ready? The system log tells more");
+        }
+    }
+
+    void ResetProfile(const std::string&) override {
+        throw CommandError(kUsage, "the modem service cannot reset a profile; add --direct");
+    }
+
+    void Connect(const std::string& id) override { Sent(usbmodem_ui::Connect(id)); }
+
+    void Disconnect(const std::string& id) override { Sent(usbmodem_ui::Disconnect(id)); }
+
+  protected:
+    std::vector<std::string> ReadyModems() override { return Lines(usbmodem_ui::GetUSBModemList); }
+
+  private:
+    // The service lists ids and interfaces in the same order, in two calls.
+    std::vector<Interface> KnownInterfaces() {
+        const auto ids = ReadyModems();
+        const auto names = Lines(usbmodem_ui::GetUSBModemIfList);
+        if (ids.size() != names.size()) {
+            throw CommandError(kFailure,
+                               "a modem was plugged in or unplugged meanwhile; try again");
+        }
+        std::vector<Interface> interfaces;
+        for (size_t i = 0; i < ids.size(); ++i) {
+            interfaces.push_back({ids[i], names[i]});
+        }
+        return interfaces;
+    }
+};
+
+}  // namespace
+
+std::unique_ptr<ModemAccess> MakeServiceAccess() {
+    return std::make_unique<ServiceAccess>();
+}
+
+}  // namespace taviwireless::cli

@@ -1,0 +1,78 @@
+// taviwireless modem watch: the states of the modems as they change.
+#include <json/json.h>
+#include <signal.h>
+#include <unistd.h>
+
+#include <CLI/CLI.hpp>
+#include <chrono>
+#include <iostream>
+#include <thread>
+
+#include "cli/commands.h"
+#include "cli/deadline.h"
+#include "cli/modem_access.h"
+#include "cli/state_output.h"
+
+namespace taviwireless::cli {
+
+namespace {
+
+// A look keeps the service busy for about as long per modem; others want to be served too.
+constexpr std::chrono::seconds kPause{2};
+
+// Ends the program wherever it is: a look may take long, and everything shown is written out.
+void EndWithSuccess(int) {
+    _exit(kSuccess);
+}
+
+std::string LookAgain(ModemAccess& access, const Options& options) {
+    if (options.id.empty()) {
+        const auto states = access.LookAtAll();
+        return options.json ? ToLine(ToJson(states)) + "\n" : ListText(states);
+    }
+    const ModemState state = access.Look(options.id);
+    return options.json ? ToLine(ToJson(state)) + "\n" : ToText(ShowTable(state, false));
+}
+
+void Show(const std::string& text, bool inPlace) {
+    constexpr char kClearScreen[] = "\033[H\033[2J";
+    ShowProgress("");
+    std::cout << (inPlace ? kClearScreen : "") << text;
+    if (!std::cout.flush()) {
+        throw CommandError(kFailure, "cannot write the output");
+    }
+}
+
+void Watch(const Options& options) {
+    signal(SIGINT, EndWithSuccess);
+    signal(SIGTERM, EndWithSuccess);
+    const bool inPlace = !options.json && isatty(STDOUT_FILENO);
+    const auto access = MakeAccess(options);
+    Deadline deadline(options);
+    std::string shown;
+    for (;;) {
+        deadline.Restart();
+        const std::string text = deadline.Limit([&] { return LookAgain(*access, options); });
+        if (text != shown) {
+            const bool isNextTable = !options.json && !inPlace && !shown.empty();
+            Show(isNextTable ? "\n" + text : text, inPlace);
+            shown = text;
+        }
+        ShowProgress("");
+        std::this_thread::sleep_for(kPause);
+    }
+}
+
+}  // namespace
+
+void AddWatchCommand(CLI::App& modem, Options& options) {
+    CLI::App& watch = AddModemCommand(
+        modem, "watch",
+        "Show the modems, or one, anew at every change until SIGINT or SIGTERM; --timeout is "
+        "that of one look",
+        options);
+    watch.add_option("ID", options.id, "Device id, such as usbmodem0");
+    watch.callback([&options] { Watch(options); });
+}
+
+}  // namespace taviwireless::cli

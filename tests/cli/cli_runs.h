@@ -1,0 +1,50 @@
+#ifndef TAVIWIRELESS_TESTS_CLI_CLI_RUNS_H
+#define TAVIWIRELESS_TESTS_CLI_CLI_RUNS_H
+
+#include <gmock/gmock.h>
+#include <json/json.h>
+
+#include "tests/support/files.h"
+#include "tests/support/process.h"
+
+namespace taviwireless::test {
+
+constexpr int kFailure = 1;
+constexpr int kUsage = 2;
+constexpr int kNotFound = 3;
+constexpr int kBusy = 4;
+constexpr int kNoService = 5;
+
+// taviwireless modem ...
+inline RunResult Modem(std::vector<std::string> arguments, const std::string& input = "") {
+    arguments.insert(arguments.begin(), {BuiltProgram("taviwireless"), "modem"});
+    return RunProgram(arguments, input);
+}
+
+inline RunResult DirectModem(std::vector<std::string> arguments, const std::string& input = "") {
+    arguments.insert(arguments.begin(), "--direct");
+    return Modem(arguments, input);
+}
+
+inline Json::Value Parse(const std::string& text) {
+    Json::Value document;
+    std::istringstream stream(text);
+    std::string errors;
+    EXPECT_TRUE(Json::parseFromStream(Json::CharReaderBuilder(), stream, &document, &errors))
+        << errors << text;
+    return document;
+}
+
+// A dialler that does this.
+inline void InstallDialler(const std::string& script) {
+    WriteFile("/etc/ppp/peers/wvdial", "noauth\n");
+    WriteFile("/usr/tavi/bin/wvdial", "#!/bin/sh\n" + script + "\nexec sleep 1000\n");
+    RunProgram({"chmod", "755", "/usr/tavi/bin/wvdial"});
+}
+
+// What the real one says in the end, at once.
+constexpr char kSaysConnected[] = "echo '--> Using interface lo secondary DNS address' >&2";
+
+}  // namespace taviwireless::test
+
+#endif

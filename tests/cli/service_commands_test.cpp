@@ -1,0 +1,210 @@
+// taviwireless modem, end to end through the modem service on a bus of its own.
+#include <signal.h>
+
+#include "tests/cli/cli_runs.h"
+#include "tests/support/bus.h"
+#include "tests/support/modem_simulator.h"
+
+namespace taviwireless::test {
+namespace {
+
+using testing::HasSubstr;
+using testing::StartsWith;
+
+// A bus, modems and the service, which is ready with them.
+struct Situation {
+    explicit Situation(const std::string& modem, const std::string& another = "")
+        : simulator(another.empty() ? Arguments{"--modem", modem}
+                                    : Arguments{"--modem", modem, "--modem", another}) {
+        const auto ids =
+            another.empty() ? Arguments{"usbmodem0"} : Arguments{"usbmodem0", "usbmodem7"};
+        EXPECT_TRUE(service.Lists(ids));
+    }
+
+    using Arguments = std::vector<std::string>;
+    PrivateBus bus;
+    ModemSimulator simulator;
+    ModemService service;
+};
+
+TEST(ServiceCommands, ListShowsWhatEveryModemSays) {
+    Situation situation("12d1,operator=Nordnetz,signal=31", "2001,id=7,pin=1234");
+    WriteFile("/tmp/usbmodem.info9", "");  // a modem that the service cannot use
+    const RunResult result = Modem({"list"});
+    EXPECT_EQ(result.status, 0);
+    EXPECT_EQ(result.err, "");
+    EXPECT_EQ(
+        result.out,
+        "DEVICE     VENDOR  PRODUCT   OPERATOR  SIGNAL  SIM              PIN LOCK  PIN/PUK LEFT  "
+        "NETWORK       ADDRESS\n"
+        "usbmodem0  huawei  E1752     Nordnetz  100%    ready            off       3 / 10        "
+        "disconnected  -\n"
+        "usbmodem7  D-Link  3G Stick  -         -       wants PIN        on        3 / 10        "
+        "disconnected  -\n"
+        "usbmodem9  -       -         -         -       modem not ready  -         - / -         "
+        "-             -\n");
+}
+
+TEST(ServiceCommands, ShowAddsTheProfileWithoutItsPassword) {
+    Situation situation("generic,operator=Nordnetz,apn=web.nord");
+    const Json::Value modem = Parse(Modem({"show", "usbmodem0", "--json"}).out);
+    EXPECT_EQ(modem["pin_protected"], false);
+    EXPECT_EQ(modem["profile"]["isp"], "Nordnetz - web.nord");
+    EXPECT_EQ(modem["profile"]["pass"], "********");
+    EXPECT_EQ(modem["profile"]["default_gw"], false);
+    EXPECT_THAT(Modem({"show", "usbmodem0", "--show-secrets"}).out,
+                HasSubstr("Profile: Password       Unknown\n"));
+}
+
+TEST(ServiceCommands, FailuresAreOneSentenceAndAnExitStatus) {
+    Situation situation("generic");
+    WriteFile("/tmp/usbmodem.info9", "");
+    const struct {
+        std::vector<std::string> arguments;
+        int status;
+        const char* sentence;
+    } kCases[] = {
+        {{"show", "usbmodem1"}, kNotFound, "there is no modem usbmodem1; "},
+        {{"unlock", "\xff"}, kNotFound, "there is no modem \xff; "},
+        {{"profile", "set", "usbmodem1", "apn=x"}, kNotFound, "there is no modem usbmodem1; "},
+        {{"connect", "usbmodem9"}, kFailure, "modem usbmodem9 is not ready: "},
+        {{"profile", "reset", "usbmodem0"}, kUsage, "the modem service cannot reset a profile; "},
+        {{"puk", "usbmodem0"}, kFailure, "the SIM of usbmodem0 does not want its PUK"},
+        {{"disconnect", "usbmodem0"}, kFailure, "usbmodem0 is not connected"},
+        {{"show", "usbmodem0", "--timeout", "1"}, kFailure, "not done within 1 s; "},
+    };
+    for (const auto& failing : kCases) {
+        const RunResult result = Modem(failing.arguments);
+        EXPECT_EQ(result.status, failing.status) << failing.sentence;
+        EXPECT_THAT(result.err, StartsWith(std::string("taviwireless: ") + failing.sentence));
+    }
+}
+
+TEST(ServiceCommands, WithoutTheServiceTheyNameWhatStartsIt) {
+    PrivateBus bus;
+    ModemSimulator simulator({"--modem", "generic"});
+    const std::vector<std::vector<std::string>> kCommands = {
+        {"list"}, {"watch"}, {"unlock", "usbmodem0"}, {"profile", "set", "usbmodem0", "apn=x"}};
+    for (const auto& command : kCommands) {
+        const RunResult result = Modem(command);
+        EXPECT_EQ(result.status, kNoService);
+        EXPECT_THAT(result.err, StartsWith("taviwireless: the modem service is not running; "
+                                           "usbmodemd starts it"));
+    }
+}
+
+struct Step {
+    std::vector<std::string> arguments;
+    const char* input;
+    int status;
+    const char* text;  // in what is printed
+};
+
+void Take(const std::vector<Step>& steps) {
+    for (const Step& step : steps) {
+        SCOPED_TRACE(step.text);
+        const RunResult result = Modem(step.arguments, step.input);
+        EXPECT_EQ(result.status, step.status);
+        EXPECT_THAT(result.out + result.err, HasSubstr(step.text));
+    }
+}
+
+TEST(ServiceCommands, OnlyAWellFormedPINIsTried) {
+    Situation situation("generic,pin=1234");
+    Take({
+        {{"unlock", "usbmodem0"}, "", kFailure, "standard input ended before there was a line"},
+        {{"unlock", "usbmodem0"}, "12a4\n", kUsage, "a PIN has 4 to 8 digits; nothing was sent"},
+        {{"unlock", "usbmodem0"}, "1111\n", kFailure, "refused the PIN; 2 attempts are left\n"},
+        {{"connect", "usbmodem0"}, "", kFailure, "the SIM of usbmodem0 is not ready; "},
+        {{"pin", "protect", "usbmodem0"}, "1234\n", kFailure, "wants its PIN; taviwireless modem"},
+        {{"unlock", "usbmodem0"}, "1234\n", 0, "usbmodem0: the SIM is ready\n"},
+        {{"unlock", "usbmodem0"}, "", 0, "usbmodem0: the SIM is ready already; "},
+    });
+}
+
+TEST(ServiceCommands, TheLastAttemptIsKeptUnlessForced) {
+    Situation situation("generic,pin=1234,attempts=1,puk=87654321");
+    Take({
+        {{"unlock", "usbmodem0"},
+         "1111\n",
+         kFailure,
+         "allows one more PIN, and after a wrong one it wants its PUK; add --force to use it\n"},
+        {{"unlock", "--force", "usbmodem0"},
+         "1111\n",
+         kFailure,
+         "0 attempts are left, and the SIM wants its PUK: taviwireless modem puk usbmodem0\n"},
+        {{"puk", "usbmodem0"}, "1234\n", kUsage, "a PUK has 8 digits; nothing was sent"},
+        {{"puk", "usbmodem0"}, "11111111\n4321\n", kFailure, "refused the PUK; 9 attempts are "},
+        {{"puk", "usbmodem0"}, "87654321\n4321\n", 0, "usbmodem0: the SIM is ready\n"},
+    });
+}
+
+TEST(ServiceCommands, TheProtectionIsSwitchedAndThePINChanged) {
+    Situation situation("generic,pin=1234,lock=off");
+    Take({
+        {{"pin", "set", "usbmodem0"}, "", kFailure, "taviwireless modem pin protect usbmodem0"},
+        {{"pin", "protect", "usbmodem0"}, "1234\n", 0, "is protected by its PIN from now on\n"},
+        {{"pin", "protect", "usbmodem0"}, "", 0, "the SIM is protected by its PIN already\n"},
+        {{"pin", "set", "usbmodem0"}, "1234\n4321\n", 0, "usbmodem0: the PIN is changed\n"},
+        {{"pin", "unprotect", "usbmodem0", "--json"}, "4321\n", 0, "\"pin_protected\": false"},
+    });
+}
+
+TEST(ServiceCommands, SetAndShowAProfile) {
+    Situation situation("generic");
+    EXPECT_EQ(
+        Modem({"profile", "set", "usbmodem0", "user=a \"b\\", "isp=a=b", "pass"}, "s3cret  =\n")
+            .status,
+        0);
+    EXPECT_THAT(Modem({"profile", "show", "usbmodem0"}).out,
+                HasSubstr("User           a \"b\\\nPassword       ********\n"));
+    const Json::Value shown =
+        Parse(Modem({"--json", "profile", "show", "usbmodem0", "--show-secrets"}).out);
+    EXPECT_EQ(shown["pass"], "s3cret  =");
+    EXPECT_EQ(shown["isp"], "a=b");
+}
+
+TEST(ServiceCommands, AProfileThatWasNotSetIsAFailure) {
+    Situation situation("generic,pin=1234");
+    EXPECT_THAT(Modem({"profile", "set", "usbmodem0", "apn=x"}).err,
+                HasSubstr("the modem service did not set the profile of usbmodem0"));
+    EXPECT_THAT(Modem({"profile", "show", "usbmodem0"}).err,
+                HasSubstr("cannot read the profile of usbmodem0; is the SIM ready"));
+}
+
+TEST(ServiceCommands, ConnectShowTheStateAndHangUp) {
+    InstallDialler(kSaysConnected);
+    Situation situation("generic");
+    const Json::Value connected = Parse(Modem({"--json", "connect", "usbmodem0"}).out);
+    EXPECT_EQ(connected["net_status"], "connected");
+    EXPECT_EQ(connected["ip"], "127.0.0.1");
+    EXPECT_EQ(Modem({"connect", "usbmodem0"}).status, kBusy);
+    EXPECT_EQ(Modem({"status", "usbmodem0"}).out, "usbmodem0: connected, 127.0.0.1 on lo\n");
+    EXPECT_EQ(Modem({"interfaces"}).out, "MODEM      INTERFACE\nusbmodem0  lo\n");
+    EXPECT_EQ(Modem({"disconnect", "usbmodem0"}).out, "usbmodem0: disconnected\n");
+}
+
+TEST(ServiceCommands, ADiallerThatGivesUpOrTakesTooLongIsAFailure) {
+    WriteFile("/etc/ppp/peers/wvdial", "noauth\n");  // there is no dialler
+    Situation situation("generic");
+    EXPECT_THAT(Modem({"connect", "usbmodem0"}).err,
+                HasSubstr("the dialler of usbmodem0 gave up, or could not be started"));
+    InstallDialler("");
+    EXPECT_THAT(Modem({"connect", "usbmodem0", "--timeout", "5"}).err,
+                HasSubstr("usbmodem0 is not connected after 5 s; it goes on trying"));
+    EXPECT_EQ(Modem({"unlock", "usbmodem0"}).status, kBusy);
+}
+
+TEST(ServiceCommands, WatchPrintsADocumentAtEachChangeUntilItIsEnded) {
+    Situation situation("generic,signal=31");
+    Process watch({BuiltProgram("taviwireless"), "--json", "modem", "watch", "usbmodem0"});
+    EXPECT_EQ(Parse(watch.ReadLine().value_or(""))["signal"], 100);
+    situation.simulator.Set("0", "signal", "0");
+    EXPECT_EQ(Parse(watch.ReadLine().value_or(""))["signal"], 0);
+    watch.Signal(SIGINT);
+    EXPECT_EQ(watch.Wait(), 0);
+    EXPECT_EQ(watch.ReadLine(), std::nullopt);
+}
+
+}  // namespace
+}  // namespace taviwireless::test

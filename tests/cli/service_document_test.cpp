@@ -1,0 +1,53 @@
+#include "cli/service_document.h"
+
+#include <gmock/gmock.h>
+
+namespace taviwireless::cli {
+namespace {
+
+using testing::IsEmpty;
+using testing::Pair;
+using testing::UnorderedElementsAre;
+
+TEST(ServiceDocument, TextsAreTakenAsTheyStand) {
+    for (const std::string text : {"", "plain", "a\"b", "back\\slash\\", "\"", "\",",
+                                   "\", \"x\": \"", "x\": \"y", ",", "{"}) {
+        SCOPED_TRACE(text);
+        const ModemState state = ReadModemDocument(
+            "{\n\t\"id\": \"usbmodem0\",\n\t\"vendor\": \"" + text +
+            "\",\n\t\"signal\": 54,\n\t\"pin_protected\": true,\n\t\"pin_remains\": -1,\n"
+            "\t\"profile\": \n\t{\n\t\t\"user\": \"" +
+            text + "\",\n\t\t\"roaming\": ,\n\t\t\"default_gw\": false\n\t}\n}\n");
+        EXPECT_EQ(state.id, "usbmodem0");
+        EXPECT_EQ(state.vendor, text);
+        EXPECT_EQ(state.signal, 54);
+        EXPECT_TRUE(state.pinProtected);
+        EXPECT_EQ(state.pinRemains, -1);
+        EXPECT_THAT(state.profile, UnorderedElementsAre(Pair("user", text), Pair("roaming", ""),
+                                                        Pair("default_gw", "false")));
+    }
+}
+
+TEST(ServiceDocument, WhatIsMissingOrCutOffStaysUnknown) {
+    const struct {
+        const char* document;
+        const char* vendor;
+    } kCases[] = {{"", ""},
+                  {"no document", ""},
+                  {"{\n\t\"vendor", ""},
+                  {"{\n\t\"vendor\": ", ""},
+                  {"{\n\t\"vendor\": \"", "\""},
+                  {"{\n\t\"vendor\": \"ab", "\"ab"},
+                  {"{\n\t\"vendor\": \"ab\"", "ab"}};
+    for (const auto& cut : kCases) {
+        SCOPED_TRACE(cut.document);
+        const ModemState state = ReadModemDocument(cut.document);
+        EXPECT_EQ(state.vendor, cut.vendor);
+        EXPECT_EQ(state.simStatus, kNoAnswer);
+        EXPECT_EQ(state.pukRemains, -1);
+        EXPECT_THAT(state.profile, IsEmpty());
+    }
+}
+
+}  // namespace
+}  // namespace taviwireless::cli
