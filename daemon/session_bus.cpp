@@ -50,13 +50,15 @@ DBusHandlerResult SessionBus::Look(DBusConnection* /*connection*/, DBusMessage* 
         self->onLost_();
     }
     if (dbus_message_get_type(message) == DBUS_MESSAGE_TYPE_METHOD_CALL && self->served_ == 0) {
-        self->served_ = g_idle_add(
+        // Before the next call, of which there may always be one.
+        self->served_ = g_idle_add_full(
+            G_PRIORITY_HIGH,
             [](gpointer idle) -> gboolean {
                 static_cast<SessionBus*>(idle)->served_ = 0;
                 static_cast<SessionBus*>(idle)->onServed_();
                 return G_SOURCE_REMOVE;
             },
-            self);
+            self, nullptr);
     }
     return DBUS_HANDLER_RESULT_NOT_YET_HANDLED;
 }

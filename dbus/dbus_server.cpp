@@ -61,7 +61,7 @@ void DBusServer::StartLoop() {
     }
     dbus_g_thread_init();
     g_main_loop_run(loop_);
-    // QuitLoop has cleared the field, and the loop object stays: whoever quit it may still hold it.
+    // After QuitLoop the field is empty, and the loop object stays.
     if (loop_ != nullptr) {
         g_main_loop_unref(loop_);
         loop_ = nullptr;
@@ -69,7 +69,10 @@ void DBusServer::StartLoop() {
 }
 
 void DBusServer::QuitLoop() {
+    // Stays, as whoever quits may still hold it; referenced so that leak checkers know.
+    [[gnu::used]] static GMainLoop* ended = nullptr;
     if (loop_ != nullptr) {
+        ended = loop_;
         g_main_loop_quit(loop_);
         loop_ = nullptr;
     }

@@ -68,6 +68,20 @@ TEST(Survival, APortThatGoesSilentCostsLessThanTheBusWaits) {
     EXPECT_THAT(document, HasSubstr("\"product\": \"E1752\""));
 }
 
+TEST(Survival, AModemThatBabblesFromTheStartKeepsNobodyWaiting) {
+    PrivateBus bus;
+    ModemSimulator simulator({"--modem", "generic,fault=babble", "--modem", "12d1,ports=dial/at"});
+    ModemService service;
+    EXPECT_TRUE(service.Lists({"usbmodem1"}));
+    const auto end = std::chrono::steady_clock::now() + std::chrono::seconds(5);
+    while (std::chrono::steady_clock::now() < end) {
+        const auto begin = std::chrono::steady_clock::now();
+        EXPECT_EQ(CallService({"GetUSBModemList"}).status, 0);
+        EXPECT_LT(std::chrono::steady_clock::now() - begin, std::chrono::seconds(5));
+        std::this_thread::sleep_for(std::chrono::milliseconds(200));
+    }
+}
+
 TEST(Survival, ACallerThatDoesNotWaitForItsReply) {
     RunningService running;
     for (int i = 0; i < 3; ++i) {
@@ -119,21 +133,29 @@ TEST(Survival, TenThousandStatusRequestsWithoutGrowth) {
     };
     ask(500);
     ASSERT_THAT(document, HasSubstr("\"net_status\": \"connecting\""));
-    const long memory = running.Memory();
+    [[maybe_unused]] const long memory = running.Memory();
     const long descriptors = running.Descriptors();
     ask(10000);
-    EXPECT_LE(running.Memory(), memory + 64);  // kilobytes; 10,000 lost bytes-per-request show
     EXPECT_EQ(running.Descriptors(), descriptors);
+#ifndef __SANITIZE_ADDRESS__  // whose allocator keeps what is freed, and looks for leaks at the end
+    EXPECT_LE(running.Memory(), memory + 64);  // kilobytes; seven lost bytes per request show
+#endif
+    running.service.Daemon().Signal(SIGTERM);
+    EXPECT_EQ(running.service.Daemon().Wait(), 0);
 }
 
+// With calls waiting all the time, too.
 TEST(Survival, ALowLimitOnSemaphoreSets) {
     WriteFile("/proc/sys/kernel/sem", "32000 1024000 500 24");
     RunningService running;
-    std::string document;
-    for (int i = 0; i < 5; ++i) {  // more than 20 commands, of two sets each
-        ASSERT_EQ(USBModemClient().GetUSBModem("usbmodem0", document), 0);
-        EXPECT_THAT(document, HasSubstr("\"pin_remains\": 3"));
+    std::vector<std::future<void>> callers;
+    for (int i = 0; i < 6; ++i) {  // more than 20 commands, of two sets each
+        callers.push_back(std::async(std::launch::async, [] {
+            EXPECT_THAT(CallService({"GetUSBModem", "usbmodem0"}).out,
+                        HasSubstr("\"pin_remains\": 3"));
+        }));
     }
+    callers.clear();  // waits for each
     const std::string sets = ReadFile("/proc/sysvipc/sem");
     EXPECT_EQ(std::count(sets.begin(), sets.end(), '\n'), 1) << sets;  // the heading alone
 }
