@@ -11,7 +11,6 @@ namespace taviwireless::daemon {
 namespace {
 
 using usbmodem_lib::USBModem;
-using usbmodem_lib::USBModemList;
 
 // Ends the connection of a modem that is gone, so that the machine gets its default route back. The
 // dialler may have noticed before us and ended by itself; then the route is still to be set.

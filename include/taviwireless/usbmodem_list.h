@@ -27,10 +27,9 @@ class TAVIWIRELESS_API USBModemList {
     // neighbours, the second is dropped by the next call.
     void DropUnplugged();
 
-    // Brings the list up to date: SearchInfoPath, DropUnplugged, and InitInfo for each modem that is
-    // not initialised.
-    // Returns 0, or -1 as soon as one modem cannot be initialised (up to six seconds); those behind
-    // it wait for the next call.
+    // Brings the list up to date: SearchInfoPath, DropUnplugged, and InitInfo for each modem that
+    // is not initialised. Returns 0, or -1 as soon as one modem cannot be initialised (up to six
+    // seconds); those behind it wait for the next call.
     int Update();
 
     // The modem with this device id or interface id, else nullObject. Borrowed from the list.
