@@ -21,7 +21,7 @@ constexpr int kApplianceRootFailed = 70;
 // group (Ctrl-C) is delivered once.
 //
 // Private and empty: /tmp, /run with /run/lock (/var/run and /var/lock lead there or are empty),
-//     /var/tmp, /dev/shm, /usr/tavi, /etc/hostapd. /var/lib/usbmodem is not there.
+//     /var/tmp, /dev/shm, /usr/tavi, /etc/hostapd, /etc.defaults. /var/lib/usbmodem is not there.
 // Private copies (changes are seen inside only and vanish): /etc, /usr, /var; also /bin, /sbin,
 //     /lib where they are no links. File systems mounted below them are not seen.
 // /dev: null, zero, full, random, urandom, tty, a pts of its own with ptmx, shm, fd, stdin, stdout,

@@ -6,6 +6,7 @@
 #include <sys/mount.h>
 #include <sys/socket.h>
 #include <sys/stat.h>
+#include <sys/syscall.h>
 #include <unistd.h>
 
 #include <cerrno>
@@ -30,11 +31,11 @@ struct Mount {
 
 constexpr unsigned long kKernelFs = MS_NOSUID | MS_NODEV | MS_NOEXEC;
 
-// Mounted in this order. The kernel's own come first: a bind mount goes through /proc.
-constexpr Mount kKernelFileSystems[] = {
-    {"proc", "/proc", kKernelFs, nullptr},
-    {"sysfs", "/sys", kKernelFs, nullptr},
-};
+// Mounted in this order. /proc comes first: a bind mount goes through it. The new root lies over
+// /sys until it is entered: that one is fresh, so it can be brought back from below.
+constexpr Mount kProc = {"proc", "/proc", kKernelFs, nullptr};
+constexpr Mount kSys = {"sysfs", "/sys", kKernelFs, nullptr};
+constexpr Mount kNewRoot = {"tmpfs", "/sys", MS_NOSUID | MS_NODEV, "mode=0755"};
 
 constexpr Mount kEmptyFileSystems[] = {
     {"tmpfs", "/tmp", MS_NOSUID | MS_NODEV, "mode=1777"},
@@ -54,6 +55,10 @@ constexpr const char* kCopied[] = {"/etc", "/usr", "/var", "/bin", "/sbin", "/li
 // A test starts from a system that was never configured. Links among them lead to /run.
 constexpr const char* kEmptied[] = {"/etc/hostapd", "/usr/tavi", "/var/run", "/var/lock"};
 constexpr const char* kAbsent[] = {"/var/lib/usbmodem"};
+
+// Folders of the appliance that other machines do not have, nor get: the root that holds them is
+// new.
+constexpr const char* kAdded[] = {"etc.defaults"};
 
 constexpr const char* kDevices[] = {"null", "zero", "full", "random", "urandom", "tty"};
 
@@ -124,13 +129,13 @@ fs::path HiddenEntry(const fs::path& path) {
     return {};
 }
 
-std::vector<Kept> KeepDevicesAndWork() {
+std::vector<Kept> KeepDevicesAndWork(const fs::path& program, const fs::path& workingDirectory) {
     std::vector<Kept> kept;
     for (const char* name : kDevices) {
         kept.emplace_back(std::string("/dev/") + name);
     }
-    const fs::path executable = HiddenEntry(fs::read_symlink("/proc/self/exe"));
-    const fs::path current = HiddenEntry(fs::current_path());
+    const fs::path executable = HiddenEntry(program);
+    const fs::path current = HiddenEntry(workingDirectory);
     if (!executable.empty()) {
         kept.emplace_back(executable);
     }
@@ -211,6 +216,46 @@ void ClearState() {
     }
 }
 
+// Shows `entry`, something in the machine's root, in the new one; `source` is what it is.
+void BindIntoNewRoot(const fs::directory_entry& entry, const std::string& source,
+                     unsigned long submounts) {
+    const fs::path target = kNewRoot.target / entry.path().filename();
+    if (entry.is_symlink()) {
+        fs::copy_symlink(entry.path(), target);
+        return;
+    }
+    if (entry.is_directory()) {
+        fs::create_directory(target);
+    } else {
+        close(open(target.c_str(), O_CREAT | O_CLOEXEC, 0644));
+    }
+    if (mount(source.c_str(), target.c_str(), "none", MS_BIND | submounts, nullptr) != 0) {
+        Fail("bind " + entry.path().string());
+    }
+}
+
+// A root of our own with everything that the machine's has, so that folders can be added to it.
+void EnterNewRoot() {
+    const int covered = open(kNewRoot.target, O_PATH | O_CLOEXEC);
+    MountOne(kNewRoot);
+    for (const char* folder : kAdded) {
+        fs::create_directory(fs::path(kNewRoot.target) / folder);
+    }
+    for (const auto& entry : fs::directory_iterator("/")) {
+        if (entry.path() == kNewRoot.target) {
+            BindIntoNewRoot(entry, "/proc/self/fd/" + std::to_string(covered), 0);
+        } else if (!fs::exists(kNewRoot.target / entry.path().filename())) {
+            BindIntoNewRoot(entry, entry.path(), MS_REC);
+        }
+    }
+    close(covered);
+    // The old root ends up over the new one, from where it is taken away.
+    if (chdir(kNewRoot.target) != 0 || syscall(SYS_pivot_root, ".", ".") != 0 ||
+        umount2(".", MNT_DETACH) != 0 || chdir("/") != 0) {
+        Fail("enter a private root");
+    }
+}
+
 void MakeDirectory(const char* path, mode_t mode) {
     if (mkdir(path, mode) != 0 || chmod(path, mode) != 0) {
         Fail(std::string("create ") + path);
@@ -248,12 +293,13 @@ void SetUpPrivateSystem(bool inUserNamespace) {
     if (mount("none", "/", "none", MS_REC | MS_PRIVATE, nullptr) != 0) {
         Fail("detach the mounts from the machine's");
     }
-    for (const Mount& mounted : kKernelFileSystems) {
-        MountOne(mounted);
-    }
+    MountOne(kProc);
+    MountOne(kSys);
     const fs::path current = fs::current_path();
+    const fs::path program = fs::read_symlink("/proc/self/exe");
+    EnterNewRoot();
     {
-        const std::vector<Kept> kept = KeepDevicesAndWork();
+        const std::vector<Kept> kept = KeepDevicesAndWork(program, current);
         CopyFolders(inUserNamespace);
         ClearState();
         for (const Mount& mounted : kEmptyFileSystems) {

@@ -37,7 +37,7 @@ INSTANTIATE_TEST_SUITE_P(ApplianceRoot, PrivateFolder,
                          testing::Values("/tmp", "/run", "/run/lock", "/var/run", "/var/lock",
                                          "/var/tmp", "/var/lib", "/etc", "/etc/hostapd", "/usr",
                                          "/usr/sbin", "/usr/tavi", "/sbin", "/bin", "/dev",
-                                         "/dev/shm"));
+                                         "/dev/shm", "/etc.defaults"));
 
 class EmptyFolder : public testing::TestWithParam<const char*> {};
 
