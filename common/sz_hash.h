@@ -17,6 +17,9 @@ class SzHash {
 
     explicit operator bool() const { return hash_ != nullptr; }
     const VEXACSzHash* Get() const { return hash_; }
+    VEXACSzHash** Address() { return &hash_; }
+    // Null when the key is not there.
+    const char* operator[](const char* key) const { return VEXACSzHashGetValue(hash_, key); }
     void Set(const char* key, const std::string& value) {
         VEXACSzHashSetValue(&hash_, key, value.c_str());
     }

@@ -3,26 +3,12 @@
 #include <tavicore/error.h>
 #include <tavisdk/network.h>
 
+#include "tests/platform/veth.h"
 #include "tests/support/descriptors.h"
 #include "tests/support/files.h"
-#include "tests/support/process.h"
 
 namespace taviwireless::test {
 namespace {
-
-// Runs "ip ARGUMENTS" and returns what it prints.
-std::string Ip(const std::string& arguments) {
-    const RunResult result = RunProgram({"sh", "-c", "ip " + arguments});
-    EXPECT_EQ(result.status, 0) << "ip " << arguments << ": " << result.err;
-    return result.out;
-}
-
-void MakeInterface(const std::string& name, const std::string& address) {
-    Ip("link add " + name + " type veth peer name " + name + "-far");
-    Ip("address add " + address + " dev " + name);
-    Ip("link set " + name + " up");
-    Ip("link set " + name + "-far up");
-}
 
 std::string Gateway() {
     char gateway[TAVI_NET_ADDRESS_SIZE] = "unchanged";

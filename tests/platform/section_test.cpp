@@ -1,7 +1,10 @@
 #include <gmock/gmock.h>
+#include <sys/mount.h>
 #include <tavicore/error.h>
 #include <tavicore/section.h>
+#include <unistd.h>
 
+#include <cstring>
 #include <vector>
 
 #include "tests/support/files.h"
@@ -73,6 +76,54 @@ TEST(Section, ReadsSectionsAmongMalformedLines) {
     EXPECT_EQ(VEXACErrGet(), VEXAC_ERR_TOO_LONG);
     EXPECT_EQ(VEXACFileGetSectionValue(kFile, "One", "LAST", value, sizeof value), -1);
     EXPECT_EQ(VEXACErrGet(), VEXAC_ERR_NOT_FOUND);
+}
+
+std::string ValueOf(const char* section) {
+    char value[32];
+    VEXACFileGetSectionValue(kFile, section, "KEY", value, sizeof value);
+    return value;
+}
+
+TEST(Section, ShowsEveryChangeOfTheFileAtOnce) {
+    // A file system that stamps files by the tick, as most kernels do everywhere.
+    ASSERT_EQ(mount("none", "/tmp", "ramfs", 0, nullptr), 0);
+    for (int i = 10; i < 99; ++i) {  // the same length, within the same tick of the clock
+        const std::string value = std::to_string(i);
+        WriteFile(kFile, "[one]\nKEY=" + value + "\n[" + value + "]\nKEY=x\n");
+        EXPECT_EQ(ValueOf("one"), value);
+        EXPECT_EQ(ValueOf(value.c_str()), "x");
+    }
+    usleep(50000);
+    EXPECT_EQ(ValueOf("98"), "x");
+    WriteFile(kFile, "[two]\nKEY=98\n[98]\nKEY=y\n");
+    EXPECT_EQ(ValueOf("98"), "y");
+    EXPECT_EQ(ValueOf("one"), "");
+    VEXACFileSetSectionValue(kFile, "two", "KEY", "1", kFormat);
+    EXPECT_EQ(ValueOf("98"), "y");
+    unlink(kFile);
+    EXPECT_EQ(ValueOf("98"), "");
+    umount("/tmp");
+}
+
+// What this process has read so far, in bytes.
+long long BytesRead() {
+    return std::stoll(ReadFile("/proc/self/io").substr(strlen("rchar: ")));
+}
+
+TEST(Section, ReadingOneByOneReadsAFileNoMoreThanTwice) {
+    constexpr int kSections = 500;
+    std::string text;
+    for (int i = 0; i < kSections; ++i) {
+        text += "[" + std::to_string(i) + "]\nKEY=" + std::to_string(i) + "\n";
+    }
+    WriteFile(kFile, text);
+    usleep(50000);  // only a file that is not being written is remembered
+    const long long before = BytesRead();
+    for (int i = 0; i < kSections; ++i) {
+        EXPECT_EQ(ValueOf(std::to_string(i).c_str()), std::to_string(i));
+    }
+    constexpr long long kOther = 1000;  // of the count itself
+    EXPECT_LT(BytesRead() - before, 2 * static_cast<long long>(text.size()) + kOther);
 }
 
 TEST(Section, WritesLeaveEverythingElseAsItStands) {

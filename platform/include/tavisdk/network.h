@@ -51,6 +51,65 @@ TAVI_SDK_API int TAVINetDefaultGatewayGetConf(char* gateway, size_t size);
 /* Returns 1 when text is an IPv4 or IPv6 address in full, else 0. */
 TAVI_SDK_API int BlVEXAIsIpAddr(const char* text);
 
+enum { TAVI_NET_IF_NAME_SIZE = 16 }; /* an interface's name, and its zero byte */
+
+/* 1 when the interface is up (administratively), else 0. */
+TAVI_SDK_API int TAVINetIsIFUp(const char* interface);
+/* Bring the interface up or down. Return 1 when that worked or it was so already, else 0. */
+TAVI_SDK_API int VEXANetIfUp(const char* interface);
+TAVI_SDK_API int VEXANetIfDown(const char* interface);
+
+enum { VEXA_NET_ALL_INTERFACES = 2 }; /* query kind: every interface but loopback */
+
+/* Link states. */
+enum {
+    VEXA_NET_LINK_DOWN = 0,
+    VEXA_NET_LINK_NO_CARRIER = 1, /* up, but nothing at the other end */
+    VEXA_NET_LINK_CONNECTED = 2   /* up, with a carrier */
+};
+
+typedef struct VEXANetInterfaceInfo {
+    char name[TAVI_NET_IF_NAME_SIZE];
+    int linkState; /* VEXA_NET_LINK_... */
+} VEXANetInterfaceInfo;
+
+/* Fills at most max entries. Returns their number, or -1 on error. */
+TAVI_SDK_API int VEXANetGetInterfaceInfo(VEXANetInterfaceInfo* interfaces, int max, int kind);
+
+/* The IPv4 settings of an interface. */
+typedef struct TAVINetCard {
+    char interface[TAVI_NET_IF_NAME_SIZE];
+    int isStatic; /* 0: by DHCP */
+    char address[TAVI_NET_ADDRESS_SIZE];
+    char netmask[TAVI_NET_ADDRESS_SIZE];
+} TAVINetCard;
+
+/*
+ * Makes the card's address the only IPv4 address of the interface. A static card has one, and ends
+ * the interface's DHCP client; one by DHCP may have none, then the interface has none either.
+ * flags is 0. Returns 0, or -1 on error, with a bad address or netmask before anything is changed.
+ */
+TAVI_SDK_API int TAVINetSetCard1(const TAVINetCard* card, int flags);
+
+/*
+ * Gets a lease by DHCP for card->interface, which is up, and fills in its address and netmask;
+ * isStatic becomes 0. The DHCP client goes on running to renew the lease, in place of an earlier
+ * one. Returns 0, or -1 with empty texts when there is no lease after 12 seconds
+ * (VEXAC_ERR_NOT_FOUND).
+ *
+ * The client's process id is in "/etc/dhcpc/dhcpcd-INTERFACE.pid". Its lease is in
+ * "/etc/dhcpc/dhcpcd-INTERFACE.info", a key/value file of IPADDR, NETMASK and, when the network
+ * has one, GATEWAY. The host edition runs udhcpc with the script "/usr/tavi/bin/dhcp-lease", which
+ * sets the address and the name servers, but no route.
+ */
+TAVI_SDK_API int TAVIIGetDHCPTestNetInfo(TAVINetCard* card);
+
+/*
+ * 1 when the interface has its address from DHCP, that is, the process of its pid file is a running
+ * DHCP client (in the host edition, a process named udhcpc), else 0.
+ */
+TAVI_SDK_API int BlTAVILnxIsDHCP(const char* interface);
+
 #ifdef __cplusplus
 }
 #endif

@@ -1,8 +1,8 @@
 // Section files: "[name]" headers, each followed by its key=value lines.
-#include <strings.h>
 #include <tavicore/section.h>
 
 #include <algorithm>
+#include <functional>
 #include <optional>
 #include <set>
 #include <string>
@@ -10,6 +10,7 @@
 
 #include "failure.h"
 #include "line.h"
+#include "section_index.h"
 #include "szhash_pairs.h"
 #include "text_file.h"
 
@@ -38,55 +39,12 @@ std::string Join(const Lines& lines) {
     return text;
 }
 
-// The name in a header line; nothing for other lines.
-std::optional<std::string> ReadHeader(std::string_view line) {
-    const std::string_view text = TrimLeft(TrimRight(Readable(line)));
-    if (text.size() < 2 || text.front() != '[' || text.back() != ']') {
-        return std::nullopt;
-    }
-    return std::string(text.substr(1, text.size() - 2));
-}
-
 std::optional<Pair> ReadKey(std::string_view line) {
     auto pair = ReadPair(line, kPassedOver);
     if (pair) {
         pair->key = TrimRight(pair->key);
     }
     return pair;
-}
-
-// Where the lines of a section stand: from begin, behind its header, up to end.
-struct Section {
-    std::string name;
-    size_t begin;
-    size_t end;
-};
-
-std::vector<Section> FindSections(const Lines& lines) {
-    std::vector<Section> sections;
-    for (size_t i = 0; i < lines.size(); ++i) {
-        if (const auto name = ReadHeader(lines[i])) {
-            if (!sections.empty()) {
-                sections.back().end = i;
-            }
-            sections.push_back({*name, i + 1, lines.size()});
-        }
-    }
-    return sections;
-}
-
-// An exact match goes before one without regard to case.
-std::optional<Section> FindSection(const Lines& lines, const char* name) {
-    std::optional<Section> similar;
-    for (const Section& section : FindSections(lines)) {
-        if (section.name == name) {
-            return section;
-        }
-        if (!similar && strcasecmp(section.name.c_str(), name) == 0) {
-            similar = section;
-        }
-    }
-    return similar;
 }
 
 void CheckSectionName(std::string_view name) {
@@ -114,16 +72,18 @@ Lines FormatPairs(const VEXACSzHash& hash, const char* format) {
     return lines;
 }
 
-// Inserts behind the last pair of the section: the comments and blank lines below it mostly belong
-// to the section that follows.
-void InsertAtEnd(Lines& lines, const Section& section, const Lines& newLines) {
-    size_t place = section.begin;
-    for (size_t i = section.begin; i < section.end; ++i) {
+// Inserts behind the last pair of a section's lines: the comments and blank lines below it mostly
+// belong to the section that follows.
+void InsertAtEnd(Lines& lines, const Lines& newLines) {
+    size_t place = 0;
+    for (size_t i = 0; i < lines.size(); ++i) {
         if (ReadKey(lines[i])) {
             place = i + 1;
         }
     }
-    EndLastLine(&lines[place - 1]);
+    if (place > 0) {
+        EndLastLine(&lines[place - 1]);
+    }
     lines.insert(lines.begin() + static_cast<std::ptrdiff_t>(place), newLines.begin(),
                  newLines.end());
 }
@@ -133,49 +93,63 @@ void AppendSection(std::string* text, const std::string& name, const Lines& pair
     *text += "[" + name + "]\n" + Join(pairs);
 }
 
-// Puts newPairs in the place of the section's first pair and takes its old pairs away; comments and
+// Puts newPairs in the place of a section's first pair and takes its old pairs away; comments and
 // blank lines stay.
-void ReplacePairs(Lines& lines, const Section& section, const Lines& newPairs) {
+void ReplacePairs(Lines& lines, const Lines& newPairs) {
     const auto isPair = [](const std::string& line) { return ReadKey(line).has_value(); };
-    const auto begin = lines.begin() + static_cast<std::ptrdiff_t>(section.begin);
-    const auto end = lines.begin() + static_cast<std::ptrdiff_t>(section.end);
-    const auto first = std::find_if(begin, end, isPair);
-    if (first == end) {
-        InsertAtEnd(lines, section, newPairs);
+    const auto first = std::find_if(lines.begin(), lines.end(), isPair);
+    if (first == lines.end()) {
+        InsertAtEnd(lines, newPairs);
         return;
     }
     const auto place = first - lines.begin();
-    lines.erase(std::remove_if(first, end, isPair), end);
+    lines.erase(std::remove_if(first, lines.end(), isPair), lines.end());
     lines.insert(lines.begin() + place, newPairs.begin(), newPairs.end());
 }
 
-// Puts newLine in the place of the key's first line, or at the end of the section; the key's
+// Puts newLine in the place of the key's first line, or at the end of a section's lines; the key's
 // further lines go.
-void SetPair(Lines& lines, const Section& section, std::string_view key,
-             const std::string& newLine) {
+void SetPair(Lines& lines, std::string_view key, const std::string& newLine) {
     bool written = false;
-    for (size_t i = section.begin; i < section.end; ++i) {
-        const auto pair = ReadKey(lines[i]);
+    for (std::string& line : lines) {
+        const auto pair = ReadKey(line);
         if (pair && pair->key == key) {
-            lines[i] = written ? "" : newLine;
+            line = written ? "" : newLine;
             written = true;
         }
     }
     if (!written) {
-        InsertAtEnd(lines, section, {newLine});
+        InsertAtEnd(lines, {newLine});
     }
 }
 
+// Lets `change` have the lines of a section. False when the text has no such section.
+bool ChangeSection(std::string* text, const char* name,
+                   const std::function<void(Lines& lines)>& change) {
+    const SectionIndex index(*text);
+    const Section* section = index.Find(name);
+    if (section == nullptr) {
+        return false;
+    }
+    std::string before = text->substr(0, section->begin);
+    EndLastLine(&before);  // a header may be the last line of all
+    Lines lines =
+        Split(std::string_view(*text).substr(section->begin, section->end - section->begin));
+    change(lines);
+    *text = before + Join(lines) + text->substr(section->end);
+    return true;
+}
+
 // Sets the section's pairs in *hash. False when the file has no such section.
-bool ReadSection(const char* file, const char* section, VEXACSzHash** hash) {
-    const Lines lines = Split(ReadText(file));
-    const auto found = FindSection(lines, section);
-    if (!found) {
+bool ReadSection(const char* file, const char* name, VEXACSzHash** hash) {
+    const TextFile text(file);
+    const Section* section = IndexOf(text).Find(name);
+    if (section == nullptr) {
         return false;
     }
     std::set<std::string> seen;
-    for (size_t i = found->begin; i < found->end; ++i) {
-        const auto pair = ReadKey(lines[i]);
+    for (const std::string& line : Split(text.Read(section->begin, section->end))) {
+        const auto pair = ReadKey(line);
         if (pair && seen.insert(std::string(pair->key)).second &&
             VEXACSzHashSetValue(hash, std::string(pair->key).c_str(),
                                 std::string(pair->value).c_str()) != 0) {
@@ -190,7 +164,7 @@ bool ReadSection(const char* file, const char* section, VEXACSzHash** hash) {
 int VEXACFileEnumSection(const char* file, VEXACSzList** list) {
     return Guarded(-1, [&] {
         RequireAll(file, list);
-        const auto sections = FindSections(Split(ReadText(file)));
+        const auto& sections = IndexOf(TextFile(file)).Sections();
         for (const Section& section : sections) {
             if (VEXACSzListPush(list, section.name.c_str()) < 0) {
                 return -1;
@@ -219,7 +193,7 @@ int VEXACFileAddSection(const char* file, const char* section, const VEXACSzHash
         CheckSectionName(section);
         const Lines pairs = FormatPairs(*hash, format);
         ChangeText(file, IfMissing::kCreate, [&](std::string* text) {
-            if (FindSection(Split(*text), section)) {
+            if (SectionIndex(*text).Find(section) != nullptr) {
                 throw Failure{VEXAC_ERR_BAD_PARAMETER};
             }
             AppendSection(text, section, pairs);
@@ -238,14 +212,11 @@ int VEXACFileSetSection(const char* file, const char* section, const char* newNa
         }
         const Lines pairs = FormatPairs(*hash, format);
         ChangeText(file, IfMissing::kFail, [&](std::string* text) {
-            Lines lines = Split(*text);
-            const auto found = FindSection(lines, section);
-            exists = found.has_value();
+            exists =
+                ChangeSection(text, section, [&](Lines& lines) { ReplacePairs(lines, pairs); });
             if (!exists) {
                 throw Failure{VEXAC_ERR_NOT_FOUND};
             }
-            ReplacePairs(lines, *found, pairs);
-            *text = Join(lines);
         });
         return 1;
     });
@@ -278,11 +249,7 @@ int VEXACFileSetSectionValue(const char* file, const char* section, const char* 
         CheckSectionName(section);
         const std::string line = FormatPair(PairFormat(format), key, value);
         ChangeText(file, IfMissing::kCreate, [&](std::string* text) {
-            Lines lines = Split(*text);
-            if (const auto found = FindSection(lines, section)) {
-                SetPair(lines, *found, key, line);
-                *text = Join(lines);
-            } else {
+            if (!ChangeSection(text, section, [&](Lines& lines) { SetPair(lines, key, line); })) {
                 AppendSection(text, section, {line});
             }
         });

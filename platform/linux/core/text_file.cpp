@@ -8,7 +8,6 @@
 #include <optional>
 
 #include "failure.h"
-#include "unique_fd.h"
 
 namespace tavicore {
 namespace {
@@ -17,42 +16,6 @@ namespace {
 // other end, no terminal taken over.
 constexpr int kCarefully = O_CLOEXEC | O_NONBLOCK | O_NOCTTY;
 constexpr int kMostLinks = 40;  // as the kernel follows
-
-struct OldFile {
-    std::string text;
-    struct stat status;
-};
-
-std::string ReadToEnd(int descriptor, off_t likelySize) {
-    std::string text;
-    size_t length = 0;
-    for (;;) {
-        if (length == text.size()) {  // one byte more than expected, so that the end shows
-            text.resize(length == 0 ? likelySize + 1 : length * 2);
-        }
-        const ssize_t count = read(descriptor, &text[length], text.size() - length);
-        if (count < 0 && errno != EINTR) {
-            throw Failure{VEXAC_ERR_IO};
-        }
-        if (count == 0) {
-            text.resize(length);
-            return text;
-        }
-        length += count > 0 ? count : 0;
-    }
-}
-
-OldFile ReadOpened(UniqueFd file) {
-    OldFile old{};
-    if (!file) {
-        throw FileFailure();
-    }
-    if (fstat(file.Get(), &old.status) != 0 || !S_ISREG(old.status.st_mode)) {
-        throw Failure{VEXAC_ERR_IO};
-    }
-    old.text = ReadToEnd(file.Get(), old.status.st_size);
-    return old;
-}
 
 void WriteAll(int descriptor, std::string_view text) {
     while (!text.empty()) {
@@ -112,12 +75,12 @@ class LockedPlace {
     LockedPlace& operator=(const LockedPlace&) = delete;
 
     // Nothing when there is no file.
-    std::optional<OldFile> Read() const {
+    std::optional<TextFile> Read() const {
         UniqueFd file(openat(directory_.Get(), name_.c_str(), O_RDONLY | O_NOFOLLOW | kCarefully));
         if (!file && errno == ENOENT) {
             return std::nullopt;
         }
-        return ReadOpened(std::move(file));
+        return TextFile(std::move(file));
     }
 
     // `like`, when it is not null, gives the new file's mode and owner.
@@ -160,12 +123,49 @@ class LockedPlace {
 
 }  // namespace
 
-std::string ReadText(const char* path, struct stat* status) {
-    OldFile file = ReadOpened(UniqueFd(open(path, O_RDONLY | kCarefully)));
-    if (status != nullptr) {
-        *status = file.status;
+TextFile::TextFile(const char* path) : TextFile(UniqueFd(open(path, O_RDONLY | kCarefully))) {}
+
+TextFile::TextFile(UniqueFd file) : file_(std::move(file)) {
+    if (!file_) {
+        throw FileFailure();
     }
-    return std::move(file.text);
+    if (fstat(file_.Get(), &status_) != 0 || !S_ISREG(status_.st_mode)) {
+        throw Failure{VEXAC_ERR_IO};
+    }
+}
+
+std::string TextFile::Read() const {
+    std::string text;
+    size_t end = status_.st_size + 1;  // one byte more than expected, so that the end shows
+    for (;;) {
+        text += Read(text.size(), end);
+        if (text.size() < end) {
+            return text;
+        }
+        end *= 2;
+    }
+}
+
+std::string TextFile::Read(size_t begin, size_t end) const {
+    std::string text(end - begin, '\0');
+    size_t length = 0;
+    while (length < text.size()) {
+        const ssize_t count = pread(file_.Get(), &text[length], text.size() - length,
+                                    static_cast<off_t>(begin + length));
+        if (count < 0 && errno != EINTR) {
+            throw Failure{VEXAC_ERR_IO};
+        }
+        if (count == 0) {
+            break;
+        }
+        length += count > 0 ? count : 0;
+    }
+    text.resize(length);
+    return text;
+}
+
+std::string ReadText(const char* path) {
+    return TextFile(path).Read();
 }
 
 void ChangeText(const char* path, IfMissing ifMissing,
@@ -175,10 +175,11 @@ void ChangeText(const char* path, IfMissing ifMissing,
     if (!old && ifMissing == IfMissing::kFail) {
         throw Failure{VEXAC_ERR_NOT_FOUND};
     }
-    std::string text = old ? old->text : std::string();
+    const std::string oldText = old ? old->Read() : std::string();
+    std::string text = oldText;
     change(&text);
-    if (!old || text != old->text) {
-        place.Replace(text, old ? &old->status : nullptr);
+    if (!old || text != oldText) {
+        place.Replace(text, old ? &old->Status() : nullptr);
     }
 }
 

@@ -6,12 +6,30 @@
 #include <functional>
 #include <string>
 
+#include "unique_fd.h"
+
 // Whole text files: read, and replaced in one step. Everything here throws Failure.
 namespace tavicore {
 
-// Reads a regular file to its end. Anything else at the path is a failure and is never waited for.
-// `status`, when it is not null, is what fstat said before the first byte was read.
-std::string ReadText(const char* path, struct stat* status = nullptr);
+// A regular file that is open for reading. Anything else at the path is a failure and is never
+// waited for.
+class TextFile {
+  public:
+    explicit TextFile(const char* path);
+    explicit TextFile(UniqueFd file);
+
+    // As it was when the file was opened.
+    const struct stat& Status() const { return status_; }
+    std::string Read() const;
+    // The bytes from begin up to end; fewer when the file has become shorter.
+    std::string Read(size_t begin, size_t end) const;
+
+  private:
+    UniqueFd file_;
+    struct stat status_ {};
+};
+
+std::string ReadText(const char* path);
 
 enum class IfMissing { kFail, kCreate };
 

@@ -1,5 +1,4 @@
 // The default gateway: in force, and in the saved settings.
-#include <arpa/inet.h>
 #include <linux/rtnetlink.h>
 #include <tavicore/file.h>
 #include <tavicore/keyvalue.h>
@@ -57,18 +56,6 @@ std::string GatewayOf(nl_sock* socket, rtnl_route* route) {
                ? gateway
                : FindAddress(socket, static_cast<unsigned int>(rtnl_route_nh_get_ifindex(hop)))
                      .peer;
-}
-
-Address ParseAddress(const char* text) {
-    in_addr address;
-    if (inet_pton(AF_INET, text, &address) != 1) {
-        throw Failure{VEXAC_ERR_BAD_PARAMETER};
-    }
-    Address built(nl_addr_build(AF_INET, &address, sizeof address));
-    if (!built) {
-        throw Failure{VEXAC_ERR_OUT_OF_MEMORY};
-    }
-    return built;
 }
 
 // 0.0.0.0/0, the destination of default routes.

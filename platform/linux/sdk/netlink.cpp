@@ -1,7 +1,7 @@
 #include "sdk/netlink.h"
 
 #include <arpa/inet.h>
-#include <netlink/route/addr.h>
+#include <net/if.h>
 
 #include "core/failure.h"
 
@@ -20,6 +20,26 @@ Socket OpenRouteSocket() {
     }
     Require(nl_connect(socket.get(), NETLINK_ROUTE));
     return socket;
+}
+
+int FindInterface(const char* name) {
+    const unsigned int index = if_nametoindex(name);
+    if (index == 0) {
+        throw tavicore::Failure{VEXAC_ERR_NOT_FOUND};
+    }
+    return static_cast<int>(index);
+}
+
+Address ParseAddress(const char* text) {
+    in_addr address;
+    if (inet_pton(AF_INET, text, &address) != 1) {
+        throw tavicore::Failure{VEXAC_ERR_BAD_PARAMETER};
+    }
+    Address built(nl_addr_build(AF_INET, &address, sizeof address));
+    if (!built) {
+        throw tavicore::Failure{VEXAC_ERR_OUT_OF_MEMORY};
+    }
+    return built;
 }
 
 std::string ToText(nl_addr* address) {

@@ -1,0 +1,25 @@
+/*
+ * The public names of Wi-Fi functions that libtaviwireless implements under the same name and
+ * "_core". They reach the library that the process has loaded.
+ */
+#ifndef TAVISDK_WIRELESS_H
+#define TAVISDK_WIRELESS_H
+
+#include <tavicore/export.h>
+
+#ifdef __cplusplus
+extern "C" {
+#endif
+
+/* The wireless interface, a constant; null when the library is not loaded. */
+TAVI_SDK_API const char* TAVIWirelessInterfaceGet(void);
+/* Non-zero when the model supports Wi-Fi; 0 also when the library is not loaded. */
+TAVI_SDK_API int TAVIWirelessIsSupported(void);
+/* Ends the Wi-Fi connection. Returns 0, or -1 on failure, also when the library is not loaded. */
+TAVI_SDK_API int TAVIWirelessNetworkDisconnect(void);
+
+#ifdef __cplusplus
+}
+#endif
+
+#endif

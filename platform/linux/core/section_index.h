@@ -1,0 +1,42 @@
+#ifndef TAVICORE_SECTION_INDEX_H
+#define TAVICORE_SECTION_INDEX_H
+
+#include <string>
+#include <string_view>
+#include <unordered_map>
+#include <vector>
+
+#include "text_file.h"
+
+// Where the sections of a text stand.
+namespace tavicore {
+
+// The bytes from begin up to end are its lines, without the header.
+struct Section {
+    std::string name;
+    size_t begin;
+    size_t end;
+};
+
+class SectionIndex {
+  public:
+    SectionIndex() = default;
+    explicit SectionIndex(std::string_view text);
+
+    const std::vector<Section>& Sections() const { return sections_; }
+    // Null when there is none. An exact match goes before one without regard to case.
+    const Section* Find(const std::string& name) const;
+
+  private:
+    std::vector<Section> sections_;
+    std::unordered_map<std::string, size_t> firstByName_;
+};
+
+// The index of a file, which stands until this thread's next call. It is kept while the file stays
+// the same, so that reading a file section by section takes no more than its size. It knows names
+// and places; no value of the file, which may be a key, is kept.
+const SectionIndex& IndexOf(const TextFile& file);
+
+}  // namespace tavicore
+
+#endif

@@ -1,0 +1,103 @@
+// Addresses by DHCP, from udhcpc. It stays in the background to renew its lease, and calls a script
+// of the host root that sets the address and keeps what is known of the lease.
+#include <sys/stat.h>
+#include <tavicore/file.h>
+#include <tavicore/keyvalue.h>
+#include <tavicore/process.h>
+#include <tavisdk/network.h>
+#include <unistd.h>
+
+#include <csignal>
+#include <fstream>
+#include <string>
+
+#include "core/failure.h"
+#include "sdk/dhcp_client.h"
+#include "sdk/netlink.h"
+
+using namespace tavicore;
+using namespace tavisdk;
+
+namespace {
+
+constexpr char kFolder[] = "/etc/dhcpc";
+constexpr char kLeaseScript[] = "/usr/tavi/bin/dhcp-lease";
+constexpr char kClientName[] = "udhcpc";
+
+// Gives up after four questions, 12 s; its messages go to the system log alone.
+constexpr char kRunClient[] = "exec udhcpc -S -n -t 4 -T 3 \"$@\" >/dev/null 2>&1";
+
+std::string FileOf(const char* interface, const char* suffix) {
+    return std::string(kFolder) + "/dhcpcd-" + interface + suffix;
+}
+
+std::string PidFileOf(const char* interface) {
+    return FileOf(interface, ".pid");
+}
+
+// The pid file outlives a restart of the system, and its number may be another program's by then.
+bool ClientRuns(const char* interface) {
+    const std::string file = PidFileOf(interface);
+    if (VEXACProcAliveByPidFile(file.c_str()) == 0) {
+        return false;
+    }
+    std::ifstream status("/proc/" + std::to_string(VEXACReadPidFile(file.c_str())) + "/comm");
+    std::string name;
+    return std::getline(status, name) && name == kClientName;
+}
+
+// The client's parent ends before the client has written its own number over its parent's.
+bool ClientSettles(const char* interface) {
+    constexpr int kMostLooks = 200;
+    for (int i = 0; i < kMostLooks && !ClientRuns(interface); ++i) {
+        usleep(10000);
+    }
+    return ClientRuns(interface);
+}
+
+bool RunClient(const char* interface) {
+    mkdir(kFolder, 0755);  // it mostly exists
+    return VEXACExec("/bin/sh", "-c", kRunClient, kClientName, "-i", interface, "-s", kLeaseScript,
+                     "-p", PidFileOf(interface).c_str(), nullptr) == 0 &&
+           ClientSettles(interface);
+}
+
+void ReadLease(const char* file, const char* key, char (&value)[TAVI_NET_ADDRESS_SIZE]) {
+    if (VEXACFileGetKeyValue(file, key, value, sizeof value) <= 0) {
+        throw Failure{VEXAC_ERR_NOT_FOUND};
+    }
+}
+
+}  // namespace
+
+void tavisdk::StopDhcpClient(const char* interface) {
+    if (ClientRuns(interface)) {
+        // Told to end, it would remove the pid file later, which may be its successor's then.
+        VEXACProcSignalByPidFile(PidFileOf(interface).c_str(), SIGKILL);
+    }
+    VEXACSysUnlink(PidFileOf(interface).c_str());
+}
+
+int TAVIIGetDHCPTestNetInfo(TAVINetCard* card) {
+    return Guarded(-1, [&] {
+        RequireAll(card);
+        FindInterface(card->interface);
+        card->isStatic = 0;
+        card->address[0] = card->netmask[0] = '\0';
+        StopDhcpClient(card->interface);
+        if (!RunClient(card->interface)) {
+            throw Failure{VEXAC_ERR_NOT_FOUND};
+        }
+        const std::string lease = FileOf(card->interface, ".info");
+        ReadLease(lease.c_str(), "IPADDR", card->address);
+        ReadLease(lease.c_str(), "NETMASK", card->netmask);
+        return 0;
+    });
+}
+
+int BlTAVILnxIsDHCP(const char* interface) {
+    return Guarded(0, [&] {
+        RequireAll(interface);
+        return ClientRuns(interface) ? 1 : 0;
+    });
+}

@@ -1,0 +1,11 @@
+#ifndef TAVISDK_DHCP_CLIENT_H
+#define TAVISDK_DHCP_CLIENT_H
+
+namespace tavisdk {
+
+// Ends the DHCP client of the interface, if there is one, without its giving the lease back.
+void StopDhcpClient(const char* interface);
+
+}  // namespace tavisdk
+
+#endif
