@@ -1,0 +1,216 @@
+// Joining a network: what the supplicant is given, and what happens around it.
+#include <tavicore/error.h>
+
+#include "tests/support/sleep_capture.h"
+#include "tests/wireless/station_fixture.h"
+
+namespace taviwireless::test {
+namespace {
+
+using testing::AllOf;
+using testing::EndsWith;
+using testing::HasSubstr;
+using testing::Not;
+using testing::StartsWith;
+
+constexpr char kStart[] =
+    "/usr/sbin/wpa_supplicant -Dwext -iwlan0 -c/usr/tavi/etc/wpa_supplicant.conf -B "
+    "-P/var/run/wpa_supplicant.pid";
+constexpr char kStatus[] = "/usr/sbin/wpa_cli status";
+constexpr char kTerminate[] = "/usr/sbin/wpa_cli terminate";
+
+// What the real supplicant says to the file: it reads it before it misses the interface.
+std::string RealSupplicantSays() {
+    return RunProgram({"/usr/sbin/wpa_supplicant.real", "-dd", "-c", kSupplicantFile, "-i",
+                       "nosuch", "-D", "wired"})
+        .out;
+}
+
+TEST(SupplicantFile, SaysHowToJoinAndIsUnderstood) {
+    struct Case {
+        int auth;
+        int encrypt;
+        std::string key;
+        std::string lines;  // behind scan_ssid
+    };
+    const std::string wpa = "\tkey_mgmt=WPA-PSK\n";
+    const std::string psk = "\tpsk=\"a secret\"\n}\n";
+    const std::string eap = "\tkey_mgmt=WPA-EAP\n\teap=TTLS PEAP\n";
+    const std::string user = "\tidentity=\"me@home\"\n\tpassword=\"a secret\"\n}\n";
+    const std::string open = "\tkey_mgmt=NONE\n";
+    const std::string wep = "\twep_tx_keyidx=0\n\tauth_alg=OPEN SHARED\n}\n";
+    const std::string key63 = "#$(id)\"\\" + std::string(55, 'k');
+    const Case kCases[] = {
+        {5, 8, kKey, wpa + "\tpairwise=CCMP\n" + psk},
+        {4, 12, kKey, wpa + "\tpairwise=TKIP CCMP\n" + psk},
+        {4, 4, kKey, wpa + "\tpairwise=TKIP\n" + psk},
+        {4, 2, kKey, wpa + psk},
+        {5, 0, key63, wpa + "\tpsk=\"" + key63 + "\"\n}\n"},
+        {7, 4, kKey, eap + "\tpairwise=TKIP\n" + user},
+        {8, 1, kKey, eap + user},
+        {1, 1, "", open + "}\n"},
+        {1, 2, "abcde", open + "\twep_key0=\"abcde\"\n" + wep},
+        {2, 2, "a\"b\\ efghijkl", open + "\twep_key0=\"a\"b\\ efghijkl\"\n" + wep},
+        {3, 2, "0123456789", open + "\twep_key0=0123456789\n" + wep},
+        {3, 2, std::string(26, 'F'), open + "\twep_key0=" + std::string(26, 'F') + "\n" + wep},
+        {2, 2, kKey, open + wep},  // of 8 characters
+    };
+    for (const Case& c : kCases) {
+        SCOPED_TRACE(c.lines);
+        Station station;
+        WirelessConf conf = MakeConf("My Net", c.key, c.auth, c.encrypt);
+        EXPECT_EQ(TAVIWirelessNetworkConnect(&conf), 0);
+        EXPECT_EQ(ReadFile(kSupplicantFile),
+                  "ctrl_interface=/var/run/wpa_supplicant\nnetwork={\n\tssid=\"My Net\"\n"
+                  "\tbssid=00:11:22:AA:BB:CC\n\tscan_ssid=1\n" +
+                      c.lines);
+        EXPECT_EQ(FileMode(kSupplicantFile), 0600u);
+        EXPECT_THAT(RealSupplicantSays(),
+                    AllOf(HasSubstr("id=0 ssid='My Net'"), Not(HasSubstr("ailed to parse"))));
+        EXPECT_EQ(station.log.Count("Wrong WEP Format."), c.lines == open + wep);
+    }
+}
+
+TEST(SupplicantFile, HoldsAnyEssidAsItStands) {
+    const std::pair<std::string, std::string> kCases[] = {
+        {" a#b ", " a#b "},
+        {"a\"b\\", "a\\\"b\\\\"},
+        {"$(touch /tmp/x);`id`|'%s%n'", "$(touch /tmp/x);`id`|'%s%n'"},
+        {"caf\xc3\xa9", "caf\\xc3\\xa9"},
+        {std::string(32, '~'), std::string(32, '~')},
+    };
+    for (const auto& [essid, printed] : kCases) {
+        Station station;
+        WirelessConf conf = MakeConf(essid);
+        conf.anyBssid = 1;
+        EXPECT_EQ(TAVIWirelessNetworkConnect(&conf), 0);
+        EXPECT_THAT(ReadFile(kSupplicantFile), HasSubstr("\tssid=\"" + essid + "\"\n\tscan_ssid"));
+        EXPECT_THAT(RealSupplicantSays(), HasSubstr("id=0 ssid='" + printed + "'\n"));
+        EXPECT_EQ(ReadFile(kRecord), essid + "\n0\n5\n8\n00:11:22:AA:BB:CC\n");
+        EXPECT_FALSE(Exists("/tmp/x"));
+    }
+}
+
+TEST(Connect, StartsTheSupplicantAnewAndRecordsTheNetwork) {
+    Station station;
+    for (const char* path : {kSupplicantPid, kSupplicantFile, kRecord}) {
+        WriteFile(path, "old");
+    }
+    WriteFile("/etc/resolv.conf", "nameserver 10.0.0.1\n");
+    WriteFile("/etc/taviinfo.conf", "runmediaservice=\"yes\"\nnetwork_mediaservice=\"wlan0\"\n");
+    station.tools.Add("/etc/rc.mediaservice");
+    WirelessConf conf = MakeConf();
+    conf.network.protocol = WIRELESS_PROTOCOL_BGN;
+    memset(conf.network.bssid, 0, sizeof conf.network.bssid);
+    const SleepCapture sleeps([](unsigned) { EXPECT_TRUE(Exists(kFlag)); });
+    testing::internal::CaptureStdout();
+    testing::internal::CaptureStderr();
+    EXPECT_EQ(TAVIWirelessNetworkConnect(&conf), 0);
+    EXPECT_EQ(testing::internal::GetCapturedStdout() + testing::internal::GetCapturedStderr(), "");
+    // The shell starts the supplicant in the background.
+    EXPECT_THAT(
+        station.tools.Commands(),
+        testing::UnorderedElementsAre(kTerminate, kStart, kStatus, "/etc/rc.mediaservice restart"));
+    EXPECT_EQ(station.tools.Commands().front(), kTerminate);
+    EXPECT_EQ(sleeps.Total(), 1u);
+    EXPECT_THAT(ReadFile(kSupplicantFile), Not(HasSubstr("bssid")));
+    EXPECT_EQ(ReadFile(kRecord), "My Net\n10\n5\n8\n00:00:00:00:00:00\n");
+    EXPECT_EQ(ReadFile("/etc/resolv.conf.wireless.bak"), "nameserver 10.0.0.1\n");
+    EXPECT_FALSE(Exists(kFlag));
+    EXPECT_EQ(station.log.Text(), "");
+}
+
+TEST(Connect, PollsFifteenTimesForTheWholeWord) {
+    const std::pair<unsigned, int> kCases[] = {{15, 0}, {16, -1}};
+    for (const auto& [completedAt, result] : kCases) {
+        Station station;
+        station.tools.Add("/etc/rc.mediaservice");  // which no setting asks for
+        unsigned polls = 0;
+        const SleepCapture sleeps([&polls, at = completedAt](unsigned) {
+            WriteFile("/tmp/state", ++polls == at ? "wpa_state=COMPLETED" : "wpa_state=COMPLETED_");
+        });
+        WirelessConf conf = MakeConf();
+        EXPECT_EQ(TAVIWirelessNetworkConnect(&conf), result);
+        EXPECT_EQ(sleeps.Calls(), std::vector<unsigned>(15, 1));
+        EXPECT_EQ(station.log.Has("Time out to connect AP, kill wpa_supplicant."), result != 0);
+        EXPECT_EQ(station.tools.Commands().back(), result != 0 ? kTerminate : kStatus);
+        EXPECT_EQ(Exists(kRecord), result == 0);
+    }
+}
+
+TEST(Connect, AdhocNetworksAreCreatedInstead) {
+    Station station;
+    WirelessConf conf = MakeConf("Party", "", WIRELESS_AUTH_OPEN, WIRELESS_ENCRYPT_NONE);
+    conf.network.opmode = WIRELESS_OPMODE_ADHOC;
+    EXPECT_EQ(TAVIWirelessNetworkConnect(&conf), 0);
+    EXPECT_EQ(station.driver.mode, IW_MODE_ADHOC);
+    EXPECT_FALSE(Exists(kSupplicantFile));
+}
+
+TEST(Connect, FailsCleanlyAndNeverLeavesTheFlag) {
+    struct Case {
+        const char* arrange;
+        WirelessConf conf;
+        std::vector<std::string> log;  // followed by what all have in common
+    };
+    const std::string notSet = "Failed to set [/usr/tavi/etc/wpa_supplicant.conf]";
+    const std::string failed = "Failed to connect network.";
+    const std::string lineBreak = "The ESSID, key or user name holds a line break";
+    const Case kCases[] = {
+        {"ip link delete wlan0", MakeConf(), {"There is no wireless USB adapter plugged"}},
+        {"touch /var/tmp/.wireless_connecting",
+         MakeConf(),
+         {"Another connection construction is going"}},
+        {"", MakeConf("a\n\tpsk=b"), {lineBreak, notSet, failed}},
+        {"", MakeConf("a", "b\nc"), {lineBreak, notSet, failed}},
+        {"",
+         MakeConf("a", kKey, WIRELESS_AUTH_WPA_NONE),
+         {"Failed to detect authentication/encryption type", notSet, failed}},
+        {"rm -r /usr/tavi/etc",
+         MakeConf(),
+         {"Failed to open file[/usr/tavi/etc/wpa_supplicant.conf].", notSet, failed}},
+        {"mkdir /var/tmp/.wireless_current_connection",
+         MakeConf(),
+         {"Failed to record this connection.", failed}},
+    };
+    for (const Case& c : kCases) {
+        Station station;
+        Shell(c.arrange);
+        WirelessConf conf = c.conf;
+        EXPECT_EQ(TAVIWirelessNetworkConnect(&conf), -1);
+        ASSERT_EQ(station.log.Lines().size(), c.log.size()) << station.log.Text();
+        for (size_t i = 0; i < c.log.size(); ++i) {
+            EXPECT_THAT(station.log.Lines()[i].text,
+                        AllOf(StartsWith("wireless_network_connect.cpp:"), EndsWith(c.log[i])));
+        }
+        EXPECT_FALSE(Exists(kFlag));
+    }
+}
+
+TEST(CheckBlock, TellsWhetherTheUserBlockedTheRadio) {
+    struct Case {
+        const char* settings;
+        const char* info;
+        int result;
+    };
+    const Case kCases[] = {
+        {"[a;b]\n\tunblock=yes\n", "PRODUCT=a;b\n", 1},  {"[a;b]\n\tx=no\n", "PRODUCT=a;b\n", -1},
+        {"[other]\n\tunblock=no\n", "PRODUCT=a;b\n", 1}, {"[a;b]\n", "PRODUCT=\n", -1},
+        {"[a;b]\n\tunblock=no\n", "PRODUCT=a;b\n", 0},
+    };
+    Station station;
+    EXPECT_EQ(TAVIWirelessCheckBlock(), 1);
+    for (const Case& c : kCases) {
+        WriteFile("/usr/tavi/etc/wireless_ap.conf", c.settings);
+        WriteFile("/tmp/wireless.info", c.info);
+        EXPECT_EQ(TAVIWirelessCheckBlock(), c.result) << c.settings;
+    }
+    EXPECT_EQ(VEXACErrGet(), VEXAC_ERR_NOT_FOUND);
+    WriteFile(kFlag, "");
+    EXPECT_EQ(TAVIWirelessNetworkConnect(nullptr), 0);  // nothing to do
+    EXPECT_FALSE(Exists(kFlag) || Exists(kSupplicantFile));
+    EXPECT_EQ(station.log.Text(), "");
+}
+
+}  // namespace
+}  // namespace taviwireless::test

@@ -1,0 +1,219 @@
+// Scanning: waiting for the adapter, scans until two agree, what is read from the tool's table.
+#include <gmock/gmock.h>
+#include <sys/resource.h>
+#include <taviwireless/wireless.h>
+
+#include "tests/support/descriptors.h"
+#include "tests/support/log_capture.h"
+#include "tests/support/sleep_capture.h"
+#include "tests/wireless/wifi_fixture.h"
+#include "wireless/queue.h"
+
+namespace taviwireless::test {
+namespace {
+
+using testing::HasSubstr;
+using Networks = wireless::OwnedList<WirelessNetwork>;
+
+constexpr char kTableCommand[] = "/sbin/iwlist wlan0 scanning tavi";
+constexpr char kAddress[] = "A0:11:22:33:44:55";
+const std::string k32Bytes = "0123456789abcdef0123456789\xC3\xBC\xF0\x9F\x93\xB6";
+
+// A table of so many networks: "0", "1", ...
+std::string Table(int count) {
+    std::string table;
+    for (int i = 0; i < count; ++i) {
+        table += ScanLine(6, std::to_string(i), kAddress, 70, "bgn", "WPA2PSK/AES");
+    }
+    return table;
+}
+
+// "[ESSID] BSSID channel signal protocol auth encrypt opmode" of each network.
+std::vector<std::string> Scanned() {
+    Networks networks;
+    EXPECT_EQ(TAVIWirelessNetworkScan(0, networks.Head()), 0);
+    std::vector<std::string> texts;
+    for (const WirelessNetwork& network : networks) {
+        char bssid[18];
+        char text[128];
+        snprintf(text, sizeof text, "[%s] %s %d %d %d %d %d %d", network.essid,
+                 TAVIWirelessBssidStringGet(network.bssid, bssid, sizeof bssid), network.channel,
+                 network.signal, network.protocol, network.auth, network.encrypt, network.opmode);
+        texts.emplace_back(text);
+    }
+    return texts;
+}
+
+TEST(Adapter, IsWaitedForFiveSeconds) {
+    ToolStandIns tools;
+    AddScanner(tools, {Table(1)});
+    for (const size_t plugged : {1u, 5u, 6u}) {  // in which wait; there is no sixth
+        LogCapture log;
+        std::optional<WirelessInterface> adapter;
+        std::vector<unsigned> slept;
+        SleepCapture sleeps([&](unsigned seconds) {
+            slept.push_back(seconds);
+            if (slept.size() == plugged) {
+                adapter.emplace();
+            }
+        });
+        WirelessNetwork network{};
+        const bool isFound = plugged < 6;
+        EXPECT_EQ(TAVIWirelessNetworkGet("0", WIRELESS_KEY_ESSID, &network), isFound ? 1 : -1);
+        EXPECT_EQ(slept, std::vector<unsigned>(isFound ? plugged + 1 : 5, 1));
+        EXPECT_EQ(log.Count("Wait for wlan0 ready, "), static_cast<int>(std::min(plugged, 5ul)));
+        EXPECT_EQ(log.Has("There is no wireless USB adapter plugged"), !isFound);
+        EXPECT_EQ(log.Has("Failed to scan wireless networks"), !isFound);
+    }
+}
+
+// An adapter, a recording iwlist, and no waiting.
+struct Scan : testing::Test {
+    WirelessInterface adapter;
+    ToolStandIns tools;
+    SleepCapture sleeps;
+    LogCapture log;
+};
+
+TEST_F(Scan, IsRepeatedUntilTwoGiveTheSameNumber) {
+    const struct {
+        std::vector<int> counts;
+        std::string lastLine;
+    } kRows[] = {{{4, 4}, "Scan 1: success."},
+                 {{3, 4, 4}, "Scan 2: success."},
+                 {{2, 0, 2, 2}, "Scan 3: success."},
+                 {{0, 0, 0, 0, 0}, "Scan 4: no scan result."},
+                 {{3, 4, 5, 6, 7}, "Scan 4: result is un-stable."}};
+    for (const auto& row : kRows) {
+        std::vector<std::string> tables;
+        for (const int count : row.counts) {
+            tables.push_back(Table(count));
+        }
+        AddScanner(tools, tables);
+        tools.ForgetCommands();
+        log.Clear();
+        EXPECT_EQ(Scanned().size(), static_cast<size_t>(row.counts.back()));
+        EXPECT_EQ(tools.Commands(), std::vector<std::string>(row.counts.size(), kTableCommand));
+        ASSERT_EQ(log.Lines().size(), row.counts.size()) << log.Text();
+        EXPECT_THAT(log.Lines().back().text, HasSubstr(row.lastLine));
+    }
+}
+
+TEST_F(Scan, ReadsALineByItsColumns) {
+    const std::string read = " A0:11:22:33:44:55 ";
+    const struct {
+        std::string line;
+        std::string network;  // empty: none
+        std::string logged;
+    } kRows[] = {
+        {ScanLine(6, "My Net", "0:1:2:a:B:cc", 70, "11b/g/n", "wpa2psk/aes"),
+         "[My Net] 00:01:02:0A:0B:CC 6 70 10 5 8 0", ""},
+        {ScanLine(140, " x ", kAddress, -52, "a/n", "None"), "[ x]" + read + "140 -52 9 1 1 0", ""},
+        {ScanLine(1, k32Bytes, kAddress, 9, "bg", "wep").erase(37, 1),
+         "[" + k32Bytes + "]" + read + "1 9 1 3 2 0", ""},
+        {ScanLine(1, "$(id)%s%n", kAddress, 9, "b", "WPA3/SAE more words"),
+         "[$(id)%s%n]" + read + "1 9 2 0 0 0", ""},
+        {ScanLine(1, "n", kAddress, 9, std::string(33, 'p'), "s"), "[n]" + read + "1 9 0 0 0 0",
+         "Failed to parse security field 'pp'"},
+        {ScanLine(1, "n", kAddress, 9, "b", "WPA2PSK"), "[n]" + read + "1 9 2 0 0 0",
+         "Failed to parse security field 'WPA2PSK'"},
+        {ScanLine(1, "  \t ", kAddress, 9, "b", "NONE"), "", ""},
+        {"  x  no channel                      00:11:22:33:44:55 70 b NONE\n", "",
+         "Failed to parse channel(  x  no"},
+        {ScanLine(1, "n", "00-11-22-33-44-55", 9, "b", "NONE"), "", "network info(1    n  "},
+        {ScanLine(1, "n", kAddress, 9, "b", ""), "", "Failed to parse network info(1    n  "},
+        {"6    ends before its address       \n", "", "Failed to parse network info(6    ends"},
+        {"6    shorter than 32\n", "", ""},
+        {std::string("6    zero\0byte", 14) + Table(1), "", ""},
+    };
+    for (const auto& row : kRows) {
+        SCOPED_TRACE(row.line);
+        AddScanner(tools, {row.line});
+        log.Clear();
+        std::vector<std::string> networks;
+        if (!row.network.empty()) {
+            networks.push_back(row.network);
+        }
+        EXPECT_EQ(Scanned(), networks);
+        EXPECT_EQ(log.Has("Failed to parse"), !row.logged.empty());
+        EXPECT_TRUE(log.Has(row.logged)) << log.Text();
+    }
+}
+
+TEST_F(Scan, SurvivesLinesCutAnywhereAndContinuesLongOnes) {
+    const std::string whole = ScanLine(6, k32Bytes, kAddress, 70, "bgn", "WPA2PSK/AES");
+    std::string table;
+    for (size_t length = 0; length < whole.size(); ++length) {
+        table += whole.substr(0, length) + "\n";
+    }
+    AddScanner(tools, {table});
+    EXPECT_EQ(Scanned().size(), strlen("WPA2PSK/AES"));  // those that reach into the last word
+
+    std::string first = whole;
+    first.back() = ' ';
+    first.resize(511, ' ');
+    AddScanner(tools, {first + whole + std::string(4096, '\xFF') + "\n" + Table(2000)});
+    EXPECT_EQ(Scanned().size(), 2002u);
+}
+
+TEST(Scanner, ThatCannotBeRunFailsWithAnEmptyList) {
+    LogCapture log;
+    rlimit before{};
+    ASSERT_EQ(getrlimit(RLIMIT_NOFILE, &before), 0);
+    SleepCapture sleeps([&](unsigned) {  // the only wait is that for the activated interface
+        const rlimit nothingCanBeOpened{0, before.rlim_max};
+        setrlimit(RLIMIT_NOFILE, &nothingCanBeOpened);
+    });
+    WirelessLink networks{};
+    const WirelessInterface adapter;
+    EXPECT_EQ(TAVIWirelessNetworkScan(0, &networks), -1);
+    setrlimit(RLIMIT_NOFILE, &before);
+    EXPECT_TRUE(wireless::IsEmpty(networks));
+    EXPECT_EQ(log.Count("popen '" + std::string(kTableCommand) + "', errno=Too many open"), 5);
+    EXPECT_TRUE(log.Has("Scan 4: failed."));
+    EXPECT_TRUE(log.Has("Failed to get network scanning result"));
+
+    Shell("ip link set wlan0 name wlan1");
+    EXPECT_EQ(TAVIWirelessNetworkScan(0, &networks), -1);
+    EXPECT_TRUE(log.Has("Failed to activate network interface wlan0"));
+    EXPECT_EQ(TAVIWirelessNetworkScan(0, nullptr), -1);
+    EXPECT_TRUE(log.Has("Bad parameters"));
+    EXPECT_EQ(sleeps.Total(), 1u);
+    Shell("ip link delete wlan1");
+}
+
+TEST_F(Scan, FindsOneNetworkAndTriggersAnotherScanWhenThereIsNone) {
+    AddScanner(tools, {ScanLine(1, "home", "0:0:0:0:0:1", 10, "b", "NONE") +
+                       ScanLine(2, "Home", "0:0:0:0:0:2", 20, "b", "WEP")});
+    const unsigned char second[6] = {0, 0, 0, 0, 0, 2};
+    const unsigned char other[6] = {0, 0, 0, 0, 0, 3};
+    const struct {
+        const void* key;
+        int kind;
+        int channel;  // 0: not found
+    } kRows[] = {{"Home", WIRELESS_KEY_ESSID, 2}, {"home", WIRELESS_KEY_ESSID, 1},
+                 {"HOME", WIRELESS_KEY_ESSID, 0}, {second, WIRELESS_KEY_BSSID, 2},
+                 {other, WIRELESS_KEY_BSSID, 0},  {"nothing", 2, 1}};
+    const auto before = OpenDescriptors();
+    for (const auto& row : kRows) {
+        WirelessNetwork network{};
+        EXPECT_EQ(TAVIWirelessNetworkGet(row.key, row.kind, &network), row.channel > 0 ? 1 : 0);
+        EXPECT_EQ(network.channel, row.channel);
+        EXPECT_EQ(network.link.next, nullptr);
+    }
+    EXPECT_EQ(OpenDescriptors(), before);
+
+    AddScanner(tools, {"", "", "", "", "", Table(1)});
+    tools.ForgetCommands();
+    WirelessNetwork network{};
+    EXPECT_EQ(TAVIWirelessNetworkGet("0", WIRELESS_KEY_ESSID, &network), 1);
+    std::vector<std::string> commands(7, kTableCommand);
+    commands.insert(commands.begin() + 5, "/sbin/iwlist wlan0 scanning");
+    EXPECT_EQ(tools.Commands(), commands);
+    EXPECT_EQ(TAVIWirelessNetworkGet(nullptr, 0, &network), -1);
+    EXPECT_EQ(TAVIWirelessNetworkGet("0", 0, nullptr), -1);
+    EXPECT_EQ(log.Count("Bad parameters"), 2);
+}
+
+}  // namespace
+}  // namespace taviwireless::test

@@ -1,0 +1,341 @@
+// What the adapter is doing, as the driver tells it; operation modes and ad-hoc networks.
+#include <dlfcn.h>
+#include <gmock/gmock.h>
+#include <tavisdk/network.h>
+#include <taviwireless/wireless.h>
+
+#include <functional>
+
+#include "tests/support/descriptors.h"
+#include "tests/support/log_capture.h"
+#include "tests/wireless/scripted_driver.h"
+#include "tests/wireless/wifi_fixture.h"
+
+namespace taviwireless::test {
+namespace {
+
+using testing::ElementsAre;
+using testing::IsEmpty;
+
+bool isSupported = true;
+int shellsThatRun = -1;  // then none can be run; negative: all can
+
+}  // namespace
+}  // namespace taviwireless::test
+
+using namespace taviwireless::test;
+
+extern "C" __attribute__((visibility("default"))) int system(const char* command) {
+    if (shellsThatRun == 0) {
+        return -1;
+    }
+    --shellsThatRun;
+    static const auto next = reinterpret_cast<decltype(&system)>(dlsym(RTLD_NEXT, "system"));
+    return next(command);
+}
+
+// "/etc.defaults" cannot be private: it would be a new directory in the machine's own "/".
+extern "C" __attribute__((visibility("default"))) int VEXACFileCheckKeyValue(const char* file,
+                                                                             const char* key,
+                                                                             const char* value,
+                                                                             int) {
+    EXPECT_STREQ(file, "/etc.defaults/taviinfo.conf");
+    EXPECT_STREQ(key, "support_wireless");
+    EXPECT_STREQ(value, "yes");
+    return isSupported ? 1 : 0;
+}
+
+namespace taviwireless::test {
+namespace {
+
+// The adapter, up, with a scripted driver.
+struct Adapter : testing::Test {
+    Adapter() {
+        interface.Up();
+        isSupported = true;
+        SetQuality("Link Quality=40/70  Signal level=-61 dBm");
+        tools.Add("/sbin/iwconfig", "[ $# -gt 1 ] || cat /tmp/quality");
+    }
+    void SetQuality(const std::string& text) {
+        WriteFile("/tmp/quality", "wlan0  IEEE 802.11\n          " + text + "\n");
+    }
+    int32_t Value(int what) {
+        int32_t value = 99;
+        return TAVIWirelessCurInfoGet(what, &value) == 0 ? value : -1;
+    }
+    WirelessStatus Status() {
+        WirelessStatus status;
+        memset(&status, '#', sizeof status);
+        EXPECT_EQ(TAVIWirelessStatusGet(&status), &status);
+        EXPECT_EQ(status.status, Value(WIRELESS_INFO_CONN_STATUS));
+        return status;
+    }
+    bool Logged(const std::string& text) {
+        const bool isLogged = log.Has(text);
+        log.Clear();
+        return isLogged;
+    }
+
+    WirelessInterface interface;
+    ToolStandIns tools;
+    ScriptedDriver driver;
+    LogCapture log;
+};
+
+TEST_F(Adapter, HasAStatusByItsModeAndItsAccessPoint) {
+    const struct {
+        unsigned mode;
+        int status;
+        int statusWithAccessPoint;
+        int opmode;
+    } kRows[] = {{0, 4, 5, 0}, {1, 6, 6, 1}, {2, 4, 5, 2}, {3, 7, 7, 3}, {4, 0, 0, 4},
+                 {5, 0, 0, 5}, {6, 7, 7, 6}, {7, 0, 0, 7}, {8, 0, 0, 7}, {~0U, 0, 0, 7}};
+    for (const auto& row : kRows) {
+        SCOPED_TRACE(row.mode);
+        driver.mode = row.mode;
+        driver.accessPoint = {};
+        EXPECT_EQ(Value(WIRELESS_INFO_OPMODE), row.opmode);
+        EXPECT_EQ(Status().status, row.status);
+        driver.accessPoint = {0, 0, 0, 0, 0, 1};
+        EXPECT_EQ(Status().status, row.statusWithAccessPoint);
+    }
+    EXPECT_EQ(TAVIWirelessOpmodeSet(WIRELESS_OPMODE_MANAGED), 0);
+    EXPECT_EQ(driver.mode, static_cast<unsigned>(IW_MODE_INFRA));
+    driver.refused = {SIOCGIWAP};
+    EXPECT_EQ(Status().status, WIRELESS_STATUS_NOT_CONNECTED);
+    EXPECT_THAT(driver.interfacesAskedFor, ElementsAre("wlan0"));
+    Shell("ip link set wlan0 down");
+    EXPECT_EQ(Status().status, WIRELESS_STATUS_INTERFACE_DOWN);
+    Shell("ip link delete wlan0");
+    log.Clear();
+    EXPECT_EQ(Status().status, WIRELESS_STATUS_NO_ADAPTER);
+    EXPECT_EQ(TAVIWirelessOpmodeGet(), WIRELESS_OPMODE_UNKNOWN);
+    EXPECT_EQ(log.Text(), "");
+    isSupported = false;
+    WirelessStatus status;
+    EXPECT_EQ(TAVIWirelessStatusGet(&status)->status, WIRELESS_STATUS_NOT_SUPPORTED);
+}
+
+TEST_F(Adapter, TellsEssidProtocolAndKeyState) {
+    for (const std::string& essid :
+         {std::string("a\xFF%s b"), std::string(), std::string(32, 'x'), std::string(33, 'y')}) {
+        driver.essid = essid;
+        WirelessInfo info;
+        memset(&info, '#', sizeof info);
+        EXPECT_EQ(TAVIWirelessCurInfoGet(WIRELESS_INFO_ESSID, &info), 0);
+        EXPECT_EQ(info.essid, essid.substr(0, 32));
+    }
+    for (const auto& [name, protocol] : {std::pair("IEEE 802.11bgn", 10),
+                                         {"IEEE 802.11", 0},
+                                         {"My IEEE 802.11bg", 0},
+                                         {"unassociated", 0},
+                                         {"b", 0},
+                                         {"IEEE 802.11bgnac", 0}}) {
+        driver.name = name;
+        EXPECT_EQ(Value(WIRELESS_INFO_PROTOCOL), protocol) << name;
+    }
+    for (const auto& [flags, length, state] :
+         {std::tuple(IW_ENCODE_DISABLED, 5, 1), {IW_ENCODE_OPEN, 0, 1}, {IW_ENCODE_OPEN, 64, 2}}) {
+        driver.encodingFlags = flags;
+        driver.keyLength = length;
+        EXPECT_EQ(Value(WIRELESS_INFO_KEY_STATE), state);
+    }
+}
+
+TEST_F(Adapter, LogsWhatIsRefused) {
+    static WirelessInfo info;
+    const std::string noSocket = "Cannot get socket.";
+    const struct {
+        int (*call)();
+        int result;
+        std::string line;
+        std::string lineWithoutSocket;  // empty: the driver is not asked
+    } kRows[] = {
+        {[] { return TAVIWirelessCurInfoGet(0, &info); }, -1, "Failed to request essid.",
+         "Failed to request essid."},
+        {[] { return TAVIWirelessCurInfoGet(1, &info); }, -1, "Failed to request protocol.",
+         "Failed to request protocol."},
+        {[] { return TAVIWirelessCurInfoGet(2, &info); }, -1, "Failed to request auth.",
+         "Failed to request auth."},
+        {TAVIWirelessOpmodeGet, 7, "Failed to get information from ioctl with ifname[wlan0].",
+         noSocket},
+        {[] { return TAVIWirelessOpmodeSet(2); }, -1, "Failed to set opmode[Managed] of wlan0.",
+         noSocket},
+        {[] { return TAVIWirelessOpmodeSet(3); }, -1, "Opmode(Master) isn't supported", ""},
+        {[] { return TAVIWirelessOpmodeSet(5); }, -1, "Opmode(Secondeary) isn't supported", ""},
+        {[] { return TAVIWirelessCurInfoGet(5, &info); }, -1, "This request is not supported.", ""},
+        {[] { return TAVIWirelessCurInfoGet(-1, &info); }, -1, "request is not supported.", ""},
+        {[] { return TAVIWirelessCurInfoGet(0, nullptr); }, -1, "Bad parameters", ""},
+        {[] { return TAVIWirelessAdhocNetworkGet(nullptr); }, -1, "Bad parameters", ""},
+        {[] { return TAVIWirelessAdhocCreate(nullptr); }, -1, "Bad parameters", ""},
+        {[] { return TAVIWirelessStatusGet(nullptr) == nullptr ? 0 : 1; }, 0, "Bad parameters", ""},
+    };
+    driver.refused = {SIOCGIWESSID, SIOCGIWNAME, SIOCGIWENCODE, SIOCGIWMODE, SIOCSIWMODE};
+    const auto before = OpenDescriptors();
+    for (const bool hasSocket : {true, false}) {
+        driver.hasNoSocket = !hasSocket;
+        for (const auto& row : kRows) {
+            EXPECT_EQ(row.call(), row.result) << row.line;
+            const bool isOther = !hasSocket && !row.lineWithoutSocket.empty();
+            EXPECT_TRUE(Logged(isOther ? row.lineWithoutSocket : row.line)) << row.line;
+        }
+    }
+    EXPECT_EQ(OpenDescriptors(), before);
+}
+
+struct Connected : Adapter {
+    Connected() { driver.accessPoint = {0, 1, 2, 3, 4, 5}; }
+    WirelessNetwork Network(const std::string& record) {
+        WriteFile("/var/tmp/.wireless_current_connection", record);
+        const WirelessStatus status = Status();
+        EXPECT_EQ(status.status, WIRELESS_STATUS_CONNECTED);
+        return status.network;
+    }
+};
+
+constexpr char kRecord[] = "  my net %s\n10\n5\n8\n00:01:02:03:04:05\n";
+
+TEST_F(Connected, IsToTheNetworkThatWasWrittenDown) {
+    const WirelessNetwork network = Network(kRecord);
+    EXPECT_STREQ(network.essid, "  my net %s");
+    EXPECT_EQ(network.protocol, 10);
+    EXPECT_EQ(network.auth, 5);
+    EXPECT_EQ(network.encrypt, 8);
+    EXPECT_THAT(network.bssid, ElementsAre(0, 1, 2, 3, 4, 5));
+    EXPECT_EQ(network.channel, 0);
+    EXPECT_EQ(network.signal, 57);
+    EXPECT_EQ(log.Text(), "");
+    for (const auto& [record, essid] : {std::pair(std::string("net\n1\n2\n"), ""),
+                                        {"\n1\n2\n3\n0:1:2:3:4:5\n", ""},
+                                        {std::string(33, 'x') + "\n1\n2\n3\n0:1:2:3:4:5\n", ""},
+                                        {"net\n1\n2\n3\nno address\n", "net"}}) {
+        EXPECT_STREQ(Network(record).essid, essid);
+        EXPECT_TRUE(Logged("Failed to get wireless network info"));
+    }
+    std::filesystem::remove("/var/tmp/.wireless_current_connection");
+    EXPECT_EQ(Status().status, WIRELESS_STATUS_CONNECTED);
+    EXPECT_TRUE(Logged("Failed to get wireless network info"));
+}
+
+TEST_F(Connected, HasASignalInPercent) {
+    const struct {
+        const char* quality;
+        int signal;
+        bool isReadable;
+    } kRows[] = {
+        {"Link Quality=33/-1", -3300, true}, {"Link Quality=5/0", 0, false},
+        {"Link Quality=5", 0, false},        {"Link Quality:5/100", 0, false},
+        {"no such words", 0, false},         {"Link Quality=30000000/30000000", 100, true}};
+    for (const auto& row : kRows) {
+        SetQuality(row.quality);
+        EXPECT_EQ(Network(kRecord).signal, row.signal) << row.quality;
+        EXPECT_NE(Logged("Failed to get signal infomation"), row.isReadable) << row.quality;
+    }
+}
+
+TEST_F(Adapter, DescribesItsAdhocNetwork) {
+    driver.mode = IW_MODE_ADHOC;
+    driver.encodingFlags = IW_ENCODE_OPEN;
+    driver.keyLength = 5;
+    for (const auto& [essid, shown] :
+         {std::pair<std::string, std::string>("100%% %%%% %", "100% %% %"),
+          {"%s%n%%%", "%s%n%%"},
+          {std::string(32, '%'), std::string(16, '%')},
+          {std::string(32, 'x'), std::string(32, 'x')}}) {
+        driver.essid = essid;
+        EXPECT_EQ(Status().network.essid, shown);
+    }
+    WirelessNetwork network = Status().network;
+    EXPECT_EQ(network.opmode, WIRELESS_OPMODE_ADHOC);
+    EXPECT_EQ(network.protocol, WIRELESS_PROTOCOL_BGN);
+    EXPECT_EQ(network.auth, 2);
+    EXPECT_EQ(network.encrypt, WIRELESS_ENCRYPT_WEP);
+    EXPECT_EQ(network.signal, 40);
+    driver.keyLength = 0;
+    SetQuality("Link Quality unknown");
+    EXPECT_EQ(TAVIWirelessAdhocNetworkGet(&network), 0);
+    EXPECT_EQ(network.auth, 1);
+    EXPECT_EQ(network.encrypt, WIRELESS_ENCRYPT_NONE);
+    EXPECT_EQ(network.signal, 70);
+    driver.mode = IW_MODE_INFRA;
+    EXPECT_EQ(TAVIWirelessAdhocNetworkGet(&network), -1);
+    EXPECT_TRUE(Logged("wlan0 is not Ad-Hoc mode."));
+}
+
+WirelessConf AdhocConf(const std::string& essid, int encrypt, const std::string& key = "") {
+    WirelessConf conf{};
+    essid.copy(conf.network.essid, sizeof conf.network.essid);
+    key.copy(conf.key, sizeof conf.key);
+    conf.network.opmode = WIRELESS_OPMODE_ADHOC;
+    conf.network.encrypt = encrypt;
+    return conf;
+}
+
+TEST_F(Adapter, CreatesAnAdhocNetwork) {
+    const std::string hostile = "$(touch /tmp/ran)`id`|a;b&'\"";
+    const struct {
+        std::string essid;
+        int encrypt;
+        std::string key;
+        std::string command;  // empty: refused
+    } kRows[] = {{"our net", 1, "ignored", "off"},
+                 {"net", 2, "abcde", "open s:abcde"},
+                 {"net", 2, "abcdefghijklm", "open s:abcdefghijklm"},
+                 {"net", 2, "0123456789", "open 0123456789"},
+                 {"net", 2, std::string(26, 'F'), "open " + std::string(26, 'F')},
+                 {"net", 2, "123456", ""},
+                 {std::string(33, 'n'), 2, std::string(257, 'x'), ""},
+                 {hostile, 2, "`id`$", "open s:`id`$"}};
+    for (const auto& row : kRows) {
+        SCOPED_TRACE(row.key);
+        const bool isCreated = !row.command.empty();
+        const WirelessConf conf = AdhocConf(row.essid, row.encrypt, row.key);
+        tools.ForgetCommands();
+        driver.modesSet.clear();
+        EXPECT_EQ(TAVIWirelessAdhocCreate(&conf), isCreated ? 0 : -1);
+        std::vector<std::string> commands{"/sbin/iwconfig wlan0 essid " + row.essid};
+        if (isCreated) {
+            commands.push_back("/sbin/iwconfig wlan0 key " + row.command);
+        }
+        EXPECT_EQ(tools.Commands(), commands);
+        EXPECT_THAT(driver.modesSet, ElementsAre(1u));
+        EXPECT_NE(Logged("The key is not standard WEP format."), isCreated);
+        EXPECT_EQ(TAVINetIsIFUp("wlan0"), isCreated ? 1 : 0);
+    }
+    EXPECT_FALSE(Exists("/tmp/ran"));
+}
+
+TEST_F(Adapter, CreatesNoNetworkWhenAStepFails) {
+    WirelessConf conf = AdhocConf("net", 2, "abcde");
+    const char* const kLines[] = {
+        "Failed to execute '/sbin/iwconfig wlan0 essid net > /dev/null 2>&1'",
+        "Failed to execute '/sbin/iwconfig wlan0 key open s:***** > /dev/null 2>&1'"};
+    for (int ran = 0; ran < 2; ++ran) {
+        shellsThatRun = ran;
+        EXPECT_EQ(TAVIWirelessAdhocCreate(&conf), -1);
+        EXPECT_TRUE(Logged(kLines[ran]));
+    }
+    shellsThatRun = -1;
+    const struct {
+        std::function<void()> change;
+        const char* line;
+    } kRows[] = {
+        {[&] { driver.refused = {SIOCSIWMODE}; }, "Failed to set Ad-Hoc mode of wlan0."},
+        {[] { Shell("ip link set wlan0 name wlan1"); },
+         "Failed to deactivate network interface [wlan0]."},
+        {[&] { conf.network.encrypt = WIRELESS_ENCRYPT_AES; },
+         "Adhoc mode does not support encryption [AES]."},
+        {[&] { conf.network.opmode = WIRELESS_OPMODE_MANAGED; },
+         "Interface wlan0 is not Adhoc mode."},
+        {[] { Shell("ip link delete wlan1"); }, "There is no wireless USB adapter plugged"}};
+    tools.ForgetCommands();
+    for (const auto& row : kRows) {
+        row.change();
+        EXPECT_EQ(TAVIWirelessAdhocCreate(&conf), -1);
+        EXPECT_TRUE(Logged(row.line)) << row.line;
+    }
+    EXPECT_THAT(tools.Commands(), IsEmpty());
+}
+
+}  // namespace
+}  // namespace taviwireless::test

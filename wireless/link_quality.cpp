@@ -1,0 +1,28 @@
+#include "wireless/link_quality.h"
+
+#include <tavisdk/wireless.h>
+
+#include "wireless/shell.h"
+
+namespace taviwireless::wireless {
+
+std::optional<LinkQuality> ReadLinkQuality() {
+    constexpr size_t kCommandSize = 128;
+    const Pipe pipe = OpenPipe(Command(
+        kCommandSize, {"/sbin/iwconfig ", TAVIWirelessInterfaceGet(), " | grep 'Link Quality'"}));
+    if (!pipe) {
+        return std::nullopt;
+    }
+    int value = 0;
+    int maximum = 0;
+    switch (fscanf(pipe.get(), " Link Quality=%d/%d", &value, &maximum)) {
+        case 2:
+            return LinkQuality{value, maximum};
+        case 1:
+            return LinkQuality{value, std::nullopt};
+        default:
+            return std::nullopt;
+    }
+}
+
+}  // namespace taviwireless::wireless

@@ -1,0 +1,24 @@
+#ifndef TAVIWIRELESS_WIRELESS_NEW_FILE_H
+#define TAVIWIRELESS_WIRELESS_NEW_FILE_H
+
+#include <fcntl.h>
+#include <unistd.h>
+
+#include <cstdio>
+#include <memory>
+
+namespace taviwireless::wireless {
+
+using File = std::unique_ptr<FILE, int (*)(FILE*)>;
+
+// Opens a file that is new: one that was there is removed, never written into, so that the mode
+// holds from the first byte and nobody reads along who had the old one open. Null on failure.
+inline File CreateAnew(const char* path, mode_t mode) {
+    unlink(path);
+    const int handle = open(path, O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, mode);
+    return File(handle >= 0 ? fdopen(handle, "w") : nullptr, fclose);
+}
+
+}  // namespace taviwireless::wireless
+
+#endif

@@ -1,0 +1,81 @@
+// Joining a saved network, the last used first.
+#include <tavisdk/wireless.h>
+#include <taviwireless/wireless.h>
+
+#include <string>
+
+#include "common/log.h"
+#include "wireless/queue.h"
+
+namespace taviwireless::wireless {
+
+namespace {
+
+constexpr size_t kInterfaceSize = 16;
+
+// Whether it is worth trying to join the network. One in range gets its settings from the scan. One
+// that is not may be hidden or silent: its saved settings are tried, if there are any, once a
+// second scan has not found it either.
+bool IsWorthTrying(WirelessConf& conf) {
+    for (int lookup = 0; lookup < 2; ++lookup) {
+        WirelessNetwork found;
+        if (TAVIWirelessNetworkGet(conf.network.bssid, WIRELESS_KEY_BSSID, &found) == 1) {
+            conf.network = found;
+            return true;
+        }
+        if (conf.network.auth == WIRELESS_AUTH_UNKNOWN ||
+            conf.network.encrypt == WIRELESS_ENCRYPT_UNKNOWN) {
+            return false;
+        }
+        if (conf.network.protocol != WIRELESS_PROTOCOL_UNKNOWN) {
+            return true;
+        }
+    }
+    return true;
+}
+
+// The network that was joined, or null.
+const WirelessConf* ConnectFirst(OwnedList<WirelessConf>& confs) {
+    if (TAVIWirelessConfEnumByAtime(confs.Head()) != 0) {
+        TAVI_LOG_ERROR("Failed to enumerate wireless network configurations");
+        return nullptr;
+    }
+    for (WirelessConf& conf : confs) {
+        if (IsWorthTrying(conf) && TAVIWirelessNetworkConnect(&conf) == 0) {
+            return &conf;
+        }
+    }
+    return nullptr;
+}
+
+bool ConnectSavedNetwork(const std::string& interface) {
+    OwnedList<WirelessConf> confs;
+    const WirelessConf* joined = ConnectFirst(confs);
+    if (joined == nullptr) {
+        TAVI_LOG_ERROR("Failed to connect any access point");
+        return false;
+    }
+    if (TAVIWirelessIfconfigSet(interface.c_str(), joined) < 0) {
+        TAVI_LOG_ERROR("Failed to set interface configuration");
+        return false;
+    }
+    return true;
+}
+
+}  // namespace
+
+}  // namespace taviwireless::wireless
+
+int TAVIWirelessAutoConnect() {
+    using namespace taviwireless::wireless;
+    WirelessInfo info{};
+    TAVIWirelessCurInfoGet(WIRELESS_INFO_CONN_STATUS, &info);
+    if (info.value == WIRELESS_STATUS_CONNECTED || info.value == WIRELESS_STATUS_ADHOC) {
+        TAVI_LOG_ERROR("Connection exists");
+    } else if (ConnectSavedNetwork(
+                   std::string(TAVIWirelessInterfaceGet()).substr(0, kInterfaceSize))) {
+        return 0;
+    }
+    TAVIWirelessNetworkDisconnect();
+    return -1;
+}

@@ -1,0 +1,38 @@
+#include <algorithm>
+#include <vector>
+
+#include "common/log.h"
+#include "wireless/queue.h"
+#include "wireless/saved_networks.h"
+
+namespace taviwireless::wireless {
+
+namespace {
+
+// The last used first; those of the same time stay in the order of the file.
+void SortByTime(WirelessLink& head) {
+    std::vector<WirelessConf*> confs;
+    for (WirelessLink* member = head.next; member != &head; member = member->next) {
+        confs.push_back(WIRELESS_RECORD(member, WirelessConf));
+    }
+    std::stable_sort(confs.begin(), confs.end(), [](WirelessConf* a, WirelessConf* b) {
+        return a->accessTime > b->accessTime;
+    });
+    MakeEmpty(head);
+    for (WirelessConf* conf : confs) {
+        InsertBefore(head, conf->link);
+    }
+}
+
+}  // namespace
+
+}  // namespace taviwireless::wireless
+
+int TAVIWirelessConfEnumByAtime(WirelessLink* confs) {
+    using namespace taviwireless::wireless;
+    const int result = ListSavedNetworks(confs, __FILE_NAME__, __LINE__);
+    if (confs != nullptr) {
+        SortByTime(*confs);
+    }
+    return result;
+}

@@ -1,0 +1,7 @@
+#include <taviwireless/wireless.h>
+
+int TAVIWirelessConnStatusGet() {
+    WirelessInfo info{};
+    TAVIWirelessCurInfoGet(WIRELESS_INFO_CONN_STATUS, &info);
+    return info.value;
+}

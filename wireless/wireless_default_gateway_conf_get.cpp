@@ -1,0 +1,37 @@
+// The gateway that the Wi-Fi connection should use.
+#include <tavicore/keyvalue.h>
+#include <tavisdk/network.h>
+#include <tavisdk/wireless.h>
+#include <taviwireless/wireless.h>
+
+#include <cstdio>
+#include <string>
+
+#include "common/log.h"
+#include "wireless/paths.h"
+
+int TAVIWirelessDefaultGatewayConfGet_core(char* buf, size_t size) {
+    using namespace taviwireless::wireless;
+    if (buf == nullptr || size == 0) {
+        TAVI_LOG_ERROR("Bad parameters");
+        return -1;
+    }
+    *buf = '\0';
+    const char* interface = TAVIWirelessInterfaceGet();
+    if (BlTAVILnxIsDHCP(interface)) {
+        // A lease without a gateway is an answer, too.
+        const std::string lease = std::string(kDhcpClientPrefix) + interface + ".info";
+        VEXACFileGetKeyValue(lease.c_str(), "GATEWAY", buf, size);
+        return 0;
+    }
+    WirelessStatus status;
+    char bssid[18];
+    TAVIWirelessBssidStringGet(TAVIWirelessStatusGet(&status)->network.bssid, bssid, sizeof bssid);
+    WirelessConf conf;
+    if (TAVIWirelessConfGet(bssid, &conf) != 0) {
+        TAVI_LOG_ERROR("Failed to get configuration of %s", bssid);
+        return -1;
+    }
+    snprintf(buf, size, "%s", conf.gateway);
+    return 0;
+}

@@ -1,0 +1,5 @@
+#include <taviwireless/wireless.h>
+
+const char* TAVIWirelessInterfaceGet_core() {
+    return "wlan0";
+}

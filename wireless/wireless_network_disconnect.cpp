@@ -1,0 +1,102 @@
+// Leaving a network.
+#include <signal.h>
+#include <tavicore/file.h>
+#include <tavicore/process.h>
+#include <tavisdk/network.h>
+#include <tavisdk/wireless.h>
+#include <taviwireless/wireless.h>
+#include <unistd.h>
+
+#include <cerrno>
+#include <string>
+
+#include "common/log.h"
+#include "wireless/paths.h"
+#include "wireless/shell.h"
+#include "wireless/supplicant.h"
+
+namespace taviwireless::wireless {
+
+namespace {
+
+constexpr size_t kCommandSize = 128;
+constexpr size_t kInterfaceSize = 16;
+
+bool ReleaseAddress(const std::string& interface) {
+    return TAVI_RUN(
+               Command(kCommandSize, {"/sbin/iwconfig ", Argument{interface}, " essid off"})) &&
+           TAVI_RUN(Command(kCommandSize,
+                            {"/sbin/ifconfig ", Argument{interface}, " 0.0.0.0 > /dev/null 2>&1"}));
+}
+
+int LeaveAdhoc(const std::string& interface) {
+    if (VEXANetIfDown(interface.c_str()) == 0) {
+        TAVI_LOG_ERROR("Failed to deactivate network interface [%s].", interface.c_str());
+        return -1;
+    }
+    return TAVIWirelessOpmodeSet(WIRELESS_OPMODE_MANAGED);
+}
+
+bool StopSupplicant() {
+    if (VEXACFileExist(kSupplicantPidFile) &&
+        !TAVI_RUN(Command(kCommandSize, {kTerminateSupplicant}))) {
+        return false;
+    }
+    VEXACSysUnlink(kSupplicantConf);
+    return true;
+}
+
+void StopDhcpClient(const std::string& interface) {
+    const std::string pidFile = kDhcpClientPrefix + interface + ".pid";
+    pid_t pid;
+    while ((pid = VEXACReadPidFile(pidFile.c_str())) > 0) {
+        if (kill(pid, SIGKILL) == 0 || errno == ESRCH) {
+            break;
+        }
+        TAVI_LOG_ERROR("dhcpcd pid[%d] still exists, wait 1 second", pid);
+        sleep(1);
+    }
+    if (pid >= 0) {
+        VEXACSysUnlink(pidFile.c_str());
+    }
+}
+
+bool RestoreResolver() {
+    if (VEXACFileExist(kResolverBackup) && VEXACSysRename(kResolverBackup, kResolver) < 0) {
+        TAVI_LOG_ERROR("Failed to rename '%s'", kResolverBackup);
+        return false;
+    }
+    return true;
+}
+
+}  // namespace
+
+}  // namespace taviwireless::wireless
+
+int TAVIWirelessNetworkDisconnect_core() {
+    using namespace taviwireless::wireless;
+    VEXACSysUnlink(kConnectingFlag);
+    WirelessInfo info{};
+    if (TAVIWirelessCurInfoGet(WIRELESS_INFO_CONN_STATUS, &info) != 0) {
+        TAVI_LOG_ERROR("Failed to get status of dongle.");
+        return -1;
+    }
+    const int status = info.value;
+    if (status != WIRELESS_STATUS_NO_ADAPTER && status != WIRELESS_STATUS_CONNECTED &&
+        status != WIRELESS_STATUS_ADHOC) {
+        return 0;
+    }
+    VEXACSysUnlink(kCurrentConnection);
+    const std::string interface = std::string(TAVIWirelessInterfaceGet()).substr(0, kInterfaceSize);
+    if (status != WIRELESS_STATUS_NO_ADAPTER && !ReleaseAddress(interface)) {
+        return -1;
+    }
+    if (status == WIRELESS_STATUS_ADHOC) {
+        return LeaveAdhoc(interface);
+    }
+    if (!StopSupplicant()) {
+        return -1;
+    }
+    StopDhcpClient(interface);
+    return RestoreResolver() ? 0 : -1;
+}
