@@ -45,6 +45,17 @@ struct Options {
     bool force = false;                 // use up the last attempt without a question
     bool noWait = false;                // connect: return as soon as the dialler runs
     std::vector<std::string> settings;  // profile set: KEY=VALUE or KEY
+
+    // wifi
+    std::string network;        // ESSID, or BSSID of a saved network
+    std::string user;           // EAP identity
+    std::string staticAddress;  // ADDRESS/PREFIX[,GATEWAY]
+    bool dhcp = false;          // also where a static address is saved
+    bool newKey = false;        // ask for the key although one is saved
+    bool hidden = false;        // the network does not show in a scan
+    std::string security;       // of a hidden network
+    bool wep = false;           // adhoc: with a WEP key
+    std::string mode;           // "ap" or "client"
 };
 
 // Each adds a group of commands. A command runs while the arguments are parsed and throws
@@ -54,8 +65,11 @@ void AddWatchCommand(CLI::App& modem, Options& options);
 void AddPINCommands(CLI::App& modem, Options& options);
 void AddProfileCommands(CLI::App& modem, Options& options);
 void AddConnectionCommands(CLI::App& modem, Options& options);
+void AddWifiCommands(CLI::App& app, Options& options);
+void AddWifiConnectCommand(CLI::App& wifi, Options& options);
+void AddWifiSavedCommands(CLI::App& wifi, Options& options);
 
-// One command of those groups, with what all of them take.
+// One command about modems, with what all of them take.
 CLI::App& AddModemCommand(CLI::App& group, const char* name, const char* description,
                           Options& options);
 // The same for a command about one modem.

@@ -12,8 +12,8 @@ using namespace taviwireless::cli;
 namespace {
 
 constexpr char kFooter[] =
-    "Exit status: 0 done, 1 failed, 2 wrong usage, 3 no such modem, 4 busy: it has a "
-    "connection already, or is connecting; 5 the modem service is not running.\n"
+    "Exit status: 0 done, 1 failed, 2 wrong usage, 3 no such modem or network, 4 busy: it "
+    "has a connection already, or is connecting; 5 the modem service is not running.\n"
     "With --json, a failure is {\"error\": SENTENCE} on standard output.\n"
     "Details of failures are in the system log; --verbose shows them here as well.";
 
@@ -25,7 +25,7 @@ int Fail(const Options& options, ExitStatus status, const std::string& sentence)
 }  // namespace
 
 int main(int argc, char** argv) {
-    CLI::App app("Wireless connectivity of the appliance: USB modems", "taviwireless");
+    CLI::App app("Wireless connectivity of the appliance: USB modems and Wi-Fi", "taviwireless");
     Options options;
     app.set_version_flag("--version", "taviwireless " TAVI_VERSION);
     app.add_flag("--json", options.json, "Print JSON instead of tables");
@@ -36,6 +36,7 @@ int main(int argc, char** argv) {
     app.require_subcommand(1);
     app.fallthrough();
     AddModemCommands(app, options);
+    AddWifiCommands(app, options);
     try {
         app.parse(argc, argv);
         return std::cout.flush() ? kSuccess : Fail(options, kFailure, "cannot write the output");

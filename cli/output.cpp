@@ -70,10 +70,14 @@ void PrintFailure(bool json, const std::string& sentence) {
 }
 
 std::string Printable(const std::string& text) {
-    std::string printable = text;
-    std::replace_if(
-        printable.begin(), printable.end(), [](unsigned char c) { return c < 0x20 || c == 0x7F; },
-        '?');
+    std::string printable;
+    for (size_t i = 0; i < text.size(); ++i) {
+        const auto byte = static_cast<unsigned char>(text[i]);
+        const auto next = static_cast<unsigned char>(text[i + 1]);      // zero at the end
+        const bool isC1 = byte == 0xC2 && next >= 0x80 && next < 0xA0;  // in UTF-8, two bytes
+        printable += byte < 0x20 || byte == 0x7F || isC1 ? '?' : text[i];
+        i += isC1 ? 1 : 0;
+    }
     return printable;
 }
 

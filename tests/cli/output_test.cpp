@@ -14,6 +14,9 @@ TEST(Output, AlignsColumnsByCharactersNotBytes) {
 
 TEST(Output, TextOfAModemCannotSteerTheTerminal) {
     EXPECT_EQ(Printable("a\x1b[2Jb\r\n\x7f ü"), "a?[2Jb??? ü");
+    EXPECT_EQ(Printable("\xC2\x9B"
+                        "2J\xC2\xA0\xC2"),
+              "?2J\xC2\xA0\xC2");
 }
 
 TEST(Output, JsonStaysJsonWhateverTheModemSays) {

@@ -1,0 +1,156 @@
+#include "cli/wifi_access.h"
+
+#include <tavisdk/network.h>
+#include <tavisdk/wireless.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <cstdlib>
+#include <memory>
+
+namespace taviwireless::cli {
+
+namespace {
+
+constexpr char kSavedNetworks[] = "/usr/tavi/etc/wireless.conf";
+
+// The members of a list that the library made, which are freed.
+template <typename Record>
+std::vector<Record> Take(WirelessLink& head) {
+    std::vector<Record> records;
+    for (WirelessLink* link = head.next; link != &head;) {
+        const std::unique_ptr<Record, decltype(&free)> record(WIRELESS_RECORD(link, Record), free);
+        link = link->next;
+        records.push_back(*record);
+    }
+    return records;
+}
+
+}  // namespace
+
+std::string WifiInterface() {
+    const char* interface = TAVIWirelessInterfaceGet();
+    return interface == nullptr ? "" : interface;
+}
+
+void RequireWifiSupport() {
+    if (TAVIWirelessIsSupported() == 0) {
+        throw CommandError(kFailure,
+                           "this model does not support Wi-Fi: /etc.defaults/taviinfo.conf does "
+                           "not say support_wireless=yes");
+    }
+}
+
+void RequireWifiSettings() {
+    RequireWifiSupport();
+    if (geteuid() != 0) {
+        throw CommandError(kFailure, "Wi-Fi settings need root");
+    }
+}
+
+void RequireAdapter() {
+    RequireWifiSettings();
+    if (TAVIWirelessConnStatusGet() == WIRELESS_STATUS_NO_ADAPTER) {
+        throw CommandError(kFailure, "there is no Wi-Fi adapter: no interface " + WifiInterface());
+    }
+}
+
+void RequireRadio() {
+    const int mayBeUsed = TAVIWirelessCheckBlock();
+    if (mayBeUsed == 0) {
+        throw CommandError(kFailure,
+                           "the radio is switched off: unblock=no is set for this adapter in "
+                           "/usr/tavi/etc/wireless_ap.conf");
+    }
+    if (mayBeUsed < 0) {
+        throw CommandError(kFailure,
+                           "cannot tell whether the radio may be used: /tmp/wireless.info does not "
+                           "name the adapter, or its section in /usr/tavi/etc/wireless_ap.conf has "
+                           "no unblock");
+    }
+}
+
+void CheckEssid(const std::string& essid) {
+    if (essid.empty() || essid.size() >= WIRELESS_ESSID_SIZE) {
+        throw CommandError(kUsage, "the name of a network has 1 to 32 bytes");
+    }
+    if (essid.find('\n') != std::string::npos) {
+        throw CommandError(kUsage, "the name of a network may not hold a line break");
+    }
+}
+
+CommandError ScanError() {
+    return {kFailure,
+            "cannot look for networks on " + WifiInterface() + "; the system log tells why"};
+}
+
+std::vector<WirelessNetwork> Scan() {
+    WirelessLink networks{&networks, &networks};
+    if (TAVIWirelessNetworkScan(1, &networks) != 0) {
+        throw ScanError();
+    }
+    std::vector<WirelessNetwork> all = Take<WirelessNetwork>(networks);
+    std::stable_sort(all.begin(), all.end(),
+                     [](const auto& a, const auto& b) { return a.signal > b.signal; });
+    return all;
+}
+
+std::vector<WirelessConf> SavedNetworks() {
+    if (access(kSavedNetworks, F_OK) != 0) {
+        return {};  // none was ever saved
+    }
+    WirelessLink confs{&confs, &confs};
+    if (TAVIWirelessConfEnumByAtime(&confs) != 0) {
+        throw CommandError(kFailure, std::string("cannot read the saved networks in ") +
+                                         kSavedNetworks + "; the system log tells why");
+    }
+    return Take<WirelessConf>(confs);
+}
+
+bool IsInNetwork(int status) {
+    return status == WIRELESS_STATUS_CONNECTED || status == WIRELESS_STATUS_ADHOC;
+}
+
+WirelessStatus LookAtWifi() {
+    WirelessStatus status{};
+    TAVIWirelessStatusGet(&status);
+    return status;
+}
+
+std::string WifiAddress() {
+    TAVINetIFInfo info{};
+    return TAVINetIFGetInfo(WifiInterface().c_str(), &info) == 1 ? info.address : "";
+}
+
+std::string ConnectionGateway() {
+    char gateway[WIRELESS_ADDRESS_SIZE] = "";
+    return TAVIWirelessDefaultGatewayConfGet_core(gateway, sizeof gateway) == 0 ? gateway : "";
+}
+
+bool UseLeasedGateway() {
+    const std::string gateway = ConnectionGateway();
+    return gateway.empty() || TAVIWirelessIsSingle_core() != 1 ||
+           SetDefaultGateway(gateway.c_str());
+}
+
+bool SetDefaultGateway(const char* gateway) {
+    // The library does not look at what the tool that it runs returned.
+    char inForce[TAVI_NET_ADDRESS_SIZE];
+    return TAVIWirelessDefaultGatewaySet(gateway) == 0 &&
+           TAVINetDefaultGatewayGet(inForce, sizeof inForce) == 0;
+}
+
+void EndConnection() {
+    if (TAVIWirelessNetworkDisconnect() != 0) {
+        throw CommandError(kFailure,
+                           "cannot disconnect " + WifiInterface() + "; the system log tells why");
+    }
+}
+
+void LeaveNetwork() {
+    if (IsInNetwork(TAVIWirelessConnStatusGet())) {
+        EndConnection();
+    }
+}
+
+}  // namespace taviwireless::cli

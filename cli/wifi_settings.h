@@ -1,0 +1,43 @@
+#ifndef TAVIWIRELESS_CLI_WIFI_SETTINGS_H
+#define TAVIWIRELESS_CLI_WIFI_SETTINGS_H
+
+#include <taviwireless/wireless.h>
+
+#include <string>
+#include <vector>
+
+namespace taviwireless::cli {
+
+// What a network wants of who joins it.
+enum class Security {
+    kOpen,
+    kWEP,  // a key of fixed length
+    kWPA,  // a pass phrase
+    kEAP,  // user and password
+    kUnknown
+};
+
+Security SecurityOf(const WirelessNetwork& network);
+
+// The words of --security, and what a network of that kind has.
+const std::vector<std::string>& SecurityWords();
+void SetSecurity(WirelessNetwork& network, const std::string& word);
+
+// Throws unless the key has the form that such a network wants: a wrong one would only cost the
+// time of an attempt.
+void CheckKey(Security security, const std::string& key);
+
+// An EAP identity.
+void CheckUser(const std::string& user);
+
+// Reads the key behind a prompt, and checks it.
+std::string ReadKey(Security security, const std::string& essid);
+
+// "ADDRESS/PREFIX" or "ADDRESS/PREFIX,GATEWAY", IPv4.
+void SetStaticAddress(WirelessConf& conf, const std::string& text);
+void SetDHCP(WirelessConf& conf);
+bool IsDHCP(const WirelessConf& conf);
+
+}  // namespace taviwireless::cli
+
+#endif
