@@ -17,7 +17,6 @@ namespace {
 using testing::ElementsAre;
 using testing::IsEmpty;
 
-bool isSupported = true;
 int shellsThatRun = -1;  // then none can be run; negative: all can
 
 }  // namespace
@@ -34,17 +33,6 @@ extern "C" __attribute__((visibility("default"))) int system(const char* command
     return next(command);
 }
 
-// "/etc.defaults" cannot be private: it would be a new directory in the machine's own "/".
-extern "C" __attribute__((visibility("default"))) int VEXACFileCheckKeyValue(const char* file,
-                                                                             const char* key,
-                                                                             const char* value,
-                                                                             int) {
-    EXPECT_STREQ(file, "/etc.defaults/taviinfo.conf");
-    EXPECT_STREQ(key, "support_wireless");
-    EXPECT_STREQ(value, "yes");
-    return isSupported ? 1 : 0;
-}
-
 namespace taviwireless::test {
 namespace {
 
@@ -52,7 +40,7 @@ namespace {
 struct Adapter : testing::Test {
     Adapter() {
         interface.Up();
-        isSupported = true;
+        SetSupport("yes");
         SetQuality("Link Quality=40/70  Signal level=-61 dBm");
         tools.Add("/sbin/iwconfig", "[ $# -gt 1 ] || cat /tmp/quality");
     }
@@ -111,7 +99,7 @@ TEST_F(Adapter, HasAStatusByItsModeAndItsAccessPoint) {
     EXPECT_EQ(Status().status, WIRELESS_STATUS_NO_ADAPTER);
     EXPECT_EQ(TAVIWirelessOpmodeGet(), WIRELESS_OPMODE_UNKNOWN);
     EXPECT_EQ(log.Text(), "");
-    isSupported = false;
+    SetSupport("no");
     WirelessStatus status;
     EXPECT_EQ(TAVIWirelessStatusGet(&status)->status, WIRELESS_STATUS_NOT_SUPPORTED);
 }

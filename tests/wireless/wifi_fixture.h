@@ -25,6 +25,11 @@ inline std::string Shell(const std::string& script) {
     return result.out;
 }
 
+// What the model's settings say of Wi-Fi: "yes" or "no".
+inline void SetSupport(const std::string& support) {
+    WriteFile("/etc.defaults/taviinfo.conf", "support_wireless=" + support + "\n");
+}
+
 // "wlan0", down: one end of a veth pair, "wlan0-far" being the other. It goes with the object.
 class WirelessInterface {
   public:
