@@ -152,7 +152,8 @@ TEST(Dialling, TheDiallerHasNothingOfItsCallersAndLeavesNoZombie) {
     const auto before = OpenDescriptors();
     EXPECT_EQ(modem.record.NetConnect(), 1);
     EXPECT_EQ(OpenDescriptors(), before);
-    // The child writes its pid file first; that it runs, and with what, shows in the file it writes.
+    // The child writes its pid file first; that it runs, and with what, shows in the file it
+    // writes.
     for (int i = 0; i < 1000 && (!Exists("/tmp/fds") || ReadFile("/tmp/fds").empty()); ++i) {
         std::this_thread::sleep_for(std::chrono::milliseconds(10));
     }
