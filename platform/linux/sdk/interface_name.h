@@ -1,0 +1,18 @@
+#ifndef TAVISDK_INTERFACE_NAME_H
+#define TAVISDK_INTERFACE_NAME_H
+
+// Names of interfaces that become parts of paths and of other programs' configurations.
+namespace tavisdk {
+
+// As the kernel would take it: 1 to 15 characters, no "/", no blank, neither "." nor "..".
+bool IsInterfaceName(const char* name);
+
+// Throws tavicore::Failure when it is none.
+void RequireInterfaceName(const char* name);
+
+// Creates a folder of settings unless it is there; who writes a file into it sees a failure.
+void MakeFolder(const char* path);
+
+}  // namespace tavisdk
+
+#endif

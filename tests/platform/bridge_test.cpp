@@ -1,0 +1,122 @@
+// Bridges: what the saved settings say of them, and who is in one.
+#include <gmock/gmock.h>
+#include <tavicore/error.h>
+#include <tavicore/keyvalue.h>
+#include <tavisdk/bridge.h>
+
+#include "tests/platform/veth.h"
+#include "tests/support/descriptors.h"
+#include "tests/support/files.h"
+
+namespace taviwireless::test {
+namespace {
+
+constexpr char kFile[] = "/etc/sysconfig/network-scripts/ifcfg-lbr0";
+
+std::string InterfaceFile(const std::string& name) {
+    return "/etc/sysconfig/network-scripts/ifcfg-" + name;
+}
+
+// "COUNT NAME NAME"
+std::string Members(const char* bridge) {
+    VEXACSzList* list = VEXACSzListAlloc(0);
+    std::string text = std::to_string(VEXANetBridgeSlaveEnum(bridge, &list));
+    for (int i = 0; i < list->count; ++i) {
+        text += std::string(" ") + VEXACSzListGet(list, i);
+    }
+    VEXACSzListFree(list);
+    return text;
+}
+
+// "KIND MEMBER LOCAL ADDRESS NETMASK"
+std::string Config(const char* bridge) {
+    TAVINetBridge config;
+    TAVINetBridgeMember member;
+    if (TAVINetGetBridgeConfig(bridge, &config, &member) != 0) {
+        return "none";
+    }
+    EXPECT_STREQ(config.name, bridge);
+    return std::to_string(member.kind) + ' ' + member.interface + ' ' +
+           std::to_string(config.isLocal) + ' ' + config.address + ' ' + config.netmask;
+}
+
+TEST(BridgeConfig, IsReadAsItWasWritten) {
+    EXPECT_EQ(Config("lbr0"), "none");
+    EXPECT_EQ(VEXACErrGet(), VEXAC_ERR_NOT_FOUND);
+    const TAVINetBridge local = {1, "lbr0", "10.1.14.1", "255.255.255.0"};
+    const TAVINetBridgeMember radio = {TAVI_NET_MEMBER_WIRELESS, "wlan0"};
+    EXPECT_EQ(TAVINetSetBridgeConfig(&local, &radio), 0);
+    EXPECT_EQ(ReadFile(kFile),
+              "DEVICE=lbr0\nTYPE=Bridge\nONBOOT=yes\nPRIMARY=wlan0\nLOCAL_LAN=yes\n"
+              "BOOTPROTO=static\nIPADDR=10.1.14.1\nNETMASK=255.255.255.0\n");
+    EXPECT_EQ(Config("lbr0"), "3 wlan0 1 10.1.14.1 255.255.255.0");
+    const TAVINetBridge wired = {0, "br0", "", ""};
+    const TAVINetBridgeMember card = {TAVI_NET_MEMBER_WIRED, "eth0"};
+    EXPECT_EQ(TAVINetSetBridgeConfig(&wired, &card), 0);
+    EXPECT_EQ(Config("br0"), "2 eth0 0  ");
+    // Another first member does not make it another kind of bridge.
+    EXPECT_EQ(VEXACFileSetKeyValue(kFile, "PRIMARY", "eth1", "%s=%s\n"), 1);
+    EXPECT_EQ(Config("lbr0"), "3 eth1 1 10.1.14.1 255.255.255.0");
+}
+
+TEST(BridgeConfig, OfAnotherHandIsJudgedByItsFirstMember) {
+    const struct {
+        const char* file;
+        const char* memberOf;  // of which wlan0 is, by its file
+        const char* config;
+    } kRows[] = {
+        {"PRIMARY=wlan0\nIPADDR=\"10.1.14.1\"\n", "", "3 wlan0 1 10.1.14.1 "},
+        {"PRIMARY=eth0\n", "", "2 eth0 0  "},
+        {"ONBOOT=no\n", "lbr0", "none"},
+        {"ONBOOT=no\n", "br0", "none"},
+        {"IPADDR=10.1.14.1\n", "lbr0", "3 wlan0 1 10.1.14.1 "},
+        {"IPADDR=10.1.14.1\n", "br0", "2  0 10.1.14.1 "},
+        {"LOCAL_LAN=no\nPRIMARY=wlan0\n", "", "2 wlan0 0  "},
+    };
+    for (const auto& row : kRows) {
+        WriteFile(kFile, row.file);
+        WriteFile(InterfaceFile("wlan0"), std::string("BRIDGE=") + row.memberOf + "\n");
+        EXPECT_EQ(Config("lbr0"), row.config) << row.file;
+    }
+}
+
+TEST(BridgeConfig, ThatIsWrongIsNotWritten) {
+    const struct {
+        TAVINetBridge config;
+        TAVINetBridgeMember member;
+    } kRows[] = {
+        {{1, "../lbr0", "10.1.14.1", "255.255.255.0"}, {TAVI_NET_MEMBER_WIRELESS, "wlan0"}},
+        {{1, "lbr0", "10.1.14.1\n", "255.255.255.0"}, {TAVI_NET_MEMBER_WIRELESS, "wlan0"}},
+        {{1, "lbr0", "10.1.14.1", ""}, {TAVI_NET_MEMBER_WIRELESS, "wlan0"}},
+        {{1, "lbr0", "", ""}, {TAVI_NET_MEMBER_WIRELESS, "wlan0"}},
+        {{1, "lbr0", "10.1.14.1", "255.255.255.0"}, {TAVI_NET_MEMBER_WIRED, "eth0"}},
+        {{0, "lbr0", "", ""}, {TAVI_NET_MEMBER_WIRED, ""}},
+    };
+    for (const auto& row : kRows) {
+        EXPECT_EQ(TAVINetSetBridgeConfig(&row.config, &row.member), -1);
+        EXPECT_EQ(VEXACErrGet(), VEXAC_ERR_BAD_PARAMETER);
+    }
+    EXPECT_EQ(TAVINetSetBridgeConfig(nullptr, nullptr), -1);
+    EXPECT_FALSE(Exists(kFile));
+}
+
+TEST(BridgeMembers, AreSavedOnesUntilThereIsABridge) {
+    EXPECT_EQ(Members("lbr0"), "-1");  // nothing is saved at all
+    WriteFile(InterfaceFile("eth7"), "BRIDGE=lbr0\n");
+    WriteFile(InterfaceFile("wlan0"), "BRIDGE=\"lbr0\"\n");
+    WriteFile(InterfaceFile("eth8"), "BRIDGE=lbr00\n");
+    EXPECT_EQ(Members("lbr0"), "2 eth7 wlan0");
+    EXPECT_EQ(Members("br0"), "0");
+    Ip("link add lbr0 type bridge");
+    Ip("link add eth8 type veth peer name eth9");
+    const auto before = OpenDescriptors();
+    EXPECT_EQ(Members("lbr0"), "0");
+    Ip("link set eth8 master lbr0");
+    EXPECT_EQ(Members("lbr0"), "1 eth8");
+    EXPECT_EQ(OpenDescriptors(), before);
+    EXPECT_EQ(Members("../lbr0"), "-1");
+    EXPECT_EQ(VEXANetBridgeSlaveEnum("lbr0", nullptr), -1);
+}
+
+}  // namespace
+}  // namespace taviwireless::test
