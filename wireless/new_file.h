@@ -19,6 +19,12 @@ inline File CreateAnew(const char* path, mode_t mode) {
     return File(handle >= 0 ? fdopen(handle, "w") : nullptr, fclose);
 }
 
+// Creates the file, empty, unless it is there already. An existing file keeps its mode.
+inline bool MakeSureOf(const char* path, mode_t mode) {
+    const int handle = open(path, O_WRONLY | O_CREAT | O_CLOEXEC, mode);
+    return handle >= 0 && close(handle) == 0;
+}
+
 }  // namespace taviwireless::wireless
 
 #endif

@@ -10,8 +10,9 @@ constexpr char kConnectingFlag[] = "/var/tmp/.wireless_connecting";
 constexpr char kCurrentConnection[] = "/var/tmp/.wireless_current_connection";
 constexpr char kResolver[] = "/etc/resolv.conf";
 constexpr char kResolverBackup[] = "/etc/resolv.conf.wireless.bak";
-constexpr char kDhcpClientPrefix[] = "/etc/dhcpc/dhcpcd-";  // the interface and ".pid" or ".info"
-constexpr char kAdapterInfo[] = "/tmp/wireless.info";       // key/value; of the plugged adapter
+constexpr char kDhcpClientPrefix[] = "/etc/dhcpc/dhcpcd-";    // the interface and ".pid" or ".info"
+constexpr char kAdapterInfo[] = "/tmp/wireless.info";         // key/value; of the plugged adapter
+constexpr char kModelInfo[] = "/etc.defaults/taviinfo.conf";  // key/value; what the model can do
 constexpr char kAPSettings[] = "/usr/tavi/etc/wireless_ap.conf";
 constexpr char kSavedNetworks[] = "/usr/tavi/etc/wireless.conf";
 

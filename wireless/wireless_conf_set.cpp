@@ -1,15 +1,14 @@
 // Saving a network.
-#include <fcntl.h>
 #include <tavicore/error.h>
 #include <tavicore/file.h>
 #include <tavicore/section.h>
 #include <taviwireless/wireless.h>
-#include <unistd.h>
 
 #include <ctime>
 
 #include "common/log.h"
 #include "common/sz_hash.h"
+#include "wireless/new_file.h"
 #include "wireless/paths.h"
 
 namespace taviwireless::wireless {
@@ -23,12 +22,10 @@ enum class Found { kFailed, kNew, kExisting };
 
 // Not readable for others before the first key is in it; later writing keeps the mode.
 bool CreateFile() {
-    const int handle = open(kSavedNetworks, O_WRONLY | O_CREAT | O_CLOEXEC, kMode);
-    if (handle < 0) {
+    if (!MakeSureOf(kSavedNetworks, kMode)) {
         TAVI_LOG_ERROR("Failed to touch %s", kSavedNetworks);
         return false;
     }
-    close(handle);
     return true;
 }
 

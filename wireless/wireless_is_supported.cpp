@@ -1,6 +1,8 @@
 #include <tavicore/keyvalue.h>
 #include <taviwireless/wireless.h>
 
+#include "wireless/paths.h"
+
 int TAVIWirelessIsSupported_core() {
-    return VEXACFileCheckKeyValue("/etc.defaults/taviinfo.conf", "support_wireless", "yes", 0);
+    return VEXACFileCheckKeyValue(taviwireless::wireless::kModelInfo, "support_wireless", "yes", 0);
 }

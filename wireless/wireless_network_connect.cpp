@@ -9,6 +9,7 @@
 #include <cstring>
 
 #include "common/log.h"
+#include "wireless/flag_file.h"
 #include "wireless/new_file.h"
 #include "wireless/paths.h"
 #include "wireless/shell.h"
@@ -22,21 +23,6 @@ constexpr char kSystemInfo[] = "/etc/taviinfo.conf";
 constexpr mode_t kSupplicantMode = 0600;  // it holds the key
 constexpr mode_t kRecordMode = 0644;
 constexpr int kPolls = 15;  // a second each
-
-// While a connection is made. A second caller that is refused takes the flag away as well, so this
-// is no lock: whoever hangs leaves nothing behind that keeps the next but one from connecting.
-class ConnectingFlag {
-  public:
-    ~ConnectingFlag() { VEXACSysUnlink(kConnectingFlag); }
-
-    bool Raise() {
-        if (VEXACFileExist(kConnectingFlag)) {
-            return false;
-        }
-        VEXACFileTouch(kConnectingFlag);
-        return true;
-    }
-};
 
 bool HoldsLineBreak(const WirelessConf& conf) {
     for (const char* text : {conf.network.essid, conf.key, conf.user}) {
@@ -149,7 +135,7 @@ void RestartMediaService(const char* interface) {
 
 int TAVIWirelessNetworkConnect(WirelessConf* conf) {
     using namespace taviwireless::wireless;
-    ConnectingFlag flag;
+    const FlagFile flag(kConnectingFlag);
     if (TAVIWirelessAdapterNum() < 1) {
         TAVI_LOG_ERROR("There is no wireless USB adapter plugged");
         return -1;

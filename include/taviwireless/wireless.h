@@ -1,11 +1,12 @@
 /*
- * The Wi-Fi adapter "wlan0" as a station, in ad-hoc mode, and what is known of it. Plain C.
+ * The Wi-Fi adapter "wlan0" as a station, in ad-hoc mode and as an access point. Plain C.
  *
  * What holds for all functions:
  * - They work on one adapter, in the caller's own process; all state is in files. The adapter's
  *   settings need root.
- * - An int result is 0 for success and -1 for failure where nothing else is said. A failure is a
- *   line in the system log; a null argument fails with "Bad parameters".
+ * - An int result is 0 for success and -1 for failure where nothing else is said; the functions of
+ *   the access point return 1 and 0. A failure is a line in the system log; a null argument fails
+ *   with "Bad parameters".
  * - Records are plain and may be zeroed with memset. Texts in them end in a zero byte.
  * - Lists are circular queues of links, as insque() knows them. The caller owns the head, which the
  *   functions make empty first, and the members: unlink each and free() it. Members are records of
@@ -301,6 +302,134 @@ TAVIWIRELESS_API int TAVIWirelessIfconfigSet(const char* interface, const Wirele
  * lease, or that of the saved network.
  */
 TAVIWIRELESS_API int TAVIWirelessDefaultGatewayConfGet_core(char* buf, size_t size);
+
+/* ---- Access point: hostapd ---- */
+
+/* Security of an access point. */
+enum {
+    WIRELESS_AP_OPEN = 0,
+    WIRELESS_AP_WEP = 1,
+    WIRELESS_AP_WPA = 2,           /* personal */
+    WIRELESS_AP_WPA_ENTERPRISE = 3 /* not for guests */
+};
+
+/* Ciphers of an access point, a set of bits. */
+enum { WIRELESS_AP_TKIP = 1, WIRELESS_AP_CCMP = 2 };
+
+/* 802.11 protocols of an access point, a set of bits. */
+enum { WIRELESS_AP_A = 1, WIRELESS_AP_B = 2, WIRELESS_AP_G = 4, WIRELESS_AP_N_ONLY = 8 };
+
+enum { WIRELESS_AP_40_MHZ = 2 }; /* the bit of htFlags that allows channels of 40 MHz */
+
+enum { WIRELESS_AP_SSID_SIZE = 128, WIRELESS_AP_PASSPHRASE_SIZE = 256 };
+
+/* What a security kind needs; the kind says which member holds. */
+typedef union WirelessAPSecret {
+    char wepKey[27]; /* 5 or 13 characters, or 10 or 26 hexadecimal digits */
+    struct {
+        int32_t wpaVersion; /* of hostapd's key "wpa": 1 WPA, 2 WPA2, 3 both */
+        char passphrase[WIRELESS_AP_PASSPHRASE_SIZE];
+        int32_t cipher;
+    } wpa;
+    struct {
+        int32_t wpaVersion;
+        int32_t cipher;
+        char radiusAddr[WIRELESS_ADDRESS_SIZE];
+        int32_t radiusPort;
+        char radiusSecret[WIRELESS_AP_PASSPHRASE_SIZE];
+    } enterprise;
+} WirelessAPSecret;
+
+typedef struct WirelessAPConf {
+    char ssid[WIRELESS_AP_SSID_SIZE];
+    char bridge[16];    /* interface that the access point joins */
+    int32_t hidden;     /* hostapd's ignore_broadcast_ssid: 0 shows the name */
+    int32_t band;       /* WIRELESS_AP_A ... */
+    int32_t ieee80211n; /* written when positive */
+    int32_t htFlags;
+    int32_t channel;
+    int32_t maxStations; /* written when positive */
+    int32_t wmm;         /* on when positive */
+    int32_t security;
+    WirelessAPSecret secret;
+    int32_t guestEnabled;
+    char guestSsid[WIRELESS_AP_SSID_SIZE];
+    char guestBssid[128]; /* as text */
+    int32_t guestHidden;
+    int32_t guestMaxStations; /* written when positive */
+    int32_t guestIsolate;     /* non-zero: guests do not reach each other */
+    int32_t guestSecurity;
+    WirelessAPSecret guestSecret;
+} WirelessAPConf;
+
+/*
+ * Ends the hostapd that serves the interface, takes the interface down, and writes
+ * "/etc/hostapd/hostapd-" and the interface and "-host.conf"; on models with
+ * support_pci_wifi=yes in "/etc.defaults/taviinfo.conf" also "-guest.conf" and "-guest.info". The
+ * files hold keys and have mode 0600. Returns 1, or 0 on failure.
+ */
+TAVIWIRELESS_API int TAVIWirelessSetHostAPConf(const char* interface, const WirelessAPConf* conf);
+
+/* ---- Access point: stored settings, "/usr/tavi/etc/wireless_ap.conf" ---- */
+
+enum { WIRELESS_AP_SCHEDULE_SIZE = 169 }; /* a character per hour of a week, '1' is on */
+
+typedef struct WirelessAPSettings {
+    int32_t enabled;
+    int32_t txPower;
+    char name[32]; /* of the section: the adapter's product */
+    WirelessAPConf ap;
+    int32_t unblock; /* 0: the user forbids the radio, see TAVIWirelessCheckBlock */
+    char schedule[WIRELESS_AP_SCHEDULE_SIZE];
+    int32_t scheduleEnabled;
+    char guestSchedule[WIRELESS_AP_SCHEDULE_SIZE];
+    int32_t guestScheduleEnabled;
+    int32_t guestLanBlock;
+    int32_t guestAccessServer;
+    int32_t guestInternetBlock;
+    int32_t guestAllowHttp;
+} WirelessAPSettings;
+
+/*
+ * Copies the plugged adapter's product, the key PRODUCT of "/tmp/wireless.info", into buf, of size
+ * bytes. Returns 1, or 0 when there is none.
+ */
+TAVIWIRELESS_API int TAVIWirelessApConfigSecNameGet(char* buf, size_t size);
+/*
+ * Fills *settings with what is stored under the section name, and with defaults for the rest.
+ * Returns a positive number when the section was read; 0 with the defaults when there is no file;
+ * what the SDK says, 0 or below, when there is no such section; -1 for bad arguments.
+ */
+TAVIWIRELESS_API int TAVIWirelessGetAPConfig(const char* section, WirelessAPSettings* settings);
+/*
+ * Stores the settings under settings->name. With enabled 0 only that is stored, and everything else
+ * stays as it is in the file. Returns 1, or 0 on failure, with the file as it was.
+ */
+TAVIWIRELESS_API int TAVIWirelessSetAPConfig(const WirelessAPSettings* settings);
+
+/* ---- Access point: on and off ---- */
+
+/*
+ * Switches the access point on with the stored settings: hostapd's files, the bridge with its
+ * address and DHCP service, the interface's file, and "/etc/rc.network restart" with the interface
+ * and the bridge. Waits up to five seconds for the adapter's channels. Returns 1; 0 on failure,
+ * when the settings say that it is off, and while another caller does the same. What was written
+ * before a failure stays.
+ */
+TAVIWIRELESS_API int TAVIWirelessAPEnable(void);
+/*
+ * Takes the interface out of its bridge, puts the bridge's DHCP service aside and restarts the
+ * network. Returns 1, or 0 on failure.
+ */
+TAVIWIRELESS_API int TAVIWirelessAPDisable(void);
+/* "wlan0", a constant. */
+TAVIWIRELESS_API const char* TAVIWirelessAPInterfaceGet(void);
+/* Whether an access point is being switched on, here or by another process: 1 or 0. */
+TAVIWIRELESS_API int TAVIWirelessAPIsConnecting(void);
+/* The same as the SDK tells it: non-zero or 0. */
+TAVIWIRELESS_API int TAVIWirelessTestAPMode(void);
+/* 1 when an adapter is present and "/tmp/wireless.info" says AP_SUPPORT=yes, else 0. */
+TAVIWIRELESS_API int TAVIWirelessAPIsSupported(void);
 
 #ifdef __cplusplus
 }

@@ -1,0 +1,424 @@
+// The access point on and off: what is in the files afterwards, what ran, what is logged.
+#include <arpa/inet.h>
+#include <gmock/gmock.h>
+#include <signal.h>
+#include <sys/syscall.h>
+#include <taviwireless/wireless.h>
+#include <unistd.h>
+
+#include "tests/support/log_capture.h"
+#include "tests/support/sleep_capture.h"
+#include "tests/wireless/wifi_fixture.h"
+#include "wireless/dhcp_range.h"
+
+namespace {
+
+int gKilledAtReplacement = 0;  // counted from 1
+
+}  // namespace
+
+// Every file that the SDK replaces comes by here.
+extern "C" __attribute__((visibility("default"))) int renameat(int oldFolder, const char* oldName,
+                                                               int newFolder, const char* newName) {
+    if (--gKilledAtReplacement == 0) {
+        raise(SIGKILL);
+    }
+    return static_cast<int>(syscall(SYS_renameat2, oldFolder, oldName, newFolder, newName, 0));
+}
+
+namespace taviwireless::test {
+namespace {
+
+using testing::ElementsAre;
+using testing::EndsWith;
+using testing::HasSubstr;
+
+constexpr char kFlag[] = "/var/tmp/.wireless_ap_connecting";
+constexpr char kSettings[] = "/usr/tavi/etc/wireless_ap.conf";
+constexpr char kHostapdInfo[] = "/etc/hostapd/hostapd-wlan0.info";
+constexpr char kInterfaceFile[] = "/etc/sysconfig/network-scripts/ifcfg-wlan0";
+constexpr char kBridgeFile[] = "/etc/sysconfig/network-scripts/ifcfg-lbr0";
+constexpr char kDhcpInfo[] = "/etc/dhcpd/dhcpd-lbr0-lbr0.info";
+constexpr char kDhcpPutAside[] = "/etc/dhcpd/dhcpd-lbr0-lbr0.info.manual";
+constexpr char kInterfaceText[] =
+    "ONBOOT=yes\nDEVICE=wlan0\nBRIDGE=lbr0\nIPADDR=10.1.14.1\nNETMASK=255.255.255.0\n"
+    "BOOTPROTO=static\n";
+constexpr char kAskForChannels[] = "/usr/sbin/iwlist wlan0 active_channel";
+
+std::string Restart(const std::string& bridge) {
+    return "/etc/rc.network restart wlan0 " + bridge;
+}
+
+std::string Value(const std::string& file, const std::string& key) {
+    return Shell("sed -n 's/^" + key + "=\"\\?\\([^\"]*\\)\"\\?$/\\1/p' " + file +
+                 " | tr -d '\\n'");
+}
+
+// An appliance whose access point was never on, with settings that want it on.
+struct AccessPoint {
+    explicit AccessPoint(const std::string& settings = "") {
+        Shell(
+            "rm -rf /etc/hostapd /etc/sysconfig /etc/dhcpd /usr/tavi/* /var/tmp/.w* /tmp/*\n"
+            "mkdir -p /usr/tavi/etc /etc/sysconfig/network-scripts");
+        tools.ForgetCommands();
+        tools.Add("/etc/rc.network");
+        tools.Add("/sbin/iwlist", "echo 'channel 1'");
+        WriteFile("/tmp/wireless.info", "PRODUCT=USB Stick\nAP_SUPPORT=yes\n");
+        WriteFile(kSettings, "[USB Stick]\n\tenable=yes\n" + settings);
+    }
+
+    ToolStandIns tools;
+    WirelessInterface adapter;
+    LogCapture log;
+};
+
+void ExpectIsOn() {
+    EXPECT_EQ(Value(kHostapdInfo, "enable"), "yes");
+    EXPECT_EQ(Value(kBridgeFile, "ONBOOT"), "yes");
+    EXPECT_EQ(Value(kBridgeFile, "IPADDR"), "10.1.14.1");
+    EXPECT_EQ(Value(kBridgeFile, "NETMASK"), "255.255.255.0");
+    EXPECT_EQ(Value(kDhcpInfo, "enable"), "yes");
+    EXPECT_EQ(Value(kDhcpInfo, "start"), "10.1.14.2");
+    EXPECT_EQ(Value(kDhcpInfo, "end"), "10.1.14.254");
+    EXPECT_EQ(Value(kDhcpInfo, "lease"), "86400");
+    EXPECT_EQ(Value(kDhcpInfo, "gateway"), "10.1.14.1");
+    EXPECT_EQ(ReadFile(kInterfaceFile), kInterfaceText);
+    EXPECT_FALSE(Exists(kFlag));
+}
+
+TEST(DhcpRange, IsAllBehindTheServerInSubnetsOfAnySize) {
+    const char* kServer = "10.1.0.1";
+    for (int bits = 8; bits <= 30; ++bits) {
+        const uint32_t mask = 0xffffffffu << (32 - bits);
+        const uint32_t end = (0x0a010001u & mask) + ~mask - 1;
+        const in_addr inOrder[] = {{htonl(mask)}, {htonl(end)}};
+        char texts[2][INET_ADDRSTRLEN];
+        inet_ntop(AF_INET, &inOrder[0], texts[0], sizeof texts[0]);
+        inet_ntop(AF_INET, &inOrder[1], texts[1], sizeof texts[1]);
+        const auto range = wireless::DhcpRangeBehind(kServer, texts[0]);
+        ASSERT_TRUE(range);
+        EXPECT_EQ(range->start, "10.1.0.2") << bits;
+        EXPECT_EQ(range->end, texts[1]) << bits;
+    }
+    struct Case {
+        const char* address;
+        const char* netmask;
+        const char* start;  // empty when there is none
+        const char* end;
+    };
+    const Case kCases[] = {
+        {"10.1.14.1", "255.255.255.0", "10.1.14.2", "10.1.14.254"},
+        {"10.1.14.1", "255.0.0.0", "10.1.14.2", "10.255.255.254"},
+        {"192.168.1.255", "255.255.252.0", "192.168.2.0", "192.168.3.254"},
+        {"10.0.0.5", "255.255.255.252", "10.0.0.6", "10.0.0.6"},
+        {"255.255.255.255", "255.255.255.255", "0.0.0.0", "255.255.255.254"},
+        {"", "255.255.255.0", "", ""},
+        {"10.1.14.1", "/24", "", ""},
+    };
+    for (const Case& c : kCases) {
+        const auto range =
+            wireless::DhcpRangeBehind(c.address, c.netmask).value_or(wireless::DhcpRange{});
+        EXPECT_EQ(range.start, c.start) << c.address << '/' << c.netmask;
+        EXPECT_EQ(range.end, c.end) << c.address << '/' << c.netmask;
+    }
+}
+
+TEST(Enable, MakesTheWirelessLanWithItsDhcpService) {
+    AccessPoint ap;
+    ap.tools.Add("/etc/rc.network", "[ -e " + std::string(kFlag) + " ]");
+    EXPECT_EQ(TAVIWirelessAPEnable(), 1);
+    ExpectIsOn();
+    EXPECT_EQ(ReadFile(kHostapdInfo), "enable=\"yes\"\n");
+    EXPECT_THAT(ReadFile("/etc/hostapd/hostapd-wlan0-host.conf"), HasSubstr("bridge=lbr0\n"));
+    EXPECT_EQ(Value(kBridgeFile, "PRIMARY"), "wlan0");
+    EXPECT_THAT(ap.tools.Commands(), ElementsAre(kAskForChannels, Restart("lbr0")));
+    EXPECT_EQ(ap.log.Text(), "");
+
+    WriteFile(kDhcpInfo, "enable=yes\nstart=10.1.14.20\nend=10.1.14.30\nlease=60\n");
+    EXPECT_EQ(TAVIWirelessAPEnable(), 1);
+    EXPECT_EQ(Value(kDhcpInfo, "start") + " " + Value(kDhcpInfo, "lease"), "10.1.14.20 60");
+    EXPECT_EQ(ReadFile(kInterfaceFile), kInterfaceText);
+}
+
+TEST(Enable, JoinsAWiredBridgeWithoutADhcpService) {
+    AccessPoint ap("\tbridge=br0\n");
+    EXPECT_EQ(TAVIWirelessAPEnable(), 1);
+    const std::string bridgeFile = "/etc/sysconfig/network-scripts/ifcfg-br0";
+    EXPECT_EQ(Value(bridgeFile, "PRIMARY") + Value(bridgeFile, "IPADDR"), "eth0");
+    EXPECT_FALSE(Exists("/etc/dhcpd"));
+    EXPECT_THAT(ReadFile(kInterfaceFile), HasSubstr("BRIDGE=br0\nIPADDR=10.1.14.1\n"));
+    EXPECT_THAT(ap.tools.Commands(), ElementsAre(kAskForChannels, Restart("br0")));
+}
+
+TEST(Enable, TakesADhcpServiceBackThatFitsTheSubnet) {
+    struct Case {
+        std::string settings;
+        const char* start;
+        const char* enabled;
+    };
+    const Case kCases[] = {
+        {"enable=no\nstart=10.1.14.9\nend=10.1.14.10\n", "10.1.14.9", "no"},
+        {"enable=yes\nstart=10.1.14.9\nend=10.1.15.9\n", "10.1.14.2", "yes"},
+        {"enable=no\nstart=10.1.13.9\nend=10.1.14.9\n", "10.1.14.2", "yes"},
+        {"enable=no\n", "10.1.14.2", "yes"},
+    };
+    for (const Case& c : kCases) {
+        AccessPoint ap;
+        WriteFile(kDhcpPutAside, c.settings);
+        EXPECT_EQ(TAVIWirelessAPEnable(), 1) << ap.log.Text();
+        EXPECT_FALSE(Exists(kDhcpPutAside));
+        EXPECT_EQ(Value(kDhcpInfo, "start"), c.start) << c.settings;
+        EXPECT_EQ(Value(kDhcpInfo, "enable"), c.enabled) << c.settings;
+    }
+}
+
+TEST(Enable, IsRefusedWhileTheFlagIsUpAndTakesItDown) {
+    AccessPoint ap;
+    WriteFile(kFlag, "");
+    EXPECT_EQ(TAVIWirelessAPIsConnecting(), 1);
+    EXPECT_EQ(TAVIWirelessTestAPMode(), 1);
+    EXPECT_EQ(TAVIWirelessAPEnable(), 0);
+    EXPECT_EQ(TAVIWirelessAPIsConnecting(), 0);
+    EXPECT_EQ(TAVIWirelessTestAPMode(), 0);
+    EXPECT_THAT(ap.log.Text(), testing::MatchesRegex("wireless_ap_enable.cpp:[0-9]+ "
+                                                     "Another ap construction is going\n"));
+    EXPECT_THAT(ap.tools.Commands(), ElementsAre());
+    EXPECT_EQ(TAVIWirelessAPEnable(), 1);
+}
+
+TEST(Enable, DoesNothingWhenTheSettingsSayOff) {
+    AccessPoint ap;
+    WriteFile(kSettings, "[USB Stick]\n\tenable=no\n");
+    EXPECT_EQ(TAVIWirelessAPEnable(), 0);
+    EXPECT_EQ(ap.log.Lines().size(), 1u);
+    EXPECT_TRUE(ap.log.Has("Failed to enable AP."));
+    EXPECT_FALSE(Exists("/etc/hostapd"));
+    EXPECT_FALSE(Exists(kFlag));
+    EXPECT_THAT(ap.tools.Commands(), ElementsAre());
+}
+
+TEST(Enable, WaitsFiveSecondsForChannels) {
+    for (const unsigned readyAfter : {4u, 5u}) {
+        AccessPoint ap;
+        ap.tools.Add("/sbin/iwlist", "[ ! -e /tmp/ready ] || echo 'channel 1'");
+        unsigned slept = 0;
+        const SleepCapture sleeps([&](unsigned) {
+            if (++slept == readyAfter) {
+                WriteFile("/tmp/ready", "");
+            }
+        });
+        const bool isEnabled = readyAfter == 4;
+        EXPECT_EQ(TAVIWirelessAPEnable(), isEnabled ? 1 : 0);
+        EXPECT_EQ(sleeps.Calls(), std::vector<unsigned>(readyAfter, 1));
+        EXPECT_EQ(ap.log.Count("Wait for wireless interface 'wlan0' ready ("), int(readyAfter));
+        EXPECT_TRUE(ap.log.Has("'wlan0' ready (0)"));
+        EXPECT_EQ(ap.log.Has("There is no wireless interface available"), !isEnabled);
+        EXPECT_EQ(ap.tools.Commands().size(), isEnabled ? 6u : 5u);
+        ExpectIsOn();  // as far as files go
+    }
+}
+
+TEST(Enable, FailsAtOnceWhenChannelsCannotBeCounted) {
+    AccessPoint ap;
+    const std::string path = getenv("PATH");
+    setenv("PATH", "/nowhere", 1);
+    EXPECT_EQ(TAVIWirelessAPEnable(), 0);
+    setenv("PATH", path.c_str(), 1);
+    EXPECT_TRUE(ap.log.Has("Failed to execute [iwlist wlan0 active_channel|wc -l]"));
+    EXPECT_TRUE(ap.log.Has("There is no wireless interface available"));
+    EXPECT_FALSE(ap.log.Has("Wait for wireless interface"));
+}
+
+TEST(Enable, FailsCleanlyAndWorksWhenTheCauseIsGone) {
+    struct Case {
+        std::string arrange;
+        std::string log;
+        std::string undo;
+    };
+    const std::string folder = "/etc/sysconfig/network-scripts";
+    const std::string bridge = kBridgeFile;
+    const auto full = [](const std::string& path) {
+        return "mkdir -p " + path + "; mount -t tmpfs -o size=4k none " + path + "; yes > " + path +
+               "/all 2> /dev/null || true";
+    };
+    const std::string ofBridge = "Failed to set bridge[lbr0] config.";
+    const std::string ofHostapd = "Failed to set hostapd conf of interface [wlan0].";
+    const Case kCases[] = {
+        {"mv /tmp/wireless.info /tmp/w", "Failed to get section name of wlan0",
+         "mv /tmp/w /tmp/wireless.info"},
+        {"echo PRODUCT=x > /tmp/wireless.info", "Failed to get ap info of secname[x]",
+         "echo 'PRODUCT=USB Stick' > /tmp/wireless.info"},
+        {"touch /etc/hostapd", ofHostapd, "rm /etc/hostapd"},
+        {full("/etc/hostapd"), ofHostapd, "umount /etc/hostapd"},
+        {"mount --bind /etc /etc; mount -o remount,bind,ro /etc", ofHostapd, "umount /etc"},
+        {"mkdir -p /etc/hostapd/hostapd-wlan0.info",
+         "Failed to set key[enable] in [/etc/hostapd/hostapd-wlan0.info].",
+         "rmdir /etc/hostapd/hostapd-wlan0.info"},
+        {full(folder), "Failed to set bridge config.", "umount " + folder},
+        {full(folder), ofBridge, "umount " + folder},
+        {"printf 'LOCAL_LAN=yes\nIPADDR=10.1.14.1\nNETMASK=255.255.255.0\n' > " + bridge +
+             "; mount --bind " + folder + ' ' + folder + "; mount -o remount,bind,ro " + folder,
+         "Failed to set key[ONBOOT] in [" + bridge + "].", "umount " + folder},
+        {"mkdir " + bridge, "Failed to set bridge config.", "rmdir " + bridge},
+        {"printf 'LOCAL_LAN=yes\nIPADDR=x\n' > " + bridge,
+         "Failed to conver to inet_aton format of [x] or [].", "rm " + bridge},
+        {"printf 'LOCAL_LAN=yes\nIPADDR=1.2.3.4\nNETMASK=255.255.255.255\n' > " + bridge,
+         "Failed to get the valid range of dhcp server[lbr0].", "rm " + bridge},
+        {full("/etc/dhcpd"), "Failed to set dhcpServer conf for [lbr0].", "umount /etc/dhcpd"},
+        {"touch /etc/dhcpd", ofBridge, "rm /etc/dhcpd"},
+        {"mkdir " + std::string(kInterfaceFile),
+         "Failed to set " + std::string(kInterfaceFile) + " tavierr=[0x0800]",
+         "rmdir " + std::string(kInterfaceFile)},
+    };
+    for (const Case& c : kCases) {
+        SCOPED_TRACE(c.arrange);
+        AccessPoint ap;
+        const std::string settings = ReadFile(kSettings);
+        Shell(c.arrange);
+        EXPECT_EQ(TAVIWirelessAPEnable(), 0);
+        EXPECT_TRUE(ap.log.Has(c.log)) << ap.log.Text();
+        EXPECT_THAT(ap.log.Text(), EndsWith("Failed to enable AP.\n"));
+        EXPECT_EQ(ReadFile(kSettings), settings);
+        EXPECT_FALSE(Exists(kFlag));
+        // Half of it would be an open network.
+        if (c.log == ofHostapd) {
+            EXPECT_FALSE(Exists("/etc/hostapd/hostapd-wlan0-host.conf"));
+        }
+        Shell(c.undo);
+        EXPECT_EQ(TAVIWirelessAPEnable(), 1) << ap.log.Text();
+        ExpectIsOn();
+    }
+}
+
+TEST(Enable, NeedsABridgeAndTheNetworkScript) {
+    AccessPoint ap("\tbridge=\n");
+    EXPECT_EQ(TAVIWirelessAPEnable(), 0);
+    EXPECT_TRUE(ap.log.Has("Failed to find bridge interface."));
+    WriteFile(kSettings, "[USB Stick]\n\tenable=yes\n\tbridge=a/../b\n");
+    EXPECT_EQ(TAVIWirelessAPEnable(), 0);
+    EXPECT_TRUE(ap.log.Has("Failed to set bridge[a/../b] config."));
+    WriteFile(kSettings, "[USB Stick]\n\tenable=yes\n");
+    ap.tools.Add("/etc/rc.network", "exit 1");
+    EXPECT_EQ(TAVIWirelessAPEnable(), 0);
+    EXPECT_TRUE(ap.log.Has("Failed to restart /etc/rc.network"));
+}
+
+// The flag of the killed one costs one more call.
+TEST(Enable, SurvivesAKillAtAnyFile) {
+    constexpr int kFiles = 10;  // replaced one after the other; those of the interface line by line
+    for (int file = 1; file <= kFiles; ++file) {
+        SCOPED_TRACE(file);
+        AccessPoint ap;
+        const std::string settings = ReadFile(kSettings);
+        gKilledAtReplacement = file;
+        EXPECT_EXIT(TAVIWirelessAPEnable(), testing::KilledBySignal(SIGKILL), "");
+        gKilledAtReplacement = 0;
+        EXPECT_EQ(ReadFile(kSettings), settings);
+        EXPECT_EQ(TAVIWirelessAPEnable(), 0);
+        EXPECT_EQ(TAVIWirelessAPEnable(), 1) << ap.log.Text();
+        ExpectIsOn();
+    }
+    const AccessPoint ap;
+    gKilledAtReplacement = 0;
+    EXPECT_EQ(TAVIWirelessAPEnable(), 1);
+    EXPECT_EQ(gKilledAtReplacement, -kFiles);
+}
+
+TEST(Disable, TakesTheLastMemberOutAndPutsTheDhcpServiceAside) {
+    AccessPoint ap;
+    EXPECT_EQ(TAVIWirelessAPEnable(), 1);
+    AppendFile(kInterfaceFile, "LOCAL_LAN=yes\n");
+    const std::string service = ReadFile(kDhcpInfo);
+    ap.tools.ForgetCommands();
+    EXPECT_EQ(TAVIWirelessAPDisable(), 1);
+    EXPECT_FALSE(Exists(kHostapdInfo));
+    EXPECT_EQ(Value(kBridgeFile, "ONBOOT"), "no");
+    EXPECT_EQ(ReadFile(kInterfaceFile),
+              "ONBOOT=yes\nDEVICE=wlan0\nIPADDR=10.1.14.1\nNETMASK=255.255.255.0\n"
+              "BOOTPROTO=static\n");
+    EXPECT_FALSE(Exists(kDhcpInfo));
+    EXPECT_EQ(ReadFile(kDhcpPutAside), service);
+    EXPECT_THAT(ap.tools.Commands(), ElementsAre(Restart("lbr0")));
+    EXPECT_EQ(ap.log.Text(), "");
+
+    EXPECT_EQ(TAVIWirelessAPDisable(), 1);  // it is in no bridge any more
+    EXPECT_EQ(ap.tools.Commands().back(), Restart(""));
+    EXPECT_EQ(TAVIWirelessAPEnable(), 1) << ap.log.Text();
+    EXPECT_FALSE(Exists(kDhcpPutAside));
+    EXPECT_EQ(ReadFile(kDhcpInfo), service);
+    EXPECT_EQ(Value(kBridgeFile, "ONBOOT"), "yes");
+}
+
+TEST(Disable, LeavesTheBridgeToItsOtherMembers) {
+    struct Case {
+        std::vector<std::string> members;  // of the kernel's bridge
+        const char* onBoot;
+        const char* primary;
+    };
+    const Case kCases[] = {
+        {{}, "no", "wlan0"},
+        {{"wlan0"}, "no", "wlan0"},
+        {{"wlan0", "wlan0-far"}, "yes", "wlan0-far"},
+        {{"wlan0-far"}, "yes", "wlan0"},
+    };
+    for (const Case& c : kCases) {
+        AccessPoint ap;
+        EXPECT_EQ(TAVIWirelessAPEnable(), 1);
+        Shell("ip link add lbr0 type bridge");
+        for (const std::string& member : c.members) {
+            Shell("ip link set " + member + " master lbr0");
+        }
+        EXPECT_EQ(TAVIWirelessAPDisable(), 1);
+        Shell("ip link delete lbr0");
+        EXPECT_EQ(Value(kBridgeFile, "ONBOOT"), c.onBoot);
+        EXPECT_EQ(Value(kBridgeFile, "PRIMARY"), c.primary);
+        EXPECT_EQ(Value(kInterfaceFile, "BRIDGE"), "");
+        EXPECT_EQ(ap.log.Text(), "");
+    }
+}
+
+TEST(Disable, SaysWhatFailed) {
+    AccessPoint ap;
+    EXPECT_EQ(TAVIWirelessAPDisable(), 0);
+    EXPECT_THAT(ap.log.Lines().front().text,
+                testing::MatchesRegex("wireless_ap_disable.cpp:[0-9]+ File.*ifcfg-wlan0. does not "
+                                      "exist."));
+    EXPECT_TRUE(ap.log.Has("Failed to set AP config files."));
+    EXPECT_THAT(ap.tools.Commands(), ElementsAre());
+
+    WriteFile(kInterfaceFile, "BRIDGE=\"a/b\"\n");
+    ap.tools.Add("/etc/rc.network", "exit 3");
+    EXPECT_EQ(TAVIWirelessAPDisable(), 0);
+    EXPECT_TRUE(ap.log.Has("Failed to get number of slave for bridge [a/b]."));
+    EXPECT_TRUE(ap.log.Has("Failed to restart /etc/rc.network"));
+    EXPECT_EQ(ReadFile(kInterfaceFile), "");
+
+    WriteFile(kInterfaceFile, "BRIDGE=lbr0\n");
+    Shell("mount --bind /etc /etc; mount -o remount,bind,ro /etc");
+    EXPECT_EQ(TAVIWirelessAPDisable(), 0);
+    Shell("umount /etc");
+    EXPECT_TRUE(ap.log.Has("Failed to set file[" + std::string(kBridgeFile) + "]."));
+    EXPECT_TRUE(
+        ap.log.Has("Failed to remove key BRIDGE in [" + std::string(kInterfaceFile) + "]."));
+    EXPECT_EQ(ReadFile(kInterfaceFile), "BRIDGE=lbr0\n");
+}
+
+TEST(Support, NeedsAnAdapterThatSaysYes) {
+    EXPECT_STREQ(TAVIWirelessAPInterfaceGet(), "wlan0");
+    const std::pair<const char*, int> kCases[] = {
+        {"AP_SUPPORT=yes\n", 1}, {"AP_SUPPORT=\"yes\"\n", 1}, {"AP_SUPPORT=no\n", 0},
+        {"AP_SUPPORT=YES\n", 0}, {"PRODUCT=x\n", 0},          {"", 0}};
+    AccessPoint ap;
+    for (const auto& [info, isSupported] : kCases) {
+        WriteFile("/tmp/wireless.info", info);
+        EXPECT_EQ(TAVIWirelessAPIsSupported(), isSupported) << info;
+    }
+    std::filesystem::remove("/tmp/wireless.info");
+    EXPECT_EQ(TAVIWirelessAPIsSupported(), 0);
+    WriteFile("/tmp/wireless.info", "AP_SUPPORT=yes\n");
+    Shell("ip link delete wlan0");
+    EXPECT_EQ(TAVIWirelessAPIsSupported(), 0);
+}
+
+}  // namespace
+}  // namespace taviwireless::test

@@ -1,0 +1,366 @@
+// What hostapd is started with, and what happens to the one that runs.
+#include <gmock/gmock.h>
+#include <taviwireless/wireless.h>
+
+#include "tests/support/log_capture.h"
+#include "tests/wireless/wifi_fixture.h"
+#include "wireless/hostapd_conf.h"
+
+namespace taviwireless::test {
+namespace {
+
+using testing::EndsWith;
+using testing::HasSubstr;
+using testing::Not;
+using wireless::RenderGuestConf;
+using wireless::RenderHostConf;
+
+constexpr char kHostFile[] = "/etc/hostapd/hostapd-wlan0-host.conf";
+constexpr char kGuestFile[] = "/etc/hostapd/hostapd-wlan0-guest.conf";
+constexpr char kGuestInfo[] = "/etc/hostapd/hostapd-wlan0-guest.info";
+constexpr char kModelInfo[] = "/etc.defaults/taviinfo.conf";
+
+template <size_t kSize>
+void Set(char (&field)[kSize], const std::string& text) {
+    snprintf(field, kSize, "%s", text.c_str());
+}
+
+void SetWpa(WirelessAPSecret& secret, int32_t cipher) {
+    secret = {};
+    secret.wpa.wpaVersion = 3;
+    secret.wpa.cipher = cipher;
+    Set(secret.wpa.passphrase, "pass = phrase");
+}
+
+void SetEnterprise(WirelessAPSecret& secret, int32_t cipher) {
+    secret = {};
+    secret.enterprise.wpaVersion = 2;
+    secret.enterprise.cipher = cipher;
+    secret.enterprise.radiusPort = 1812;
+    Set(secret.enterprise.radiusAddr, "10.0.0.9");
+    Set(secret.enterprise.radiusSecret, "radius secret");
+}
+
+// Open, at 2.4 GHz with 802.11n, for guests as well.
+WirelessAPConf MakeConf() {
+    WirelessAPConf conf{};
+    Set(conf.ssid, "My \"Net\" #1");
+    Set(conf.bridge, "lbr0");
+    conf.band = WIRELESS_AP_G;
+    conf.ieee80211n = 1;
+    conf.channel = 11;
+    conf.wmm = 7;
+    conf.guestEnabled = 1;
+    Set(conf.guestSsid, "Guests");
+    Set(conf.guestBssid, "02:00:00:00:00:01");
+    return conf;
+}
+
+std::string HostText(const WirelessAPConf& conf) {
+    return RenderHostConf("wlan0", conf).Text();
+}
+
+const std::string kGoldenHead =
+    "interface=wlan0\ndriver=nl80211\nssid=My \"Net\" #1\nignore_broadcast_ssid=0\n"
+    "macaddr_acl=0\nwpa_psk_file=/etc/hostapd.psk\nwps_state=2\nap_setup_locked=1\n"
+    "ctrl_interface=/var/run/hostapd\nconfig_methods=label display push_button keypad\n";
+const std::string kGoldenOpen = kGoldenHead +
+                                "bridge=lbr0\nchannel=11\nieee80211n=1\n"
+                                "ht_capab=[SHORT-GI-20][DELAYED-BA]\nwmm_enabled=1\nhw_mode=g\n"
+                                "eap_server=1\nauth_algs=1\n";
+
+TEST(HostConf, IsWrittenLineByLine) {
+    WirelessAPConf conf = MakeConf();
+    EXPECT_EQ(HostText(conf), kGoldenOpen);
+
+    conf.hidden = 1;
+    conf.maxStations = 12;
+    conf.ieee80211n = conf.wmm = 0;
+    conf.band = WIRELESS_AP_N_ONLY;
+    conf.security = WIRELESS_AP_WPA;
+    SetWpa(conf.secret, WIRELESS_AP_CCMP);
+    std::string head = kGoldenHead;
+    head.replace(head.find("ssid=0"), 6, "ssid=1");
+    EXPECT_EQ(HostText(conf), head +
+                                  "max_num_sta=12\nbridge=lbr0\nchannel=11\nwmm_enabled=0\n"
+                                  "require_ht=1\nhw_mode=g\neap_server=1\nauth_algs=1\nwpa=3\n"
+                                  "wpa_key_mgmt=WPA-PSK\nwpa_passphrase=pass = phrase\n"
+                                  "wpa_pairwise=CCMP\nrsn_pairwise=CCMP\n");
+
+    conf.security = WIRELESS_AP_WPA_ENTERPRISE;
+    SetEnterprise(conf.secret, WIRELESS_AP_TKIP | WIRELESS_AP_CCMP);
+    EXPECT_THAT(HostText(conf),
+                EndsWith("\nrequire_ht=1\nhw_mode=g\neap_server=0\nauth_algs=1\nwpa=2\n"
+                         "wpa_key_mgmt=WPA-EAP\nwpa_pairwise=TKIP CCMP\nrsn_pairwise=TKIP CCMP\n"
+                         "ieee8021x=1\nauth_server_addr=10.0.0.9\nauth_server_port=1812\n"
+                         "auth_server_shared_secret=radius secret\n"));
+}
+
+TEST(HostConf, HasTheModeAndWidthThatBandAndChannelAllow) {
+    struct Case {
+        int band, n, htFlags, channel, security, cipher;
+        std::string capabilities;  // the end of the line
+        std::string mode;          // the lines between WMM and the EAP server
+    };
+    const Case kCases[] = {
+        {1, 1, 3, 44, 0, 0, "7935][HT40+]", "hw_mode=a\n"},
+        {1, 1, 2, 64, 0, 0, "7935][HT40-]", "hw_mode=a\n"},
+        {1, 1, 2, 149, 0, 0, "[MAX-AMSDU-7935]", "hw_mode=a\n"},
+        {4, 1, 2, 5, 0, 0, "7935][HT40+]", "hw_mode=g\n"},
+        {4, 1, 2, 6, 0, 0, "7935][HT40-]", "hw_mode=g\n"},
+        {2, 2, 1, 3, 0, 0, "=[SHORT-GI-20][DELAYED-BA]", "hw_mode=b\n"},
+        {9, 1, 2, 44, 0, 0, "7935][HT40-]", "hw_mode=a\n"},
+        {12, 1, 0, 1, 0, 0, "[DELAYED-BA]", "hw_mode=g\n"},
+        {12, 0, 0, 1, 0, 0, "", ""},
+        {6, 1, 0, 1, 0, 0, "[DELAYED-BA]", ""},
+        {8, 1, 0, 1, 2, 1, "[DELAYED-BA]", "hw_mode=g\n"},
+        {8, 1, 0, 1, 1, 0, "[DELAYED-BA]", "hw_mode=g\n"},
+        {8, 1, 0, 1, 2, 3, "[DELAYED-BA]", "require_ht=1\nhw_mode=g\n"},
+        {8, 1, 0, 1, 3, 1, "[DELAYED-BA]", "require_ht=1\nhw_mode=g\n"},
+        {8, 0, 0, 1, 0, 0, "", "require_ht=1\nhw_mode=g\n"},
+    };
+    for (const Case& c : kCases) {
+        WirelessAPConf conf = MakeConf();
+        conf.band = c.band;
+        conf.ieee80211n = c.n;
+        conf.htFlags = c.htFlags;
+        conf.channel = c.channel;
+        conf.security = c.security;
+        if (c.security == WIRELESS_AP_WPA) {
+            SetWpa(conf.secret, c.cipher);
+        } else if (c.security == WIRELESS_AP_WPA_ENTERPRISE) {
+            SetEnterprise(conf.secret, c.cipher);
+        }
+        EXPECT_THAT(HostText(conf), HasSubstr((c.n != 0 ? c.capabilities : "channel=1") +
+                                              "\nwmm_enabled=1\n" + c.mode + "eap_server="))
+            << "band " << c.band << " channel " << c.channel << " security " << c.security;
+    }
+}
+
+TEST(HostConf, QuotesAWepKeyByItsLength) {
+    const std::string k26(26, 'a');
+    const std::pair<std::string, std::string> kCases[] = {
+        {"ab\"d ", "wep_key0=\"ab\"d \"\n"},
+        {"0123456789", "wep_key0=0123456789\n"},
+        {"0123456789abc", "wep_key0=\"0123456789abc\"\n"},
+        {k26, "wep_key0=" + k26 + "\n"},
+        {"0123456789ab", ""},
+        {"", ""},
+    };
+    for (const auto& [key, line] : kCases) {
+        WirelessAPConf conf = MakeConf();
+        conf.security = conf.guestSecurity = WIRELESS_AP_WEP;
+        Set(conf.secret.wepKey, key);
+        Set(conf.guestSecret.wepKey, key);
+        EXPECT_THAT(HostText(conf),
+                    EndsWith("eap_server=1\nauth_algs=3\nwep_default_key=0\n" + line));
+        EXPECT_THAT(RenderGuestConf(conf).Text(),
+                    EndsWith("\nignore_broadcast_ssid=0\nauth_algs=3\nwep_default_key=0\n" + line));
+    }
+}
+
+TEST(GuestConf, IsABlockWithoutEapServer) {
+    WirelessAPConf conf = MakeConf();
+    const std::string head =
+        "bss=gwlan\nbssid=02:00:00:00:00:01\nssid=Guests\nbridge=gbr\n"
+        "ctrl_interface=/var/run/hostapd\n";
+    EXPECT_EQ(RenderGuestConf(conf).Text(), head + "ignore_broadcast_ssid=0\n");
+    conf.guestSecurity = WIRELESS_AP_WPA_ENTERPRISE;
+    EXPECT_EQ(RenderGuestConf(conf).Text(), head + "ignore_broadcast_ssid=0\n");
+    conf.guestSecurity = WIRELESS_AP_WPA;
+    conf.guestHidden = 1;
+    conf.guestIsolate = 5;
+    conf.guestMaxStations = 3;
+    SetWpa(conf.guestSecret, WIRELESS_AP_TKIP);
+    EXPECT_EQ(RenderGuestConf(conf).Text(),
+              head +
+                  "max_num_sta=3\nap_isolate=1\nignore_broadcast_ssid=1\nauth_algs=1\nwpa=3\n"
+                  "wpa_key_mgmt=WPA-PSK\nwpa_passphrase=pass = phrase\nwpa_pairwise=TKIP\n"
+                  "rsn_pairwise=TKIP\n");
+}
+
+// Every kind of security with every cipher or length of key.
+struct Security {
+    int kind;
+    WirelessAPSecret secret;
+};
+std::vector<Security> Securities() {
+    std::vector<Security> all{{WIRELESS_AP_OPEN, {}}};
+    for (const size_t length : {5, 10, 12, 13, 26}) {
+        all.push_back({WIRELESS_AP_WEP, {}});
+        Set(all.back().secret.wepKey, std::string(length, 'a'));
+    }
+    for (int cipher = 0; cipher <= 4; ++cipher) {
+        all.push_back({WIRELESS_AP_WPA, {}});
+        SetWpa(all.back().secret, cipher);
+        all.push_back({WIRELESS_AP_WPA_ENTERPRISE, {}});
+        SetEnterprise(all.back().secret, cipher);
+    }
+    return all;
+}
+
+std::string MatrixFile(int number) {
+    return "/tmp/matrix/" + std::to_string(number);
+}
+
+// Writes host and guest files, joined, for every case there is. Returns their number.
+int WriteMatrix() {
+    const std::vector<Security> securities = Securities();
+    WirelessAPConf conf = MakeConf();
+    int count = 0;
+    for (int i = 0; i < 9 * 2 * 2; ++i) {
+        constexpr int kBands[] = {1, 2, 4, 5, 6, 7, 8, 9, 12};
+        conf.band = kBands[i % 9];
+        conf.ieee80211n = i / 9 % 2;
+        conf.htFlags = i / 18 * WIRELESS_AP_40_MHZ;
+        for (const int channel : {0, 1, 6, 13, 36, 48, 64, 149}) {
+            conf.channel = channel;
+            for (const Security& security : securities) {
+                const Security& guest =
+                    securities[static_cast<size_t>(count) / 3 % securities.size()];
+                conf.security = security.kind;
+                conf.secret = security.secret;
+                conf.guestSecurity = guest.kind;
+                conf.guestSecret = guest.secret;
+                conf.maxStations = conf.guestMaxStations = conf.guestIsolate = count % 2;
+                WriteFile(MatrixFile(++count), HostText(conf) + RenderGuestConf(conf).Text());
+            }
+        }
+    }
+    return count;
+}
+
+// It reads all of its files before it misses the radio, and names each line it does not know.
+TEST(HostConf, IsUnderstoodByHostapdInEveryCase) {
+    const int count = WriteMatrix();
+    EXPECT_EQ(count, 36 * 8 * 16);
+    int read = 0;
+    for (int first = 1; first <= count; first += 200) {
+        std::vector<std::string> command{"/usr/sbin/hostapd", "-d"};
+        for (int i = first; i < first + 200 && i <= count; ++i) {
+            command.push_back(MatrixFile(i));
+        }
+        const std::string said = RunProgram(command).out;
+        EXPECT_THAT(said, Not(HasSubstr("Line ")));
+        EXPECT_THAT(said, Not(HasSubstr("errors found")));
+        for (size_t at = 0; (at = said.find("Configuration file: ", at)) != said.npos; ++at) {
+            ++read;
+        }
+    }
+    EXPECT_EQ(read, count);
+    AppendFile(MatrixFile(1), "nonsense=1\n");
+    EXPECT_THAT(RunProgram({"/usr/sbin/hostapd", "-d", MatrixFile(1)}).out, HasSubstr("Line "));
+}
+
+// An appliance without hostapd's files; its ps lists every process with its arguments.
+struct AccessPoint {
+    AccessPoint() {
+        Shell(
+            "rm -rf /etc/hostapd /etc.defaults/* /tmp/*; mkdir -p /tmp/bin /etc.defaults\n"
+            "ln -s /bin/busybox /tmp/bin/ps; printf '#!/bin/sh\\nread end\\n' > /tmp/hostapd\n"
+            "chmod +x /tmp/hostapd");
+        setenv("PATH", ("/tmp/bin:" + path).c_str(), 1);
+    }
+    ~AccessPoint() { setenv("PATH", path.c_str(), 1); }
+
+    const std::string path = getenv("PATH");
+    WirelessInterface adapter;
+    LogCapture log;
+};
+
+TEST(SetHostAPConf, StopsHostapdAndWritesFilesThatOthersCannotRead) {
+    AccessPoint here;
+    here.adapter.Up();
+    WriteFile(kHostFile, "old\n");
+    Process other({"/tmp/hostapd", "/etc/hostapd/hostapd-wlan1.conf"});
+    Process ours({"/tmp/hostapd", "/etc/hostapd/hostapd-wlan0.conf"});
+    const WirelessAPConf conf = MakeConf();
+    EXPECT_EQ(TAVIWirelessSetHostAPConf("wlan0", &conf), 1);
+    EXPECT_EQ(ours.Wait(), 128 + SIGTERM);
+    EXPECT_EQ(other.Wait(Process::Milliseconds(0)), std::nullopt);
+    EXPECT_THAT(Shell("ip link show wlan0"), Not(HasSubstr("UP")));
+    EXPECT_EQ(ReadFile(kHostFile), kGoldenOpen);
+    EXPECT_EQ(FileMode(kHostFile), 0600u);
+    EXPECT_FALSE(Exists(kGuestFile) || Exists(kGuestInfo));
+    EXPECT_EQ(here.log.Text(), "");
+}
+
+TEST(SetHostAPConf, WritesGuestFilesOnModelsThatOfferThem) {
+    AccessPoint here;
+    WriteFile(kModelInfo, "support_pci_wifi=\"yes\"\n");
+    WirelessAPConf conf = MakeConf();
+    EXPECT_EQ(TAVIWirelessSetHostAPConf("wlan0", &conf), 1);
+    EXPECT_EQ(ReadFile(kGuestInfo), "enable=yes\n");
+    EXPECT_EQ(ReadFile(kGuestFile), RenderGuestConf(conf).Text());
+    EXPECT_EQ(FileMode(kGuestInfo) | FileMode(kGuestFile), 0600u);
+    conf.guestEnabled = 0;
+    EXPECT_EQ(TAVIWirelessSetHostAPConf("wlan0", &conf), 1);
+    EXPECT_EQ(ReadFile(kGuestInfo), "enable=no\n");
+}
+
+TEST(SetHostAPConf, AnInterfaceNameRunsNothingAndMatchesOnlyItself) {
+    AccessPoint here;
+    Process other({"/tmp/hostapd", "wlan0x1", "/etc/hostapd/hostapd-"});
+    const WirelessAPConf conf = MakeConf();
+    for (const char* interface : {"wlan0.1", "w*", "$(>x)", "`>x`;>x", "[w]", "^"}) {
+        EXPECT_EQ(TAVIWirelessSetHostAPConf(interface, &conf), 1) << interface;
+    }
+    EXPECT_EQ(other.Wait(Process::Milliseconds(50)), std::nullopt);
+    EXPECT_FALSE(Exists("x"));
+}
+
+TEST(SetHostAPConf, RefusesBadArgumentsAndLineBreaksBeforeAnythingIsDone) {
+    AccessPoint here;
+    here.adapter.Up();
+    WirelessAPConf conf = MakeConf();
+    EXPECT_EQ(TAVIWirelessSetHostAPConf(nullptr, &conf), 0);
+    EXPECT_EQ(TAVIWirelessSetHostAPConf("wlan0", nullptr), 0);
+    EXPECT_EQ(here.log.Count("wireless_hostap_conf_set.cpp:"), 2);
+    EXPECT_EQ(here.log.Count(" Bad parameter."), 2);
+    Set(conf.guestSsid, "a\nb");  // which this model does not write
+    EXPECT_EQ(TAVIWirelessSetHostAPConf("wlan0", &conf), 1);
+    here.adapter.Up();
+    Shell("rm -r /etc/hostapd");
+    WriteFile(kModelInfo, "support_pci_wifi=yes\n");
+    EXPECT_EQ(TAVIWirelessSetHostAPConf("wlan0", &conf), 0);
+    conf = MakeConf();
+    conf.security = WIRELESS_AP_WPA;
+    Set(conf.secret.wpa.passphrase, "secret\nauth_algs=1");
+    EXPECT_EQ(TAVIWirelessSetHostAPConf("wlan0", &conf), 0);
+    EXPECT_EQ(here.log.Count("holds a line break"), 2);
+    EXPECT_FALSE(here.log.Has("secret"));
+    EXPECT_THAT(Shell("ip link show wlan0"), HasSubstr("UP"));
+    EXPECT_FALSE(Exists("/etc/hostapd"));
+}
+
+TEST(SetHostAPConf, TellsWhatCouldNotBeWritten) {
+    struct Case {
+        std::string arrange;
+        std::string log;
+        bool isHostWritten;
+    };
+    const std::string guest = "Failed to set hostapd.conf for Guest Network\n";
+    const Case kCases[] = {
+        {"touch /etc/hostapd", "Failed to mkdir /etc/hostapd\n", false},
+        {std::string("mkdir -p ") + kHostFile, "", false},
+        {std::string("mkdir -p ") + kGuestInfo, guest, true},
+        {std::string("mkdir -p ") + kGuestFile, guest, true},
+    };
+    for (const Case& c : kCases) {
+        AccessPoint here;
+        WriteFile(kModelInfo, "support_pci_wifi=yes\n");
+        Shell(c.arrange);
+        const WirelessAPConf conf = MakeConf();
+        testing::internal::CaptureStderr();  // mkdir's
+        EXPECT_EQ(TAVIWirelessSetHostAPConf("wlan0", &conf), 0);
+        testing::internal::GetCapturedStderr();
+        EXPECT_THAT(here.log.Text(), EndsWith(c.log));
+        EXPECT_EQ(here.log.Lines().size(), c.log.empty() ? 0u : c.log == guest ? 2u : 1u);
+        EXPECT_EQ(here.log.Has("Failed to open file [/etc/hostapd/hostapd-wlan0-guest."),
+                  c.log == guest);
+        EXPECT_EQ(std::filesystem::is_regular_file(kHostFile), c.isHostWritten);
+    }
+}
+
+}  // namespace
+}  // namespace taviwireless::test

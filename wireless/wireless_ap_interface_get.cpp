@@ -1,0 +1,5 @@
+#include <taviwireless/wireless.h>
+
+const char* TAVIWirelessAPInterfaceGet() {
+    return "wlan0";
+}
