@@ -44,7 +44,7 @@ struct Options {
     bool showSecrets = false;
     bool force = false;                 // use up the last attempt without a question
     bool noWait = false;                // connect: return as soon as the dialler runs
-    std::vector<std::string> settings;  // profile set: KEY=VALUE or KEY
+    std::vector<std::string> settings;  // profile set, ap set: KEY=VALUE or KEY
 
     // wifi
     std::string network;        // ESSID, or BSSID of a saved network
@@ -68,6 +68,8 @@ void AddConnectionCommands(CLI::App& modem, Options& options);
 void AddWifiCommands(CLI::App& app, Options& options);
 void AddWifiConnectCommand(CLI::App& wifi, Options& options);
 void AddWifiSavedCommands(CLI::App& wifi, Options& options);
+void AddAPCommands(CLI::App& app, Options& options);
+void AddAPCheckCommand(CLI::App& ap, Options& options);
 
 // One command about modems, with what all of them take.
 CLI::App& AddModemCommand(CLI::App& group, const char* name, const char* description,

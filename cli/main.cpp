@@ -37,6 +37,7 @@ int main(int argc, char** argv) {
     app.fallthrough();
     AddModemCommands(app, options);
     AddWifiCommands(app, options);
+    AddAPCommands(app, options);
     try {
         app.parse(argc, argv);
         return std::cout.flush() ? kSuccess : Fail(options, kFailure, "cannot write the output");

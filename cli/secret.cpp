@@ -54,7 +54,7 @@ std::string ReadSecret(const std::string& prompt) {
 std::string ReadNewSecret(const std::string& prompt) {
     const std::string secret = ReadSecret(prompt);
     if (isatty(STDIN_FILENO) && ReadSecret(prompt + " again") != secret) {
-        throw CommandError(kUsage, "the two differ; nothing was sent to the modem");
+        throw CommandError(kUsage, "the two differ; nothing was changed");
     }
     return secret;
 }

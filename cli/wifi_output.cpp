@@ -32,16 +32,8 @@ const StatusWord& WordsOf(const WirelessStatus& status) {
     return kStatuses[isKnown ? status.status : WIRELESS_STATUS_OTHER_MODE];
 }
 
-Json::Value TextOrNull(const std::string& text) {
-    return text.empty() ? Json::Value() : Json::Value(text);
-}
-
 Json::Value NumberOrNull(int number) {
     return number == 0 ? Json::Value() : Json::Value(number);
-}
-
-std::string Cell(const std::string& text) {
-    return text.empty() ? "-" : Printable(text);
 }
 
 std::string ProtocolText(const WirelessNetwork& network) {
@@ -91,10 +83,6 @@ std::string AddressText(const WirelessConf& conf) {
     return IsDHCP(conf) ? "by DHCP" : conf.ipAddr;
 }
 
-std::string SecretText(const std::string& secret, bool showSecrets) {
-    return secret.empty() || showSecrets ? secret : "********";
-}
-
 std::string StatusLine(const WirelessStatus& status, const std::string& address) {
     std::string line = WifiInterface() + ": " + WordsOf(status).text;
     const std::string essid = status.network.essid;
@@ -106,6 +94,18 @@ std::string StatusLine(const WirelessStatus& status, const std::string& address)
 }
 
 }  // namespace
+
+Json::Value TextOrNull(const std::string& text) {
+    return text.empty() ? Json::Value() : Json::Value(text);
+}
+
+std::string Cell(const std::string& text) {
+    return text.empty() ? "-" : Printable(text);
+}
+
+std::string SecretText(const std::string& secret, bool showSecrets) {
+    return secret.empty() || showSecrets ? secret : "********";
+}
 
 std::string BssidText(const unsigned char (&bssid)[6]) {
     const bool isKnown = std::any_of(std::begin(bssid), std::end(bssid), [](int b) { return b; });

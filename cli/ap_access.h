@@ -1,0 +1,36 @@
+#ifndef TAVIWIRELESS_CLI_AP_ACCESS_H
+#define TAVIWIRELESS_CLI_AP_ACCESS_H
+
+#include <taviwireless/wireless.h>
+
+#include <optional>
+#include <string>
+
+namespace taviwireless::cli {
+
+// The library's functions of the access point with exceptions. Failures throw CommandError.
+
+// What everybody may know; nothing where the settings cannot be told.
+struct APStatus {
+    bool isSupported;
+    bool isConnecting;
+    bool isOn;                                   // the adapter works as one
+    std::optional<WirelessAPSettings> settings;  // only root may read them
+    std::string bridgeAddress;
+};
+APStatus LookAtAP();
+
+// The settings of the adapter that is plugged in: those stored, or the defaults.
+WirelessAPSettings ReadAPSettings();
+// Stores them whether they say that the access point is on or off.
+void StoreAPSettings(WirelessAPSettings settings);
+
+// Stores that the access point is on, and switches it on. When that fails, what was stored before
+// counts again.
+void SwitchAPOn();
+// Switches it off, and stores that.
+void SwitchAPOff();
+
+}  // namespace taviwireless::cli
+
+#endif

@@ -1,0 +1,187 @@
+// taviwireless ap check: what the access point would be started with, and what hostapd says of it.
+#include <json/json.h>
+#include <sys/mman.h>
+#include <unistd.h>
+
+#include <CLI/CLI.hpp>
+#include <cstdio>
+#include <cstring>
+#include <iostream>
+#include <memory>
+#include <sstream>
+
+#include "cli/ap_access.h"
+#include "cli/ap_settings.h"
+#include "cli/commands.h"
+#include "cli/output.h"
+#include "cli/wifi_access.h"
+#include "wireless/ap_files.h"
+#include "wireless/hostapd_conf.h"
+
+namespace taviwireless::cli {
+
+namespace {
+
+// hostapd has no mode that only checks. A line that it cannot understand keeps it from starting,
+// and it names all others first.
+constexpr char kStopper[] = "taviwireless_only_checks";
+
+struct ConfFile {
+    std::string path;
+    std::string text;
+};
+
+// As the access point would be started with them.
+std::vector<ConfFile> Render(const WirelessAPConf& conf) {
+    const std::string interface = TAVIWirelessAPInterfaceGet();
+    std::vector<ConfFile> files{
+        {wireless::HostapdHostConf(interface), wireless::RenderHostConf(interface, conf).Text()}};
+    if (wireless::OffersGuestNetwork() && conf.guestEnabled != 0) {
+        files.push_back(
+            {wireless::HostapdGuestConf(interface), wireless::RenderGuestConf(conf).Text()});
+    }
+    return files;
+}
+
+std::string HideSecrets(const std::string& text) {
+    std::istringstream lines(text);
+    std::string hidden;
+    for (std::string line; std::getline(lines, line);) {
+        for (const char* key : {"wpa_passphrase=", "wep_key0=", "auth_server_shared_secret="}) {
+            if (line.rfind(key, 0) == 0) {
+                line = key + std::string("********");
+            }
+        }
+        hidden += line + "\n";
+    }
+    return hidden;
+}
+
+// A file of no folder, which nobody else can read and which is gone when the program ends.
+class MemoryFile {
+  public:
+    explicit MemoryFile(const std::string& text) : handle_(memfd_create("hostapd", 0)) {
+        if (handle_ < 0 || write(handle_, text.data(), text.size()) != ssize_t(text.size())) {
+            throw CommandError(kFailure, "there is no memory for hostapd's settings");
+        }
+    }
+    ~MemoryFile() { close(handle_); }
+    MemoryFile(const MemoryFile&) = delete;
+    MemoryFile& operator=(const MemoryFile&) = delete;
+
+    // For programs that are started.
+    std::string Path() const { return "/proc/self/fd/" + std::to_string(handle_); }
+
+  private:
+    int handle_;
+};
+
+struct Verdict {
+    int errors = -1;  // negative: none was heard
+    std::vector<std::string> remarks;
+};
+
+// "Line 7: ..." counts through both files.
+Verdict AskHostapd(const std::string& text) {
+    const MemoryFile file(text + kStopper + "=1\n");
+    const std::string command = "hostapd " + file.Path() + " 2>&1";
+    const std::unique_ptr<FILE, decltype(&pclose)> output(popen(command.c_str(), "r"), pclose);
+    Verdict verdict;
+    char line[1024];
+    while (output && fgets(line, sizeof line, output.get()) != nullptr) {
+        std::string remark = line;
+        remark.erase(remark.find_last_not_of('\n') + 1);
+        if (sscanf(line, "%d errors found in", &verdict.errors) == 1) {
+            --verdict.errors;  // the stopper
+            break;             // what follows is that it does not start
+        }
+        if (remark.find(kStopper) == std::string::npos) {
+            verdict.remarks.push_back(Printable(remark));
+        }
+    }
+    return verdict;
+}
+
+std::string Join(const std::vector<std::string>& texts) {
+    std::string joined;
+    for (const std::string& text : texts) {
+        joined += (joined.empty() ? "" : "; ") + text;
+    }
+    return joined;
+}
+
+Verdict CheckWithHostapd(const std::vector<ConfFile>& files) {
+    std::string text;
+    for (const ConfFile& file : files) {
+        text += file.text;
+    }
+    // The network script leaves this line out as well; the BSSID of guests is not read from the
+    // settings, and hostapd derives one.
+    constexpr char kNoBssid[] = "\nbssid=\n";
+    if (const size_t line = text.find(kNoBssid); line != text.npos) {
+        text.erase(line, strlen(kNoBssid) - 1);
+    }
+    Verdict verdict = AskHostapd(text);
+    if (verdict.errors < 0) {
+        throw CommandError(kFailure,
+                           "hostapd cannot be asked; is it installed? " + Join(verdict.remarks));
+    }
+    if (verdict.errors > 0) {
+        throw CommandError(kFailure, "hostapd would not start: " + Join(verdict.remarks));
+    }
+    return verdict;
+}
+
+Json::Value ToJson(const std::vector<ConfFile>& files, const Verdict& verdict) {
+    Json::Value document;
+    document["files"] = Json::Value(Json::objectValue);
+    for (const ConfFile& file : files) {
+        document["files"][file.path] = file.text;
+    }
+    document["remarks"] = Json::Value(Json::arrayValue);
+    for (const std::string& remark : verdict.remarks) {
+        document["remarks"].append(remark);
+    }
+    return document;
+}
+
+void Check(const Options& options) {
+    RequireWifiSettings();
+    const WirelessAPSettings settings = ReadAPSettings();
+    const std::vector<ConfFile> files = Render(settings.ap);
+    std::vector<ConfFile> shown = files;
+    for (ConfFile& file : shown) {
+        file.text = options.showSecrets ? file.text : HideSecrets(file.text);
+    }
+    if (!options.json) {
+        for (const ConfFile& file : shown) {
+            // Not the line breaks, which belong to the file.
+            std::istringstream lines(file.text);
+            std::cout << "# " << file.path << '\n';
+            for (std::string line; std::getline(lines, line);) {
+                std::cout << Printable(line) << '\n';
+            }
+        }
+        std::cout.flush();  // before what is said of them
+    }
+    CheckAPConf(settings.ap);
+    const Verdict verdict = CheckWithHostapd(files);
+    if (options.json) {
+        return Print(ToJson(shown, verdict));
+    }
+    for (const std::string& remark : verdict.remarks) {
+        std::cout << "hostapd: " << remark << '\n';
+    }
+    std::cout << "hostapd understands all of it.\n";
+}
+
+}  // namespace
+
+void AddAPCheckCommand(CLI::App& ap, Options& options) {
+    CLI::App* check = ap.add_subcommand(
+        "check", "Show what hostapd would be started with, and whether it understands that");
+    check->add_flag("--show-secrets", options.showSecrets, "Show the secrets as well");
+    check->callback([&options] { Check(options); });
+}
+
+}  // namespace taviwireless::cli

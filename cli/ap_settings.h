@@ -1,0 +1,33 @@
+#ifndef TAVIWIRELESS_CLI_AP_SETTINGS_H
+#define TAVIWIRELESS_CLI_AP_SETTINGS_H
+
+#include <taviwireless/wireless.h>
+
+#include <string>
+#include <vector>
+
+namespace taviwireless::cli {
+
+// One setting to change, checked only for being one.
+struct APChange {
+    std::string key;
+    std::string value;
+};
+
+// The settings there are, with commas between them.
+std::string APSettingNames();
+
+// "KEY=VALUE" each, or "KEY" alone for the secrets, which are read from standard input, a line each
+// in this order. Nothing is read when there is a mistake.
+std::vector<APChange> ReadAPChanges(const std::vector<std::string>& texts);
+
+// Changes the settings, whatever the order of the changes; throws when a value is not allowed.
+void ApplyAPChanges(const std::vector<APChange>& changes, WirelessAPConf& conf);
+
+// Throws unless an access point can work with the settings as a whole: much of this hostapd finds
+// only when it starts, and some of it never.
+void CheckAPConf(WirelessAPConf conf);
+
+}  // namespace taviwireless::cli
+
+#endif

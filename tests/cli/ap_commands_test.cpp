@@ -1,0 +1,272 @@
+// taviwireless ap, end to end: the program, the library, a real interface, and the real hostapd.
+#include "tests/cli/cli_runs.h"
+#include "tests/wireless/wifi_fixture.h"
+
+namespace taviwireless::test {
+namespace {
+
+using testing::Contains;
+using testing::HasSubstr;
+using testing::Not;
+using testing::StartsWith;
+
+constexpr char kStored[] = "/usr/tavi/etc/wireless_ap.conf";
+constexpr char kFlag[] = "/var/tmp/.wireless_ap_connecting";
+
+RunResult AP(std::vector<std::string> arguments, const std::string& input = "") {
+    arguments.insert(arguments.begin(), {BuiltProgram("taviwireless_with_wifi"), "ap"});
+    return RunProgram(arguments, input);
+}
+
+RunResult Set(std::vector<std::string> settings, const std::string& input = "") {
+    settings.insert(settings.begin(), "set");
+    return AP(settings, input);
+}
+
+// An adapter that can be an access point, for which nothing is stored.
+struct APCommands : testing::Test {
+    APCommands() {
+        Shell("rm -rf /usr/tavi/etc /etc/hostapd/* /etc/sysconfig /etc/dhcpd /tmp/master " +
+              std::string(kFlag));
+        Shell("mkdir -p /usr/tavi/etc /etc/sysconfig/network-scripts /etc/dhcpd");
+        WriteFile("/etc.defaults/taviinfo.conf", "support_wireless=yes\nsupport_pci_wifi=yes\n");
+        WriteFile("/tmp/wireless.info", "PRODUCT=stick\nAP_SUPPORT=yes\n");
+        tools.Add("/sbin/iwlist", "echo '11 channels'");
+        tools.Add("/etc/rc.network", "[ ! -e /tmp/no-network ] && touch /tmp/master");
+    }
+    ~APCommands() override { Shell("rm -f /tmp/no-network /tmp/master /tmp/wireless.info"); }
+    ToolStandIns tools;
+    WirelessInterface interface;
+};
+
+TEST_F(APCommands, SettingsAreInTheWordsOfAPerson) {
+    const RunResult set =
+        Set({"ssid=Our Home", "security=wpa2", "passphrase", "cipher=both", "band=5", "channel=36",
+             "width=40", "hidden=yes", "max-stations=20", "bridge=lbr1", "guest=yes",
+             "guest-ssid=Visitors", "guest-security=wep", "guest-wep-key", "guest-isolate=no"},
+            "the phrase\n0123456789\n");
+    ASSERT_EQ(set.status, 0) << set.err;
+    EXPECT_EQ(FileMode(kStored), 0600u);
+    EXPECT_EQ(AP({"show"}).out,
+              "Adapter                   stick\n"
+              "To be on                  no\n"
+              "Network                   Our Home\n"
+              "Hidden                    yes\n"
+              "Stations at most          20\n"
+              "Security                  wpa2, cipher both\n"
+              "Passphrase                ********\n"
+              "Bridge                    lbr1\n"
+              "Mode                      802.11an at 5 GHz\n"
+              "Channel                   36, 40 MHz\n"
+              "Guest network             yes\n"
+              "Guests: Network           Visitors\n"
+              "Guests: Hidden            no\n"
+              "Guests: Stations at most  256\n"
+              "Guests: Security          wep\n"
+              "Guests: WEP key           ********\n"
+              "Guests: Isolated          no\n");
+    const Json::Value shown = Parse(AP({"show", "--show-secrets", "--json"}).out);
+    EXPECT_EQ(shown["passphrase"], "the phrase");
+    EXPECT_EQ(shown["guest"]["wep_key"], "0123456789");
+    EXPECT_EQ(shown["mode"], "an");
+    EXPECT_EQ(Parse(AP({"show", "--json"}).out)["passphrase"], "********");
+}
+
+TEST_F(APCommands, WhatIsNotSetKeepsItsDefaultOrItsStoredValue) {
+    ASSERT_EQ(Set({"ssid=First"}).status, 0);
+    EXPECT_THAT(ReadFile(kStored), HasSubstr("\tguest_net_lan_block=1\n"));
+    EXPECT_THAT(ReadFile(kStored), HasSubstr("\tenable=no\n"));
+    Shell(
+        "sed -i 's/guest_net_lan_block=1/guest_net_lan_block=0/; s/enable=no/enable=yes/;"
+        "s/bssid=$/bssid=02:00:00:00:00:01/; s/txpower=10/txpower=7/' " +
+        std::string(kStored));
+    ASSERT_EQ(Set({"security=wpa-eap", "radius-server=10.0.0.9", "radius-secret"}, "s\n").status,
+              0);
+    for (const char* line : {"enable=yes", "ssid=First", "txpower=7", "bssid=02:00:00:00:00:01",
+                             "guest_net_lan_block=0", "auth_server_port=1812"}) {
+        EXPECT_THAT(ReadFile(kStored), HasSubstr("\t" + std::string(line) + "\n"));
+    }
+    // Another version of WPA keeps the passphrase, another kind of security does not.
+    ASSERT_EQ(Set({"security=wpa", "passphrase"}, "the phrase\n").status, 0);
+    EXPECT_EQ(Set({"security=wpa-mixed"}).status, 0);
+    EXPECT_EQ(Set({"security=wep"}).err, "taviwireless: security wep needs wep-key\n");
+}
+
+TEST_F(APCommands, AWrongSettingChangesNothing) {
+    const struct {
+        std::vector<std::string> settings;
+        std::string input;
+        std::string sentence;
+    } kCases[] = {
+        {{"colour=red"}, "", "an access point has no setting colour; there are bridge, band, "},
+        {{"guest-bridge=x"}, "", "an access point has no setting guest-bridge; there are "},
+        {{"ssid"}, "", "ssid needs a value: ssid=VALUE"},
+        {{"ssid="}, "", "the name of a network has 1 to 32 bytes"},
+        {{"ssid=" + std::string(33, 's')}, "", "the name of a network has 1 to 32 bytes"},
+        {{"ssid=a", "ssid=b"}, "", "ssid is given twice"},
+        {{"hidden=maybe"}, "", "hidden is yes or no"},
+        {{"max-stations=0"}, "", "max-stations is a number from 1 to 2007"},
+        {{"max-stations=2008"}, "", "max-stations is a number from 1 to 2007"},
+        {{"bridge=0123456789abcdef"}, "", "bridge is the name of an interface"},
+        {{"passphrase=geheim77"}, "", "passphrase is read from standard input, where nobody"},
+        {{"security=wpa3"}, "", "security cannot be wpa3; it is one of open, wep, wpa, wpa2, "},
+        {{"guest-security=wpa-eap"}, "", "security cannot be wpa-eap; it is one of open, wep"},
+        {{"security=wpa2"}, "", "security wpa2 needs passphrase"},
+        {{"guest=yes", "guest-security=wpa2"}, "", "guest-security wpa2 needs guest-passphrase"},
+        {{"security=wpa2", "passphrase"}, "1234567\n", "a WPA key has 8 to 63"},
+        {{"security=wpa2", "passphrase"}, std::string(64, 'p') + "\n", "a WPA key has 8 to 63"},
+        {{"passphrase"}, "12345678\n", "a passphrase needs the security wpa, wpa2 or wpa-mixed"},
+        {{"security=wep", "wep-key"}, "123456\n", "a WEP key has 5 or 13 characters"},
+        {{"cipher=aes"}, "", "a cipher needs one of the kinds of security with wpa"},
+        {{"security=wpa-eap", "radius-server=home"}, "", "radius-server is an IPv4 address"},
+        {{"radius-port=1"}, "", "a RADIUS server needs the security wpa-eap"},
+        {{"mode=g"}, "", "mode cannot be g; it is one of b, bg, bgn, n, a, an"},
+        {{"band=5", "mode=bgn"}, "", "mode bgn is of the band 2.4, not 5"},
+        {{"channel=1e"}, "", "channel is auto or the number"},
+        {{"channel=36"}, "", "there is no channel 36 at 2.4 GHz in this mode; channel is auto or"},
+        {{"channel=14"}, "", "there is no channel 14 at 2.4 GHz in this mode"},
+        {{"band=5", "channel=6"}, "", "there is no channel 6 at 5 GHz; channel is auto, 36 to 64"},
+        {{"band=5", "channel=149"}, "", "channel 149 has no room for 40 MHz at 5 GHz; "},
+        {{"band=5", "width=40"}, "", "channel auto has no room for 40 MHz at 5 GHz; "},
+        {{"width=40", "mode=bg"}, "", "40 MHz need mode bgn, n or an"},
+        {{"width=80"}, "", "width is 20 or 40 (MHz)"},
+        {{"mode=n", "security=wpa2", "cipher=tkip", "passphrase"},
+         "12345678\n",
+         "mode n carries neither WEP nor TKIP alone"},
+    };
+    for (const auto& wrong : kCases) {
+        SCOPED_TRACE(wrong.sentence);
+        const RunResult set = Set(wrong.settings, wrong.input);
+        EXPECT_EQ(set.status, kUsage);
+        EXPECT_THAT(set.err, StartsWith("taviwireless: " + wrong.sentence));
+    }
+    EXPECT_EQ(Parse(AP({"set", "width=80", "--json"}).out)["error"], "width is 20 or 40 (MHz)");
+    EXPECT_FALSE(Exists(kStored));
+}
+
+TEST_F(APCommands, EverySettingThatIsAllowedIsUnderstoodByHostapd) {
+    const std::vector<std::vector<std::string>> kRadios = {{"mode=b", "channel=14"},
+                                                           {"mode=bg", "channel=11"},
+                                                           {"mode=bgn", "channel=13", "width=40"},
+                                                           {"mode=n", "channel=auto", "width=40"},
+                                                           {"mode=a", "channel=165"},
+                                                           {"mode=an", "channel=64", "width=40"},
+                                                           {"mode=an", "channel=149", "width=20"}};
+    const std::vector<std::pair<std::vector<std::string>, std::string>> kSecurities = {
+        {{"security=open"}, ""},
+        {{"security=wpa-mixed", "cipher=both", "passphrase"}, std::string(63, 'p') + "\n"},
+        {{"security=wpa2-eap", "radius-server=10.0.0.9", "radius-port=65535", "radius-secret"},
+         "s\n"}};
+    for (std::vector<std::string> settings : kRadios) {
+        for (const auto& security : kSecurities) {
+            std::vector<std::string> all = settings;
+            all.insert(all.end(), security.first.begin(), security.first.end());
+            SCOPED_TRACE(testing::PrintToString(all));
+            const RunResult set = Set(all, security.second);
+            EXPECT_EQ(set.status, 0) << set.err;
+            const RunResult check = AP({"check"});
+            EXPECT_EQ(check.status, 0) << check.err;
+            EXPECT_THAT(check.out, HasSubstr("hostapd understands all of it.\n"));
+        }
+    }
+}
+
+TEST_F(APCommands, ACheckShowsTheFilesWithoutSecretsAndSwitchesNothing) {
+    interface.Up();
+    ASSERT_EQ(Set({"security=wpa2", "passphrase"}, "the phrase\n").status, 0);
+    const RunResult check = AP({"check"});
+    EXPECT_THAT(check.out, StartsWith("# /etc/hostapd/hostapd-wlan0-host.conf\ninterface=wlan0\n"));
+    EXPECT_THAT(check.out, HasSubstr("\nwpa_passphrase=********\n"));
+    EXPECT_THAT(check.out + check.err, Not(HasSubstr("the phrase")));
+    EXPECT_THAT(AP({"check", "--show-secrets"}).out, HasSubstr("wpa_passphrase=the phrase\n"));
+    const Json::Value document = Parse(AP({"check", "--json"}).out);
+    EXPECT_THAT(document["files"]["/etc/hostapd/hostapd-wlan0-host.conf"].asString(),
+                HasSubstr("\nwpa_passphrase=********\n"));
+    EXPECT_EQ(Shell("ls -A /etc/hostapd"), "");
+    EXPECT_THAT(Shell("ip link show wlan0"), HasSubstr(",UP"));
+}
+
+TEST_F(APCommands, ACheckNamesWhatHostapdRefuses) {
+    ASSERT_EQ(Set({"ssid=Home"}).status, 0);
+    Shell("sed -i 's/max_num_sta=256/max_num_sta=3000/' " + std::string(kStored));
+    const RunResult check = AP({"check"});
+    EXPECT_EQ(check.status, kFailure);
+    EXPECT_THAT(check.err, StartsWith("taviwireless: hostapd would not start: Line "));
+    EXPECT_THAT(check.err, HasSubstr("Invalid max_num_sta=3000; allowed range 0..2007"));
+    EXPECT_THAT(check.err, Not(HasSubstr("taviwireless_only_checks")));
+    EXPECT_THAT(Parse(AP({"check", "--json"}).out)["error"].asString(), HasSubstr("max_num_sta"));
+}
+
+TEST_F(APCommands, ACheckIncludesTheGuestsWhereTheModelHasThem) {
+    const std::string guests = "# /etc/hostapd/hostapd-wlan0-guest.conf\nbss=gwlan\n";
+    ASSERT_EQ(Set({"guest=yes"}).status, 0);
+    EXPECT_THAT(AP({"check"}).out, HasSubstr(guests));
+    EXPECT_EQ(AP({"check"}).status, 0);
+    SetSupport("yes");
+    EXPECT_THAT(AP({"check"}).out, Not(HasSubstr(guests)));
+}
+
+TEST_F(APCommands, ItIsSwitchedOnAndOff) {
+    EXPECT_EQ(AP({"enable"}).out,
+              "wlan0: access point Merilond switched on, open: everybody can join\n");
+    EXPECT_THAT(tools.Commands(), Contains("/etc/rc.network restart wlan0 lbr0"));
+    EXPECT_THAT(ReadFile("/etc/hostapd/hostapd-wlan0-host.conf"), HasSubstr("ssid=Merilond\n"));
+    Shell(
+        "ip link add lbr0 type bridge; ip address add 10.1.14.1/24 dev lbr0; ip link set lbr0 up");
+    const Json::Value on = Parse(AP({"status", "--json"}).out);
+    EXPECT_EQ(on["on"], true);
+    EXPECT_EQ(on["enabled"], true);
+    EXPECT_EQ(on["bridge"], "lbr0");
+    EXPECT_EQ(on["address"], "10.1.14.1");
+    EXPECT_EQ(on["max_stations"], 256);
+    const RunResult off = AP({"disable"});
+    EXPECT_EQ(off.out, "wlan0: access point switched off\n") << off.err;
+    EXPECT_THAT(ReadFile(kStored), HasSubstr("\tenable=no\n"));
+    Shell("ip link delete lbr0");
+}
+
+TEST_F(APCommands, ItIsSwitchedOffWithoutItsAdapterToo) {
+    ASSERT_EQ(AP({"enable"}).status, 0);
+    Shell("rm /tmp/wireless.info");
+    EXPECT_EQ(AP({"disable"}).status, 0);
+    EXPECT_FALSE(Exists("/etc/hostapd/hostapd-wlan0.info"));
+}
+
+TEST_F(APCommands, AFailedStartLeavesItOff) {
+    ASSERT_EQ(Set({"ssid=Home"}).status, 0);
+    const std::string stored = ReadFile(kStored);
+    WriteFile("/tmp/no-network", "");
+    EXPECT_EQ(AP({"enable"}).err,
+              "taviwireless: the access point could not be switched on; the system log tells "
+              "why\n");
+    EXPECT_EQ(ReadFile(kStored), stored);
+}
+
+TEST_F(APCommands, AnInterruptedStartIsInTheWayOnce) {
+    WriteFile(kFlag, "");
+    EXPECT_THAT(AP({"status"}).out, HasSubstr("State             being switched on\n"));
+    EXPECT_EQ(AP({"enable"}).status, kBusy);
+    EXPECT_FALSE(Exists(kStored));
+    EXPECT_EQ(AP({"enable"}).status, 0);
+}
+
+TEST_F(APCommands, WhatIsMissingIsSaidInOneLine) {
+    const auto asNobody = [](const char* command) {
+        return RunProgram({"setpriv", "--reuid=65534", "--clear-groups",
+                           BuiltProgram("taviwireless_with_wifi"), "ap", command});
+    };
+    ASSERT_EQ(Set({"ssid=Home"}).status, 0);
+    for (const char* command : {"show", "check", "enable", "disable"}) {
+        EXPECT_EQ(asNobody(command).err, "taviwireless: Wi-Fi settings need root\n");
+    }
+    const RunResult status = asNobody("status");
+    EXPECT_EQ(status.out, "Interface  wlan0\nState      off\n") << status.err;
+    WriteFile("/tmp/wireless.info", "PRODUCT=stick\nAP_SUPPORT=no\n");
+    EXPECT_THAT(AP({"enable"}).err, StartsWith("taviwireless: there is no adapter that can be an"));
+    Shell("rm /tmp/wireless.info");
+    EXPECT_THAT(AP({"show"}).err, StartsWith("taviwireless: there are no settings without an"));
+    EXPECT_EQ(Parse(AP({"status", "--json"}).out)["supported"], false);
+}
+
+}  // namespace
+}  // namespace taviwireless::test
