@@ -1,10 +1,14 @@
 #include "cli/ap_access.h"
 
+#include <sys/statvfs.h>
 #include <tavicore/section.h>
 #include <tavisdk/network.h>
 #include <unistd.h>
 
 #include <cerrno>
+#include <cstdio>
+#include <cstring>
+#include <memory>
 
 #include "cli/commands.h"
 #include "cli/wifi_access.h"
@@ -53,6 +57,28 @@ void Store(const WirelessAPSettings& settings) {
         throw CommandError(kFailure, std::string("cannot store the settings in ") + kAPSettings +
                                          "; the system log tells why");
     }
+}
+
+bool HasChannels() {
+    const std::string command =
+        std::string("iwlist ") + TAVIWirelessAPInterfaceGet() + " active_channel";
+    const std::unique_ptr<FILE, decltype(&pclose)> lines(popen(command.c_str(), "r"), pclose);
+    return lines && fgetc(lines.get()) != EOF;
+}
+
+// The library says only that it failed; these are what commonly stands behind that.
+std::string CauseOfFailure() {
+    struct statvfs disk {};
+    if (access("/etc", W_OK) != 0) {
+        return std::string("/etc cannot be written: ") + strerror(errno);
+    }
+    if (statvfs("/etc", &disk) == 0 && disk.f_bavail == 0) {
+        return "there is no space left for files in /etc";
+    }
+    if (!HasChannels()) {
+        return "the adapter offers no channel; is its radio switched off? (rfkill list)";
+    }
+    return "the system log tells why, and --verbose shows it";
 }
 
 std::string AddressOf(const char* interface) {
@@ -117,7 +143,7 @@ void SwitchAPOn() {
             Store(settings);
         }
         throw CommandError(kFailure,
-                           "the access point could not be switched on; the system log tells why");
+                           "the access point could not be switched on: " + CauseOfFailure());
     }
 }
 

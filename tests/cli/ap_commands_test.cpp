@@ -232,14 +232,34 @@ TEST_F(APCommands, ItIsSwitchedOffWithoutItsAdapterToo) {
     EXPECT_FALSE(Exists("/etc/hostapd/hostapd-wlan0.info"));
 }
 
-TEST_F(APCommands, AFailedStartLeavesItOff) {
+TEST_F(APCommands, AFailedStartSaysWhyAndLeavesItOff) {
+    const struct {
+        const char* arrange;
+        const char* undo;
+        const char* cause;
+    } kCases[] = {
+        {"touch /tmp/no-network", "rm /tmp/no-network",
+         "the system log tells why, and --verbose shows it"},
+        {"mount --bind /etc /etc; mount -o remount,bind,ro /etc", "umount /etc",
+         "/etc cannot be written: Read-only file system"},
+        {"mount -t tmpfs -o size=4k none /etc; yes > /etc/all 2> /dev/null || true", "umount /etc",
+         "there is no space left for files in /etc"},
+        {"mv /usr/sbin/iwlist /tmp; ln -s /bin/true /usr/sbin/iwlist", "mv /tmp/iwlist /usr/sbin",
+         "the adapter offers no channel; is its radio switched off? (rfkill list)"},
+    };
     ASSERT_EQ(Set({"ssid=Home"}).status, 0);
     const std::string stored = ReadFile(kStored);
-    WriteFile("/tmp/no-network", "");
-    EXPECT_EQ(AP({"enable"}).err,
-              "taviwireless: the access point could not be switched on; the system log tells "
-              "why\n");
-    EXPECT_EQ(ReadFile(kStored), stored);
+    for (const auto& failure : kCases) {
+        Shell(failure.arrange);
+        const RunResult enable = AP({"enable"});
+        Shell(failure.undo);
+        EXPECT_THAT(enable.err, testing::EndsWith("taviwireless: the access point could not be "
+                                                  "switched on: " +
+                                                  std::string(failure.cause) + "\n"));
+        EXPECT_EQ(ReadFile(kStored), stored);
+        EXPECT_EQ(AP({"enable"}).status, 0);
+        EXPECT_EQ(AP({"disable"}).status, 0);
+    }
 }
 
 TEST_F(APCommands, AnInterruptedStartIsInTheWayOnce) {
