@@ -81,6 +81,18 @@ std::string Printable(const std::string& text) {
     return printable;
 }
 
+Json::Value TextOrNull(const std::string& text) {
+    return text.empty() ? Json::Value() : Json::Value(text);
+}
+
+std::string Cell(const std::string& text) {
+    return text.empty() ? "-" : Printable(text);
+}
+
+std::string SecretText(const std::string& secret, bool showSecrets) {
+    return secret.empty() || showSecrets ? secret : "********";
+}
+
 void ShowProgress(const std::string& text) {
     if (isatty(STDERR_FILENO)) {
         std::fprintf(stderr, "\r\033[K%s", text.c_str());

@@ -28,6 +28,13 @@ void PrintFailure(bool json, const std::string& sentence);
 // terminal.
 std::string Printable(const std::string& text);
 
+// What is not known is null in documents and "-" in tables.
+Json::Value TextOrNull(const std::string& text);
+std::string Cell(const std::string& text);
+
+// Stars, unless secrets are to be shown.
+std::string SecretText(const std::string& secret, bool showSecrets);
+
 // Shows on standard error what is being waited for, one line that each call replaces; the empty
 // text removes it. Nothing is shown unless standard error is a terminal.
 void ShowProgress(const std::string& text);

@@ -20,18 +20,8 @@ std::string WithoutBlanks(const std::string& text) {
     return begin == std::string::npos ? "" : text.substr(begin);
 }
 
-Json::Value TextOrNull(const std::string& text) {
-    const std::string known = WithoutBlanks(text);
-    return known.empty() ? Json::Value() : Json::Value(known);
-}
-
 Json::Value AttemptsOrNull(const ModemState& state, int attempts) {
     return HasSIM(state) && attempts >= 0 ? Json::Value(attempts) : Json::Value();
-}
-
-std::string Cell(const std::string& text) {
-    const std::string known = WithoutBlanks(text);
-    return known.empty() ? "-" : Printable(known);
 }
 
 std::string SignalCell(const ModemState& state) {
@@ -85,9 +75,9 @@ Json::Value ToJson(const Profile& profile, bool showSecrets) {
 Json::Value ToJson(const ModemState& state, bool showSecrets) {
     Json::Value document;
     document["id"] = state.id;
-    document["vendor"] = TextOrNull(state.vendor);
-    document["product"] = TextOrNull(state.product);
-    document["carrier"] = TextOrNull(state.carrier);
+    document["vendor"] = TextOrNull(WithoutBlanks(state.vendor));
+    document["product"] = TextOrNull(WithoutBlanks(state.product));
+    document["carrier"] = TextOrNull(WithoutBlanks(state.carrier));
     document["signal"] = state.simStatus == kReady ? Json::Value(state.signal) : Json::Value();
     document["sim_status"] = state.simStatus;
     document["pin_protected"] = HasSIM(state) ? Json::Value(state.pinProtected) : Json::Value();
@@ -116,8 +106,9 @@ std::string ListText(const std::vector<ModemState>& states) {
                  "PIN/PUK LEFT", "NETWORK", "ADDRESS"}};
     for (const ModemState& state : states) {
         table.push_back(
-            {state.id, Cell(state.vendor), Cell(state.product), Cell(state.carrier),
-             SignalCell(state), SIMCell(state.simStatus), ProtectionCell(state),
+            {state.id, Cell(WithoutBlanks(state.vendor)), Cell(WithoutBlanks(state.product)),
+             Cell(WithoutBlanks(state.carrier)), SignalCell(state), SIMCell(state.simStatus),
+             ProtectionCell(state),
              AttemptsCell(state, state.pinRemains) + " / " + AttemptsCell(state, state.pukRemains),
              NetworkCell(state.netStatus), Cell(state.ip)});
     }
@@ -126,9 +117,9 @@ std::string ListText(const std::vector<ModemState>& states) {
 
 Table ShowTable(const ModemState& state, bool showSecrets) {
     Table table{{"Device", state.id},
-                {"Vendor", Cell(state.vendor)},
-                {"Product", Cell(state.product)},
-                {"Operator", Cell(state.carrier)},
+                {"Vendor", Cell(WithoutBlanks(state.vendor))},
+                {"Product", Cell(WithoutBlanks(state.product))},
+                {"Operator", Cell(WithoutBlanks(state.carrier))},
                 {"Signal", SignalCell(state)},
                 {"SIM", SIMCell(state.simStatus)},
                 {"PIN lock", ProtectionCell(state)},

@@ -95,18 +95,6 @@ std::string StatusLine(const WirelessStatus& status, const std::string& address)
 
 }  // namespace
 
-Json::Value TextOrNull(const std::string& text) {
-    return text.empty() ? Json::Value() : Json::Value(text);
-}
-
-std::string Cell(const std::string& text) {
-    return text.empty() ? "-" : Printable(text);
-}
-
-std::string SecretText(const std::string& secret, bool showSecrets) {
-    return secret.empty() || showSecrets ? secret : "********";
-}
-
 std::string BssidText(const unsigned char (&bssid)[6]) {
     const bool isKnown = std::any_of(std::begin(bssid), std::end(bssid), [](int b) { return b; });
     char text[18];

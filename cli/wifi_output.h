@@ -14,10 +14,6 @@ namespace taviwireless::cli {
 
 // What is not known is null in documents and "-" in tables. Keys are hidden unless showSecrets.
 
-Json::Value TextOrNull(const std::string& text);
-std::string Cell(const std::string& text);
-std::string SecretText(const std::string& secret, bool showSecrets);
-
 std::string BssidText(const unsigned char (&bssid)[6]);
 std::string SecurityText(const WirelessNetwork& network);
 
