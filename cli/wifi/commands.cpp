@@ -1,14 +1,15 @@
 // taviwireless wifi: the Wi-Fi adapter.
+#include "cli/commands.h"
+
 #include <json/json.h>
 #include <taviwireless/wireless.h>
 
 #include <CLI/CLI.hpp>
 #include <iostream>
 
-#include "cli/commands.h"
-#include "cli/wifi_access.h"
-#include "cli/wifi_output.h"
-#include "cli/wifi_settings.h"
+#include "cli/wifi/access.h"
+#include "cli/wifi/output.h"
+#include "cli/wifi/settings.h"
 
 namespace taviwireless::cli {
 

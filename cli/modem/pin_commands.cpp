@@ -7,9 +7,9 @@
 
 #include "cli/commands.h"
 #include "cli/deadline.h"
-#include "cli/modem_access.h"
+#include "cli/modem/access.h"
+#include "cli/modem/state_output.h"
 #include "cli/secret.h"
-#include "cli/state_output.h"
 
 namespace taviwireless::cli {
 

@@ -1,4 +1,4 @@
-#include "cli/state_output.h"
+#include "cli/modem/state_output.h"
 
 #include <json/json.h>
 

@@ -4,7 +4,7 @@
 #include <algorithm>
 #include <set>
 
-#include "cli/modem_access.h"
+#include "cli/modem/access.h"
 #include "cli/output.h"
 
 namespace taviwireless::cli {

@@ -3,7 +3,7 @@
 
 #include <json/forwards.h>
 
-#include "cli/ap_access.h"
+#include "cli/ap/access.h"
 #include "cli/output.h"
 
 namespace taviwireless::cli {

@@ -1,17 +1,17 @@
-#include "cli/ap_settings.h"
+#include "cli/ap/settings.h"
 
 #include <arpa/inet.h>
 
 #include <algorithm>
 #include <set>
 
-#include "cli/ap_radio.h"
-#include "cli/ap_words.h"
+#include "cli/ap/radio.h"
+#include "cli/ap/words.h"
 #include "cli/commands.h"
 #include "cli/output.h"
 #include "cli/secret.h"
-#include "cli/wifi_access.h"
-#include "cli/wifi_settings.h"
+#include "cli/wifi/access.h"
+#include "cli/wifi/settings.h"
 
 namespace taviwireless::cli {
 

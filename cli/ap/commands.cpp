@@ -1,14 +1,15 @@
 // taviwireless ap: the Wi-Fi adapter as an access point.
+#include "cli/commands.h"
+
 #include <json/json.h>
 
 #include <CLI/CLI.hpp>
 
-#include "cli/ap_access.h"
-#include "cli/ap_output.h"
-#include "cli/ap_settings.h"
-#include "cli/ap_words.h"
-#include "cli/commands.h"
-#include "cli/wifi_access.h"
+#include "cli/ap/access.h"
+#include "cli/ap/output.h"
+#include "cli/ap/settings.h"
+#include "cli/ap/words.h"
+#include "cli/wifi/access.h"
 
 namespace taviwireless::cli {
 

@@ -1,8 +1,8 @@
-#include "cli/ap_radio.h"
+#include "cli/ap/radio.h"
 
 #include <algorithm>
 
-#include "cli/ap_words.h"
+#include "cli/ap/words.h"
 #include "cli/commands.h"
 
 namespace taviwireless::cli {

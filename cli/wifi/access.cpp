@@ -1,4 +1,4 @@
-#include "cli/wifi_access.h"
+#include "cli/wifi/access.h"
 
 #include <tavisdk/network.h>
 #include <tavisdk/wireless.h>

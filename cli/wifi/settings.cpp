@@ -1,4 +1,4 @@
-#include "cli/wifi_settings.h"
+#include "cli/wifi/settings.h"
 
 #include <arpa/inet.h>
 
@@ -8,7 +8,7 @@
 #include "cli/commands.h"
 #include "cli/output.h"
 #include "cli/secret.h"
-#include "cli/wifi_access.h"
+#include "cli/wifi/access.h"
 
 namespace taviwireless::cli {
 

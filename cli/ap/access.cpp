@@ -1,4 +1,4 @@
-#include "cli/ap_access.h"
+#include "cli/ap/access.h"
 
 #include <sys/statvfs.h>
 #include <tavicore/section.h>
@@ -11,7 +11,7 @@
 #include <memory>
 
 #include "cli/commands.h"
-#include "cli/wifi_access.h"
+#include "cli/wifi/access.h"
 #include "wireless/ap_settings.h"
 #include "wireless/paths.h"
 

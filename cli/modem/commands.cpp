@@ -1,13 +1,14 @@
 // taviwireless modem: the USB modems that are plugged in.
+#include "cli/commands.h"
+
 #include <json/json.h>
 
 #include <CLI/CLI.hpp>
 #include <iostream>
 
-#include "cli/commands.h"
 #include "cli/deadline.h"
-#include "cli/modem_access.h"
-#include "cli/state_output.h"
+#include "cli/modem/access.h"
+#include "cli/modem/state_output.h"
 
 namespace taviwireless::cli {
 

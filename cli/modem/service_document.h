@@ -1,9 +1,9 @@
-#ifndef TAVIWIRELESS_CLI_SERVICE_DOCUMENT_H
-#define TAVIWIRELESS_CLI_SERVICE_DOCUMENT_H
+#ifndef TAVIWIRELESS_CLI_MODEM_SERVICE_DOCUMENT_H
+#define TAVIWIRELESS_CLI_MODEM_SERVICE_DOCUMENT_H
 
 #include <string>
 
-#include "cli/modem_access.h"
+#include "cli/modem/access.h"
 
 namespace taviwireless::cli {
 

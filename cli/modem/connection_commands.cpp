@@ -9,7 +9,7 @@
 
 #include "cli/commands.h"
 #include "cli/deadline.h"
-#include "cli/modem_access.h"
+#include "cli/modem/access.h"
 #include "cli/output.h"
 
 namespace taviwireless::cli {

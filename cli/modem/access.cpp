@@ -1,4 +1,4 @@
-#include "cli/modem_access.h"
+#include "cli/modem/access.h"
 
 #include <taviwireless/usbmodem_list.h>
 

@@ -1,11 +1,11 @@
-#include "cli/ap_output.h"
+#include "cli/ap/output.h"
 
 #include <json/json.h>
 
-#include "cli/ap_radio.h"
-#include "cli/ap_words.h"
-#include "cli/wifi_access.h"
-#include "cli/wifi_output.h"
+#include "cli/ap/radio.h"
+#include "cli/ap/words.h"
+#include "cli/wifi/access.h"
+#include "cli/wifi/output.h"
 
 namespace taviwireless::cli {
 

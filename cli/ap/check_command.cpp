@@ -10,11 +10,11 @@
 #include <memory>
 #include <sstream>
 
-#include "cli/ap_access.h"
-#include "cli/ap_settings.h"
+#include "cli/ap/access.h"
+#include "cli/ap/settings.h"
 #include "cli/commands.h"
 #include "cli/output.h"
-#include "cli/wifi_access.h"
+#include "cli/wifi/access.h"
 #include "wireless/ap_files.h"
 #include "wireless/hostapd_conf.h"
 

@@ -6,9 +6,9 @@
 #include <optional>
 
 #include "cli/commands.h"
-#include "cli/wifi_access.h"
-#include "cli/wifi_output.h"
-#include "cli/wifi_settings.h"
+#include "cli/wifi/access.h"
+#include "cli/wifi/output.h"
+#include "cli/wifi/settings.h"
 
 namespace taviwireless::cli {
 

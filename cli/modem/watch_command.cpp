@@ -10,8 +10,8 @@
 
 #include "cli/commands.h"
 #include "cli/deadline.h"
-#include "cli/modem_access.h"
-#include "cli/state_output.h"
+#include "cli/modem/access.h"
+#include "cli/modem/state_output.h"
 
 namespace taviwireless::cli {
 

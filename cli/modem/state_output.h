@@ -1,11 +1,11 @@
-#ifndef TAVIWIRELESS_CLI_STATE_OUTPUT_H
-#define TAVIWIRELESS_CLI_STATE_OUTPUT_H
+#ifndef TAVIWIRELESS_CLI_MODEM_STATE_OUTPUT_H
+#define TAVIWIRELESS_CLI_MODEM_STATE_OUTPUT_H
 
 #include <json/forwards.h>
 
 #include <vector>
 
-#include "cli/modem_access.h"
+#include "cli/modem/access.h"
 #include "cli/output.h"
 
 namespace taviwireless::cli {

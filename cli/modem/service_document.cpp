@@ -1,4 +1,4 @@
-#include "cli/service_document.h"
+#include "cli/modem/service_document.h"
 
 #include <cstdlib>
 #include <sstream>

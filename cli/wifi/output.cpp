@@ -1,12 +1,12 @@
-#include "cli/wifi_output.h"
+#include "cli/wifi/output.h"
 
 #include <json/json.h>
 
 #include <algorithm>
 #include <ctime>
 
-#include "cli/wifi_access.h"
-#include "cli/wifi_settings.h"
+#include "cli/wifi/access.h"
+#include "cli/wifi/settings.h"
 
 namespace taviwireless::cli {
 

@@ -7,8 +7,8 @@
 #include <iostream>
 
 #include "cli/commands.h"
-#include "cli/wifi_access.h"
-#include "cli/wifi_output.h"
+#include "cli/wifi/access.h"
+#include "cli/wifi/output.h"
 
 namespace taviwireless::cli {
 

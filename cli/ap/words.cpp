@@ -1,4 +1,4 @@
-#include "cli/ap_words.h"
+#include "cli/ap/words.h"
 
 #include "cli/commands.h"
 #include "cli/output.h"

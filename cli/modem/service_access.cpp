@@ -4,9 +4,9 @@
 
 #include <algorithm>
 
-#include "cli/modem_access.h"
+#include "cli/modem/access.h"
+#include "cli/modem/service_document.h"
 #include "cli/output.h"
-#include "cli/service_document.h"
 
 namespace taviwireless::cli {
 
