@@ -58,7 +58,7 @@ TEST(DhcpServer, SettingsInForceWinOverThosePutAside) {
 
 TEST(DhcpServer, BadSettingsOfOneBridgeDoNotKeepAnotherFromService) {
     WriteFile("/etc/dhcpd/dhcpd-abr0-abr0.info", "interface=abr0\nbridge=abr0\nstart=$(reboot)\n");
-    EXPECT_EQ(TAVINetSetDhcpServerConfigFiles(&kServer, 1), 0);
+    EXPECT_EQ(TAVINetSetDhcpServerConfigFiles(&kServer, 1), 1);
     EXPECT_TRUE(Exists(kConf));
     EXPECT_FALSE(Exists("/etc/dhcpd/dhcpd-abr0-abr0.conf"));
 }

@@ -71,8 +71,7 @@ TAVI_SDK_API int TAVINetGetDhcpServerConf(const char* interface, const char* bri
 /*
  * Writes that file, and the configuration of the DHCP server for all bridges that have one, put
  * aside or not. With save 0 the server's configuration alone is written, from the files as they
- * are. Returns 1, or 0 on failure, also when the files of one bridge are no settings; those of the
- * others are written nevertheless.
+ * are. Files that are no settings are passed over. Returns 1, or 0 on failure.
  *
  * The host edition's server is udhcpd, with "/etc/dhcpd/dhcpd-INTERFACE-BRIDGE.conf". The network
  * script runs it while the ".info" file says enable=yes.

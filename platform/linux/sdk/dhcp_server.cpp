@@ -121,34 +121,35 @@ std::string Configuration(const TAVINetDhcpServer& server) {
     return text;
 }
 
+// A file that is no settings, or half of one, is passed over: it must not keep another bridge's
+// access point from being switched on or off.
 void WriteConfiguration(const std::string& settings) {
     const TAVINetDhcpServer server = ReadServer(settings);
-    Check(server);
-    ReplaceFile(PathOf(server.interface, server.bridge, ".conf").c_str(), Configuration(server));
+    if (Guarded(-1, [&server] {
+            Check(server);
+            return 0;
+        }) == 0) {
+        ReplaceFile(PathOf(server.interface, server.bridge, ".conf").c_str(),
+                    Configuration(server));
+    }
 }
 
-// One bad file does not keep the others from being written. Returns false when there was one.
-bool WriteConfigurations() {
+void WriteConfigurations() {
     VEXACSzList* list = VEXACSzListAlloc(1024);
     if (list == nullptr) {
         throw Failure{VEXAC_ERR_OUT_OF_MEMORY};
     }
     VEXACFileEnumDir(kFolder, kFilePrefix, &list, VEXAC_ENUM_FILES);  // no folder, no names
     const std::unique_ptr<VEXACSzList, decltype(&VEXACSzListFree)> names(list, VEXACSzListFree);
-    int result = 1;
     // Settings in use come last, and so win over those put aside of the same bridge.
     for (const char* suffix : {kSuffixes[1], kSuffixes[0]}) {
         for (int i = 0; i < names->count; ++i) {
             const std::string name = VEXACSzListGet(list, i);
             if (EndsWith(name, suffix)) {
-                result &= Guarded(0, [&] {
-                    WriteConfiguration(std::string(kFolder) + '/' + name);
-                    return 1;
-                });
+                WriteConfiguration(std::string(kFolder) + '/' + name);
             }
         }
     }
-    return result != 0;
 }
 
 }  // namespace
@@ -179,7 +180,8 @@ int TAVINetSetDhcpServerConfigFiles(const TAVINetDhcpServer* server, int save) {
             ReplaceFile(PathOf(server->interface, server->bridge, kSuffixes[0]).c_str(),
                         Settings(*server));
         }
-        return WriteConfigurations() ? 1 : 0;
+        WriteConfigurations();
+        return 1;
     });
 }
 
