@@ -13,22 +13,40 @@ using testing::StartsWith;
 
 // A bus, modems and the service, which is ready with them.
 struct Situation {
-    explicit Situation(const std::string& modem, const std::string& another = "")
-        : simulator(another.empty() ? Arguments{"--modem", modem}
-                                    : Arguments{"--modem", modem, "--modem", another}) {
-        const auto ids =
-            another.empty() ? Arguments{"usbmodem0"} : Arguments{"usbmodem0", "usbmodem7"};
+    explicit Situation(const std::string& modem) : Situation({"--modem", modem}, {"usbmodem0"}) {}
+    Situation(const std::vector<std::string>& modems, const std::vector<std::string>& ids)
+        : simulator(modems) {
         EXPECT_TRUE(service.Lists(ids));
     }
 
-    using Arguments = std::vector<std::string>;
     PrivateBus bus;
     ModemSimulator simulator;
     ModemService service;
 };
 
+struct Step {
+    std::string command;  // its words, with a blank between them
+    const char* input;
+    int status;
+    std::string text;  // in what is printed
+};
+
+void Take(const std::vector<Step>& steps) {
+    for (const Step& step : steps) {
+        SCOPED_TRACE(step.command + ": " + step.text);
+        std::istringstream words(step.command);
+        const std::istream_iterator<std::string> first(words);
+        const RunResult result = Modem({first, {}}, step.input);
+        EXPECT_EQ(result.status, step.status);
+        EXPECT_THAT(result.err, StartsWith(step.status == 0 ? "" : "taviwireless: "));
+        EXPECT_THAT(result.out + result.err, HasSubstr(step.text));
+    }
+}
+
 TEST(ServiceCommands, ListShowsWhatEveryModemSays) {
-    Situation situation("12d1,operator=Nordnetz,signal=31", "2001,id=7,pin=1234");
+    Situation situation(
+        {"--modem", "12d1,operator=Nordnetz,signal=31", "--modem", "2001,id=7,pin=1234"},
+        {"usbmodem0", "usbmodem7"});
     WriteFile("/tmp/usbmodem.info9", "");  // a modem that the service cannot use
     const RunResult result = Modem({"list"});
     EXPECT_EQ(result.status, 0);
@@ -45,131 +63,89 @@ TEST(ServiceCommands, ListShowsWhatEveryModemSays) {
         "-             -\n");
 }
 
-TEST(ServiceCommands, ShowAddsTheProfileWithoutItsPassword) {
-    Situation situation("generic,operator=Nordnetz,apn=web.nord");
-    const Json::Value modem = Parse(Modem({"show", "usbmodem0", "--json"}).out);
-    EXPECT_EQ(modem["pin_protected"], false);
-    EXPECT_EQ(modem["profile"]["isp"], "Nordnetz - web.nord");
-    EXPECT_EQ(modem["profile"]["pass"], "********");
-    EXPECT_EQ(modem["profile"]["default_gw"], false);
-    EXPECT_THAT(Modem({"show", "usbmodem0", "--show-secrets"}).out,
-                HasSubstr("Profile: Password       Unknown\n"));
-}
-
 TEST(ServiceCommands, FailuresAreOneSentenceAndAnExitStatus) {
     Situation situation("generic");
     WriteFile("/tmp/usbmodem.info9", "");
-    const struct {
-        std::vector<std::string> arguments;
-        int status;
-        const char* sentence;
-    } kCases[] = {
-        {{"show", "usbmodem1"}, kNotFound, "there is no modem usbmodem1; "},
-        {{"unlock", "\xff"}, kNotFound, "there is no modem \xff; "},
-        {{"profile", "set", "usbmodem1", "apn=x"}, kNotFound, "there is no modem usbmodem1; "},
-        {{"connect", "usbmodem9"}, kFailure, "modem usbmodem9 is not ready: "},
-        {{"profile", "reset", "usbmodem0"}, kUsage, "the modem service cannot reset a profile; "},
-        {{"puk", "usbmodem0"}, kFailure, "the SIM of usbmodem0 does not want its PUK"},
-        {{"disconnect", "usbmodem0"}, kFailure, "usbmodem0 is not connected"},
-        {{"show", "usbmodem0", "--timeout", "1"}, kFailure, "not done within 1 s; "},
-    };
-    for (const auto& failing : kCases) {
-        const RunResult result = Modem(failing.arguments);
-        EXPECT_EQ(result.status, failing.status) << failing.sentence;
-        EXPECT_THAT(result.err, StartsWith(std::string("taviwireless: ") + failing.sentence));
-    }
+    Take({
+        {"show usbmodem1", "", kNotFound, "taviwireless: there is no modem usbmodem1; "},
+        {"unlock \xff", "", kNotFound, "taviwireless: there is no modem \xff; "},
+        {"profile set usbmodem1 apn=x", "", kNotFound, "there is no modem usbmodem1; "},
+        {"connect usbmodem9", "", kFailure, "modem usbmodem9 is not ready: "},
+        {"profile reset usbmodem0", "", kUsage, "the modem service cannot reset a profile; "},
+        {"puk usbmodem0", "", kFailure, "the SIM of usbmodem0 does not want its PUK"},
+        {"disconnect usbmodem0", "", kFailure, "usbmodem0 is not connected"},
+        {"show usbmodem0 --timeout 1", "", kFailure, "not done within 1 s; "},
+    });
 }
 
 TEST(ServiceCommands, WithoutTheServiceTheyNameWhatStartsIt) {
     PrivateBus bus;
     ModemSimulator simulator({"--modem", "generic"});
-    const std::vector<std::vector<std::string>> kCommands = {
-        {"list"}, {"watch"}, {"unlock", "usbmodem0"}, {"profile", "set", "usbmodem0", "apn=x"}};
-    for (const auto& command : kCommands) {
-        const RunResult result = Modem(command);
-        EXPECT_EQ(result.status, kNoService);
-        EXPECT_THAT(result.err, StartsWith("taviwireless: the modem service is not running; "
-                                           "usbmodemd starts it"));
-    }
+    const std::string line = "taviwireless: the modem service is not running; usbmodemd starts it";
+    Take({
+        {"list", "", kNoService, line},
+        {"watch", "", kNoService, line},
+        {"unlock usbmodem0", "", kNoService, line},
+        {"profile set usbmodem0 apn=x", "", kNoService, line},
+    });
 }
 
-struct Step {
-    std::vector<std::string> arguments;
-    const char* input;
-    int status;
-    const char* text;  // in what is printed
-};
-
-void Take(const std::vector<Step>& steps) {
-    for (const Step& step : steps) {
-        SCOPED_TRACE(step.text);
-        const RunResult result = Modem(step.arguments, step.input);
-        EXPECT_EQ(result.status, step.status);
-        EXPECT_THAT(result.out + result.err, HasSubstr(step.text));
-    }
-}
-
-TEST(ServiceCommands, OnlyAWellFormedPINIsTried) {
+TEST(ServiceCommands, OnlyAWellFormedPINIsTriedAndNothingElseBeforeItIsRight) {
     Situation situation("generic,pin=1234");
     Take({
-        {{"unlock", "usbmodem0"}, "", kFailure, "standard input ended before there was a line"},
-        {{"unlock", "usbmodem0"}, "12a4\n", kUsage, "a PIN has 4 to 8 digits; nothing was sent"},
-        {{"unlock", "usbmodem0"}, "1111\n", kFailure, "refused the PIN; 2 attempts are left\n"},
-        {{"connect", "usbmodem0"}, "", kFailure, "the SIM of usbmodem0 is not ready; "},
-        {{"pin", "protect", "usbmodem0"}, "1234\n", kFailure, "wants its PIN; taviwireless modem"},
-        {{"unlock", "usbmodem0"}, "1234\n", 0, "usbmodem0: the SIM is ready\n"},
-        {{"unlock", "usbmodem0"}, "", 0, "usbmodem0: the SIM is ready already; "},
+        {"unlock usbmodem0", "", kFailure, "standard input ended before there was a line"},
+        {"unlock usbmodem0", "12a4\n", kUsage, "a PIN has 4 to 8 digits; nothing was sent"},
+        {"unlock usbmodem0", "1111\n", kFailure, "refused the PIN; 2 attempts are left\n"},
+        {"connect usbmodem0", "", kFailure, "the SIM of usbmodem0 is not ready; "},
+        {"profile set usbmodem0 apn=x", "", kFailure, "the modem service did not set"},
+        {"profile show usbmodem0", "", kFailure, "cannot read the profile of usbmodem0; "},
+        {"pin protect usbmodem0", "1234\n", kFailure, "wants its PIN; taviwireless modem"},
+        {"unlock usbmodem0", "1234\n", 0, "usbmodem0: the SIM is ready\n"},
+        {"unlock usbmodem0", "", 0, "usbmodem0: the SIM is ready already; "},
     });
 }
 
 TEST(ServiceCommands, TheLastAttemptIsKeptUnlessForced) {
     Situation situation("generic,pin=1234,attempts=1,puk=87654321");
     Take({
-        {{"unlock", "usbmodem0"},
-         "1111\n",
-         kFailure,
+        {"unlock usbmodem0", "1111\n", kFailure,
          "allows one more PIN, and after a wrong one it wants its PUK; add --force to use it\n"},
-        {{"unlock", "--force", "usbmodem0"},
-         "1111\n",
-         kFailure,
+        {"unlock --force usbmodem0", "1111\n", kFailure,
          "0 attempts are left, and the SIM wants its PUK: taviwireless modem puk usbmodem0\n"},
-        {{"puk", "usbmodem0"}, "1234\n", kUsage, "a PUK has 8 digits; nothing was sent"},
-        {{"puk", "usbmodem0"}, "11111111\n4321\n", kFailure, "refused the PUK; 9 attempts are "},
-        {{"puk", "usbmodem0"}, "87654321\n4321\n", 0, "usbmodem0: the SIM is ready\n"},
+        {"puk usbmodem0", "1234\n", kUsage, "a PUK has 8 digits; nothing was sent"},
+        {"puk usbmodem0", "11111111\n4321\n", kFailure, "refused the PUK; 9 attempts are "},
+        {"puk usbmodem0", "87654321\n4321\n", 0, "usbmodem0: the SIM is ready\n"},
     });
 }
 
 TEST(ServiceCommands, TheProtectionIsSwitchedAndThePINChanged) {
     Situation situation("generic,pin=1234,lock=off");
     Take({
-        {{"pin", "set", "usbmodem0"}, "", kFailure, "taviwireless modem pin protect usbmodem0"},
-        {{"pin", "protect", "usbmodem0"}, "1234\n", 0, "is protected by its PIN from now on\n"},
-        {{"pin", "protect", "usbmodem0"}, "", 0, "the SIM is protected by its PIN already\n"},
-        {{"pin", "set", "usbmodem0"}, "1234\n4321\n", 0, "usbmodem0: the PIN is changed\n"},
-        {{"pin", "unprotect", "usbmodem0", "--json"}, "4321\n", 0, "\"pin_protected\": false"},
+        {"pin set usbmodem0", "", kFailure, "taviwireless modem pin protect usbmodem0"},
+        {"pin protect usbmodem0", "1234\n", 0, "is protected by its PIN from now on\n"},
+        {"pin protect usbmodem0", "", 0, "the SIM is protected by its PIN already\n"},
+        {"pin set usbmodem0", "1234\n4321\n", 0, "usbmodem0: the PIN is changed\n"},
+        {"pin unprotect usbmodem0 --json", "4321\n", 0, "\"pin_protected\": false"},
     });
 }
 
-TEST(ServiceCommands, SetAndShowAProfile) {
-    Situation situation("generic");
+TEST(ServiceCommands, AProfileIsSetAndShownWithoutItsPassword) {
+    Situation situation("generic,operator=Nordnetz,apn=web.nord");
+    const Json::Value modem = Parse(Modem({"show", "usbmodem0", "--json"}).out);
+    EXPECT_EQ(modem["pin_protected"], false);
+    EXPECT_EQ(modem["profile"]["isp"], "Nordnetz - web.nord");
+    EXPECT_EQ(modem["profile"]["pass"], "********");
+    EXPECT_EQ(modem["profile"]["default_gw"], false);
     EXPECT_EQ(
         Modem({"profile", "set", "usbmodem0", "user=a \"b\\", "isp=a=b", "pass"}, "s3cret  =\n")
             .status,
         0);
-    EXPECT_THAT(Modem({"profile", "show", "usbmodem0"}).out,
-                HasSubstr("User           a \"b\\\nPassword       ********\n"));
-    const Json::Value shown =
-        Parse(Modem({"--json", "profile", "show", "usbmodem0", "--show-secrets"}).out);
-    EXPECT_EQ(shown["pass"], "s3cret  =");
-    EXPECT_EQ(shown["isp"], "a=b");
-}
-
-TEST(ServiceCommands, AProfileThatWasNotSetIsAFailure) {
-    Situation situation("generic,pin=1234");
-    EXPECT_THAT(Modem({"profile", "set", "usbmodem0", "apn=x"}).err,
-                HasSubstr("the modem service did not set the profile of usbmodem0"));
-    EXPECT_THAT(Modem({"profile", "show", "usbmodem0"}).err,
-                HasSubstr("cannot read the profile of usbmodem0; is the SIM ready"));
+    Take({
+        {"profile show usbmodem0", "", 0, "User           a \"b\\\nPassword       ********\n"},
+        {"show usbmodem0 --show-secrets", "", 0, "Profile: Password       s3cret  =\n"},
+        {"--json profile show usbmodem0", "", 0, "\"isp\": \"a=b\""},
+        {"--json profile show usbmodem0 --show-secrets", "", 0, "\"s3cret  =\""},
+    });
 }
 
 TEST(ServiceCommands, ConnectShowTheStateAndHangUp) {
@@ -187,12 +163,13 @@ TEST(ServiceCommands, ConnectShowTheStateAndHangUp) {
 TEST(ServiceCommands, ADiallerThatGivesUpOrTakesTooLongIsAFailure) {
     WriteFile("/etc/ppp/peers/wvdial", "noauth\n");  // there is no dialler
     Situation situation("generic");
-    EXPECT_THAT(Modem({"connect", "usbmodem0"}).err,
-                HasSubstr("the dialler of usbmodem0 gave up, or could not be started"));
+    Take({{"connect usbmodem0", "", kFailure, "gave up, or could not be started"}});
     InstallDialler("");
-    EXPECT_THAT(Modem({"connect", "usbmodem0", "--timeout", "5"}).err,
-                HasSubstr("usbmodem0 is not connected after 5 s; it goes on trying"));
-    EXPECT_EQ(Modem({"unlock", "usbmodem0"}).status, kBusy);
+    Take({
+        {"connect usbmodem0 --timeout 5", "", kFailure,
+         "usbmodem0 is not connected after 5 s; it goes on"},
+        {"unlock usbmodem0", "", kBusy, ""},
+    });
 }
 
 TEST(ServiceCommands, WatchPrintsADocumentAtEachChangeUntilItIsEnded) {

@@ -4,6 +4,7 @@
 #include <tavicore/keyvalue.h>
 #include <tavisdk/bridge.h>
 
+#include "common/sz_list.h"
 #include "tests/platform/veth.h"
 #include "tests/support/descriptors.h"
 #include "tests/support/files.h"
@@ -11,20 +12,16 @@
 namespace taviwireless::test {
 namespace {
 
-constexpr char kFile[] = "/etc/sysconfig/network-scripts/ifcfg-lbr0";
-
-std::string InterfaceFile(const std::string& name) {
-    return "/etc/sysconfig/network-scripts/ifcfg-" + name;
-}
+const std::string kInterfaceFile = "/etc/sysconfig/network-scripts/ifcfg-";  // and its name
+const std::string kFile = kInterfaceFile + "lbr0";
 
 // "COUNT NAME NAME"
 std::string Members(const char* bridge) {
-    VEXACSzList* list = VEXACSzListAlloc(0);
-    std::string text = std::to_string(VEXANetBridgeSlaveEnum(bridge, &list));
-    for (int i = 0; i < list->count; ++i) {
-        text += std::string(" ") + VEXACSzListGet(list, i);
+    SzList list(0);
+    std::string text = std::to_string(VEXANetBridgeSlaveEnum(bridge, list.Address()));
+    for (int i = 0; i < list.Count(); ++i) {
+        text += std::string(" ") + list[i];
     }
-    VEXACSzListFree(list);
     return text;
 }
 
@@ -55,15 +52,13 @@ TEST(BridgeConfig, IsReadAsItWasWritten) {
     EXPECT_EQ(TAVINetSetBridgeConfig(&wired, &card), 0);
     EXPECT_EQ(Config("br0"), "2 eth0 0  ");
     // Another first member does not make it another kind of bridge.
-    EXPECT_EQ(VEXACFileSetKeyValue(kFile, "PRIMARY", "eth1", "%s=%s\n"), 1);
+    EXPECT_EQ(VEXACFileSetKeyValue(kFile.c_str(), "PRIMARY", "eth1", "%s=%s\n"), 1);
     EXPECT_EQ(Config("lbr0"), "3 eth1 1 10.1.14.1 255.255.255.0");
 }
 
 TEST(BridgeConfig, OfAnotherHandIsJudgedByItsFirstMember) {
     const struct {
-        const char* file;
-        const char* memberOf;  // of which wlan0 is, by its file
-        const char* config;
+        const char *file, *bridgeOfRadio, *config;
     } kRows[] = {
         {"PRIMARY=wlan0\nIPADDR=\"10.1.14.1\"\n", "", "3 wlan0 1 10.1.14.1 "},
         {"PRIMARY=eth0\n", "", "2 eth0 0  "},
@@ -75,16 +70,13 @@ TEST(BridgeConfig, OfAnotherHandIsJudgedByItsFirstMember) {
     };
     for (const auto& row : kRows) {
         WriteFile(kFile, row.file);
-        WriteFile(InterfaceFile("wlan0"), std::string("BRIDGE=") + row.memberOf + "\n");
+        WriteFile(kInterfaceFile + "wlan0", std::string("BRIDGE=") + row.bridgeOfRadio + "\n");
         EXPECT_EQ(Config("lbr0"), row.config) << row.file;
     }
 }
 
 TEST(BridgeConfig, ThatIsWrongIsNotWritten) {
-    const struct {
-        TAVINetBridge config;
-        TAVINetBridgeMember member;
-    } kRows[] = {
+    const std::pair<TAVINetBridge, TAVINetBridgeMember> kRows[] = {
         {{1, "../lbr0", "10.1.14.1", "255.255.255.0"}, {TAVI_NET_MEMBER_WIRELESS, "wlan0"}},
         {{1, "lbr0", "10.1.14.1\n", "255.255.255.0"}, {TAVI_NET_MEMBER_WIRELESS, "wlan0"}},
         {{1, "lbr0", "10.1.14.1", ""}, {TAVI_NET_MEMBER_WIRELESS, "wlan0"}},
@@ -92,8 +84,8 @@ TEST(BridgeConfig, ThatIsWrongIsNotWritten) {
         {{1, "lbr0", "10.1.14.1", "255.255.255.0"}, {TAVI_NET_MEMBER_WIRED, "eth0"}},
         {{0, "lbr0", "", ""}, {TAVI_NET_MEMBER_WIRED, ""}},
     };
-    for (const auto& row : kRows) {
-        EXPECT_EQ(TAVINetSetBridgeConfig(&row.config, &row.member), -1);
+    for (const auto& [config, member] : kRows) {
+        EXPECT_EQ(TAVINetSetBridgeConfig(&config, &member), -1);
         EXPECT_EQ(VEXACErrGet(), VEXAC_ERR_BAD_PARAMETER);
     }
     EXPECT_EQ(TAVINetSetBridgeConfig(nullptr, nullptr), -1);
@@ -102,9 +94,9 @@ TEST(BridgeConfig, ThatIsWrongIsNotWritten) {
 
 TEST(BridgeMembers, AreSavedOnesUntilThereIsABridge) {
     EXPECT_EQ(Members("lbr0"), "-1");  // nothing is saved at all
-    WriteFile(InterfaceFile("eth7"), "BRIDGE=lbr0\n");
-    WriteFile(InterfaceFile("wlan0"), "BRIDGE=\"lbr0\"\n");
-    WriteFile(InterfaceFile("eth8"), "BRIDGE=lbr00\n");
+    WriteFile(kInterfaceFile + "eth7", "BRIDGE=lbr0\n");
+    WriteFile(kInterfaceFile + "wlan0", "BRIDGE=\"lbr0\"\n");
+    WriteFile(kInterfaceFile + "eth8", "BRIDGE=lbr00\n");
     EXPECT_EQ(Members("lbr0"), "2 eth7 wlan0");
     EXPECT_EQ(Members("br0"), "0");
     Ip("link add lbr0 type bridge");

@@ -27,7 +27,7 @@ struct Hotplug : testing::Test {
         umount("/sys/class/net");
     }
 
-    static RunResult Plug() { return RunProgram({"/usr/tavi/hotplug/usb.plug"}); }
+    static void Plug() { Shell("/usr/tavi/hotplug/usb.plug"); }
 
     // A serial port at /tmp/usb/DEVICE, interface 1.N of it.
     static void AddPort(int number, const std::string& device, const std::string& vendor,
@@ -52,7 +52,7 @@ TEST_F(Hotplug, ModemHasItsInfoFileWhileItIsPluggedIn) {
     AddPort(11, "1-1", "12d1", "option", 2);
     AddPort(2, "1-2", "0403", "ftdi_sio", 2);  // a cable
     AddPort(3, "1-3", "1199", "sierra", 2);
-    ASSERT_EQ(Plug().status, 0);
+    Plug();
     EXPECT_EQ(ReadFile("/tmp/usbmodem.info0"),
               "USB_ID_VENDOR=12d1\nCONNECTNODE=10\nDEVICENODE=9,10,11\nUSB_DEVICE=/tmp/usb/1-1\n");
     EXPECT_EQ(FileMode("/tmp/usbmodem.info0"), 0644);
@@ -64,21 +64,19 @@ TEST_F(Hotplug, ModemHasItsInfoFileWhileItIsPluggedIn) {
     WriteFile("/tmp/usbmodem.info7", "CONNECTNODE=77\n");
     const auto written = fs::last_write_time("/tmp/usbmodem.info1");
     Shell("rm -r /sys/class/tty/ttyUSB9 /sys/class/tty/ttyUSB1?");
-    ASSERT_EQ(Plug().status, 0);
+    Plug();
     EXPECT_FALSE(Exists("/tmp/usbmodem.info0"));
     EXPECT_EQ(fs::last_write_time("/tmp/usbmodem.info1"), written);
     EXPECT_TRUE(Exists("/tmp/usbmodem.info7"));
     Shell("rm -r /sys/class/tty/ttyUSB*");
-    ASSERT_EQ(Plug().status, 0);
+    Plug();
     EXPECT_FALSE(Exists("/tmp/usbmodem.info1"));
     EXPECT_EQ(Shell("ls -A /tmp | grep usb.plug || true"), "");
 }
 
 TEST_F(Hotplug, AdapterIsDescribedWhileItIsPluggedIn) {
     const struct {
-        const char* uevent;
-        const char* modes;
-        const char* info;
+        const char *uevent, *modes, *info;
     } kRows[] = {
         {"DEVTYPE=usb_interface\nPRODUCT=148f/5370/101\n", "\t\t * managed\n\t\t * AP\n",
          "PRODUCT=148f/5370/101\nAP_SUPPORT=yes\n"},
@@ -92,11 +90,11 @@ TEST_F(Hotplug, AdapterIsDescribedWhileItIsPluggedIn) {
     for (const auto& row : kRows) {
         WriteFile("/sys/class/net/wlan0/device/uevent", row.uevent);
         WriteFile("/tmp/modes", row.modes);
-        ASSERT_EQ(Plug().status, 0);
+        Plug();
         EXPECT_EQ(ReadFile("/tmp/wireless.info"), row.info);
     }
     Shell("rm -r /sys/class/net/wlan0");
-    ASSERT_EQ(Plug().status, 0);
+    Plug();
     EXPECT_FALSE(Exists("/tmp/wireless.info"));
 }
 
@@ -105,17 +103,15 @@ TEST(WirelessFunction, FreesTheAdapter) {
     const std::string script = "/usr/tavi/hotplug/usb.wireless.function";
     EXPECT_EQ(RunProgram({script, "change-mode", "ap"}).status, 1);  // there is none
     WirelessInterface adapter;
-    Ip("link add lbr0 type bridge");
-    Ip("link set wlan0 master lbr0");
+    Shell("ip link add lbr0 type bridge; ip link set wlan0 master lbr0");
     Shell("cp -L /bin/sleep /tmp/hostapd");
     Process accessPoint({"/tmp/hostapd", "60"});
     WriteFile("/var/run/hostapd-wlan0.pid", std::to_string(accessPoint.Pid()));
     for (const char* mode : {"ap", "client"}) {
         adapter.Up();
         Shell("ip address replace 10.7.0.2/24 dev wlan0");
-        const RunResult result = RunProgram({script, "change-mode", mode});
-        EXPECT_EQ(result.status, 0) << result.err;
-        EXPECT_THAT(Ip("address show wlan0"), testing::Not(testing::HasSubstr("inet ")));
+        Shell(script + " change-mode " + mode);
+        EXPECT_EQ(Ip("-4 address show wlan0"), "");
         EXPECT_THAT(Ip("address show wlan0"), testing::HasSubstr("state DOWN"));
     }
     EXPECT_EQ(accessPoint.Wait(Process::Milliseconds(0)), 128 + SIGTERM);

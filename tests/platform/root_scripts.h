@@ -3,6 +3,7 @@
 
 #include <sys/stat.h>
 
+#include <cstring>
 #include <string>
 
 #include "tests/support/files.h"
@@ -10,17 +11,17 @@
 // The scripts of the host root, at the places where they are called.
 namespace taviwireless::test {
 
-inline void InstallRootScript(const std::string& name, const std::string& folder) {
-    WriteFile(folder + '/' + name, ReadFile(TAVI_ROOT_FOLDER "/" + name));
-    chmod((folder + '/' + name).c_str(), 0755);
+inline void InstallScript(const std::string& from, const std::string& path) {
+    WriteFile(path, ReadFile(from));
+    chmod(path.c_str(), 0755);
 }
 
 inline void InstallRootScripts() {
-    InstallRootScript("rc.network", "/etc");
-    InstallRootScript("dhcp-lease", "/usr/tavi/bin");
-    InstallRootScript("stop-program", "/usr/tavi/bin");
-    InstallRootScript("usb.plug", "/usr/tavi/hotplug");
-    InstallRootScript("usb.wireless.function", "/usr/tavi/hotplug");
+    for (const char* path :
+         {"/etc/rc.network", "/usr/tavi/bin/dhcp-lease", "/usr/tavi/bin/stop-program",
+          "/usr/tavi/hotplug/usb.plug", "/usr/tavi/hotplug/usb.wireless.function"}) {
+        InstallScript(TAVI_ROOT_FOLDER + std::string(strrchr(path, '/')), path);
+    }
 }
 
 }  // namespace taviwireless::test

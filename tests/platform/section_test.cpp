@@ -7,6 +7,8 @@
 #include <cstring>
 #include <vector>
 
+#include "common/sz_hash.h"
+#include "common/sz_list.h"
 #include "tests/support/files.h"
 
 namespace taviwireless::test {
@@ -17,55 +19,32 @@ constexpr char kFormat[] = "\t%s=%s\n";
 
 using Pairs = std::vector<std::pair<std::string, std::string>>;
 
-class Hash {
-  public:
-    Hash() = default;
-    explicit Hash(const Pairs& pairs) {
+struct Hash : SzHash {
+    explicit Hash(const Pairs& pairs = {}) : SzHash(64) {
         for (const auto& [key, value] : pairs) {
-            VEXACSzHashSetValue(&hash_, key.c_str(), value.c_str());
+            Set(key.c_str(), value);
         }
     }
-    ~Hash() { VEXACSzHashFree(hash_); }
-    VEXACSzHash** Address() { return &hash_; }
-    const VEXACSzHash* Get() const { return hash_; }
-    const char* operator[](const char* key) const { return VEXACSzHashGetValue(hash_, key); }
-
-  private:
-    VEXACSzHash* hash_ = VEXACSzHashAlloc(64);
 };
 
 constexpr char kText[] =
-    "stray=0\n"
-    "[One]\n"
-    "\tKEY= \"as it stands\" \n"
-    "# KEY=comment\n"
-    "\n"
-    "; of Two\n"
-    " [two] \r\n"
-    "KEY=a=b\r\n"
-    "KEY=second\n"
-    "[no=header\n"
-    "UTF=\xc3\xbc\xff\n"
-    "no pair\n"
-    "[a]b]\n"
-    "[]\n"
-    "LAST=1";
+    "stray=0\n[One]\n\tKEY= \"as it stands\" \n# KEY=comment\n\n; of Two\n"
+    " [two] \r\nKEY=a=b\r\nKEY=second\n[no=header\nUTF=\xc3\xbc\xff\nno pair\n"
+    "[a]b]\n[]\nLAST=1";
 
 TEST(Section, ReadsSectionsAmongMalformedLines) {
     WriteFile(kFile, kText);
-    VEXACSzList* names = VEXACSzListAlloc(64);
-    ASSERT_EQ(VEXACFileEnumSection(kFile, &names), 4);
+    SzList names(64);
+    ASSERT_EQ(VEXACFileEnumSection(kFile, names.Address()), 4);
     const char* kNames[] = {"One", "two", "a]b", ""};
     for (int i = 0; i < 4; ++i) {
-        EXPECT_STREQ(VEXACSzListGet(names, i), kNames[i]);
+        EXPECT_STREQ(names[i], kNames[i]);
     }
-    VEXACSzListFree(names);
     Hash two;
     EXPECT_EQ(VEXACFileGetSection(kFile, "TWO", two.Address()), 1);  // another letter case
     EXPECT_STREQ(two["KEY"], "a=b");
     EXPECT_STREQ(two["UTF"], "\xc3\xbc\xff");
-    EXPECT_EQ(two["stray"], nullptr);
-    EXPECT_EQ(two["[no"], nullptr);
+    EXPECT_TRUE(two["stray"] == nullptr && two["[no"] == nullptr);
     EXPECT_EQ(VEXACFileGetSection(kFile, "three", two.Address()), 0);
     char value[32];
     EXPECT_EQ(VEXACFileGetSectionValue(kFile, "One", "KEY", value, sizeof value), 0);
@@ -106,52 +85,53 @@ TEST(Section, ShowsEveryChangeOfTheFileAtOnce) {
 }
 
 // What this process has read so far, in bytes.
-long long BytesRead() {
-    return std::stoll(ReadFile("/proc/self/io").substr(strlen("rchar: ")));
+size_t BytesRead() {
+    return std::stoul(ReadFile("/proc/self/io").substr(strlen("rchar: ")));
 }
 
 TEST(Section, ReadingOneByOneReadsAFileNoMoreThanTwice) {
-    constexpr int kSections = 500;
     std::string text;
-    for (int i = 0; i < kSections; ++i) {
+    for (int i = 0; i < 500; ++i) {
         text += "[" + std::to_string(i) + "]\nKEY=" + std::to_string(i) + "\n";
     }
     WriteFile(kFile, text);
     usleep(50000);  // only a file that is not being written is remembered
-    const long long before = BytesRead();
-    for (int i = 0; i < kSections; ++i) {
+    const size_t before = BytesRead();
+    for (int i = 0; i < 500; ++i) {
         EXPECT_EQ(ValueOf(std::to_string(i).c_str()), std::to_string(i));
     }
-    constexpr long long kOther = 1000;  // of the count itself
-    EXPECT_LT(BytesRead() - before, 2 * static_cast<long long>(text.size()) + kOther);
+    constexpr size_t kOther = 1000;  // of the count itself
+    EXPECT_LT(BytesRead() - before, 2 * text.size() + kOther);
+}
+
+int Set(const char* section, const Pairs& pairs) {
+    return VEXACFileSetSection(kFile, section, nullptr, Hash(pairs).Get(), kFormat);
+}
+
+int Add(const char* section, const Pairs& pairs) {
+    return VEXACFileAddSection(kFile, section, Hash(pairs).Get(), kFormat);
 }
 
 TEST(Section, WritesLeaveEverythingElseAsItStands) {
-    const std::string one = "; top\n[one]\n[c=1\n\ta=1\n\tb=2\n\n# two\n";
-    const std::string two = "[two]\nx=\xff\n";
-    WriteFile(kFile, one + two);
+    const std::string top = "; top\n[one]\n[c=1\n";
+    const std::string two = "\n# two\n[two]\nx=\xff\n";
+    WriteFile(kFile, top + "\ta=1\n\tb=2\n" + two);
     EXPECT_EQ(VEXACFileSetSectionValue(kFile, "one", "c", " 3 ", kFormat), 0);
-    EXPECT_EQ(ReadFile(kFile), "; top\n[one]\n[c=1\n\ta=1\n\tb=2\n\tc= 3 \n\n# two\n" + two);
-    EXPECT_EQ(VEXACFileSetSection(kFile, "ONE", nullptr, Hash(Pairs{{"b", "9"}, {"n", ""}}).Get(),
-                                  kFormat),
-              1);
-    EXPECT_EQ(ReadFile(kFile), "; top\n[one]\n[c=1\n\tb=9\n\tn=\n\n# two\n" + two);
-    EXPECT_EQ(VEXACFileAddSection(kFile, "new", Hash(Pairs{{"z", "1"}, {"a", "2"}}).Get(), kFormat),
-              1);
-    EXPECT_EQ(ReadFile(kFile),
-              "; top\n[one]\n[c=1\n\tb=9\n\tn=\n\n# two\n" + two + "[new]\n\tz=1\n\ta=2\n");
-    EXPECT_EQ(VEXACFileAddSection(kFile, "new", Hash().Get(), kFormat), -1);
-    EXPECT_EQ(VEXACFileAddSection(kFile, " blanks ", Hash().Get(), kFormat), 1);
-    EXPECT_EQ(VEXACFileSetSection(kFile, " blanks ", nullptr, Hash().Get(), kFormat), 1);
-    EXPECT_EQ(VEXACFileSetSection(kFile, "none", nullptr, Hash().Get(), kFormat), 0);
+    EXPECT_EQ(ReadFile(kFile), top + "\ta=1\n\tb=2\n\tc= 3 \n" + two);
+    EXPECT_EQ(Set("ONE", {{"b", "9"}, {"n", ""}}), 1);
+    EXPECT_EQ(ReadFile(kFile), top + "\tb=9\n\tn=\n" + two);
+    EXPECT_EQ(Add("new", {{"z", "1"}, {"a", "2"}}), 1);
+    EXPECT_EQ(ReadFile(kFile), top + "\tb=9\n\tn=\n" + two + "[new]\n\tz=1\n\ta=2\n");
+    EXPECT_EQ(Add("new", {}), -1);
+    EXPECT_EQ(Add(" blanks ", {}), 1);
+    EXPECT_EQ(Set(" blanks ", {}), 1);
+    EXPECT_EQ(Set("none", {}), 0);
 }
 
 TEST(Section, RefusesWhatWouldForgeALine) {
     WriteFile(kFile, "[one]\n\ta=1\n");
     const struct {
-        const char* section;
-        const char* key;
-        const char* value;
+        const char *section, *key, *value;
     } kRows[] = {{"one", "a", "x\n[two]"}, {"one", "a\nb", "x"}, {"one", "[a", "x"},
                  {"one", "", "x"},         {"one", "a=b", "x"},  {"one", "#a", "x"},
                  {"one\n[two", "a", "x"},  {"", "a", "x"}};
@@ -159,9 +139,8 @@ TEST(Section, RefusesWhatWouldForgeALine) {
         EXPECT_EQ(VEXACFileSetSectionValue(kFile, row.section, row.key, row.value, kFormat), -1);
         EXPECT_EQ(VEXACErrGet(), VEXAC_ERR_BAD_PARAMETER);
     }
-    EXPECT_EQ(VEXACFileAddSection(kFile, "x", Hash(Pairs{{"a", "1\n2"}}).Get(), kFormat), -1);
-    EXPECT_EQ(VEXACFileSetSection(kFile, "one", nullptr, Hash(Pairs{{"a", "1\n2"}}).Get(), kFormat),
-              -1);
+    EXPECT_EQ(Add("x", {{"a", "1\n2"}}), -1);
+    EXPECT_EQ(Set("one", {{"a", "1\n2"}}), -1);
     EXPECT_EQ(ReadFile(kFile), "[one]\n\ta=1\n");
 }
 

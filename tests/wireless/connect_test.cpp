@@ -1,17 +1,16 @@
 // Joining a network: what the supplicant is given, and what happens around it.
 #include <tavicore/error.h>
 
+#include <regex>
+
 #include "tests/support/sleep_capture.h"
 #include "tests/wireless/station_fixture.h"
 
 namespace taviwireless::test {
 namespace {
 
-using testing::AllOf;
-using testing::EndsWith;
 using testing::HasSubstr;
 using testing::Not;
-using testing::StartsWith;
 
 constexpr char kStart[] =
     "/usr/sbin/wpa_supplicant -Dwext -iwlan0 -c/usr/tavi/etc/wpa_supplicant.conf -B "
@@ -27,12 +26,6 @@ std::string RealSupplicantSays() {
 }
 
 TEST(SupplicantFile, SaysHowToJoinAndIsUnderstood) {
-    struct Case {
-        int auth;
-        int encrypt;
-        std::string key;
-        std::string lines;  // behind scan_ssid
-    };
     const std::string wpa = "\tkey_mgmt=WPA-PSK\n";
     const std::string psk = "\tpsk=\"a secret\"\n}\n";
     const std::string eap = "\tkey_mgmt=WPA-EAP\n\teap=TTLS PEAP\n";
@@ -40,7 +33,10 @@ TEST(SupplicantFile, SaysHowToJoinAndIsUnderstood) {
     const std::string open = "\tkey_mgmt=NONE\n";
     const std::string wep = "\twep_tx_keyidx=0\n\tauth_alg=OPEN SHARED\n}\n";
     const std::string key63 = "#$(id)\"\\" + std::string(55, 'k');
-    const Case kCases[] = {
+    const struct {
+        int auth, encrypt;
+        std::string key, lines;  // these stand behind scan_ssid
+    } kCases[] = {
         {5, 8, kKey, wpa + "\tpairwise=CCMP\n" + psk},
         {4, 12, kKey, wpa + "\tpairwise=TKIP CCMP\n" + psk},
         {4, 4, kKey, wpa + "\tpairwise=TKIP\n" + psk},
@@ -55,7 +51,7 @@ TEST(SupplicantFile, SaysHowToJoinAndIsUnderstood) {
         {3, 2, std::string(26, 'F'), open + "\twep_key0=" + std::string(26, 'F') + "\n" + wep},
         {2, 2, kKey, open + wep},  // of 8 characters
     };
-    for (const Case& c : kCases) {
+    for (const auto& c : kCases) {
         SCOPED_TRACE(c.lines);
         Station station;
         WirelessConf conf = MakeConf("My Net", c.key, c.auth, c.encrypt);
@@ -65,20 +61,20 @@ TEST(SupplicantFile, SaysHowToJoinAndIsUnderstood) {
                   "\tbssid=00:11:22:AA:BB:CC\n\tscan_ssid=1\n" +
                       c.lines);
         EXPECT_EQ(FileMode(kSupplicantFile), 0600u);
-        EXPECT_THAT(RealSupplicantSays(),
-                    AllOf(HasSubstr("id=0 ssid='My Net'"), Not(HasSubstr("ailed to parse"))));
+        EXPECT_THAT(RealSupplicantSays(), testing::AllOf(HasSubstr("id=0 ssid='My Net'"),
+                                                         Not(HasSubstr("ailed to parse"))));
         EXPECT_EQ(station.log.Count("Wrong WEP Format."), c.lines == open + wep);
     }
 }
 
 TEST(SupplicantFile, HoldsAnyEssidAsItStands) {
+    const std::string kHostile = "$(touch /tmp/x);`id`|'%s%n'";
     const std::pair<std::string, std::string> kCases[] = {
         {" a#b ", " a#b "},
         {"a\"b\\", "a\\\"b\\\\"},
-        {"$(touch /tmp/x);`id`|'%s%n'", "$(touch /tmp/x);`id`|'%s%n'"},
+        {kHostile, kHostile},
         {"caf\xc3\xa9", "caf\\xc3\\xa9"},
-        {std::string(32, '~'), std::string(32, '~')},
-    };
+        {std::string(32, '~'), std::string(32, '~')}};
     for (const auto& [essid, printed] : kCases) {
         Station station;
         WirelessConf conf = MakeConf(essid);
@@ -148,59 +144,49 @@ TEST(Connect, AdhocNetworksAreCreatedInstead) {
 }
 
 TEST(Connect, FailsCleanlyAndNeverLeavesTheFlag) {
-    struct Case {
+    const std::string kFailed = "Failed to connect network.\n";
+    const std::string kNotSet = "Failed to set [/usr/tavi/etc/wpa_supplicant.conf]\n" + kFailed;
+    const std::string kLineBreak = "The ESSID, key or user name holds a line break\n" + kNotSet;
+    const struct {
         const char* arrange;
         WirelessConf conf;
-        std::vector<std::string> log;  // followed by what all have in common
+        std::string log;
+    } kCases[] = {
+        {"ip link delete wlan0", MakeConf(), "There is no wireless USB adapter plugged\n"},
+        {"touch /var/tmp/.wireless_connecting", MakeConf(),
+         "Another connection construction is going\n"},
+        {"", MakeConf("a\n\tpsk=b"), kLineBreak},
+        {"", MakeConf("a", "b\nc"), kLineBreak},
+        {"", MakeConf("a", kKey, WIRELESS_AUTH_WPA_NONE),
+         "Failed to detect authentication/encryption type\n" + kNotSet},
+        {"rm -r /usr/tavi/etc", MakeConf(),
+         "Failed to open file[/usr/tavi/etc/wpa_supplicant.conf].\n" + kNotSet},
+        {"mkdir /var/tmp/.wireless_current_connection", MakeConf(),
+         "Failed to record this connection.\n" + kFailed},
     };
-    const std::string notSet = "Failed to set [/usr/tavi/etc/wpa_supplicant.conf]";
-    const std::string failed = "Failed to connect network.";
-    const std::string lineBreak = "The ESSID, key or user name holds a line break";
-    const Case kCases[] = {
-        {"ip link delete wlan0", MakeConf(), {"There is no wireless USB adapter plugged"}},
-        {"touch /var/tmp/.wireless_connecting",
-         MakeConf(),
-         {"Another connection construction is going"}},
-        {"", MakeConf("a\n\tpsk=b"), {lineBreak, notSet, failed}},
-        {"", MakeConf("a", "b\nc"), {lineBreak, notSet, failed}},
-        {"",
-         MakeConf("a", kKey, WIRELESS_AUTH_WPA_NONE),
-         {"Failed to detect authentication/encryption type", notSet, failed}},
-        {"rm -r /usr/tavi/etc",
-         MakeConf(),
-         {"Failed to open file[/usr/tavi/etc/wpa_supplicant.conf].", notSet, failed}},
-        {"mkdir /var/tmp/.wireless_current_connection",
-         MakeConf(),
-         {"Failed to record this connection.", failed}},
-    };
-    for (const Case& c : kCases) {
+    for (const auto& c : kCases) {
         Station station;
         Shell(c.arrange);
         WirelessConf conf = c.conf;
         EXPECT_EQ(TAVIWirelessNetworkConnect(&conf), -1);
-        ASSERT_EQ(station.log.Lines().size(), c.log.size()) << station.log.Text();
-        for (size_t i = 0; i < c.log.size(); ++i) {
-            EXPECT_THAT(station.log.Lines()[i].text,
-                        AllOf(StartsWith("wireless_network_connect.cpp:"), EndsWith(c.log[i])));
-        }
+        const std::regex place("wireless_network_connect.cpp:[0-9]+ ");
+        EXPECT_EQ(std::regex_replace(station.log.Text(), place, ""), c.log);
         EXPECT_FALSE(Exists(kFlag));
     }
 }
 
 TEST(CheckBlock, TellsWhetherTheUserBlockedTheRadio) {
-    struct Case {
-        const char* settings;
-        const char* info;
+    const struct {
+        const char *settings, *info;
         int result;
-    };
-    const Case kCases[] = {
+    } kCases[] = {
         {"[a;b]\n\tunblock=yes\n", "PRODUCT=a;b\n", 1},  {"[a;b]\n\tx=no\n", "PRODUCT=a;b\n", -1},
         {"[other]\n\tunblock=no\n", "PRODUCT=a;b\n", 1}, {"[a;b]\n", "PRODUCT=\n", -1},
         {"[a;b]\n\tunblock=no\n", "PRODUCT=a;b\n", 0},
     };
     Station station;
     EXPECT_EQ(TAVIWirelessCheckBlock(), 1);
-    for (const Case& c : kCases) {
+    for (const auto& c : kCases) {
         WriteFile("/usr/tavi/etc/wireless_ap.conf", c.settings);
         WriteFile("/tmp/wireless.info", c.info);
         EXPECT_EQ(TAVIWirelessCheckBlock(), c.result) << c.settings;

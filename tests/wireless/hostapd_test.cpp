@@ -20,39 +20,34 @@ constexpr char kGuestFile[] = "/etc/hostapd/hostapd-wlan0-guest.conf";
 constexpr char kGuestInfo[] = "/etc/hostapd/hostapd-wlan0-guest.info";
 constexpr char kModelInfo[] = "/etc.defaults/taviinfo.conf";
 
-template <size_t kSize>
-void Set(char (&field)[kSize], const std::string& text) {
-    snprintf(field, kSize, "%s", text.c_str());
-}
-
-void SetWpa(WirelessAPSecret& secret, int32_t cipher) {
-    secret = {};
-    secret.wpa.wpaVersion = 3;
-    secret.wpa.cipher = cipher;
-    Set(secret.wpa.passphrase, "pass = phrase");
-}
-
-void SetEnterprise(WirelessAPSecret& secret, int32_t cipher) {
-    secret = {};
-    secret.enterprise.wpaVersion = 2;
-    secret.enterprise.cipher = cipher;
-    secret.enterprise.radiusPort = 1812;
-    Set(secret.enterprise.radiusAddr, "10.0.0.9");
-    Set(secret.enterprise.radiusSecret, "radius secret");
+WirelessAPSecret MakeSecret(int kind, int32_t cipher) {
+    WirelessAPSecret secret{};
+    if (kind == WIRELESS_AP_WPA) {
+        secret.wpa.wpaVersion = 3;
+        secret.wpa.cipher = cipher;
+        SetField(secret.wpa.passphrase, "pass = phrase");
+    } else if (kind == WIRELESS_AP_WPA_ENTERPRISE) {
+        secret.enterprise.wpaVersion = 2;
+        secret.enterprise.cipher = cipher;
+        secret.enterprise.radiusPort = 1812;
+        SetField(secret.enterprise.radiusAddr, "10.0.0.9");
+        SetField(secret.enterprise.radiusSecret, "radius secret");
+    }
+    return secret;
 }
 
 // Open, at 2.4 GHz with 802.11n, for guests as well.
 WirelessAPConf MakeConf() {
     WirelessAPConf conf{};
-    Set(conf.ssid, "My \"Net\" #1");
-    Set(conf.bridge, "lbr0");
+    SetField(conf.ssid, "My \"Net\" #1");
+    SetField(conf.bridge, "lbr0");
     conf.band = WIRELESS_AP_G;
     conf.ieee80211n = 1;
     conf.channel = 11;
     conf.wmm = 7;
     conf.guestEnabled = 1;
-    Set(conf.guestSsid, "Guests");
-    Set(conf.guestBssid, "02:00:00:00:00:01");
+    SetField(conf.guestSsid, "Guests");
+    SetField(conf.guestBssid, "02:00:00:00:00:01");
     return conf;
 }
 
@@ -78,7 +73,7 @@ TEST(HostConf, IsWrittenLineByLine) {
     conf.ieee80211n = conf.wmm = 0;
     conf.band = WIRELESS_AP_N_ONLY;
     conf.security = WIRELESS_AP_WPA;
-    SetWpa(conf.secret, WIRELESS_AP_CCMP);
+    conf.secret = MakeSecret(conf.security, WIRELESS_AP_CCMP);
     std::string head = kGoldenHead;
     head.replace(head.find("ssid=0"), 6, "ssid=1");
     EXPECT_EQ(HostText(conf), head +
@@ -88,7 +83,7 @@ TEST(HostConf, IsWrittenLineByLine) {
                                   "wpa_pairwise=CCMP\nrsn_pairwise=CCMP\n");
 
     conf.security = WIRELESS_AP_WPA_ENTERPRISE;
-    SetEnterprise(conf.secret, WIRELESS_AP_TKIP | WIRELESS_AP_CCMP);
+    conf.secret = MakeSecret(conf.security, WIRELESS_AP_TKIP | WIRELESS_AP_CCMP);
     EXPECT_THAT(HostText(conf),
                 EndsWith("\nrequire_ht=1\nhw_mode=g\neap_server=0\nauth_algs=1\nwpa=2\n"
                          "wpa_key_mgmt=WPA-EAP\nwpa_pairwise=TKIP CCMP\nrsn_pairwise=TKIP CCMP\n"
@@ -97,12 +92,11 @@ TEST(HostConf, IsWrittenLineByLine) {
 }
 
 TEST(HostConf, HasTheModeAndWidthThatBandAndChannelAllow) {
-    struct Case {
+    const struct {
         int band, n, htFlags, channel, security, cipher;
         std::string capabilities;  // the end of the line
         std::string mode;          // the lines between WMM and the EAP server
-    };
-    const Case kCases[] = {
+    } kCases[] = {
         {1, 1, 3, 44, 0, 0, "7935][HT40+]", "hw_mode=a\n"},
         {1, 1, 2, 64, 0, 0, "7935][HT40-]", "hw_mode=a\n"},
         {1, 1, 2, 149, 0, 0, "[MAX-AMSDU-7935]", "hw_mode=a\n"},
@@ -119,18 +113,14 @@ TEST(HostConf, HasTheModeAndWidthThatBandAndChannelAllow) {
         {8, 1, 0, 1, 3, 1, "[DELAYED-BA]", "require_ht=1\nhw_mode=g\n"},
         {8, 0, 0, 1, 0, 0, "", "require_ht=1\nhw_mode=g\n"},
     };
-    for (const Case& c : kCases) {
+    for (const auto& c : kCases) {
         WirelessAPConf conf = MakeConf();
         conf.band = c.band;
         conf.ieee80211n = c.n;
         conf.htFlags = c.htFlags;
         conf.channel = c.channel;
         conf.security = c.security;
-        if (c.security == WIRELESS_AP_WPA) {
-            SetWpa(conf.secret, c.cipher);
-        } else if (c.security == WIRELESS_AP_WPA_ENTERPRISE) {
-            SetEnterprise(conf.secret, c.cipher);
-        }
+        conf.secret = MakeSecret(c.security, c.cipher);
         EXPECT_THAT(HostText(conf), HasSubstr((c.n != 0 ? c.capabilities : "channel=1") +
                                               "\nwmm_enabled=1\n" + c.mode + "eap_server="))
             << "band " << c.band << " channel " << c.channel << " security " << c.security;
@@ -150,8 +140,8 @@ TEST(HostConf, QuotesAWepKeyByItsLength) {
     for (const auto& [key, line] : kCases) {
         WirelessAPConf conf = MakeConf();
         conf.security = conf.guestSecurity = WIRELESS_AP_WEP;
-        Set(conf.secret.wepKey, key);
-        Set(conf.guestSecret.wepKey, key);
+        SetField(conf.secret.wepKey, key);
+        SetField(conf.guestSecret.wepKey, key);
         EXPECT_THAT(HostText(conf),
                     EndsWith("eap_server=1\nauth_algs=3\nwep_default_key=0\n" + line));
         EXPECT_THAT(RenderGuestConf(conf).Text(),
@@ -164,14 +154,15 @@ TEST(GuestConf, IsABlockWithoutEapServer) {
     const std::string head =
         "bss=gwlan\nbssid=02:00:00:00:00:01\nssid=Guests\nbridge=gbr\n"
         "ctrl_interface=/var/run/hostapd\n";
-    EXPECT_EQ(RenderGuestConf(conf).Text(), head + "ignore_broadcast_ssid=0\n");
-    conf.guestSecurity = WIRELESS_AP_WPA_ENTERPRISE;
-    EXPECT_EQ(RenderGuestConf(conf).Text(), head + "ignore_broadcast_ssid=0\n");
+    for (const int security : {WIRELESS_AP_OPEN, WIRELESS_AP_WPA_ENTERPRISE}) {
+        conf.guestSecurity = security;
+        EXPECT_EQ(RenderGuestConf(conf).Text(), head + "ignore_broadcast_ssid=0\n");
+    }
     conf.guestSecurity = WIRELESS_AP_WPA;
     conf.guestHidden = 1;
     conf.guestIsolate = 5;
     conf.guestMaxStations = 3;
-    SetWpa(conf.guestSecret, WIRELESS_AP_TKIP);
+    conf.guestSecret = MakeSecret(conf.guestSecurity, WIRELESS_AP_TKIP);
     EXPECT_EQ(RenderGuestConf(conf).Text(),
               head +
                   "max_num_sta=3\nap_isolate=1\nignore_broadcast_ssid=1\nauth_algs=1\nwpa=3\n"
@@ -188,13 +179,12 @@ std::vector<Security> Securities() {
     std::vector<Security> all{{WIRELESS_AP_OPEN, {}}};
     for (const size_t length : {5, 10, 12, 13, 26}) {
         all.push_back({WIRELESS_AP_WEP, {}});
-        Set(all.back().secret.wepKey, std::string(length, 'a'));
+        SetField(all.back().secret.wepKey, std::string(length, 'a'));
     }
     for (int cipher = 0; cipher <= 4; ++cipher) {
-        all.push_back({WIRELESS_AP_WPA, {}});
-        SetWpa(all.back().secret, cipher);
-        all.push_back({WIRELESS_AP_WPA_ENTERPRISE, {}});
-        SetEnterprise(all.back().secret, cipher);
+        for (const int kind : {WIRELESS_AP_WPA, WIRELESS_AP_WPA_ENTERPRISE}) {
+            all.push_back({kind, MakeSecret(kind, cipher)});
+        }
     }
     return all;
 }
@@ -253,28 +243,27 @@ TEST(HostConf, IsUnderstoodByHostapdInEveryCase) {
 }
 
 // An appliance without hostapd's files; its ps lists every process with its arguments.
-struct AccessPoint {
-    AccessPoint() {
+struct SetHostAPConf : testing::Test {
+    SetHostAPConf() {
         Shell(
             "rm -rf /etc/hostapd /etc.defaults/* /tmp/*; mkdir -p /tmp/bin /etc.defaults\n"
             "ln -s /bin/busybox /tmp/bin/ps; printf '#!/bin/sh\\nread end\\n' > /tmp/hostapd\n"
             "chmod +x /tmp/hostapd");
         setenv("PATH", ("/tmp/bin:" + path).c_str(), 1);
+        adapter.Up();
     }
-    ~AccessPoint() { setenv("PATH", path.c_str(), 1); }
+    ~SetHostAPConf() override { setenv("PATH", path.c_str(), 1); }
 
     const std::string path = getenv("PATH");
     WirelessInterface adapter;
     LogCapture log;
+    WirelessAPConf conf = MakeConf();
 };
 
-TEST(SetHostAPConf, StopsHostapdAndWritesFilesThatOthersCannotRead) {
-    AccessPoint here;
-    here.adapter.Up();
+TEST_F(SetHostAPConf, StopsHostapdAndWritesFilesThatOthersCannotRead) {
     WriteFile(kHostFile, "old\n");
     Process other({"/tmp/hostapd", "/etc/hostapd/hostapd-wlan1.conf"});
     Process ours({"/tmp/hostapd", "/etc/hostapd/hostapd-wlan0.conf"});
-    const WirelessAPConf conf = MakeConf();
     EXPECT_EQ(TAVIWirelessSetHostAPConf("wlan0", &conf), 1);
     EXPECT_EQ(ours.Wait(), 128 + SIGTERM);
     EXPECT_EQ(other.Wait(Process::Milliseconds(0)), std::nullopt);
@@ -282,13 +271,9 @@ TEST(SetHostAPConf, StopsHostapdAndWritesFilesThatOthersCannotRead) {
     EXPECT_EQ(ReadFile(kHostFile), kGoldenOpen);
     EXPECT_EQ(FileMode(kHostFile), 0600u);
     EXPECT_FALSE(Exists(kGuestFile) || Exists(kGuestInfo));
-    EXPECT_EQ(here.log.Text(), "");
-}
+    EXPECT_EQ(log.Text(), "");
 
-TEST(SetHostAPConf, WritesGuestFilesOnModelsThatOfferThem) {
-    AccessPoint here;
     WriteFile(kModelInfo, "support_pci_wifi=\"yes\"\n");
-    WirelessAPConf conf = MakeConf();
     EXPECT_EQ(TAVIWirelessSetHostAPConf("wlan0", &conf), 1);
     EXPECT_EQ(ReadFile(kGuestInfo), "enable=yes\n");
     EXPECT_EQ(ReadFile(kGuestFile), RenderGuestConf(conf).Text());
@@ -298,10 +283,8 @@ TEST(SetHostAPConf, WritesGuestFilesOnModelsThatOfferThem) {
     EXPECT_EQ(ReadFile(kGuestInfo), "enable=no\n");
 }
 
-TEST(SetHostAPConf, AnInterfaceNameRunsNothingAndMatchesOnlyItself) {
-    AccessPoint here;
+TEST_F(SetHostAPConf, AnInterfaceNameRunsNothingAndMatchesOnlyItself) {
     Process other({"/tmp/hostapd", "wlan0x1", "/etc/hostapd/hostapd-"});
-    const WirelessAPConf conf = MakeConf();
     for (const char* interface : {"wlan0.1", "w*", "$(>x)", "`>x`;>x", "[w]", "^"}) {
         EXPECT_EQ(TAVIWirelessSetHostAPConf(interface, &conf), 1) << interface;
     }
@@ -309,54 +292,48 @@ TEST(SetHostAPConf, AnInterfaceNameRunsNothingAndMatchesOnlyItself) {
     EXPECT_FALSE(Exists("x"));
 }
 
-TEST(SetHostAPConf, RefusesBadArgumentsAndLineBreaksBeforeAnythingIsDone) {
-    AccessPoint here;
-    here.adapter.Up();
-    WirelessAPConf conf = MakeConf();
+TEST_F(SetHostAPConf, RefusesBadArgumentsAndLineBreaksBeforeAnythingIsDone) {
     EXPECT_EQ(TAVIWirelessSetHostAPConf(nullptr, &conf), 0);
     EXPECT_EQ(TAVIWirelessSetHostAPConf("wlan0", nullptr), 0);
-    EXPECT_EQ(here.log.Count("wireless_hostap_conf_set.cpp:"), 2);
-    EXPECT_EQ(here.log.Count(" Bad parameter."), 2);
-    Set(conf.guestSsid, "a\nb");  // which this model does not write
+    EXPECT_EQ(log.Count("wireless_hostap_conf_set.cpp:"), 2);
+    EXPECT_EQ(log.Count(" Bad parameter."), 2);
+    SetField(conf.guestSsid, "a\nb");  // which this model does not write
     EXPECT_EQ(TAVIWirelessSetHostAPConf("wlan0", &conf), 1);
-    here.adapter.Up();
+    adapter.Up();
     Shell("rm -r /etc/hostapd");
     WriteFile(kModelInfo, "support_pci_wifi=yes\n");
     EXPECT_EQ(TAVIWirelessSetHostAPConf("wlan0", &conf), 0);
     conf = MakeConf();
     conf.security = WIRELESS_AP_WPA;
-    Set(conf.secret.wpa.passphrase, "secret\nauth_algs=1");
+    SetField(conf.secret.wpa.passphrase, "secret\nauth_algs=1");
     EXPECT_EQ(TAVIWirelessSetHostAPConf("wlan0", &conf), 0);
-    EXPECT_EQ(here.log.Count("holds a line break"), 2);
-    EXPECT_FALSE(here.log.Has("secret"));
+    EXPECT_EQ(log.Count("holds a line break"), 2);
+    EXPECT_FALSE(log.Has("secret"));
     EXPECT_THAT(Shell("ip link show wlan0"), HasSubstr("UP"));
     EXPECT_FALSE(Exists("/etc/hostapd"));
 }
 
-TEST(SetHostAPConf, TellsWhatCouldNotBeWritten) {
-    struct Case {
-        std::string arrange;
-        std::string log;
-        bool isHostWritten;
-    };
+TEST_F(SetHostAPConf, TellsWhatCouldNotBeWritten) {
     const std::string guest = "Failed to set hostapd.conf for Guest Network\n";
-    const Case kCases[] = {
+    const struct {
+        std::string arrange, log;
+        bool isHostWritten;
+    } kCases[] = {
         {"touch /etc/hostapd", "Failed to mkdir /etc/hostapd\n", false},
         {std::string("mkdir -p ") + kHostFile, "", false},
         {std::string("mkdir -p ") + kGuestInfo, guest, true},
         {std::string("mkdir -p ") + kGuestFile, guest, true},
     };
-    for (const Case& c : kCases) {
-        AccessPoint here;
-        WriteFile(kModelInfo, "support_pci_wifi=yes\n");
-        Shell(c.arrange);
-        const WirelessAPConf conf = MakeConf();
+    WriteFile(kModelInfo, "support_pci_wifi=yes\n");
+    for (const auto& c : kCases) {
+        Shell("rm -rf /etc/hostapd; " + c.arrange);
+        log.Clear();
         testing::internal::CaptureStderr();  // mkdir's
         EXPECT_EQ(TAVIWirelessSetHostAPConf("wlan0", &conf), 0);
         testing::internal::GetCapturedStderr();
-        EXPECT_THAT(here.log.Text(), EndsWith(c.log));
-        EXPECT_EQ(here.log.Lines().size(), c.log.empty() ? 0u : c.log == guest ? 2u : 1u);
-        EXPECT_EQ(here.log.Has("Failed to open file [/etc/hostapd/hostapd-wlan0-guest."),
+        EXPECT_THAT(log.Text(), EndsWith(c.log));
+        EXPECT_EQ(log.Lines().size(), c.log.empty() ? 0u : c.log == guest ? 2u : 1u);
+        EXPECT_EQ(log.Has("Failed to open file [/etc/hostapd/hostapd-wlan0-guest."),
                   c.log == guest);
         EXPECT_EQ(std::filesystem::is_regular_file(kHostFile), c.isHostWritten);
     }

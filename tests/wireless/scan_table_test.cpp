@@ -55,46 +55,47 @@ ScanResult Beacon(int frequency, int signal, bool isPrivate, const std::string& 
 }
 
 TEST(ScanTable, IsReadByTheScanAsWhatTheBeaconsSay) {
-    const struct {
+    struct Row {
         ScanResult beacon;
-        const char* channelAndEssid;
-        const char* rest;
+        std::string channelAndEssid, rest;
         int protocol, auth, encrypt;
-    } kRows[] = {
+    };
+    std::vector<Row> rows = {
         {Beacon(2437, -61, kPrivate, Ssid("My Net") + kRates + kRsnPskCcmp + kHt + kWmm),
          "6    My Net", "70 11b/g/n WPA2PSK/AES", 10, 5, 8},
         {Beacon(2484, -40, false, Ssid("old") + kSlowRates + kWmm), "14   old", "100 11b NONE", 2,
          1, 1},
-        {Beacon(2412, -30, kPrivate, Ssid("wep") + kRates), "1    wep", "100 11b/g WEP", 1, 3, 2},
         {Beacon(5180, -110, kPrivate, Ssid("five") + kRatesOf5GHz + kWpaPskTkip), "36   five",
          "0 11a WPAPSK/TKIP", 3, 4, 4},
         {Beacon(5825, -120, kPrivate, Ssid("five n") + kRatesOf5GHz + kHt + kRsnEap), "165  five n",
          "0 11a/n WPA2EAP/AES", 9, 8, 8},
-        {Beacon(2417, -75, kPrivate, Ssid("both") + kRates + kWpaPskTkip + kRsnPskCcmp),
-         "2    both", "50 11b/g WPA1PSKWPA2PSK/TKIPAES", 1, 5, 12},
-        {Beacon(2417, -75, kPrivate, Ssid("ciphers") + kRates + kRsnPskMixed), "2    ciphers",
-         "50 11b/g WPA2PSK/TKIPAES", 1, 5, 12},
-        {Beacon(2417, -75, kPrivate, Ssid("both eap") + kRates + kWpaEapTkip + kRsnEap),
-         "2    both eap", "50 11b/g WPA1WPA2EAP/TKIPAES", 1, 8, 12},
-        {Beacon(2417, -75, kPrivate, Ssid("eap") + kRates + kWpaEapTkip), "2    eap",
-         "50 11b/g WPAEAP/TKIP", 1, 7, 4},
-        {Beacon(2417, -75, kPrivate, Ssid("group") + kRates + kRsnGroupCipher), "2    group",
-         "50 11b/g WPA2PSK/TKIP", 1, 5, 4},
-        {Beacon(2417, -75, kPrivate, Ssid("adhoc") + kRates + kWpaNone), "2    adhoc",
-         "50 11b/g WPANONE/TKIP", 1, 6, 4},
-        {Beacon(2417, -75, kPrivate, Ssid("new") + kRates + kRsnSae), "2    new",
-         "50 11b/g UNKNOW/AES", 1, 0, 8},
-        {Beacon(2417, -75, kPrivate, Ssid("newer") + kRates + kRsnSaeAndPsk), "2    newer",
-         "50 11b/g WPA2PSK/AES", 1, 5, 8},
         {Beacon(5955, -75, kPrivate, Ssid("six") + kRatesOf5GHz + kRsnSae), "1    six",
          "50 unknown UNKNOW/AES", 0, 0, 8},
         {Beacon(2417, -75, false, Ssid(std::string(32, 'w')) + kRates),
-         "2    wwwwwwwwwwwwwwwwwwwwwwwwwwwwwwww", "50 11b/g NONE", 1, 1, 1},
+         "2    " + std::string(32, 'w'), "50 11b/g NONE", 1, 1, 1},
         {Beacon(2417, -75, false, Ssid(" a\nb\xc3\xbc") + kRates), "2     a?b\xc3\xbc",
          "50 11b/g NONE", 1, 1, 1},
     };
+    const struct {
+        std::string protection, text;
+        int auth, encrypt;
+    } kSecurities[] = {
+        {"", "WEP", 3, 2},
+        {kWpaPskTkip + kRsnPskCcmp, "WPA1PSKWPA2PSK/TKIPAES", 5, 12},
+        {kRsnPskMixed, "WPA2PSK/TKIPAES", 5, 12},
+        {kWpaEapTkip + kRsnEap, "WPA1WPA2EAP/TKIPAES", 8, 12},
+        {kWpaEapTkip, "WPAEAP/TKIP", 7, 4},
+        {kRsnGroupCipher, "WPA2PSK/TKIP", 5, 4},
+        {kWpaNone, "WPANONE/TKIP", 6, 4},
+        {kRsnSae, "UNKNOW/AES", 0, 8},
+        {kRsnSaeAndPsk, "WPA2PSK/AES", 5, 8},
+    };
+    for (const auto& s : kSecurities) {
+        rows.push_back({Beacon(2417, -75, kPrivate, Ssid("x") + kRates + s.protection), "2    x",
+                        "50 11b/g " + s.text, 1, s.auth, s.encrypt});
+    }
     std::string table;
-    for (const auto& row : kRows) {
+    for (const Row& row : rows) {
         std::string line = row.channelAndEssid;
         line.resize(38, ' ');
         EXPECT_EQ(TableLine(row.beacon), line + "00:11:22:33:44:55 " + row.rest + "\n");
@@ -103,51 +104,45 @@ TEST(ScanTable, IsReadByTheScanAsWhatTheBeaconsSay) {
     table += TableLine(Beacon(2417, -75, false, Ssid("") + kRates));  // hidden: not read
     table += TableLine(Beacon(2417, -75, false, Ssid(std::string(5, '\0')) + kRates));
 
-    WirelessInterface wlan0;
+    const WirelessInterface wlan0;
     ToolStandIns tools;
     WriteFile("/tmp/table", iwlist::TableHeading() + table);
     tools.Add("/sbin/iwlist", "cat /tmp/table");
     wireless::OwnedList<WirelessNetwork> networks;
     ASSERT_EQ(TAVIWirelessNetworkScan(0, networks.Head()), 0);
-    auto network = networks.begin();
-    for (const auto& row : kRows) {
-        SCOPED_TRACE(row.channelAndEssid);
-        ASSERT_TRUE(network != networks.end());
-        EXPECT_EQ((*network).channel, std::stoi(row.channelAndEssid));
-        EXPECT_STREQ((*network).essid, row.channelAndEssid + 5);
-        EXPECT_EQ((*network).bssid[5], 0x55);
-        EXPECT_EQ((*network).signal, std::stoi(row.rest));
-        EXPECT_EQ((*network).protocol, row.protocol);
-        EXPECT_EQ((*network).auth, row.auth);
-        EXPECT_EQ((*network).encrypt, row.encrypt);
-        ++network;
+    auto row = rows.begin();
+    for (const WirelessNetwork& n : networks) {
+        ASSERT_NE(row, rows.end());
+        SCOPED_TRACE(row->channelAndEssid + ' ' + row->rest);
+        EXPECT_EQ(n.essid, row->channelAndEssid.substr(5));
+        EXPECT_EQ(n.bssid[5], 0x55);
+        EXPECT_THAT((std::vector{n.channel, n.signal, n.protocol, n.auth, n.encrypt}),
+                    testing::ElementsAre(std::stoi(row->channelAndEssid), std::stoi(row->rest),
+                                         row->protocol, row->auth, row->encrypt));
+        ++row;
     }
-    EXPECT_FALSE(network != networks.end());
+    EXPECT_EQ(row, rows.end());
 }
 
 // A beacon is a stranger's: whatever it holds, it is one line of the table, and its ESSID and what
 // stands before the fault count.
 TEST(ScanTable, SurvivesBrokenElements) {
-    const struct {
-        std::string elements;
-        const char* security;
-    } kRows[] = {
-        {Bytes("30"), "WEP"},           // no size
-        {Bytes("30 14 01 00"), "WEP"},  // shorter than its size
-        {Bytes("30 00"), "WPA2EAP/AES"},
-        {Bytes("30 01 01"), "WPA2EAP/AES"},
-        {Bytes("30 06 01 00 00 0f ac 04"), "WPA2EAP/AES"},  // the rest has its default
-        {Bytes("30 0c 01 00 00 0f ac 04 01 00 00 0f ac 04"), "WPA2EAP/AES"},
-        {Bytes("30 0e 01 00 00 0f ac 04 ff ff 00 0f ac 02 00 0f"), "WPA2EAP/TKIP"},
-        {Bytes("30 08 01 00 00 0f ac 04 ff ff"), "WPA2EAP/UNKNOW"},
-        {Bytes("dd 03 00 50 f2"), "WEP"},
-        {Bytes("dd 04 00 50 f2 01"), "WPAEAP/TKIP"},
+    const std::pair<const char*, const char*> kRows[] = {
+        {"30", "WEP"},           // no size
+        {"30 14 01 00", "WEP"},  // shorter than its size
+        {"30 00", "WPA2EAP/AES"},
+        {"30 01 01", "WPA2EAP/AES"},
+        {"30 06 01 00 00 0f ac 04", "WPA2EAP/AES"},  // the rest has its default
+        {"30 0c 01 00 00 0f ac 04 01 00 00 0f ac 04", "WPA2EAP/AES"},
+        {"30 0e 01 00 00 0f ac 04 ff ff 00 0f ac 02 00 0f", "WPA2EAP/TKIP"},
+        {"30 08 01 00 00 0f ac 04 ff ff", "WPA2EAP/UNKNOW"},
+        {"dd 03 00 50 f2", "WEP"},
+        {"dd 04 00 50 f2 01", "WPAEAP/TKIP"},
     };
-    for (const auto& row : kRows) {
-        const std::string line =
-            TableLine(Beacon(2417, -75, kPrivate, Ssid("x") + kRates + row.elements));
-        EXPECT_EQ(line, "2    x" + std::string(32, ' ') + "00:11:22:33:44:55 50 11b/g " +
-                            row.security + "\n");
+    for (const auto& [elements, security] : kRows) {
+        const auto beacon = Beacon(2417, -75, kPrivate, Ssid("x") + kRates + Bytes(elements));
+        EXPECT_THAT(TableLine(beacon),
+                    testing::EndsWith(" 50 11b/g " + std::string(security) + "\n"));
     }
     const std::string longName = Bytes("00 ff") + std::string(255, 'x');
     EXPECT_THAT(TableLine(Beacon(2417, -75, false, longName)),
@@ -170,10 +165,8 @@ TEST(HostIwlist, HandsOtherFormsToTheStockTool) {
     const std::string path = "/usr/sbin/iwlist";
     Shell("cp " HOST_IWLIST " " + path);
     Shell("rm -f " + path + ".distrib");
-    const RunResult alone = RunProgram({path, "wlan0", "scanning"});
-    EXPECT_EQ(alone.status, 1);
-    EXPECT_THAT(alone.err, testing::HasSubstr("install wireless-tools"));
-
+    EXPECT_THAT(RunProgram({path, "wlan0", "scanning"}).err,
+                testing::HasSubstr("install wireless-tools"));
     ToolStandIns tools;
     tools.Add(path + ".distrib", "exit 7");
     EXPECT_EQ(RunProgram({path, "wlan0", "scanning"}).status, 7);

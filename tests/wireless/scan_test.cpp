@@ -13,6 +13,7 @@ namespace taviwireless::test {
 namespace {
 
 using testing::HasSubstr;
+using Texts = std::vector<std::string>;
 using Networks = wireless::OwnedList<WirelessNetwork>;
 
 constexpr char kTableCommand[] = "/sbin/iwlist wlan0 scanning tavi";
@@ -29,13 +30,12 @@ std::string Table(int count) {
 }
 
 // "[ESSID] BSSID channel signal protocol auth encrypt opmode" of each network.
-std::vector<std::string> Scanned() {
+Texts Scanned() {
     Networks networks;
     EXPECT_EQ(TAVIWirelessNetworkScan(0, networks.Head()), 0);
-    std::vector<std::string> texts;
+    Texts texts;
     for (const WirelessNetwork& network : networks) {
-        char bssid[18];
-        char text[128];
+        char bssid[18], text[128];
         snprintf(text, sizeof text, "[%s] %s %d %d %d %d %d %d", network.essid,
                  TAVIWirelessBssidStringGet(network.bssid, bssid, sizeof bssid), network.channel,
                  network.signal, network.protocol, network.auth, network.encrypt, network.opmode);
@@ -76,26 +76,22 @@ struct Scan : testing::Test {
 };
 
 TEST_F(Scan, IsRepeatedUntilTwoGiveTheSameNumber) {
-    const struct {
-        std::vector<int> counts;
-        std::string lastLine;
-    } kRows[] = {{{4, 4}, "Scan 1: success."},
-                 {{3, 4, 4}, "Scan 2: success."},
-                 {{2, 0, 2, 2}, "Scan 3: success."},
-                 {{0, 0, 0, 0, 0}, "Scan 4: no scan result."},
-                 {{3, 4, 5, 6, 7}, "Scan 4: result is un-stable."}};
-    for (const auto& row : kRows) {
-        std::vector<std::string> tables;
-        for (const int count : row.counts) {
-            tables.push_back(Table(count));
-        }
+    const std::pair<std::vector<int>, const char*> kRows[] = {
+        {{4, 4}, "Scan 1: success.\n"},
+        {{3, 4, 4}, "Scan 2: success.\n"},
+        {{2, 0, 2, 2}, "Scan 3: success.\n"},
+        {{0, 0, 0, 0, 0}, "Scan 4: no scan result.\n"},
+        {{3, 4, 5, 6, 7}, "Scan 4: result is un-stable.\n"}};
+    for (const auto& [counts, lastLine] : kRows) {
+        Texts tables;
+        std::transform(counts.begin(), counts.end(), std::back_inserter(tables), Table);
         AddScanner(tools, tables);
         tools.ForgetCommands();
         log.Clear();
-        EXPECT_EQ(Scanned().size(), static_cast<size_t>(row.counts.back()));
-        EXPECT_EQ(tools.Commands(), std::vector<std::string>(row.counts.size(), kTableCommand));
-        ASSERT_EQ(log.Lines().size(), row.counts.size()) << log.Text();
-        EXPECT_THAT(log.Lines().back().text, HasSubstr(row.lastLine));
+        EXPECT_EQ(Scanned().size(), static_cast<size_t>(counts.back()));
+        EXPECT_EQ(tools.Commands(), Texts(counts.size(), kTableCommand));
+        EXPECT_EQ(log.Lines().size(), counts.size()) << log.Text();
+        EXPECT_THAT(log.Text(), testing::EndsWith(lastLine));
     }
 }
 
@@ -103,38 +99,34 @@ TEST_F(Scan, ReadsALineByItsColumns) {
     const std::string read = " A0:11:22:33:44:55 ";
     const struct {
         std::string line;
-        std::string network;  // empty: none
-        std::string logged;
+        std::string network = "";  // empty: none
+        std::string logged = "";
     } kRows[] = {
         {ScanLine(6, "My Net", "0:1:2:a:B:cc", 70, "11b/g/n", "wpa2psk/aes"),
-         "[My Net] 00:01:02:0A:0B:CC 6 70 10 5 8 0", ""},
-        {ScanLine(140, " x ", kAddress, -52, "a/n", "None"), "[ x]" + read + "140 -52 9 1 1 0", ""},
+         "[My Net] 00:01:02:0A:0B:CC 6 70 10 5 8 0"},
+        {ScanLine(140, " x ", kAddress, -52, "a/n", "None"), "[ x]" + read + "140 -52 9 1 1 0"},
         {ScanLine(1, k32Bytes, kAddress, 9, "bg", "wep").erase(37, 1),
-         "[" + k32Bytes + "]" + read + "1 9 1 3 2 0", ""},
+         "[" + k32Bytes + "]" + read + "1 9 1 3 2 0"},
         {ScanLine(1, "$(id)%s%n", kAddress, 9, "b", "WPA3/SAE more words"),
-         "[$(id)%s%n]" + read + "1 9 2 0 0 0", ""},
+         "[$(id)%s%n]" + read + "1 9 2 0 0 0"},
         {ScanLine(1, "n", kAddress, 9, std::string(33, 'p'), "s"), "[n]" + read + "1 9 0 0 0 0",
          "Failed to parse security field 'pp'"},
         {ScanLine(1, "n", kAddress, 9, "b", "WPA2PSK"), "[n]" + read + "1 9 2 0 0 0",
          "Failed to parse security field 'WPA2PSK'"},
-        {ScanLine(1, "  \t ", kAddress, 9, "b", "NONE"), "", ""},
+        {ScanLine(1, "  \t ", kAddress, 9, "b", "NONE")},
         {"  x  no channel                      00:11:22:33:44:55 70 b NONE\n", "",
          "Failed to parse channel(  x  no"},
         {ScanLine(1, "n", "00-11-22-33-44-55", 9, "b", "NONE"), "", "network info(1    n  "},
         {ScanLine(1, "n", kAddress, 9, "b", ""), "", "Failed to parse network info(1    n  "},
         {"6    ends before its address       \n", "", "Failed to parse network info(6    ends"},
-        {"6    shorter than 32\n", "", ""},
-        {std::string("6    zero\0byte", 14) + Table(1), "", ""},
+        {"6    shorter than 32\n"},
+        {std::string("6    zero\0byte", 14) + Table(1)},
     };
     for (const auto& row : kRows) {
         SCOPED_TRACE(row.line);
         AddScanner(tools, {row.line});
         log.Clear();
-        std::vector<std::string> networks;
-        if (!row.network.empty()) {
-            networks.push_back(row.network);
-        }
-        EXPECT_EQ(Scanned(), networks);
+        EXPECT_EQ(Scanned(), row.network.empty() ? Texts{} : Texts{row.network});
         EXPECT_EQ(log.Has("Failed to parse"), !row.logged.empty());
         EXPECT_TRUE(log.Has(row.logged)) << log.Text();
     }
@@ -207,7 +199,7 @@ TEST_F(Scan, FindsOneNetworkAndTriggersAnotherScanWhenThereIsNone) {
     tools.ForgetCommands();
     WirelessNetwork network{};
     EXPECT_EQ(TAVIWirelessNetworkGet("0", WIRELESS_KEY_ESSID, &network), 1);
-    std::vector<std::string> commands(7, kTableCommand);
+    Texts commands(7, kTableCommand);
     commands.insert(commands.begin() + 5, "/sbin/iwlist wlan0 scanning");
     EXPECT_EQ(tools.Commands(), commands);
     EXPECT_EQ(TAVIWirelessNetworkGet(nullptr, 0, &network), -1);

@@ -107,3 +107,12 @@ extern "C" __attribute__((visibility("default"))) int socket(int domain, int typ
     static const auto next = reinterpret_cast<int (*)(int, int, int)>(dlsym(RTLD_NEXT, "socket"));
     return next(domain, type, protocol);
 }
+
+extern "C" __attribute__((visibility("default"))) int system(const char* command) {
+    if (living != nullptr && !living->unrunnable.empty() &&
+        strstr(command, living->unrunnable.c_str()) != nullptr) {
+        return -1;
+    }
+    static const auto next = reinterpret_cast<decltype(&system)>(dlsym(RTLD_NEXT, "system"));
+    return next(command);
+}

@@ -25,6 +25,12 @@ inline std::string Shell(const std::string& script) {
     return result.out;
 }
 
+// Puts a text into a record's field, which it may not fill up.
+template <size_t kSize>
+void SetField(char (&field)[kSize], const std::string& text) {
+    snprintf(field, kSize, "%s", text.c_str());
+}
+
 // What the model's settings say of Wi-Fi: "yes" or "no".
 inline void SetSupport(const std::string& support) {
     WriteFile("/etc.defaults/taviinfo.conf", "support_wireless=" + support + "\n");
