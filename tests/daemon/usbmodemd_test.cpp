@@ -186,7 +186,11 @@ TEST(Usbmodemd, RestartedKnowsTheConnectionThatRuns) {
     // Unplugged while connected: the dialler is ended.
     simulator.Unplug("0");
     EXPECT_TRUE(service.Lists({}));
-    EXPECT_EQ(RunProgram({"pgrep", "sleep"}).out, "");
+    const auto isDialling = [] { return RunProgram({"pgrep", "-x", "sleep"}).status == 0; };
+    for (int i = 0; i < 200 && isDialling(); ++i) {
+        std::this_thread::sleep_for(std::chrono::milliseconds(50));
+    }
+    EXPECT_FALSE(isDialling());
 }
 
 }  // namespace
