@@ -22,6 +22,7 @@ constexpr int kBadUsage = 2;
 struct Options {
     std::vector<std::string> modems;
     std::vector<std::string> ttys;
+    std::string onDial;
     std::vector<std::string> faults;
     Places places;
     bool control = false;
@@ -69,6 +70,11 @@ void Define(CLI::App& app, Options& options) {
                    "--modem and so on; such a modem gets no links and no info file")
         ->type_name("PATH[,PATH...]")
         ->allow_extra_args(false);
+    app.add_option(
+           "--on-dial", options.onDial,
+           "Run COMMAND with the line as its input and output when a connection is dialled; "
+           "its end ends the connection")
+        ->type_name("COMMAND");
     CLI::Option* linkDir =
         app.add_option("--link-dir", options.places.linkDir,
                        "Link the ports as DIR/ttyUSB0 and so on, while this runs")
@@ -97,6 +103,7 @@ void AddModems(const Options& options, Simulator& simulator) {
     for (size_t index = 0; index < modems.size(); ++index) {
         try {
             ModemDescription description = ParseModemDescription(modems[index]);
+            description.onDial = options.onDial;
             if (index < options.ttys.size()) {
                 description.ttys = Split(options.ttys[index], ',');
             }

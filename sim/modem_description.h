@@ -16,6 +16,7 @@ struct ModemDescription {
     std::optional<unsigned> id;     // nothing: the next free one
     std::string ports;              // empty: the personality's
     std::vector<std::string> ttys;  // empty: pseudo-terminals
+    std::string onDial;             // a command; empty: nobody is at the far end
     std::vector<std::string> faults;
     std::vector<std::pair<std::string, std::string>> settings;  // for Modem::Set, in order
 };

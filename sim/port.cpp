@@ -25,12 +25,13 @@ void Port::Plug(std::unique_ptr<SerialLine> line) {
 }
 
 void Port::Unplug() {
+    Forget();
     line_.reset();
     settledAt_.reset();
-    Forget();
 }
 
 void Port::Forget() {
+    call_.reset();
     inData_ = blocked_ = false;
     typed_.clear();
     output_.clear();
@@ -38,6 +39,12 @@ void Port::Forget() {
 }
 
 Port::Outcome Port::Work(Clock::time_point now) {
+    if (call_) {
+        if (!call_->HasEnded()) {
+            return Outcome::kServed;  // the line is the far end's
+        }
+        EndCall(now);
+    }
     const SerialLine::Input input = line_->Read();
     if (input.hasNewClient) {
         Forget();
@@ -57,6 +64,7 @@ Port::Outcome Port::Work(Clock::time_point now) {
     }
     Babble(now);
     SendDue(now);
+    StartCall();
     if (vanishAt_ && now >= *vanishAt_) {
         faults.vanishAfter.reset();
         return Outcome::kVanishes;
@@ -100,6 +108,20 @@ void Port::ReceiveLine(Clock::time_point now) {
     }
     const bool fails = !faults.failing.empty() && MatchesPattern(faults.failing, Normalise(line));
     Respond(fails ? Reply{{}, "ERROR"} : modem_.Answer(line), now);
+}
+
+void Port::StartCall() {
+    if (inData_ && output_.empty() && !onDial_.empty()) {
+        call_ = std::make_unique<Call>(onDial_, line_->Get());
+    }
+}
+
+// The far end has hung up, and so does the modem.
+void Port::EndCall(Clock::time_point now) {
+    call_.reset();
+    line_->Restart();
+    inData_ = false;
+    Respond(Reply{{}, "NO CARRIER"}, now);
 }
 
 void Port::LeaveData(Clock::time_point now) {

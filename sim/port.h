@@ -8,6 +8,7 @@
 #include <string>
 #include <vector>
 
+#include "sim/call.h"
 #include "sim/faults.h"
 #include "sim/modem.h"
 #include "sim/serial_line.h"
@@ -21,14 +22,21 @@ using Clock = std::chrono::steady_clock;
 // framing, faults and timing. It stays when its line is unplugged and comes back with a new one.
 class Port {
   public:
-    // `name` is how the transcript calls it, such as "0.2".
-    Port(Modem& modem, PortRole role, std::string name, Transcript& transcript)
-        : modem_(modem), role_(role), name_(std::move(name)), transcript_(transcript) {}
+    // `name` is how the transcript calls it, such as "0.2". The command `onDial`, if not empty, has
+    // the line during a connection, and its end ends the connection.
+    Port(Modem& modem, PortRole role, std::string name, std::string onDial, Transcript& transcript)
+        : modem_(modem),
+          role_(role),
+          name_(std::move(name)),
+          onDial_(std::move(onDial)),
+          transcript_(transcript) {}
 
     void Plug(std::unique_ptr<SerialLine> line);
     void Unplug();
     SerialLine* Line() const { return line_.get(); }
     PortRole Role() const { return role_; }
+    // What becomes readable when there is work to do.
+    int Awaited() const { return call_ ? call_->Get() : line_->Get(); }
 
     enum class Outcome { kServed, kHungUp, kVanishes };
 
@@ -57,6 +65,8 @@ class Port {
 
     void Receive(const std::string& bytes, Clock::time_point now);
     void ReceiveLine(Clock::time_point now);
+    void EndCall(Clock::time_point now);
+    void StartCall();
     void LeaveData(Clock::time_point now);
     void Echo(char c, Clock::time_point now);
     void Respond(const Reply& reply, Clock::time_point now);
@@ -69,8 +79,10 @@ class Port {
     Modem& modem_;
     PortRole role_;
     std::string name_;
+    std::string onDial_;
     Transcript& transcript_;
     std::unique_ptr<SerialLine> line_;
+    std::unique_ptr<Call> call_;  // ends before the line
     bool inData_ = false;
     bool blocked_ = false;
     std::string typed_;

@@ -204,6 +204,11 @@ void SerialLine::Refresh() {
     watch_.Reset(watchId_);
 }
 
+void SerialLine::Restart() {
+    tcflush(modemEnd_.Get(), TCIFLUSH);
+    SetRaw(modemEnd_.Get());
+}
+
 size_t SerialLine::Write(const std::string& bytes) {
     const ssize_t count = write(modemEnd_.Get(), bytes.data(), bytes.size());
     return count > 0 ? count : 0;

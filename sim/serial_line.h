@@ -68,6 +68,9 @@ class SerialLine {
     // waited for.
     bool HasClient() const { return hasClient_; }
 
+    // Sets the line up anew after another program had it, and drops what it left unread.
+    void Restart();
+
     // Writes as much as the line takes now, and returns how many bytes that were.
     size_t Write(const std::string& bytes);
 

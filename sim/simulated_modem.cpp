@@ -39,7 +39,7 @@ SimulatedModem::SimulatedModem(unsigned id, const ModemDescription& description,
     }
     for (size_t index = 0; index < roles.size(); ++index) {
         const std::string name = std::to_string(id) + "." + std::to_string(index);
-        ports_.emplace_back(modem_, roles[index], name, transcript);
+        ports_.emplace_back(modem_, roles[index], name, description.onDial, transcript);
         for (const auto& fault : description.faults) {
             ports_.back().faults.Add(fault);
         }
@@ -109,15 +109,24 @@ void SimulatedModem::Work(Clock::time_point now) {
             case Port::Outcome::kServed:
                 break;
             case Port::Outcome::kHungUp:
-                ports_[index].Unplug();
-                hungUp_.push_back(index);
-                reopenAt_ = now + kReopenPause;
-                break;
+                HangUp(now);
+                return;
             case Port::Outcome::kVanishes:
                 Unplug();
                 return;
         }
     }
+}
+
+// The ttys of a USB gadget are hung up together, but the call of a port may be late to notice.
+void SimulatedModem::HangUp(Clock::time_point now) {
+    hungUp_.clear();
+    for (size_t index = 0; index < ports_.size(); ++index) {
+        ports_[index].Unplug();
+        hungUp_.push_back(index);
+    }
+    modem_.PowerCycle();
+    reopenAt_ = now + kReopenPause;
 }
 
 void SimulatedModem::Reopen(Clock::time_point now) {

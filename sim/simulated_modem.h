@@ -49,6 +49,7 @@ class SimulatedModem {
   private:
     void PlugPort(size_t index);
     void NumberPorts();
+    void HangUp(Clock::time_point now);
     void Reopen(Clock::time_point now);
     void WriteInfo();
     void RemoveInfo();

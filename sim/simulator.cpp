@@ -68,7 +68,7 @@ bool Simulator::ServeUntil(int extra, int stop) {
             for (const Port& port : modem->Ports()) {
                 if (port.Line() != nullptr && port.Line()->HasClient()) {
                     const short events = port.IsBlocked() ? POLLIN | POLLOUT : POLLIN;
-                    ready.push_back({port.Line()->Get(), events, 0});
+                    ready.push_back({port.Awaited(), events, 0});
                 }
             }
         }

@@ -95,5 +95,26 @@ TEST(Plug, AGivenTtyAnswersWithoutLinkAndInfoFileAndIsReopenedAfterAHangUp) {
     }
 }
 
+TEST(Plug, AModemLosesPowerWhenItsGivenTtysHangUp) {
+    ModemSimulator far({"--fault", "0:silent"});
+    fs::create_directory("/tmp/near");
+    ModemSimulator near("/tmp/near", {"--modem", "generic,pin=1234", "--tty", "/dev/ttyUSB1"});
+    const auto answers = [&far](const char* command) {
+        std::vector<std::string> lines;
+        for (int i = 0; i < 100 && lines.size() < 2; ++i) {  // the echo, and what it says
+            far.Send("0.1", command);
+            std::this_thread::sleep_for(std::chrono::milliseconds(20));
+            lines = far.Received("0.1");
+        }
+        return lines;
+    };
+    answers("AT+CPIN=1234\r");
+    EXPECT_THAT(answers("AT+CPIN?\r"), testing::Contains("+CPIN: READY"));
+    far.Unplug("0");
+    near.Command("received 0");
+    far.Plug("0");
+    EXPECT_THAT(answers("AT+CPIN?\r"), testing::Contains("+CPIN: SIM PIN"));
+}
+
 }  // namespace
 }  // namespace taviwireless::test
