@@ -1,5 +1,8 @@
 #include "cli/wifi/access.h"
 
+#include <linux/wireless.h>
+#include <sys/ioctl.h>
+#include <sys/socket.h>
 #include <tavisdk/network.h>
 #include <tavisdk/wireless.h>
 #include <unistd.h>
@@ -24,6 +27,21 @@ std::vector<Record> Take(WirelessLink& head) {
         records.push_back(*record);
     }
     return records;
+}
+
+// The access point that the driver is associated with, as it says. What the library wrote down when
+// it joined knows no address of a hidden network, and not which of several of one name it became.
+void UpdateBssid(unsigned char (&bssid)[6]) {
+    iwreq request{};
+    SetField(request.ifr_name, WifiInterface());
+    const int handle = socket(AF_INET, SOCK_DGRAM | SOCK_CLOEXEC, 0);
+    if (handle < 0) {
+        return;
+    }
+    if (ioctl(handle, SIOCGIWAP, &request) == 0) {
+        std::copy_n(request.u.ap_addr.sa_data, sizeof bssid, bssid);
+    }
+    close(handle);
 }
 
 }  // namespace
@@ -114,6 +132,9 @@ bool IsInNetwork(int status) {
 WirelessStatus LookAtWifi() {
     WirelessStatus status{};
     TAVIWirelessStatusGet(&status);
+    if (status.status == WIRELESS_STATUS_CONNECTED) {
+        UpdateBssid(status.network.bssid);
+    }
     return status;
 }
 

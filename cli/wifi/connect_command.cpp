@@ -146,12 +146,12 @@ class Joining {
     }
 
     // A network is saved under the address of its access point. A hidden one tells it once it was
-    // joined, mostly; else it is saved under zeros, where there is room for one.
-    void FindBssid(WirelessNetwork& network) const {
-        WirelessNetwork found{};
-        if (BssidText(network.bssid).empty() &&
-            TAVIWirelessNetworkGet(network.essid, WIRELESS_KEY_ESSID, &found) == 1) {
-            std::copy(std::begin(found.bssid), std::end(found.bssid), network.bssid);
+    // joined.
+    static void FindBssid(WirelessNetwork& network) {
+        if (BssidText(network.bssid).empty()) {
+            const WirelessStatus status = LookAtWifi();
+            std::copy(std::begin(status.network.bssid), std::end(status.network.bssid),
+                      network.bssid);
         }
     }
 

@@ -125,6 +125,8 @@ TEST_F(WifiCommands, AHiddenNetworkIsDescribedOnceAndRemembered) {
     const RunResult joined =
         Wifi({"connect", "Cave", "--hidden", "--security", "wpa2"}, "the right key\n");
     EXPECT_EQ(joined.out, "wlan0: connected to Cave, 192.168.9.30\n") << joined.err;
+    EXPECT_THAT(Wifi({"status"}).out, HasSubstr("BSSID      11:11:11:11:11:11\n"));
+    EXPECT_THAT(Wifi({"saved", "show", "Cave"}).out, HasSubstr("BSSID      11:11:11:11:11:11\n"));
     EXPECT_EQ(Wifi({"connect", "Cave", "--hidden"}).status, 0);
 }
 
