@@ -62,11 +62,11 @@ TEST(DefaultGateway, IsThatOfTheLowestMetric) {
 TEST(DefaultGateway, IsReplacedInItsPlace) {
     MakeInterface("eth7", "10.7.0.2/24");
     EXPECT_EQ(TAVINetDefaultGatewaySet("10.7.0.1"), 0);
-    EXPECT_EQ(Ip("route show default"), "default via 10.7.0.1 dev eth7 proto static \n");
+    EXPECT_EQ(Ip("route show default"), "default via 10.7.0.1 dev eth7 \n");
     Ip("route delete default");
     Ip("route add default via 10.7.0.1 metric 100");
     EXPECT_EQ(TAVINetDefaultGatewaySet("10.7.0.9"), 0);
-    EXPECT_EQ(Ip("route show default"), "default via 10.7.0.9 dev eth7 proto static metric 100 \n");
+    EXPECT_EQ(Ip("route show default"), "default via 10.7.0.9 dev eth7 metric 100 \n");
 }
 
 TEST(DefaultGateway, ThatCannotBeSetLeavesTheOldOne) {

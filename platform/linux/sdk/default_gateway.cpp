@@ -119,6 +119,9 @@ int TAVINetDefaultGatewaySet(const char* gateway) {
         Require(rtnl_route_set_dst(route.get(), everywhere.get()));
         // The same metric, so that it takes the old route's place instead of standing beside it.
         rtnl_route_set_priority(route.get(), old ? rtnl_route_get_priority(old.get()) : 0);
+        // As of the routes that pppd sets: a second one like it is refused then. Of another
+        // protocol, it would stand beside this one.
+        rtnl_route_set_protocol(route.get(), RTPROT_BOOT);
         rtnl_route_nh_set_gateway(hop.get(), address.get());
         rtnl_route_add_nexthop(route.get(), hop.release());  // it owns the hop now
         Require(rtnl_route_add(socket.get(), route.get(), NLM_F_CREATE | NLM_F_REPLACE));
