@@ -1,0 +1,173 @@
+#!/bin/bash
+# The Wi-Fi access point: the product's on wlan0, with the real hostapd and udhcpd. A real station at wlan1
+# joins it by wpa_supplicant and udhcpc; wlan2 is a neighbour's access point.
+# shellcheck source=tests/vm/common.sh
+. "$(dirname "$0")/common.sh"
+# shellcheck source=tests/vm/radio.sh
+. "$(dirname "$0")/radio.sh"
+
+ap() {
+    taviwireless ap "$@"
+}
+
+status_of() {
+    ap status | sed -n "s/^$1  *//p"
+}
+
+# join NETWORK PASSPHRASE: what a station does at home.
+join() {
+    leave
+    printf '%s\n' ctrl_interface=/run/station "network={" "ssid=\"$1\"" "psk=\"$2\"" scan_ssid=1 "}" >/run/station.conf
+    in_air wpa_supplicant -B -Dnl80211 -iwlan1 -c/run/station.conf -P/run/station.pid
+    wait_for 30 has_joined
+}
+has_joined() {
+    in_air wpa_cli -p /run/station -i wlan1 status | grep -qx wpa_state=COMPLETED
+}
+
+# Everything that the station has of the access point, if it has something.
+leave() {
+    [ ! -e /run/station.pid ] || kill "$(cat /run/station.pid)"
+    wait_for 5 test ! -e /run/station.pid
+    in_air ip addr flush dev wlan1
+}
+
+# Prints the lease in words: "ip=10.1.14.2 ...".
+lease() {
+    cat >/run/station.script <<'END'
+#!/bin/sh
+[ "$1" = bound ] || exit 0
+ip addr replace "$ip/$mask" dev "$interface"
+echo "ip=$ip mask=$mask router=$router dns=$dns" >/run/station.lease
+END
+    chmod +x /run/station.script
+    rm -f /run/station.lease
+    in_air udhcpc -i wlan1 -n -q -f -t 5 -T 2 -s /run/station.script >&2
+    cat /run/station.lease
+}
+
+set_up() {
+    plug_radios 3
+    configure_ap wlan2 Neighbour 1
+    /usr/tavi/hotplug/usb.plug
+    holds "$(cat /tmp/wireless.info)" "^AP_SUPPORT=yes$"
+    holds "$(ap status)" "^State +off$"
+}
+
+sets_and_checks() {
+    ap set ssid="My Home" security=wpa2 passphrase channel=6 <<<"correct horse"
+    same 600 "$(stat -c %a /usr/tavi/etc/wireless_ap.conf)"
+    must_fail grep -F "correct horse" <<<"$(ap show)"
+    ap check
+}
+
+enables() {
+    ap enable
+    same on "$(status_of State)"
+    same 10.1.14.1 "$(status_of Address)"
+    wait_for 5 is_on_air
+    holds "$(ip -4 addr show lbr0)" "inet 10.1.14.1/24 "
+    same lbr0 "$(basename "$(readlink /sys/class/net/wlan0/master)")"
+    same 600 "$(stat -c %a /etc/hostapd/hostapd-wlan0-host.conf)"
+    pgrep -x hostapd
+    pgrep -x udhcpd
+    must_fail test -e /var/tmp/.wireless_ap_connecting
+}
+is_on_air() {
+    [ "$(iw dev wlan0 info | grep -cE 'ssid My Home$|type AP$|channel 6 ')" = 3 ]
+}
+
+serves_station() {
+    join "My Home" "correct horse"
+    local leased
+    leased=$(lease)
+    holds "$leased" "^ip=10\.1\.14\.([2-9]|[1-9][0-9]|1[0-9][0-9]|2[0-4][0-9]|25[0-4]) mask=24 router=10.1.14.1 "
+    in_air ping -c 2 -i 0.2 -W 2 10.1.14.1
+    iw dev wlan0 station dump | grep "^Station $(in_air cat /sys/class/net/wlan1/address)"
+}
+
+turns_away() {
+    is_on_air
+    leave
+    printf '%s\n' ctrl_interface=/run/station "network={" 'ssid="My Home"' 'psk="wrong horse"' "}" >/run/station.conf
+    in_air wpa_supplicant -B -Dnl80211 -iwlan1 -c/run/station.conf -P/run/station.pid
+    sleep 12
+    must_fail has_joined
+    leave
+}
+
+disables() {
+    is_on_air
+    ap disable
+    same off "$(status_of State)"
+    wait_for 3 ended hostapd
+    wait_for 3 ended udhcpd
+    must_fail ip link show lbr0
+    same "" "$(ip -4 addr show wlan0)"
+    must_fail grep -r 'passphrase=' /run/hostapd-wlan0.conf
+    must_fail is_on_air
+}
+
+# The user had changed the range; switched off and on again it still holds, and is what a station gets.
+restores_dhcp() {
+    ap enable
+    sed -i 's/^start=.*/start="10.1.14.100"/' /etc/dhcpd/dhcpd-lbr0-lbr0.info
+    ap disable
+    must_fail test -e /etc/dhcpd/dhcpd-lbr0-lbr0.info
+    ap enable
+    join "My Home" "correct horse"
+    holds "$(lease)" "^ip=10\.1\.14\.(1[0-9][0-9]|2[0-4][0-9]|25[0-4]) "
+    in_air ping -c 2 -i 0.2 -W 2 10.1.14.1
+}
+
+# Enabled while it is on, with another channel and name.
+changes_settings() {
+    ap set ssid="My Castle" channel=11
+    ap enable
+    join "My Castle" "correct horse"
+    lease
+    in_air ping -c 2 -i 0.2 -W 2 10.1.14.1
+    holds "$(iw dev wlan0 info)" "channel 11 "
+}
+
+# The guests' bridge and its addresses are the model's own.
+serves_guests() {
+    echo support_pci_wifi=yes >>/etc.defaults/taviinfo.conf
+    printf '%s\n' DEVICE=gbr TYPE=Bridge ONBOOT=yes BOOTPROTO=static IPADDR=10.1.15.1 NETMASK=255.255.255.0 \
+        >/etc/sysconfig/network-scripts/ifcfg-gbr
+    printf '%s\n' enable=yes reserved=30 lease=3600 start=10.1.15.50 end=10.1.15.59 interface=gbr bridge=gbr \
+        gateway=10.1.15.1 nameserver=10.1.15.1 netmask=255.255.255.0 >/etc/dhcpd/dhcpd-gbr-gbr.info
+    ap disable # which has the server's own file made of that
+    ap set guest=yes guest-ssid=Visitors guest-security=wpa2 guest-passphrase <<<"welcome friend"
+    ap enable
+    join Visitors "welcome friend"
+    holds "$(lease)" "^ip=10.1.15.5[0-9] "
+    in_air ping -c 2 -i 0.2 -W 2 10.1.15.1
+    same gbr "$(basename "$(readlink /sys/class/net/gwlan/master)")"
+    join "My Castle" "correct horse"
+    holds "$(lease)" "^ip=10\.1\.14\."
+    ap disable
+    must_fail ip link show gbr
+    wait_for 3 ended hostapd
+}
+
+is_station_again() {
+    start_ap wlan2
+    taviwireless wifi mode client
+    holds "$(taviwireless wifi scan)" "^Neighbour .* 02:00:00:00:02:00$"
+}
+
+mkdir -p /etc.defaults
+echo support_wireless=yes >/etc.defaults/taviinfo.conf
+
+scenario "the adapter can be an access point" set_up
+[ "$scenario_status" = 0 ] || exit 0
+scenario "takes settings, and hostapd understands them" sets_and_checks
+scenario "switches on, with bridge and address" enables
+scenario "a station joins, gets a lease and reaches it" serves_station
+scenario "a station with a wrong key stays out" turns_away
+scenario "switches off, and leaves nothing" disables
+scenario "keeps the DHCP settings from one time to the next" restores_dhcp
+scenario "takes new settings while it is on" changes_settings
+scenario "serves guests on a network of their own" serves_guests
+scenario "the adapter is a station again" is_station_again
