@@ -1,6 +1,8 @@
 #ifndef TAVIWIRELESS_USBMODEM_STATE_FILES_H
 #define TAVIWIRELESS_USBMODEM_STATE_FILES_H
 
+#include <sys/types.h>
+
 #include <string>
 
 // Where the state of modems and SIM cards is kept.
@@ -12,7 +14,10 @@ inline constexpr char kDialLogPrefix[] = "/var/lib/usbmodem/wvdial.log.";       
 inline constexpr char kPidFilePrefix[] = "/var/lib/usbmodem/usbmodem.pid.";  // and the interface id
 inline constexpr char kStateFilePrefix[] = "/var/lib/usbmodem/usbmodem.conf.";  // likewise
 
-// Makes path an empty file, whatever file it was.
+// A profile holds a password, a dialler's log whom the user calls.
+inline constexpr mode_t kStateFileMode = 0600;
+
+// Makes path an empty file that only its owner may read, whatever file it was.
 bool MakeEmptyFile(const std::string& path);
 
 }  // namespace taviwireless::usbmodem_lib

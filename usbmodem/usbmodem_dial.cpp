@@ -26,7 +26,6 @@ constexpr char kInit[] = "Init1=ATZ";
 constexpr char kBaud[] = "Baud=460800";
 constexpr char kDefaultNumber[] = "*99#";
 constexpr char kDefaultUser[] = "Unknown";
-constexpr mode_t kLogMode = 0600;
 
 std::string OrElse(const std::string& value, const char* standard) {
     return value.empty() ? standard : value;
@@ -36,7 +35,7 @@ std::string OrElse(const std::string& value, const char* standard) {
 // parent that the pid file is written.
 [[noreturn]] void BecomeDialler(char* const arguments[], const char* pidFile, const char* logFile,
                                 int hasPidFile) {
-    const int log = open(logFile, O_RDWR | O_CREAT, kLogMode);
+    const int log = open(logFile, O_RDWR | O_CREAT, kStateFileMode);
     VEXACProcPidFileCreate(pidFile);
     close(hasPidFile);
     VEXACFileCloseLock(dup2(log, STDERR_FILENO));

@@ -15,7 +15,6 @@ namespace {
 constexpr char kSection[] = "USBModem Profile";
 constexpr char kLineFormat[] = "%s=%s\n";
 constexpr mode_t kDirectoryMode = 0775;
-constexpr mode_t kProfileMode = 0600;  // it holds the password
 
 constexpr char kDefaultNumber[] = "*99#";
 constexpr char kDefaultUser[] = "Unknown";
@@ -41,7 +40,7 @@ int USBModem::ResetProfile() {
     }
     const char* path = profilePath_.c_str();
     // Closed to others before the first byte is in it; every later write keeps the mode.
-    if (!MakeEmptyFile(profilePath_) || chmod(path, kProfileMode) != 0) {
+    if (!MakeEmptyFile(profilePath_)) {
         TAVI_LOG_ERROR("Error on reset profile: touch profile %s", path);
     }
     SzHash profile(1024);
@@ -84,7 +83,7 @@ int USBModem::InitProfile() {
         TAVI_LOG_ERROR("Error on init profile: reset %s", profilePath_.c_str());
         return -1;
     }
-    if (chmod(profilePath_.c_str(), kProfileMode) != 0) {
+    if (chmod(profilePath_.c_str(), kStateFileMode) != 0) {
         TAVI_LOG_ERROR("Failed to chmod for file [%s]", profilePath_.c_str());
         return -1;
     }

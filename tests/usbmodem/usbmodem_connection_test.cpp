@@ -162,6 +162,7 @@ TEST(Dialling, TheDiallerHasNothingOfItsCallersAndLeavesNoZombie) {
     EXPECT_THAT(descriptors, HasSubstr("2 -> " + std::string(kLog)));
     EXPECT_THAT(descriptors, testing::Not(HasSubstr("/dev/pts")));
     EXPECT_THAT(descriptors, testing::Not(HasSubstr("pipe:")));
+    EXPECT_EQ(FileMode(kLog), 0600u);
     EXPECT_EQ(modem.record.NetDisconnect(), 0);
     EXPECT_TRUE(modem.BecomesStatus("disconnected"));
     EXPECT_EQ(waitpid(-1, nullptr, WNOHANG), 0);  // the simulator lives; nobody else is ours
