@@ -47,13 +47,13 @@ resident_memory() { # PROGRAM, in MB
 # measure WHO BUS LISTED GONE LIST PROGRAM
 measure() {
     plug
-    take "$1.plug" wait_for 60 "$3"
+    take "$1.plug" wait_for 120 "$3"
     take "$1.call" five_times "$2"
     # shellcheck disable=SC2086 # words of a command
     take "$1.list" five_times $5
     resident_memory "$6" >"/run/peer/$1.memory"
     unplug
-    take "$1.unplug" wait_for 30 "$4"
+    take "$1.unplug" wait_for 60 "$4"
 }
 
 measures_ours() {
