@@ -7,6 +7,7 @@
 
 #include <cerrno>
 #include <cstdio>
+#include <cstdlib>
 #include <cstring>
 #include <memory>
 
@@ -74,6 +75,9 @@ std::string CauseOfFailure() {
     }
     if (statvfs("/etc", &disk) == 0 && disk.f_bavail == 0) {
         return "there is no space left for files in /etc";
+    }
+    if (system("command -v iwlist >/dev/null") != 0) {
+        return "there is no program iwlist to ask for channels; install it";
     }
     if (!HasChannels()) {
         return "the adapter offers no channel; is its radio switched off? (rfkill list)";

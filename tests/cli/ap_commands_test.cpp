@@ -230,6 +230,8 @@ TEST_F(APCommands, AFailedStartSaysWhyAndLeavesItOff) {
          "/etc cannot be written: Read-only file system"},
         {"mount -t tmpfs -o size=4k none /etc; yes > /etc/all 2> /dev/null || true", "umount /etc",
          "there is no space left for files in /etc"},
+        {"chmod a-x /usr/sbin/iwlist", "chmod a+x /usr/sbin/iwlist",
+         "there is no program iwlist to ask for channels; install it"},
         {"mv /usr/sbin/iwlist /tmp; ln -s /bin/true /usr/sbin/iwlist", "mv /tmp/iwlist /usr/sbin",
          "the adapter offers no channel; is its radio switched off? (rfkill list)"},
     };
