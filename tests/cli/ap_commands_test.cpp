@@ -228,7 +228,7 @@ TEST_F(APCommands, AFailedStartSaysWhyAndLeavesItOff) {
          "the system log tells why, and --verbose shows it"},
         {"mount --bind /etc /etc; mount -o remount,bind,ro /etc", "umount /etc",
          "/etc cannot be written: Read-only file system"},
-        {"mount -t tmpfs -o size=4k none /etc; yes > /etc/all 2> /dev/null || true", "umount /etc",
+        {"mount -t tmpfs -o size=4k none /etc; ! yes > /etc/all 2> /dev/null", "umount /etc",
          "there is no space left for files in /etc"},
         {"chmod a-x /usr/sbin/iwlist", "chmod a+x /usr/sbin/iwlist",
          "there is no program iwlist to ask for channels; install it"},

@@ -94,10 +94,9 @@ TEST(ApplianceRoot, DiesWithTheProcessOutside) {
 
 // The program must be reachable for others, which a checkout in somebody's home is not.
 TEST(ApplianceRoot, NeedsNoPrivilegeWhereUserNamespacesAreAllowed) {
-    const std::vector<std::string> nobody = {"setpriv", "--reuid=65534", "--regid=65534",
-                                             "--clear-groups"};
-    if (geteuid() != 0) {
-        GTEST_SKIP() << "not run by root: the other cases tested this";
+    std::vector<std::string> nobody;  // before a command; not needed by somebody else than root
+    if (geteuid() == 0) {
+        nobody = {"setpriv", "--reuid=65534", "--regid=65534", "--clear-groups"};
     }
     auto command = nobody;
     command.insert(command.end(),

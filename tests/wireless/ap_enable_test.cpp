@@ -207,8 +207,8 @@ TEST(Enable, FailsCleanlyAndWorksWhenTheCauseIsGone) {
     const std::string folder = "/etc/sysconfig/network-scripts";
     const std::string bridge = kBridgeFile, interface = kInterfaceFile, settings = kSettings;
     const auto full = [](const std::string& path) {
-        return "mkdir -p " + path + "; mount -t tmpfs -o size=4k none " + path + "; yes > " + path +
-               "/all 2> /dev/null || true";
+        return "mkdir -p " + path + "; mount -t tmpfs -o size=4k none " + path + "; ! yes > " +
+               path + "/all 2> /dev/null";
     };
     const std::string ofBridge = "Failed to set bridge[lbr0] config.";
     const std::string ofHostapd = "Failed to set hostapd conf of interface [wlan0].";
