@@ -1,8 +1,5 @@
 #include "cli/wifi/access.h"
 
-#include <linux/wireless.h>
-#include <sys/ioctl.h>
-#include <sys/socket.h>
 #include <tavisdk/network.h>
 #include <tavisdk/wireless.h>
 #include <unistd.h>
@@ -10,6 +7,8 @@
 #include <algorithm>
 #include <cstdlib>
 #include <memory>
+
+#include "wireless/driver_request.h"
 
 namespace taviwireless::cli {
 
@@ -33,15 +32,9 @@ std::vector<Record> Take(WirelessLink& head) {
 // it joined knows no address of a hidden network, and not which of several of one name it became.
 void UpdateBssid(unsigned char (&bssid)[6]) {
     iwreq request{};
-    SetField(request.ifr_name, WifiInterface());
-    const int handle = socket(AF_INET, SOCK_DGRAM | SOCK_CLOEXEC, 0);
-    if (handle < 0) {
-        return;
-    }
-    if (ioctl(handle, SIOCGIWAP, &request) == 0) {
+    if (wireless::RequestDriver(SIOCGIWAP, request) == wireless::DriverResult::kDone) {
         std::copy_n(request.u.ap_addr.sa_data, sizeof bssid, bssid);
     }
-    close(handle);
 }
 
 }  // namespace
