@@ -46,7 +46,7 @@ Call::Call(const std::string& command, int line) : line_(line) {
     if (process_ == 0) {
         Become(command, line);
     }
-    handle_ = Descriptor(process_ > 0 ? pidfd_open(process_, 0) : -1);
+    handle_ = UniqueFd(process_ > 0 ? pidfd_open(process_, 0) : -1);
     if (handle_.Get() < 0) {
         const std::string reason = std::strerror(errno);
         if (process_ > 0) {

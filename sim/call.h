@@ -5,7 +5,7 @@
 
 #include <string>
 
-#include "sim/descriptor.h"
+#include "base/unique_fd.h"
 
 namespace taviwireless::sim {
 
@@ -26,7 +26,7 @@ class Call {
   private:
     int line_;
     pid_t process_;
-    Descriptor handle_;
+    UniqueFd handle_;
 };
 
 }  // namespace taviwireless::sim

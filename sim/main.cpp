@@ -14,6 +14,7 @@
 
 namespace {
 
+using taviwireless::UniqueFd;
 using namespace taviwireless::sim;
 
 constexpr int kFailed = 1;
@@ -132,7 +133,7 @@ void AddFaults(const Options& options, Simulator& simulator) {
 }
 
 // Readable when this program is told to end, so that links and info files are removed then.
-Descriptor EndSignals() {
+UniqueFd EndSignals() {
     sigset_t signals;
     sigemptyset(&signals);
     for (const int number : {SIGINT, SIGTERM, SIGHUP}) {
@@ -140,7 +141,7 @@ Descriptor EndSignals() {
     }
     sigprocmask(SIG_BLOCK, &signals, nullptr);
     signal(SIGPIPE, SIG_IGN);
-    return Descriptor(signalfd(-1, &signals, SFD_CLOEXEC));
+    return UniqueFd(signalfd(-1, &signals, SFD_CLOEXEC));
 }
 
 // Carries out the commands of standard input; returns when it ends or says quit.
@@ -165,7 +166,7 @@ void RunControl(Simulator& simulator, int stop) {
 }
 
 void Run(const Options& options) {
-    const Descriptor stop = EndSignals();
+    const UniqueFd stop = EndSignals();
     Simulator simulator(options.places,
                         options.log.empty() ? Transcript() : Transcript(options.log));
     AddModems(options, simulator);

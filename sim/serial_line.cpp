@@ -119,7 +119,7 @@ SerialLine::~SerialLine() {
 }
 
 void SerialLine::OpenPseudoTerminal() {
-    modemEnd_ = Descriptor(posix_openpt(O_RDWR | O_NOCTTY | O_NONBLOCK | O_CLOEXEC));
+    modemEnd_ = UniqueFd(posix_openpt(O_RDWR | O_NOCTTY | O_NONBLOCK | O_CLOEXEC));
     char path[64];
     if (modemEnd_.Get() < 0 || grantpt(modemEnd_.Get()) != 0 || unlockpt(modemEnd_.Get()) != 0 ||
         ptsname_r(modemEnd_.Get(), path, sizeof path) != 0) {
@@ -127,7 +127,7 @@ void SerialLine::OpenPseudoTerminal() {
     }
     path_ = path;
     // The system tells that nobody has it open only once somebody had.
-    const Descriptor first(open(path, O_RDWR | O_NOCTTY | O_CLOEXEC));
+    const UniqueFd first(open(path, O_RDWR | O_NOCTTY | O_CLOEXEC));
     if (first.Get() < 0) {
         Fail("Cannot open " + path_);
     }
@@ -136,7 +136,7 @@ void SerialLine::OpenPseudoTerminal() {
 }
 
 void SerialLine::OpenGiven() {
-    modemEnd_ = Descriptor(open(path_.c_str(), O_RDWR | O_NOCTTY | O_NONBLOCK | O_CLOEXEC));
+    modemEnd_ = UniqueFd(open(path_.c_str(), O_RDWR | O_NOCTTY | O_NONBLOCK | O_CLOEXEC));
     if (modemEnd_.Get() < 0) {
         Fail("Cannot open " + path_);
     }
@@ -197,7 +197,7 @@ bool SerialLine::IsOpened() const {
 // clients' end can do the first; opening it must not pass for another client.
 void SerialLine::Refresh() {
     {
-        const Descriptor clientEnd(open(path_.c_str(), O_RDWR | O_NOCTTY | O_CLOEXEC));
+        const UniqueFd clientEnd(open(path_.c_str(), O_RDWR | O_NOCTTY | O_CLOEXEC));
         tcflush(clientEnd.Get(), TCIFLUSH);
     }
     SetRaw(modemEnd_.Get());

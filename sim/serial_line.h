@@ -4,7 +4,7 @@
 #include <map>
 #include <string>
 
-#include "sim/descriptor.h"
+#include "base/unique_fd.h"
 
 namespace taviwireless::sim {
 
@@ -36,7 +36,7 @@ class OpenWatch {
 
     void ReadEvents();
 
-    Descriptor inotify_;
+    UniqueFd inotify_;
     std::map<int, File> files_;
 };
 
@@ -86,7 +86,7 @@ class SerialLine {
     std::string link_;
     OpenWatch& watch_;
     int watchId_ = -1;
-    Descriptor modemEnd_;
+    UniqueFd modemEnd_;
     bool hasClient_ = true;
 };
 

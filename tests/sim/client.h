@@ -8,7 +8,7 @@
 #include <stdexcept>
 #include <string>
 
-#include "sim/descriptor.h"
+#include "base/unique_fd.h"
 
 namespace taviwireless::test {
 
@@ -77,7 +77,7 @@ class Client {
         return line == "OK" || line == "CONNECT" || line.find("ERROR") != std::string::npos;
     }
 
-    sim::Descriptor line_;
+    UniqueFd line_;
     bool hungUp_ = false;
 };
 

@@ -15,7 +15,7 @@
 #include <thread>
 #include <utility>
 
-#include "platform/linux/core/unique_fd.h"
+#include "base/unique_fd.h"
 
 namespace taviwireless::test {
 namespace {
@@ -23,7 +23,7 @@ namespace {
 using Clock = std::chrono::steady_clock;
 using Milliseconds = Process::Milliseconds;
 
-using Descriptor = tavicore::UniqueFd;
+using Descriptor = UniqueFd;
 
 struct Pipe {
     Descriptor reading;

@@ -12,10 +12,10 @@
 #include <string>
 #include <vector>
 
+#include "base/unique_fd.h"
 #include "failure.h"
 #include "line.h"
 #include "text_file.h"
-#include "unique_fd.h"
 
 using namespace tavicore;
 

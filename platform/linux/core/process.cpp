@@ -7,10 +7,10 @@
 #include <cstdlib>
 #include <optional>
 
+#include "base/unique_fd.h"
 #include "failure.h"
 #include "line.h"
 #include "text_file.h"
-#include "unique_fd.h"
 
 // glibc 2.36 does not declare these as C functions itself.
 extern "C" {

@@ -6,10 +6,12 @@
 #include <functional>
 #include <string>
 
-#include "unique_fd.h"
+#include "base/unique_fd.h"
 
 // Whole text files: read, and replaced in one step. Everything here throws Failure.
 namespace tavicore {
+
+using taviwireless::UniqueFd;
 
 // A regular file that is open for reading. Anything else at the path is a failure and is never
 // waited for.

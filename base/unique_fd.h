@@ -1,11 +1,11 @@
-#ifndef TAVICORE_UNIQUE_FD_H
-#define TAVICORE_UNIQUE_FD_H
+#ifndef TAVIWIRELESS_BASE_UNIQUE_FD_H
+#define TAVIWIRELESS_BASE_UNIQUE_FD_H
 
 #include <unistd.h>
 
 #include <utility>
 
-namespace tavicore {
+namespace taviwireless {
 
 // A descriptor that closes itself; negative when there is none.
 class UniqueFd {
@@ -31,6 +31,6 @@ class UniqueFd {
     int number_;
 };
 
-}  // namespace tavicore
+}  // namespace taviwireless
 
 #endif

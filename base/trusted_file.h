@@ -1,0 +1,67 @@
+#ifndef TAVIWIRELESS_BASE_TRUSTED_FILE_H
+#define TAVIWIRELESS_BASE_TRUSTED_FILE_H
+
+#include <fcntl.h>
+#include <sys/stat.h>
+#include <sys/types.h>
+#include <unistd.h>
+
+#include <cerrno>
+#include <optional>
+#include <string>
+
+#include "base/unique_fd.h"
+
+// Files in folders that others can write in, such as "/tmp/". Whoever is on the machine may put
+// anything there under any name: only a regular file of root or of the own user counts.
+namespace taviwireless {
+
+constexpr off_t kTrustedFileLimit = 65536;  // bytes; far above what any of these files holds
+
+// Opens path for reading. Never follows a link at its end and never waits for the other end of a
+// pipe. Without a descriptor errno tells why: ENOENT when nothing is there, ELOOP for a link, EPERM
+// for what is no regular file or somebody else's, EFBIG when it holds more than limit bytes.
+inline UniqueFd OpenTrusted(const std::string& path, off_t limit = kTrustedFileLimit) {
+    UniqueFd file(open(path.c_str(), O_RDONLY | O_NOFOLLOW | O_NONBLOCK | O_NOCTTY | O_CLOEXEC));
+    struct stat status {};
+    if (!file || fstat(file.Get(), &status) != 0) {
+        return UniqueFd();
+    }
+    const bool isOurs = status.st_uid == 0 || status.st_uid == geteuid();
+    if (!S_ISREG(status.st_mode) || !isOurs) {
+        file.Close();
+        errno = EPERM;
+    } else if (status.st_size > limit) {
+        file.Close();
+        errno = EFBIG;
+    }
+    return file;
+}
+
+// The whole text of path, which OpenTrusted must accept; nothing, with errno, when it does not or
+// when reading fails. A file that grows meanwhile is cut at limit.
+inline std::optional<std::string> ReadTrusted(const std::string& path,
+                                              off_t limit = kTrustedFileLimit) {
+    const UniqueFd file = OpenTrusted(path, limit);
+    if (!file) {
+        return std::nullopt;
+    }
+    std::string text(static_cast<size_t>(limit), '\0');
+    size_t length = 0;
+    while (length < text.size()) {
+        const ssize_t count = read(file.Get(), &text[length], text.size() - length);
+        if (count < 0 && errno != EINTR) {
+            return std::nullopt;
+        }
+        if (count == 0) {
+            break;
+        }
+        length += count > 0 ? static_cast<size_t>(count) : 0;
+    }
+    text.resize(length);
+    return text;
+}
+
+}  // namespace taviwireless
+
+#endif
