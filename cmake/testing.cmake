@@ -3,10 +3,22 @@
 find_package(GTest REQUIRED)
 include(GoogleTest)
 
+# GoogleTest's header takes most of the time in which a test is compiled, so that is done once, with the options of the
+# test programs: otherwise they could not use it.
+file(CONFIGURE OUTPUT headers.cpp CONTENT "")
+add_library(tavi_test_headers OBJECT ${CMAKE_CURRENT_BINARY_DIR}/headers.cpp)
+set_target_properties(tavi_test_headers PROPERTIES POSITION_INDEPENDENT_CODE OFF)
+target_compile_options(tavi_test_headers PRIVATE -fPIE -pthread)
+target_link_libraries(tavi_test_headers PRIVATE GTest::gmock)
+target_precompile_headers(tavi_test_headers PRIVATE
+  <gmock/gmock.h> <chrono> <filesystem> <fstream> <functional> <optional> <string> <thread> <vector>)
+
 function(tavi_add_test)
   cmake_parse_arguments(TEST "" "NAME" "SOURCES;LIBS" ${ARGN})
   add_executable(${TEST_NAME} ${TEST_SOURCES})
   target_include_directories(${TEST_NAME} PRIVATE ${PROJECT_SOURCE_DIR})
   target_link_libraries(${TEST_NAME} PRIVATE ${TEST_LIBS})
-  gtest_discover_tests(${TEST_NAME} TEST_PREFIX ${TEST_NAME}. PROPERTIES TIMEOUT 60)
+  target_compile_options(${TEST_NAME} PRIVATE -pthread)
+  target_precompile_headers(${TEST_NAME} REUSE_FROM tavi_test_headers)
+  gtest_discover_tests(${TEST_NAME} TEST_PREFIX ${TEST_NAME}. PROPERTIES TIMEOUT 120)
 endfunction()

@@ -1,7 +1,9 @@
 #include "platform/root/appliance_root.h"
 
+#include <linux/capability.h>
 #include <poll.h>
 #include <sched.h>
+#include <sys/auxv.h>
 #include <sys/prctl.h>
 #include <sys/wait.h>
 #include <unistd.h>
@@ -10,6 +12,7 @@
 #include <csignal>
 #include <cstdio>
 #include <exception>
+#include <filesystem>
 #include <fstream>
 #include <string>
 #include <system_error>
@@ -18,6 +21,18 @@
 
 namespace taviwireless {
 namespace {
+
+namespace fs = std::filesystem;
+
+// What would change the machine itself rather than what is seen inside, such as its clock.
+constexpr unsigned long kPowersOverTheMachine[] = {CAP_SYS_MODULE, CAP_SYS_RAWIO, CAP_SYS_BOOT,
+                                                   CAP_SYS_TIME,   CAP_MKNOD,     CAP_SYSLOG};
+
+constexpr char kNamespacesRefused[] =
+    "new namespaces are refused: run as root, or let ordinary users make user namespaces (sysctl "
+    "user.max_user_namespaces, kernel.unprivileged_userns_clone, "
+    "kernel.apparmor_restrict_unprivileged_userns); a container has to be a privileged one, and "
+    "in a chroot only root can";
 
 [[noreturn]] void Fail(const std::string& sentence) {
     throw std::system_error(errno, std::generic_category(), "appliance root: " + sentence);
@@ -30,21 +45,36 @@ void WriteMap(const char* path, const std::string& text) {
     }
 }
 
-// Makes the namespaces; true when a user namespace had to come first.
-bool LeaveNamespaces() {
-    constexpr int kNamespaces = CLONE_NEWNS | CLONE_NEWNET | CLONE_NEWIPC | CLONE_NEWPID;
+// Makes the namespaces, and a user namespace first when they are refused without.
+void LeaveNamespaces() {
+    constexpr int kNamespaces =
+        CLONE_NEWNS | CLONE_NEWNET | CLONE_NEWIPC | CLONE_NEWPID | CLONE_NEWUTS;
     if (unshare(kNamespaces) == 0) {
-        return false;
+        return;
     }
     const std::string user = std::to_string(geteuid());
     const std::string group = std::to_string(getegid());
     if (errno != EPERM || unshare(kNamespaces | CLONE_NEWUSER) != 0) {
-        Fail("this system refuses new namespaces, run as root");
+        Fail(kNamespacesRefused);
     }
     WriteMap("/proc/self/setgroups", "deny");  // the kernel's condition for mapping the group
     WriteMap("/proc/self/uid_map", "0 " + user + " 1");
     WriteMap("/proc/self/gid_map", "0 " + group + " 1");
-    return true;
+}
+
+// Before anything is moved; the program's own path without /proc, which may not be there.
+Workplace FindWorkplace(const std::string& output) {
+    const auto* program = reinterpret_cast<const char*>(getauxval(AT_EXECFN));
+    Workplace workplace = {fs::canonical(program), fs::current_path(), ""};
+    if (!output.empty()) {
+        std::error_code error;
+        workplace.output = fs::canonical(output, error);
+        if (error || access(workplace.output.c_str(), W_OK) != 0) {
+            errno = error ? error.value() : errno;
+            Fail("cannot use the output folder " + output);
+        }
+    }
+    return workplace;
 }
 
 sigset_t HandledSignals() {
@@ -98,19 +128,23 @@ void DieWithOutside(int outside) {
     close(outside);
 }
 
-void SetUpOrExit(bool inUserNamespace) {
+void SetUpOrExit(const Workplace& workplace) {
     try {
-        SetUpPrivateSystem(inUserNamespace);
+        SetUpPrivateSystem(workplace);
     } catch (const std::exception& error) {
         fprintf(stderr, "%s\n", error.what());
         _exit(kApplianceRootFailed);
+    }
+    for (const unsigned long power : kPowersOverTheMachine) {
+        prctl(PR_CAPBSET_DROP, power);  // of every program that is run from now on
     }
 }
 
 }  // namespace
 
-void EnterApplianceRoot() {
-    const bool inUserNamespace = LeaveNamespaces();
+void EnterApplianceRoot(const std::string& output) {
+    const Workplace workplace = FindWorkplace(output);
+    LeaveNamespaces();
     int life[2];  // holds no data: its writing end is open as long as the process outside lives
     if (pipe(life) != 0) {
         Fail("cannot make a pipe");
@@ -128,7 +162,7 @@ void EnterApplianceRoot() {
     }
     close(life[1]);
     DieWithOutside(life[0]);
-    SetUpOrExit(inUserNamespace);
+    SetUpOrExit(workplace);
     const pid_t inside = fork();
     if (inside < 0) {
         perror("appliance root: cannot start a process");

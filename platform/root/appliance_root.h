@@ -1,6 +1,8 @@
 #ifndef TAVIWIRELESS_PLATFORM_ROOT_APPLIANCE_ROOT_H
 #define TAVIWIRELESS_PLATFORM_ROOT_APPLIANCE_ROOT_H
 
+#include <string>
+
 namespace taviwireless {
 
 // The exit status of a process whose appliance root could not be set up.
@@ -26,23 +28,32 @@ constexpr int kApplianceRootFailed = 70;
 //     /lib where they are no links. File systems mounted below them are not seen.
 // /dev: null, zero, full, random, urandom, tty, a pts of its own with ptmx, shm, fd, stdin, stdout,
 //     stderr. None of the machine's devices; links such as /dev/ttyUSB0 can be made.
-// Fresh: /proc and /sys. /sys/class/net shows the network inside: lo, which is up.
-// Private: System V and POSIX IPC, process numbers, network devices, addresses, abstract sockets.
+// Fresh: /proc, and /sys, which cannot be written. /sys/class/net shows the network inside: lo,
+// which
+//     is up. In /proc what would change the whole machine cannot be written, such as most of
+//     /proc/sys.
+// Private: System V and POSIX IPC, process numbers, host name, network devices, addresses, abstract
+//     sockets.
 //
-// Unchanged: everything else (/home, /root, /opt, ...), the environment, open descriptors, and the
-// current directory, which is entered anew by its path ("/" if that path is no more). When the
-// running executable or the current directory lies below a directory that is private and empty, the
-// topmost directory on the way to it stays visible and is the real one: with a checkout in
-// /tmp/clone, /tmp holds "clone" alone.
+// Everything else of the machine (/home, /root, /opt, the checkout, ...) can be read and not
+// written, but for the folder `output`, which stays the machine's own: whatever has to come out
+// goes there.
+//
+// Unchanged: the environment, open descriptors, and the current directory, which is entered anew by
+// its path ("/" if that path is no more). When the running executable or the current directory lies
+// below a directory that is private and empty, the topmost directory on the way to it stays
+// visible: with a checkout in /tmp/clone, /tmp holds "clone" alone.
+//
+// Programs that are run inside have no power over the clock, the modules, the devices and the
+// restart of the machine.
 //
 // Without root, only the caller's own user and group exist: changing owners fails, and files of the
 // machine's root cannot be changed in place, but can be removed and created in folders at most
-// three levels deep (/var/lib/usbmodem). A machine with file systems mounted below /etc, /usr or
-// /var (a container) needs root.
+// three levels deep (/var/lib/usbmodem). Folders there that the caller may not enter are empty.
 //
 // Throws std::system_error with one plain sentence when namespaces are refused. What fails later is
 // printed on standard error and ends the process with kApplianceRootFailed.
-void EnterApplianceRoot();
+void EnterApplianceRoot(const std::string& output = "");
 
 }  // namespace taviwireless
 

@@ -3,51 +3,49 @@
 #include <fcntl.h>
 #include <net/if.h>
 #include <sys/ioctl.h>
-#include <sys/mount.h>
 #include <sys/socket.h>
 #include <sys/stat.h>
-#include <sys/syscall.h>
 #include <unistd.h>
 
 #include <cerrno>
 #include <cstring>
-#include <filesystem>
+#include <fstream>
 #include <string>
-#include <system_error>
 #include <utility>
 #include <vector>
+
+#include "platform/root/mounts.h"
 
 namespace taviwireless {
 namespace {
 
 namespace fs = std::filesystem;
 
-struct Mount {
-    const char* type;
-    const char* target;
-    unsigned long flags;
-    const char* options;
-};
-
 constexpr unsigned long kKernelFs = MS_NOSUID | MS_NODEV | MS_NOEXEC;
+constexpr char kHidden[] =
+    "the kernel lets only root do that where a part of the machine's own is covered or missing, as "
+    "in a container";
 
 // Mounted in this order. /proc comes first: a bind mount goes through it. The new root lies over
 // /sys until it is entered: that one is fresh, so it can be brought back from below.
-constexpr Mount kProc = {"proc", "/proc", kKernelFs, nullptr};
-constexpr Mount kSys = {"sysfs", "/sys", kKernelFs, nullptr};
-constexpr Mount kNewRoot = {"tmpfs", "/sys", MS_NOSUID | MS_NODEV, "mode=0755"};
+constexpr Mount kProc = {"proc", "/proc", kKernelFs, nullptr, kHidden};
+constexpr Mount kSys = {"sysfs", "/sys", kKernelFs | MS_RDONLY, nullptr, kHidden};
+constexpr Mount kNewRoot = {"tmpfs", "/sys", MS_NOSUID | MS_NODEV, "mode=0755", nullptr};
 
 constexpr Mount kEmptyFileSystems[] = {
-    {"tmpfs", "/tmp", MS_NOSUID | MS_NODEV, "mode=1777"},
-    {"tmpfs", "/var/tmp", MS_NOSUID | MS_NODEV, "mode=1777"},
-    {"tmpfs", "/run", MS_NOSUID | MS_NODEV, "mode=0755"},
-    {"tmpfs", "/dev", MS_NOSUID, "mode=0755"},
+    {"tmpfs", "/tmp", MS_NOSUID | MS_NODEV, "mode=1777", nullptr},
+    {"tmpfs", "/var/tmp", MS_NOSUID | MS_NODEV, "mode=1777", nullptr},
+    {"tmpfs", "/run", MS_NOSUID | MS_NODEV, "mode=0755", nullptr},
+    {"tmpfs", "/dev", MS_NOSUID, "mode=0755", nullptr},
 };
 
 constexpr Mount kDeviceFileSystems[] = {
-    {"devpts", "/dev/pts", MS_NOSUID | MS_NOEXEC, "newinstance,ptmxmode=0666,mode=0600"},
-    {"tmpfs", "/dev/shm", MS_NOSUID | MS_NODEV, "mode=1777"},
+    {"devpts", "/dev/pts", MS_NOSUID | MS_NOEXEC, "newinstance,ptmxmode=0666,mode=0600", nullptr},
+    {"tmpfs", "/dev/shm", MS_NOSUID | MS_NODEV, "mode=1777", nullptr},
 };
+
+// Whatever lies directly in one of these has to be brought back to be seen, the innermost first.
+constexpr const char* kHiding[] = {"/dev/shm", "/dev", "/run/lock", "/run", "/var/tmp", "/tmp"};
 
 // What may be changed inside although it is the machine's.
 constexpr const char* kCopied[] = {"/etc", "/usr", "/var", "/bin", "/sbin", "/lib"};
@@ -68,131 +66,68 @@ constexpr std::pair<const char*, const char*> kDeviceLinks[] = {
     {"/proc/self/fd/2", "/dev/stderr"},
 };
 
-[[noreturn]] void Fail(const std::string& what) {
-    throw std::system_error(errno, std::generic_category(), "appliance root: cannot " + what);
+// What root sets here is set for the whole machine ...
+constexpr const char* kKernelsOwn[] = {"/proc/sys", "/proc/sysrq-trigger", "/proc/irq", "/proc/bus",
+                                       "/proc/fs",  "/proc/acpi",          "/proc/scsi"};
+// ... but for what belongs to the network and IPC namespaces.
+constexpr const char* kNamespacesOwn[] = {"/proc/sys/net",           "/proc/sys/kernel/sem",
+                                          "/proc/sys/kernel/shmmax", "/proc/sys/kernel/shmmni",
+                                          "/proc/sys/kernel/msgmax", "/proc/sys/kernel/msgmni"};
+
+bool IsBelow(const fs::path& path, const fs::path& folder) {
+    const fs::path below = path.lexically_relative(folder);
+    return !below.empty() && *below.begin() != ".." && *below.begin() != ".";
 }
 
-void MountOne(const Mount& mounted) {
-    if (mount(mounted.type, mounted.target, mounted.type, mounted.flags, mounted.options) != 0) {
-        Fail(std::string("mount a private ") + mounted.target);
-    }
+dev_t DeviceOf(const fs::path& path) {
+    struct stat status {};
+    return stat(path.c_str(), &status) == 0 ? status.st_dev : 0;
 }
 
-// A file or directory that stays reachable when something is mounted over its path.
-class Kept {
-  public:
-    explicit Kept(std::string path)
-        : path_(std::move(path)), handle_(open(path_.c_str(), O_PATH | O_CLOEXEC)) {
-        if (handle_ < 0) {
-            Fail("keep " + path_ + " visible");
-        }
-    }
-    Kept(Kept&& other) noexcept
-        : path_(std::move(other.path_)), handle_(std::exchange(other.handle_, -1)) {}
-    ~Kept() {
-        if (handle_ >= 0) {
-            close(handle_);
-        }
-    }
-
-    // Makes it visible at its old path again.
-    void BringBack() const {
-        const std::string link = "/proc/self/fd/" + std::to_string(handle_);
-        MakeMountPoint(fs::is_directory(link));
-        if (mount(link.c_str(), path_.c_str(), "none", MS_BIND | MS_REC, nullptr) != 0) {
-            Fail("keep " + path_ + " visible");
-        }
-    }
-
-  private:
-    void MakeMountPoint(bool directory) const {
-        if (directory) {
-            fs::create_directory(path_);
-        } else {
-            close(open(path_.c_str(), O_CREAT | O_CLOEXEC, 0644));
-        }
-    }
-
-    std::string path_;
-    int handle_;
-};
-
-// The topmost entry below a directory that is about to be hidden on the way to `path`; empty when
-// none of them hides it.
+// The topmost entry on the way to `path` that will not be seen: an entry of a folder that is about
+// to be hidden, or a file system that is mounted below one that is about to be copied. Empty when
+// path stays visible.
 fs::path HiddenEntry(const fs::path& path) {
-    for (const Mount& mounted : kEmptyFileSystems) {
-        const fs::path below = path.lexically_relative(mounted.target);
-        if (!below.empty() && *below.begin() != ".." && *below.begin() != ".") {
-            return mounted.target / *below.begin();
+    for (const fs::path hiding : kHiding) {
+        if (IsBelow(path, hiding)) {
+            return hiding / *path.lexically_relative(hiding).begin();
+        }
+    }
+    for (const fs::path copied : kCopied) {
+        fs::path entry = IsBelow(path, copied) ? copied : path;
+        for (const fs::path& name : path.lexically_relative(entry)) {
+            const fs::path folder = std::exchange(entry, entry / name);
+            if (name != "." && DeviceOf(entry) != DeviceOf(folder)) {
+                return entry;
+            }
         }
     }
     return {};
 }
 
-std::vector<Kept> KeepDevicesAndWork(const fs::path& program, const fs::path& workingDirectory) {
+std::vector<Kept> KeepDevicesAndWork(const Workplace& workplace) {
     std::vector<Kept> kept;
     for (const char* name : kDevices) {
         kept.emplace_back(std::string("/dev/") + name);
     }
-    const fs::path executable = HiddenEntry(program);
-    const fs::path current = HiddenEntry(workingDirectory);
-    if (!executable.empty()) {
-        kept.emplace_back(executable);
+    for (const fs::path& path : {workplace.program, workplace.current}) {
+        const fs::path entry = HiddenEntry(path);
+        if (!entry.empty()) {
+            kept.emplace_back(entry);
+        }
     }
-    if (!current.empty() && current != executable) {
-        kept.emplace_back(current);
+    if (!workplace.output.empty()) {
+        kept.emplace_back(workplace.output);
     }
     return kept;
 }
 
-// Whatever the caller's umask: a service within may run as somebody else.
-void CreateLike(const fs::path& model, const fs::path& directory) {
-    fs::create_directories(directory);
-    fs::permissions(directory, fs::status(model).permissions());
-}
-
-// A user namespace does not give power over files of the machine's root, and what a copy of a
-// folder lets one do is decided by the owner of its changed half: so that half gets the folders of
-// the first two levels beforehand, owned by the caller.
-void OwnFolders(const fs::path& machine, const fs::path& changed, int levels) {
-    for (const auto& entry :
-         fs::directory_iterator(machine, fs::directory_options::skip_permission_denied)) {
-        if (entry.is_directory() && !entry.is_symlink()) {
-            const fs::path folder = changed / entry.path().filename();
-            CreateLike(entry.path(), folder);
-            if (levels > 1) {
-                OwnFolders(entry.path(), folder, levels - 1);
-            }
-        }
-    }
-}
-
-// Mounts an overlay over `path`; its changes go to `store`, a directory of a private file system.
-void CopyFolder(const fs::path& path, const fs::path& store, bool inUserNamespace) {
-    const fs::path changed = store / "changed";
-    const fs::path work = store / "work";
-    CreateLike(path, changed);
-    fs::create_directory(work);
-    if (inUserNamespace) {
-        constexpr int kOwnedLevels = 2;
-        OwnFolders(path, changed, kOwnedLevels);
-    }
-    std::string options =
-        "lowerdir=" + path.string() + ",upperdir=" + changed.string() + ",workdir=" + work.string();
-    if (inUserNamespace) {
-        options += ",userxattr";
-    }
-    if (mount("overlay", path.c_str(), "overlay", 0, options.c_str()) != 0) {
-        Fail("lay a private copy over " + path.string());
-    }
-}
-
 void CopyFolders(bool inUserNamespace) {
     // The changes are kept in a file system that the empty /tmp will cover.
-    MountOne(kEmptyFileSystems[0]);
+    MountNew(kEmptyFileSystems[0]);
     for (const fs::path path : kCopied) {
         if (fs::is_directory(path) && !fs::is_symlink(path)) {
-            CopyFolder(path, kEmptyFileSystems[0].target / path.filename(), inUserNamespace);
+            LayCopyOver(path, kEmptyFileSystems[0].target / path.filename(), inUserNamespace);
         }
     }
 }
@@ -216,49 +151,73 @@ void ClearState() {
     }
 }
 
-// Shows `entry`, something in the machine's root, in the new one; `source` is what it is.
-void BindIntoNewRoot(const fs::directory_entry& entry, const std::string& source,
-                     unsigned long submounts) {
+// Shows an entry of the machine's root in the new one, never to be written; `source` is what it is,
+// `submounts` as for Bind.
+void ShowInNewRoot(const fs::directory_entry& entry, const std::string& source,
+                   unsigned long submounts) {
     const fs::path target = kNewRoot.target / entry.path().filename();
-    if (entry.is_symlink()) {
+    std::error_code unreachable;  // such as a network file system whose server is away
+    const fs::file_status status = fs::symlink_status(entry.path(), unreachable);
+    if (unreachable) {
+        return;
+    }
+    if (fs::is_symlink(status)) {
         fs::copy_symlink(entry.path(), target);
         return;
     }
-    if (entry.is_directory()) {
-        fs::create_directory(target);
-    } else {
-        close(open(target.c_str(), O_CREAT | O_CLOEXEC, 0644));
-    }
-    if (mount(source.c_str(), target.c_str(), "none", MS_BIND | submounts, nullptr) != 0) {
-        Fail("bind " + entry.path().string());
+    Bind(source, target, submounts);
+    if (entry.path() != kProc.target) {
+        MakeReadOnly(target);
     }
 }
 
 // A root of our own with everything that the machine's has, so that folders can be added to it.
-void EnterNewRoot() {
-    const int covered = open(kNewRoot.target, O_PATH | O_CLOEXEC);
-    MountOne(kNewRoot);
+void EnterNewRoot(const fs::path& output) {
+    const UniqueFd sys(open(kNewRoot.target, O_PATH | O_CLOEXEC));
+    MountNew(kNewRoot);
     for (const char* folder : kAdded) {
         fs::create_directory(fs::path(kNewRoot.target) / folder);
     }
+    if (!output.empty()) {
+        Bind(output, output, 0);  // a mount of its own, which can have its own protection
+    }
     for (const auto& entry : fs::directory_iterator("/")) {
         if (entry.path() == kNewRoot.target) {
-            BindIntoNewRoot(entry, "/proc/self/fd/" + std::to_string(covered), 0);
+            ShowInNewRoot(entry, "/proc/self/fd/" + std::to_string(sys.Get()), 0);
         } else if (!fs::exists(kNewRoot.target / entry.path().filename())) {
-            BindIntoNewRoot(entry, entry.path(), MS_REC);
+            ShowInNewRoot(entry, entry.path(), MS_REC);
         }
     }
-    close(covered);
-    // The old root ends up over the new one, from where it is taken away.
-    if (chdir(kNewRoot.target) != 0 || syscall(SYS_pivot_root, ".", ".") != 0 ||
-        umount2(".", MNT_DETACH) != 0 || chdir("/") != 0) {
-        Fail("enter a private root");
+    // As root of a chroot, which need not be a mount that pivot_root could put away.
+    if (chdir(kNewRoot.target) != 0 || mount(".", "/", nullptr, MS_MOVE, nullptr) != 0 ||
+        chroot(".") != 0 || chdir("/") != 0) {
+        FailTo("enter a private root");
     }
+    if (!output.empty()) {
+        MakeWritable(output);
+    }
+}
+
+template <size_t count, typename Do>
+void ForThoseThere(const char* const (&paths)[count], Do what) {
+    for (const char* path : paths) {
+        if (fs::exists(path)) {
+            what(path);
+        }
+    }
+}
+
+void ProtectKernel() {
+    const auto bindToItself = [](const char* path) { Bind(path, path, 0); };
+    ForThoseThere(kKernelsOwn, bindToItself);
+    ForThoseThere(kNamespacesOwn, bindToItself);
+    ForThoseThere(kKernelsOwn, MakeReadOnly);
+    ForThoseThere(kNamespacesOwn, MakeWritable);
 }
 
 void MakeDirectory(const char* path, mode_t mode) {
     if (mkdir(path, mode) != 0 || chmod(path, mode) != 0) {
-        Fail(std::string("create ") + path);
+        FailTo(std::string("create ") + path);
     }
 }
 
@@ -266,7 +225,7 @@ void LayOutDevices() {
     MakeDirectory("/dev/pts", 0755);
     MakeDirectory("/dev/shm", 01777);
     for (const Mount& mounted : kDeviceFileSystems) {
-        MountOne(mounted);
+        MountNew(mounted);
     }
     for (const auto& [target, link] : kDeviceLinks) {
         fs::create_symlink(target, link);
@@ -274,36 +233,41 @@ void LayOutDevices() {
 }
 
 void BringLoopbackUp() {
-    const int handle = socket(AF_INET, SOCK_DGRAM | SOCK_CLOEXEC, 0);
+    const UniqueFd handle(socket(AF_INET, SOCK_DGRAM | SOCK_CLOEXEC, 0));
     ifreq request{};
     strcpy(request.ifr_name, "lo");
     request.ifr_flags = IFF_UP;
-    const bool up = handle >= 0 && ioctl(handle, SIOCSIFFLAGS, &request) == 0;
-    const int error = errno;
-    close(handle);
-    if (!up) {
-        errno = error;
-        Fail("bring lo up");
+    if (!handle || ioctl(handle.Get(), SIOCSIFFLAGS, &request) != 0) {
+        FailTo("bring lo up");
     }
+}
+
+// Also for a caller who is root of a container that maps its users.
+bool IsInUserNamespace() {
+    std::ifstream map("/proc/self/uid_map");
+    unsigned long first = 0;
+    unsigned long outside = 0;
+    unsigned long count = 0;
+    map >> first >> outside >> count;
+    constexpr unsigned long kEveryUser = 4294967295;
+    return count != kEveryUser;
 }
 
 }  // namespace
 
-void SetUpPrivateSystem(bool inUserNamespace) {
+void SetUpPrivateSystem(const Workplace& workplace) {
     if (mount("none", "/", "none", MS_REC | MS_PRIVATE, nullptr) != 0) {
-        Fail("detach the mounts from the machine's");
+        FailTo("detach the mounts from the machine's");
     }
-    MountOne(kProc);
-    MountOne(kSys);
-    const fs::path current = fs::current_path();
-    const fs::path program = fs::read_symlink("/proc/self/exe");
-    EnterNewRoot();
+    MountNew(kProc);
+    MountNew(kSys);
+    EnterNewRoot(workplace.output);
     {
-        const std::vector<Kept> kept = KeepDevicesAndWork(program, current);
-        CopyFolders(inUserNamespace);
+        const std::vector<Kept> kept = KeepDevicesAndWork(workplace);
+        CopyFolders(IsInUserNamespace());
         ClearState();
         for (const Mount& mounted : kEmptyFileSystems) {
-            MountOne(mounted);
+            MountNew(mounted);
         }
         MakeDirectory("/run/lock", 01777);
         LayOutDevices();
@@ -311,9 +275,10 @@ void SetUpPrivateSystem(bool inUserNamespace) {
             entry.BringBack();
         }
     }
+    ProtectKernel();
     // By its path: the directory itself may be one that is covered now.
-    if (chdir(current.c_str()) != 0 && chdir("/") != 0) {
-        Fail("enter the current directory " + current.string());
+    if (chdir(workplace.current.c_str()) != 0 && chdir("/") != 0) {
+        FailTo("enter the current directory " + workplace.current.string());
     }
     BringLoopbackUp();
 }

@@ -192,9 +192,8 @@ TEST(WifiRequirements, WhatIsMissingIsSaidInOneLine) {
         EXPECT_THAT(Wifi({"connect", "X"}).err, StartsWith("taviwireless: " + missing.sentence));
         EXPECT_EQ(Parse(Wifi({"status", "--json"}).out)["status"], missing.status);
     }
-    const RunResult asNobody = RunProgram({"setpriv", "--reuid=65534", "--clear-groups",
-                                           BuiltProgram("taviwireless_with_wifi"), "wifi", "scan"});
-    EXPECT_EQ(asNobody.err, "taviwireless: Wi-Fi settings need root\n");
+    EXPECT_EQ(RunAsNobody({BuiltProgram("taviwireless_with_wifi"), "wifi", "scan"}).err,
+              "taviwireless: Wi-Fi settings need root\n");
 }
 
 }  // namespace

@@ -10,6 +10,7 @@
 #include "tests/support/log_capture.h"
 #include "tests/support/modem_simulator.h"
 #include "tests/support/sleep_capture.h"
+#include "tests/support/wait.h"
 
 namespace taviwireless::test {
 namespace {
@@ -238,13 +239,10 @@ TEST(SetProfile, ReconnectsAModemThatWasConnected) {
     ASSERT_EQ(service.object->list.Update(), 0);
     usbmodem_lib::USBModem& modem = service.object->list.FindUSBModem(0);
     const auto becomesConnected = [&] {
-        for (int i = 0; i < 1000; ++i) {
-            if (service.Ask(usbmodem_get_usbmodem, "usbmodem0").text.find("\"connected\"") !=
-                std::string::npos) {
-                return true;
-            }
-        }
-        return false;
+        return Eventually([&] {
+            return service.Ask(usbmodem_get_usbmodem, "usbmodem0").text.find("\"connected\"") !=
+                   std::string::npos;
+        });
     };
     ASSERT_TRUE(service.Do(usbmodem_connect, "usbmodem0").isDone);
     const Outcome again = service.Do(usbmodem_connect, "usbmodem0");

@@ -39,6 +39,7 @@ void StartServer(const std::string& router) {
 struct Dhcp : testing::Test {
     void SetUp() override {
         InstallLeaseScript();
+        std::filesystem::remove("/etc/resolv.conf");  // somebody else's, where this is not root
         MakeInterface("eth7", "192.168.9.9/24");
     }
     TAVINetCard card_ = {"eth7", 1, "1.2.3.4", "255.0.0.0"};

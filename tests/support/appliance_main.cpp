@@ -1,7 +1,9 @@
-// main() of the test programs that touch system paths: every case runs in an appliance root.
+// main() of the test programs that touch system paths: every case runs in an appliance root. What
+// has to come out of it, such as a report, goes to the folder that TAVI_TEST_OUTPUT names.
 #include <gmock/gmock.h>
 
 #include <cstdio>
+#include <cstdlib>
 #include <cstring>
 #include <exception>
 
@@ -24,7 +26,8 @@ bool OnlyLists(int argc, char** argv) {
 int main(int argc, char** argv) {
     if (!OnlyLists(argc, argv)) {
         try {
-            taviwireless::EnterApplianceRoot();
+            const char* output = getenv("TAVI_TEST_OUTPUT");
+            taviwireless::EnterApplianceRoot(output != nullptr ? output : "");
         } catch (const std::exception& error) {
             fprintf(stderr, "%s\n", error.what());
             return taviwireless::kApplianceRootFailed;

@@ -4,6 +4,7 @@
 #include <gmock/gmock.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <csignal>
 #include <cstdlib>
 #include <filesystem>
@@ -38,10 +39,6 @@ INSTANTIATE_TEST_SUITE_P(ApplianceRoot, PrivateFolder,
                                          "/var/tmp", "/var/lib", "/etc", "/etc/hostapd", "/usr",
                                          "/usr/sbin", "/usr/tavi", "/sbin", "/bin", "/dev",
                                          "/dev/shm", "/etc.defaults"));
-
-class EmptyFolder : public testing::TestWithParam<const char*> {};
-
-class PrivateNamespace : public testing::TestWithParam<const char*> {};
 
 using CommandEnd = std::pair<std::string, int>;
 
@@ -92,40 +89,54 @@ TEST(ApplianceRoot, DiesWithTheProcessOutside) {
     EXPECT_TRUE(root.AtEnd());
 }
 
-// The program must be reachable for others, which a checkout in somebody's home is not.
-TEST(ApplianceRoot, NeedsNoPrivilegeWhereUserNamespacesAreAllowed) {
-    std::vector<std::string> nobody;  // before a command; not needed by somebody else than root
-    if (geteuid() == 0) {
-        nobody = {"setpriv", "--reuid=65534", "--regid=65534", "--clear-groups"};
+std::vector<std::string> WithNamespaces(std::vector<std::string> command) {
+    std::vector<std::string> unshare = {"unshare", "--mount", "--ipc"};
+    if (geteuid() != 0) {
+        unshare.insert(unshare.end(), {"--user", "--map-root-user"});
     }
-    auto command = nobody;
-    command.insert(command.end(),
-                   {"unshare", "--user", "--net", BuiltProgram("appliance-root"), "--help"});
-    if (RunProgram(command).status != 0) {
-        GTEST_SKIP() << "no user namespaces here, or the build directory is closed to others";
-    }
-    command = nobody;
-    command.insert(command.end(),
-                   {BuiltProgram("appliance-root"), "sh", "-ec",
-                    "id -u; touch /etc/x /usr/sbin/x /var/lib/x /dev/ttyUSB0 /tmp/x /run/lock/x;"
-                    "mkdir /var/lib/usbmodem; touch /etc/hostapd/x; rm /etc/passwd;"
-                    "echo new > /etc/passwd; cat /etc/passwd"});
-    const auto result = RunProgram(command);
-    EXPECT_EQ(result.status, 0) << result.err;
-    EXPECT_EQ(result.out, "0\nnew\n");
+    command.insert(command.begin(), unshare.begin(), unshare.end());
+    return command;
 }
 
-struct Usage {
-    std::vector<std::string> arguments;
-    int status;
-    const char* error;
+class UsedMachine : public testing::TestWithParam<const char*> {};
 
-    friend void PrintTo(const Usage& usage, std::ostream* out) {
-        *out << testing::PrintToString(usage.arguments);
-    }
-};
+TEST_P(UsedMachine, IsNotSeenAndNotChanged) {
+    const RunResult result =
+        RunProgram(WithNamespaces({TAVI_SOURCE_DIR "/tests/support/used_machine",
+                                   BuiltProgram("appliance-root"), GetParam()}));
+    const bool isReadOnly = GetParam() == std::string("read-only");
+    const std::string place =
+        "/etc/hostapd:\n\n/run/lock:\nno /var/lib/usbmodem\n0 new\ndestroyed\n" +
+        std::string(isReadOnly ? "no output\n" : "");
+    EXPECT_EQ(result.out, place + place + place + place + place + "unchanged\n" +
+                              (isReadOnly ? "" : "kept\nkept\nkept\nkept\nkept\n"))
+        << result.err;
+    EXPECT_EQ(result.status, 0);
+}
 
-class CommandLine : public testing::TestWithParam<Usage> {};
+INSTANTIATE_TEST_SUITE_P(ApplianceRoot, UsedMachine,
+                         testing::Values("", "user", "read-only", "chroot"));
+
+using Refusal = std::pair<std::string, std::string>;
+
+class KernelThatRefuses : public testing::TestWithParam<Refusal> {};
+
+TEST_P(KernelThatRefuses, IsNamedInOneSentence) {
+    const auto result = RunProgram({"unshare", "--mount", "--user", "--map-root-user", "sh", "-c",
+                                    GetParam().first, BuiltProgram("appliance-root")});
+    EXPECT_EQ(result.status, kApplianceRootFailed);
+    EXPECT_THAT(result.err, StartsWith("appliance root: " + GetParam().second));
+    EXPECT_EQ(std::count(result.err.begin(), result.err.end(), '\n'), 1);
+}
+
+INSTANTIATE_TEST_SUITE_P(
+    ApplianceRoot, KernelThatRefuses,
+    testing::Values(Refusal("mount --bind /dev/null /proc/version;"
+                            "exec unshare --user --map-root-user --mount \"$0\" true",
+                            "cannot mount a private /proc (the kernel lets only root"),
+                    Refusal("echo 0 >/proc/sys/user/max_user_namespaces;"
+                            "setpriv --bounding-set=-sys_admin \"$0\" true",
+                            "new namespaces are refused: run as root, or let ordinary users")));
 
 }  // namespace
 }  // namespace taviwireless::test

@@ -2,14 +2,12 @@
 
 #include <taviwireless/usbmodem_client.h>
 
-#include <chrono>
 #include <csignal>
 #include <cstdlib>
-#include <functional>
 #include <stdexcept>
-#include <thread>
 
 #include "tests/support/files.h"
+#include "tests/support/wait.h"
 
 namespace taviwireless::test {
 
@@ -17,17 +15,6 @@ namespace {
 
 constexpr char kConfigFile[] = "/tmp/session-bus.conf";
 constexpr char kAddress[] = "unix:path=/tmp/session-bus";
-
-bool WaitUntil(const std::function<bool()>& condition) {
-    const auto end = std::chrono::steady_clock::now() + std::chrono::seconds(20);
-    while (!condition()) {
-        if (std::chrono::steady_clock::now() > end) {
-            return false;
-        }
-        std::this_thread::sleep_for(std::chrono::milliseconds(10));
-    }
-    return true;
-}
 
 std::vector<std::string> DaemonCommand(std::vector<std::string> command) {
     if (command.empty()) {
@@ -79,7 +66,7 @@ void PrivateBus::Restart() {
 
 ModemService::ModemService(const std::vector<std::string>& command)
     : process_(DaemonCommand(command)) {
-    if (!WaitUntil([] { return dbus::USBModemClient().IsServerReady(); })) {
+    if (!Eventually([] { return dbus::USBModemClient().IsServerReady(); })) {
         throw std::runtime_error("usbmodemd does not own its name");
     }
 }
@@ -89,7 +76,7 @@ bool ModemService::Lists(const std::vector<std::string>& devids) {
     for (const std::string& devid : devids) {
         expected += devid + '\n';
     }
-    return WaitUntil([&expected] {
+    return Eventually([&expected] {
         std::string list;
         return dbus::USBModemClient().GetUSBModemList(list) == 0 && list == expected;
     });

@@ -33,8 +33,7 @@ class ModemService {
     // Returns once the service owns its name.
     explicit ModemService(const std::vector<std::string>& command = {});
 
-    // Waits until the service lists exactly these modems, 20 s at most, and returns whether it
-    // does.
+    // Waits until the service lists exactly these modems, and returns whether it ever does.
     bool Lists(const std::vector<std::string>& devids);
 
     Process& Daemon() { return process_; }

@@ -1,6 +1,7 @@
 #include "tests/support/files.h"
 
 #include <sys/stat.h>
+#include <unistd.h>
 
 #include <cerrno>
 #include <filesystem>
@@ -28,6 +29,10 @@ void WriteFile(const std::string& path, const std::string& text) {
     const auto folder = std::filesystem::path(path).parent_path();
     if (!folder.empty()) {
         MakeDirectories(folder);
+    }
+    // Without root, a file of the machine's cannot be changed in place, but can be replaced.
+    if (access(path.c_str(), W_OK) != 0 && errno == EACCES) {
+        std::filesystem::remove(path);
     }
     Write(path, text, std::ios::trunc);
 }

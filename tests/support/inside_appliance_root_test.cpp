@@ -1,17 +1,11 @@
 // The appliance root as the test programs see it that run in one.
 #include <fcntl.h>
 #include <gmock/gmock.h>
-#include <sys/sem.h>
 #include <unistd.h>
 
-#include <cerrno>
-#include <chrono>
-#include <csignal>
 #include <filesystem>
-#include <thread>
 
 #include "tests/support/files.h"
-#include "tests/support/process.h"
 
 namespace taviwireless::test {
 namespace {
@@ -58,61 +52,6 @@ TEST(InsideApplianceRoot, TheNetworkIsLoAndItIsUp) {
     EXPECT_THAT(NamesIn("/sys/class/net"), ElementsAre("lo"));
     constexpr long kUp = 1;
     EXPECT_TRUE(std::stol(ReadFile("/sys/class/net/lo/flags"), nullptr, 16) & kUp);
-}
-
-TEST(InsideApplianceRoot, SemaphoresArePrivate) {
-    const int set = semget(0x7a11, 1, IPC_CREAT | IPC_EXCL | 0600);
-    ASSERT_GE(set, 0);
-    EXPECT_EQ(RunProgram({"wc", "-l", "/proc/sysvipc/sem"}).out, "2 /proc/sysvipc/sem\n");
-    EXPECT_EQ(RunProgram({BuiltProgram("appliance-root"), "wc", "-l", "/proc/sysvipc/sem"}).out,
-              "1 /proc/sysvipc/sem\n");
-}
-
-// A root within this one stands for a root on a machine that was in use.
-class UsedMachine : public testing::Test {
-  protected:
-    UsedMachine() {
-        const std::string program = "/tmp/clone/build/bin/appliance-root";
-        MakeDirectories("/tmp/clone/build/bin");
-        fs::copy_file(BuiltProgram("appliance-root"), program);
-        WriteFile("/tmp/other", "not for those inside");
-        WriteFile("/var/lib/usbmodem/pin.conf", "state");
-        WriteFile("/etc/hostapd/old.conf", "state");
-        WriteFile("/usr/tavi/old", "state");
-        WriteFile("/run/lock/LCK..ttyUSB0", "state");
-        program_ = program;
-    }
-
-    RunResult Inside(const std::string& script) {
-        return RunProgram({"sh", "-c", script, "sh", program_});
-    }
-
-    std::string program_;
-};
-
-TEST_F(UsedMachine, ShowsNoneOfItsState) {
-    const auto result = Inside(
-        "$1 ls -A /etc/hostapd /usr/tavi /run/lock /var/lock/ && ! $1 test -e /var/lib/usbmodem");
-    EXPECT_EQ(result.status, 0);
-    EXPECT_EQ(result.out, "/etc/hostapd:\n\n/run/lock:\n\n/usr/tavi:\n\n/var/lock/:\n");
-}
-
-TEST_F(UsedMachine, KeepsItsStateWhateverIsDoneInside) {
-    EXPECT_EQ(Inside("$1 sh -c 'rm -rf /etc/hostapd /usr/tavi /run/lock /etc/passwd;"
-                     "  mkdir -p /var/lib/usbmodem; echo new > /var/lib/usbmodem/pin.conf'")
-                  .status,
-              0);
-    EXPECT_EQ(ReadFile("/var/lib/usbmodem/pin.conf"), "state");
-    EXPECT_EQ(ReadFile("/etc/hostapd/old.conf"), "state");
-    EXPECT_EQ(ReadFile("/usr/tavi/old"), "state");
-    EXPECT_EQ(ReadFile("/run/lock/LCK..ttyUSB0"), "state");
-    EXPECT_TRUE(Exists("/etc/passwd"));
-}
-
-TEST_F(UsedMachine, ACheckoutInAHiddenFolderStaysVisibleAndReal) {
-    const auto result = Inside("$1 sh -c 'ls -A /tmp; echo made > /tmp/clone/build/result'");
-    EXPECT_EQ(result.out, "clone\n");
-    EXPECT_EQ(ReadFile("/tmp/clone/build/result"), "made\n");
 }
 
 }  // namespace

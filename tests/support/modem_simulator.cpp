@@ -9,7 +9,7 @@
 namespace taviwireless::test {
 namespace {
 
-constexpr Process::Milliseconds kPatience{5000};
+constexpr Process::Milliseconds kPatience = Process::kPatience;
 
 std::vector<std::string> CommandLine(const std::string& linkDir, const std::string& infoDir,
                                      const std::vector<std::string>& arguments) {

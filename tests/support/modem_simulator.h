@@ -14,7 +14,7 @@ class ModemSimulator {
   public:
     // Returns once every port is there. `arguments` are modemsim's own, such as {"--modem",
     // "12d1,pin=1234"}. Every member throws std::runtime_error with what modemsim said, or that it
-    // said nothing for 5 s.
+    // says nothing.
     explicit ModemSimulator(const std::vector<std::string>& arguments = {});
 
     // The same in a folder of the caller's, which holds links and info files.

@@ -3,6 +3,7 @@
 #include <fcntl.h>
 #include <poll.h>
 #include <spawn.h>
+#include <sys/auxv.h>
 #include <sys/mman.h>
 #include <sys/wait.h>
 #include <unistd.h>
@@ -19,6 +20,10 @@
 
 namespace taviwireless::test {
 namespace {
+
+// Found before main(): in an appliance root the path of the test itself may be none.
+const std::filesystem::path kBuiltPrograms =
+    std::filesystem::canonical(reinterpret_cast<const char*>(getauxval(AT_EXECFN))).parent_path();
 
 using Clock = std::chrono::steady_clock;
 using Milliseconds = Process::Milliseconds;
@@ -134,7 +139,23 @@ std::optional<int> WaitUntil(Clock::time_point deadline, pid_t pid) {
 }  // namespace
 
 std::string BuiltProgram(const std::string& name) {
-    return std::filesystem::read_symlink("/proc/self/exe").parent_path() / name;
+    return kBuiltPrograms / name;
+}
+
+RunResult RunAsNobody(std::vector<std::string> argv) {
+    // The program may lie in a folder that is closed to others.
+    std::vector<std::string> nobody = {"setpriv",
+                                       "--reuid=65534",
+                                       "--regid=65534",
+                                       "--clear-groups",
+                                       "--inh-caps=+dac_read_search",
+                                       "--ambient-caps=+dac_read_search"};
+    const bool isOnlyUser = RunProgram({"setpriv", "--reuid=65534", "true"}).status != 0;
+    if (isOnlyUser) {
+        nobody = {"unshare", "--user", "--map-user=65534"};
+    }
+    argv.insert(argv.begin(), nobody.begin(), nobody.end());
+    return RunProgram(argv);
 }
 
 Process::Process(const std::vector<std::string>& argv) {
@@ -201,7 +222,7 @@ std::optional<int> Process::Wait(Milliseconds patience) {
 }
 
 RunResult RunProgram(const std::vector<std::string>& argv, const std::string& input) {
-    constexpr Milliseconds kRunPatience{30000};
+    constexpr Milliseconds kRunPatience{50000};
     const Descriptor in = MemoryFile(input);
     const Descriptor out = MemoryFile("");
     const Descriptor err = MemoryFile("");
@@ -210,7 +231,7 @@ RunResult RunProgram(const std::vector<std::string>& argv, const std::string& in
     if (!status) {
         kill(pid, SIGKILL);
         waitpid(pid, nullptr, 0);
-        throw std::runtime_error(argv[0] + " has not ended within 30 s");
+        throw std::runtime_error(argv[0] + " has not ended within 50 s");
     }
     return {*status, Content(out), Content(err)};
 }

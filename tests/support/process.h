@@ -18,7 +18,7 @@ std::string BuiltProgram(const std::string& name);
 class Process {
   public:
     using Milliseconds = std::chrono::milliseconds;
-    static constexpr Milliseconds kPatience{10000};  // far above what anything here needs
+    static constexpr Milliseconds kPatience{50000};  // as busy as a machine may be
 
     // Starts argv[0], found along PATH when it holds no slash. Throws std::system_error when it
     // cannot be run.
@@ -59,9 +59,12 @@ struct RunResult {
     std::string err;
 };
 
-// Runs a program to its end with `input` on its standard input. One that has not ended within 30 s
+// Runs a program to its end with `input` on its standard input. One that has not ended within 50 s
 // is killed, and std::runtime_error thrown.
 RunResult RunProgram(const std::vector<std::string>& argv, const std::string& input = "");
+
+// The same as a user who is not root, wherever the program lies.
+RunResult RunAsNobody(std::vector<std::string> argv);
 
 }  // namespace taviwireless::test
 
