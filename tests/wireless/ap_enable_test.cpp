@@ -55,7 +55,8 @@ std::string Values(const std::string& file, const std::string& keys) {
 struct AccessPoint {
     explicit AccessPoint(const std::string& settings = "") {
         Shell(
-            "rm -rf /etc/hostapd /etc/sysconfig /etc/dhcpd /usr/tavi/* /var/tmp/.w* /tmp/*\n"
+            "rm -rf /etc/hostapd /etc/sysconfig /etc/dhcpd /usr/tavi/etc /tmp/ready"
+            " /var/tmp/.wireless_ap_connecting\n"
             "mkdir -p /usr/tavi/etc /etc/sysconfig/network-scripts");
         tools.ForgetCommands();
         tools.Add("/etc/rc.network");

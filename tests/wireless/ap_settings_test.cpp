@@ -19,7 +19,7 @@ const std::string kFullSchedule(168, '1');
 
 // An appliance that never had an access point.
 struct Settings {
-    Settings() { Shell("rm -rf /usr/tavi/* /tmp/*; mkdir -p /usr/tavi/etc"); }
+    Settings() { Shell("rm -rf /usr/tavi/etc /tmp/bin /tmp/wireless.info; mkdir /usr/tavi/etc"); }
     LogCapture log;
 };
 

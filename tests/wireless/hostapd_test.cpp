@@ -246,7 +246,8 @@ TEST(HostConf, IsUnderstoodByHostapdInEveryCase) {
 struct SetHostAPConf : testing::Test {
     SetHostAPConf() {
         Shell(
-            "rm -rf /etc/hostapd /etc.defaults/* /tmp/*; mkdir -p /tmp/bin /etc.defaults\n"
+            "rm -rf /etc/hostapd /etc.defaults/taviinfo.conf /tmp/bin /tmp/hostapd; mkdir "
+            "/tmp/bin\n"
             "ln -s /bin/busybox /tmp/bin/ps; printf '#!/bin/sh\\nread end\\n' > /tmp/hostapd\n"
             "chmod +x /tmp/hostapd");
         setenv("PATH", ("/tmp/bin:" + path).c_str(), 1);

@@ -26,7 +26,9 @@ struct Station {
     Station() {
         Shell(
             "cd /usr/sbin; [ -e wpa_supplicant.real ] || cp wpa_supplicant wpa_supplicant.real\n"
-            "rm -rf /usr/tavi/* /var/tmp/.w* /var/run/wpa* /etc/dhcpc /etc/resolv.conf* /tmp/*\n"
+            "rm -rf /usr/tavi/etc /etc/dhcpc /etc/resolv.conf /etc/resolv.conf.wireless.bak"
+            " /var/tmp/.wireless_connecting /var/tmp/.wireless_current_connection"
+            " /var/run/wpa_supplicant /var/run/wpa_supplicant.pid /tmp/started /tmp/wireless.info\n"
             "rm -f /etc/taviinfo.conf /etc/rc.mediaservice\n"
             "mkdir -p /usr/tavi/etc /etc/dhcpc; echo wpa_state=COMPLETED > /tmp/state");
         tools.ForgetCommands();

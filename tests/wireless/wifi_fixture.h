@@ -85,15 +85,15 @@ inline void AddScanner(ToolStandIns& tools, const std::vector<std::string>& tabl
     const std::string headings =
         "Ch   ESSID                            BSSID             Signal Protocol Security\n" +
         std::string(80, '-') + "\n";
-    Shell("rm -f /tmp/scan.*");
+    Shell("rm -rf /tmp/scan");
     for (size_t k = 0; k < tables.size(); ++k) {
-        WriteFile("/tmp/scan." + std::to_string(k), headings + tables[k]);
+        WriteFile("/tmp/scan/" + std::to_string(k), headings + tables[k]);
     }
     tools.Add("/sbin/iwlist",
               "[ \"$3\" = tavi ] || exit 0\n"
-              "k=$(cat /tmp/scan.next 2> /dev/null || echo 0)\n"
-              "cat /tmp/scan.$k\n"
-              "if [ -e /tmp/scan.$((k + 1)) ]; then echo $((k + 1)) > /tmp/scan.next; fi");
+              "k=$(cat /tmp/scan/next 2> /dev/null || echo 0)\n"
+              "cat /tmp/scan/$k\n"
+              "if [ -e /tmp/scan/$((k + 1)) ]; then echo $((k + 1)) > /tmp/scan/next; fi");
 }
 
 }  // namespace taviwireless::test
