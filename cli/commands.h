@@ -61,22 +61,11 @@ struct Options {
 // Each adds a group of commands. A command runs while the arguments are parsed and throws
 // CommandError when it fails.
 void AddModemCommands(CLI::App& app, Options& options);
-void AddWatchCommand(CLI::App& modem, Options& options);
-void AddPINCommands(CLI::App& modem, Options& options);
-void AddProfileCommands(CLI::App& modem, Options& options);
-void AddConnectionCommands(CLI::App& modem, Options& options);
 void AddWifiCommands(CLI::App& app, Options& options);
 void AddWifiConnectCommand(CLI::App& wifi, Options& options);
 void AddWifiSavedCommands(CLI::App& wifi, Options& options);
 void AddAPCommands(CLI::App& app, Options& options);
 void AddAPCheckCommand(CLI::App& ap, Options& options);
-
-// One command about modems, with what all of them take.
-CLI::App& AddModemCommand(CLI::App& group, const char* name, const char* description,
-                          Options& options);
-// The same for a command about one modem.
-CLI::App& AddCommandWithID(CLI::App& group, const char* name, const char* description,
-                           Options& options);
 
 }  // namespace taviwireless::cli
 

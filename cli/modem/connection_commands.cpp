@@ -1,15 +1,14 @@
 // taviwireless modem connect, disconnect and status: the data connection.
 #include <json/json.h>
 
-#include <CLI/CLI.hpp>
 #include <chrono>
 #include <iomanip>
 #include <sstream>
 #include <thread>
 
-#include "cli/commands.h"
 #include "cli/deadline.h"
 #include "cli/modem/access.h"
+#include "cli/modem/commands.h"
 #include "cli/output.h"
 
 namespace taviwireless::cli {
@@ -84,7 +83,9 @@ Connection Dial(ModemAccess& access, const Options& options, Deadline& deadline)
     return WaitUntilConnected(access, options.id, options.noWait);
 }
 
-void Connect(const Options& options) {
+}  // namespace
+
+void ConnectModem(const Options& options) {
     const auto access = MakeAccess(options);
     Deadline deadline(options, kConnectTimeout);
     const auto begin = Clock::now();
@@ -99,7 +100,7 @@ void Connect(const Options& options) {
     }
 }
 
-void Disconnect(const Options& options) {
+void DisconnectModem(const Options& options) {
     const auto access = MakeAccess(options);
     const auto hangUp = [&] {
         if (IsDisconnected(access->LookAtConnection(options.id).status)) {
@@ -118,29 +119,12 @@ void Disconnect(const Options& options) {
                  : Print(Table{{ToText(options.id, connection)}});
 }
 
-void Status(const Options& options) {
+void ShowConnection(const Options& options) {
     const auto access = MakeAccess(options);
     const Connection connection =
         Deadline(options).Limit([&] { return access->LookAtConnection(options.id); });
     options.json ? Print(ToJson(options.id, connection))
                  : Print(Table{{ToText(options.id, connection)}});
-}
-
-}  // namespace
-
-void AddConnectionCommands(CLI::App& modem, Options& options) {
-    CLI::App& connect =
-        AddCommandWithID(modem, "connect",
-                         "Dial, and wait until the link is up, at most 60 s or --timeout", options);
-    connect.add_flag("--no-wait", options.noWait, "Return as soon as the dialler runs");
-    connect.callback([&options] { Connect(options); });
-
-    AddCommandWithID(modem, "disconnect", "Hang up", options).callback([&options] {
-        Disconnect(options);
-    });
-
-    AddCommandWithID(modem, "status", "Show the state of the connection", options)
-        .callback([&options] { Status(options); });
 }
 
 }  // namespace taviwireless::cli

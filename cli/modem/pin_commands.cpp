@@ -1,13 +1,12 @@
 // taviwireless modem unlock, pin and puk: what the SIM in a modem asks for.
 #include <json/json.h>
 
-#include <CLI/CLI.hpp>
 #include <algorithm>
 #include <iostream>
 
-#include "cli/commands.h"
 #include "cli/deadline.h"
 #include "cli/modem/access.h"
+#include "cli/modem/commands.h"
 #include "cli/modem/state_output.h"
 #include "cli/secret.h"
 
@@ -200,32 +199,24 @@ class PINCommand {
 
 }  // namespace
 
-void AddPINCommands(CLI::App& modem, Options& options) {
-    const auto add = [&options](CLI::App& group, const char* name, const char* description,
-                                void (*run)(PINCommand & command)) {
-        CLI::App& command = AddCommandWithID(group, name, description, options);
-        command.add_flag("--force", options.force, "Use the last attempt without a question");
-        command.callback([&options, run] {
-            PINCommand pinCommand(options);
-            run(pinCommand);
-        });
-    };
+void UnlockSIM(const Options& options) {
+    PINCommand(options).Unlock();
+}
 
-    add(modem, "unlock", "Enter the PIN; it is read from standard input",
-        [](PINCommand& command) { command.Unlock(); });
+void ChangePIN(const Options& options) {
+    PINCommand(options).ChangePIN();
+}
 
-    CLI::App* pin = modem.add_subcommand("pin", "PIN of the SIM; it is read from standard input");
-    pin->require_subcommand(1);
-    pin->fallthrough();
-    add(*pin, "set", "Change the PIN; the old one is read, then the new one",
-        [](PINCommand& command) { command.ChangePIN(); });
-    add(*pin, "protect", "Let the SIM ask for its PIN",
-        [](PINCommand& command) { command.Protect(true); });
-    add(*pin, "unprotect", "Let the SIM do without its PIN",
-        [](PINCommand& command) { command.Protect(false); });
+void ProtectSIM(const Options& options) {
+    PINCommand(options).Protect(true);
+}
 
-    add(modem, "puk", "Set a new PIN with the PUK; the PUK is read, then the PIN",
-        [](PINCommand& command) { command.UsePUK(); });
+void UnprotectSIM(const Options& options) {
+    PINCommand(options).Protect(false);
+}
+
+void UsePUK(const Options& options) {
+    PINCommand(options).UsePUK();
 }
 
 }  // namespace taviwireless::cli

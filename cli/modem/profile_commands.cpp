@@ -1,12 +1,11 @@
 // taviwireless modem profile: the connection profile of the SIM in a modem.
 #include <json/json.h>
 
-#include <CLI/CLI.hpp>
 #include <algorithm>
 
-#include "cli/commands.h"
 #include "cli/deadline.h"
 #include "cli/modem/access.h"
+#include "cli/modem/commands.h"
 #include "cli/modem/state_output.h"
 #include "cli/secret.h"
 
@@ -56,14 +55,6 @@ Setting ParseSetting(const std::string& text) {
     return setting;
 }
 
-void Show(const Options& options) {
-    const auto access = MakeAccess(options);
-    const Profile profile =
-        Deadline(options).Limit([&] { return access->ReadProfile(options.id); });
-    options.json ? Print(ToJson(profile, options.showSecrets))
-                 : Print(ProfileTable(profile, options.showSecrets));
-}
-
 // Shows a person nothing: there is nothing to tell that was not asked for.
 template <typename Change>
 void ChangeAndReport(const Options& options, const Change& change) {
@@ -78,7 +69,17 @@ void ChangeAndReport(const Options& options, const Change& change) {
     }
 }
 
-void Set(const Options& options) {
+}  // namespace
+
+void ShowProfile(const Options& options) {
+    const auto access = MakeAccess(options);
+    const Profile profile =
+        Deadline(options).Limit([&] { return access->ReadProfile(options.id); });
+    options.json ? Print(ToJson(profile, options.showSecrets))
+                 : Print(ProfileTable(profile, options.showSecrets));
+}
+
+void SetProfile(const Options& options) {
     std::vector<Setting> settings;
     for (const std::string& text : options.settings) {
         settings.push_back(ParseSetting(text));
@@ -87,34 +88,8 @@ void Set(const Options& options) {
                     [&](ModemAccess& access) { access.ChangeProfile(options.id, settings); });
 }
 
-void Reset(const Options& options) {
+void ResetProfile(const Options& options) {
     ChangeAndReport(options, [&](ModemAccess& access) { access.ResetProfile(options.id); });
-}
-
-}  // namespace
-
-void AddProfileCommands(CLI::App& modem, Options& options) {
-    CLI::App* profile = modem.add_subcommand("profile", "Connection profile of the SIM in a modem");
-    profile->require_subcommand(1);
-    profile->fallthrough();
-
-    CLI::App& show =
-        AddCommandWithID(*profile, "show", "Show the profile; one is made for a new SIM", options);
-    show.add_flag("--show-secrets", options.showSecrets, "Show the password as well");
-    show.callback([&options] { Show(options); });
-
-    CLI::App& set = AddCommandWithID(
-        *profile, "set",
-        "Change settings of the profile; the service connects a connected modem anew", options);
-    set.add_option("KEY=VALUE", options.settings,
-                   "Settings; KEY alone reads its value from standard input (for pass)")
-        ->required();
-    set.callback([&options] { Set(options); });
-
-    AddCommandWithID(*profile, "reset",
-                     "Write the profile anew, with the defaults of the modem; only with --direct",
-                     options)
-        .callback([&options] { Reset(options); });
 }
 
 }  // namespace taviwireless::cli

@@ -3,14 +3,13 @@
 #include <signal.h>
 #include <unistd.h>
 
-#include <CLI/CLI.hpp>
 #include <chrono>
 #include <iostream>
 #include <thread>
 
-#include "cli/commands.h"
 #include "cli/deadline.h"
 #include "cli/modem/access.h"
+#include "cli/modem/commands.h"
 #include "cli/modem/state_output.h"
 
 namespace taviwireless::cli {
@@ -43,7 +42,9 @@ void Show(const std::string& text, bool inPlace) {
     }
 }
 
-void Watch(const Options& options) {
+}  // namespace
+
+void WatchModems(const Options& options) {
     signal(SIGINT, EndWithSuccess);
     signal(SIGTERM, EndWithSuccess);
     const bool inPlace = !options.json && isatty(STDOUT_FILENO);
@@ -61,18 +62,6 @@ void Watch(const Options& options) {
         ShowProgress("");
         std::this_thread::sleep_for(kPause);
     }
-}
-
-}  // namespace
-
-void AddWatchCommand(CLI::App& modem, Options& options) {
-    CLI::App& watch = AddModemCommand(
-        modem, "watch",
-        "Show the modems, or one, anew at every change until SIGINT or SIGTERM; --timeout is "
-        "that of one look",
-        options);
-    watch.add_option("ID", options.id, "Device id, such as usbmodem0");
-    watch.callback([&options] { Watch(options); });
 }
 
 }  // namespace taviwireless::cli
