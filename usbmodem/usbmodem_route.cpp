@@ -3,8 +3,11 @@
 #include <tavisdk/network.h>
 #include <taviwireless/usbmodem.h>
 
-#include <fstream>
+#include <cerrno>
+#include <cstring>
+#include <optional>
 
+#include "base/trusted_file.h"
 #include "common/log.h"
 #include "usbmodem/state_files.h"
 
@@ -18,11 +21,16 @@ constexpr char kBackup[] = "/etc/ppp/usbmodem_backup_gw";
 constexpr char kOtherBackup[] =
     "/tmp/pppoe_gw_backup";  // of another part of the system; goes first
 
-std::string FirstLine(const char* path) {
-    std::ifstream file(path);
-    std::string line;
-    std::getline(file, line);
-    return line;
+// The first line of the backup that counts.
+std::string SavedGateway() {
+    std::optional<std::string> text = ReadTrusted(kOtherBackup);
+    if (!text) {
+        if (errno != ENOENT) {
+            TAVI_LOG_ERROR("%s does not count: %s", kOtherBackup, strerror(errno));
+        }
+        text = ReadTrusted(kBackup);
+    }
+    return text ? text->substr(0, text->find('\n')) : "";
 }
 
 int SetGateway(const std::string& gateway) {
@@ -76,7 +84,7 @@ int USBModem::RestoreDefaultRoute() {
         TAVI_LOG_ERROR("Backup gateway is not existed (%s)", kBackup);
         return -1;
     }
-    const std::string saved = FirstLine(VEXACFileExist(kOtherBackup) == 1 ? kOtherBackup : kBackup);
+    const std::string saved = SavedGateway();
     if (!BlVEXAIsIpAddr(saved.c_str())) {
         TAVI_LOG_ERROR("File format error (%s)", saved.c_str());
         return -1;

@@ -241,8 +241,8 @@ class TAVIWIRELESS_API USBModem {
     int SetDefaultRoute(const std::string& flag);
     // Saves the default gateway in force in "/etc/ppp/usbmodem_backup_gw"; -1 when there is none.
     int BackupDefaultRoute();
-    // Sets the saved gateway again, that of "/tmp/pppoe_gw_backup" if there is one; if it cannot be
-    // set, the configured one.
+    // Sets the saved gateway again, that of "/tmp/pppoe_gw_backup" if root or the own user has put
+    // a regular file there; if it cannot be set, the configured one.
     int RestoreDefaultRoute();
     // Loads the kernel's PPP modules from "/lib/modules". Returns the result of the last one.
     int InsertPPPModules();
