@@ -149,6 +149,7 @@ int DBusClient::SendMessage(bool wantReply, int timeout) {
     if (wantReply) {
         Error error;
         if (canSend) {
+            dbus_message_set_no_reply(message_, FALSE);  // as it may have been sent before
             reply_ = dbus_connection_send_with_reply_and_block(connection_, message_, timeout,
                                                                error.Address());
         }

@@ -48,6 +48,11 @@ TEST(Client, ReadsTextsAndListsOnce) {
     ASSERT_EQ(client.SendMessage(true, -1), 0);
     EXPECT_EQ(client.GetReply(text), 0);
     EXPECT_EQ(text, kBus);
+    // What was sent to be left unanswered can be sent again, to be answered.
+    ASSERT_EQ(client.NewMessage("AddMatch"), 0);
+    ASSERT_EQ(client.Append("type='signal'"), 0);
+    EXPECT_EQ(client.SendMessage(false, -1), 0);
+    EXPECT_EQ(client.SendMessage(true, 5000), 0);
     // An array of numbers holds no texts.
     ASSERT_EQ(client.NewMessage("GetConnectionSELinuxSecurityContext"), 0);
     ASSERT_EQ(client.Append(kBus), 0);
