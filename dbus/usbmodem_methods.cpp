@@ -24,49 +24,52 @@ constexpr int kModemFailed = -1;
 
 constexpr unsigned int kReconnectPause = 3;  // seconds, for the modem to get over the hang-up
 
-// Logs text and makes it the error, which the caller of the method sees. Returns FALSE, which is
-// what a method returns then.
-gboolean Fail(GError** error, int code, const std::string& text) {
-    TAVI_LOG_ERROR("%s", text.c_str());
+// Logs text, at the line of the caller, and makes it the error, which the caller of the method
+// sees. Returns FALSE, which is what a method returns then.
+gboolean Fail(GError** error, int code, const std::string& text, int line = __builtin_LINE()) {
+    WriteLog(LOG_ERR, __FILE_NAME__, line, "%s", text.c_str());
     g_set_error_literal(error, kErrorDomain, code, text.c_str());
     return FALSE;
 }
 
 // The modem a method is for: known and ready for use. Null with the error set otherwise, and when
-// one of the arguments is missing.
+// one of the arguments is missing. line is that of the method.
 USBModem* ReadyModem(USBModemObject* object, std::initializer_list<const char*> arguments,
-                     GError** error) {
+                     GError** error, int line = __builtin_LINE()) {
     bool isComplete = object != nullptr;
     for (const char* argument : arguments) {
         isComplete = isComplete && argument != nullptr;
     }
     if (!isComplete) {
-        Fail(error, kBadParameter, "Bad parameter");
+        Fail(error, kBadParameter, "Bad parameter", line);
         return nullptr;
     }
     const std::string devid = *arguments.begin();
     USBModem& modem = object->list.FindUSBModem(devid);
     if (modem.IsNull()) {
-        Fail(error, kModemFailed, "USBModem [" + devid + "] not found");
+        Fail(error, kModemFailed, "USBModem [" + devid + "] not found", line);
         return nullptr;
     }
     if (!modem.IsInited()) {
-        Fail(error, kModemFailed, "USBModem [" + devid + "] not inited");
+        Fail(error, kModemFailed, "USBModem [" + devid + "] not inited", line);
         return nullptr;
     }
     return &modem;
 }
 
 // The end of a method that changes the SIM: result is the device layer's.
-gboolean Finish(int result, const char* failure, const char* devid, GError** error) {
-    return result >= 0 ? TRUE : Fail(error, -result, std::string(failure) + " [" + devid + "]");
+gboolean Finish(int result, const char* failure, const char* devid, GError** error,
+                int line = __builtin_LINE()) {
+    return result >= 0 ? TRUE
+                       : Fail(error, -result, std::string(failure) + " [" + devid + "]", line);
 }
 
 // One line per modem that is ready for use.
 template <typename Describe>
-gboolean ListModems(USBModemObject* object, char** list, GError** error, Describe describe) {
+gboolean ListModems(USBModemObject* object, char** list, GError** error, Describe describe,
+                    int line = __builtin_LINE()) {
     if (object == nullptr) {
-        return Fail(error, kBadParameter, "Bad parameter");
+        return Fail(error, kBadParameter, "Bad parameter", line);
     }
     std::string text;
     for (USBModem& modem : object->list) {

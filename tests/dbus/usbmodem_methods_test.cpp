@@ -5,6 +5,7 @@
 #include <sys/stat.h>
 
 #include <memory>
+#include <set>
 
 #include "tests/support/files.h"
 #include "tests/support/log_capture.h"
@@ -169,14 +170,18 @@ TEST(Methods, RefuseMissingArguments) {
             return usbmodem_set_pin(service.object, text, text, nullptr, TRUE, error);
         },
     };
+    std::set<std::string> lines;  // each its own in the source
     for (const auto& call : kCalls) {
+        service.log.Clear();
         GError* error = nullptr;
         const bool isDone = call(&error);
         const Outcome outcome = service.MakeOutcome(isDone, "", error);
         EXPECT_EQ(outcome.text, "Bad parameter");
         EXPECT_EQ(outcome.code, 1);
         EXPECT_EQ(out, nullptr);
+        lines.insert(service.log.Text());
     }
+    EXPECT_EQ(lines.size(), std::size(kCalls)) << testing::PrintToString(lines);
 }
 
 TEST(Methods, ReportWhatTheModemSaysToPINAndPUK) {
