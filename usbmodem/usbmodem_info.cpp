@@ -34,6 +34,14 @@ bool HasOperator(const Json::Value& location, const std::string& name) {
     return false;
 }
 
+// Whether it is 6 to 15 digits, which may have blanks before them.
+bool IsIMSI(const std::string& text) {
+    const size_t begin = text.find_first_not_of(' ');
+    const size_t length = begin == std::string::npos ? 0 : text.size() - begin;
+    return length >= 6 && length <= 15 &&
+           text.find_first_not_of("0123456789", begin) == std::string::npos;
+}
+
 // Returns the id of the first location that lists the operator; empty when none does.
 std::string FindLocation(const Json::Value& locations, const std::string& name) {
     if (!locations.isArray()) {
@@ -126,13 +134,22 @@ std::string USBModem::GetRoaming(bool& err) {
 }
 
 std::string USBModem::GetIMSI(bool& err) {
-    if (!busy_ &&
-        (simStatus_ != kReady ||
-         !Refresh(&USBModem_ATIF::GetATCommandGetIMSI, &USBModem_ATIF::ParseRetStringDefaultFormat,
-                  imsi_, [](const char* reply) {
-                      TAVI_LOG_ERROR("error on parsing string, ret %s", reply);
-                  }))) {
+    if (busy_) {
+        return imsi_;
+    }
+    constexpr auto kLogFailure = [](const char* reply) {
+        TAVI_LOG_ERROR("error on parsing string, ret %s", reply);
+    };
+    std::string imsi;
+    if (simStatus_ != kReady ||
+        !Refresh(&USBModem_ATIF::GetATCommandGetIMSI, &USBModem_ATIF::ParseRetStringDefaultFormat,
+                 imsi, kLogFailure)) {
         err = true;
+    } else if (!IsIMSI(imsi)) {
+        kLogFailure(imsi.c_str());
+        err = true;
+    } else {
+        imsi_ = imsi;
     }
     return imsi_;
 }
@@ -244,8 +261,11 @@ bool USBModem::ReadAPNData(Json::Value& out) {
     std::ifstream file(kAPNDatabase);
     Json::Value root;
     try {
-        std::string errors;
-        if (Json::parseFromStream(Json::CharReaderBuilder(), file, &root, &errors)) {
+// Deprecated, but stricter than its successor, which takes a trailing comma, "+1" and more.
+#pragma GCC diagnostic push
+#pragma GCC diagnostic ignored "-Wdeprecated-declarations"
+        if (Json::Reader().parse(file, root)) {
+#pragma GCC diagnostic pop
             out = root;
             return true;
         }

@@ -158,6 +158,7 @@ class TAVIWIRELESS_API USBModem {
     std::string GetDefaultLocation(bool& err);
     // "true" or "false"; asked only while connected.
     std::string GetRoaming(bool& err);
+    // 6 to 15 digits; any other answer is a failure.
     std::string GetIMSI(bool& err);
     std::string GetProductName(bool& err);
     std::string GetVendorName(bool& err);

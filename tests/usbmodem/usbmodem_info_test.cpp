@@ -60,6 +60,31 @@ TEST(Query, GivesTheValueOfTheReplyAndKeepsItWhenALaterOneFails) {
     }
 }
 
+TEST(IMSI, IsSixToFifteenDigits) {
+    const struct {
+        std::vector<std::string> reply;
+        const char* value;
+    } kReplies[] = {
+        {{"OK"}, " (err)"},
+        {{"12345", "OK"}, " (err)"},
+        {{"1234567890123456", "OK"}, " (err)"},
+        {{"\x1b[2J466920123456789", "OK"}, " (err)"},
+        {{"../466920123456789", "OK"}, " (err)"},
+        {{"^RSSI:18", "466920123456789", "OK"}, " (err)"},
+        {{"+CIMI: 123456", "OK"}, " 123456"},
+        {{"OK"}, " 123456 (err)"},
+    };
+    ReadyModem modem;
+    for (const auto& row : kReplies) {
+        SCOPED_TRACE(row.reply[0]);
+        modem.log.Clear();
+        modem.Answer("AT+CIMI", row.reply);
+        EXPECT_EQ(Ask(modem, &USBModem::GetIMSI), row.value);
+        EXPECT_EQ(modem.log.Has("error on parsing string, ret "),
+                  std::string(row.value).find("(err)") != std::string::npos);
+    }
+}
+
 TEST(Query, OfALockedCardSendsNothing) {
     OpenedModem modem("generic,pin=1234");
     ASSERT_EQ(modem.record.UpdateSIMStatus(), 0);
@@ -164,6 +189,10 @@ TEST(Location, IsTheFirstThatListsTheOperatorInADatabaseThatCanBeRead) {
         {R"([{"id":"A","isp":[{"name":"example mobile"},{"name":"Example Mobile "}]}])", ""},
         {R"({"id":"A","isp":[{"name":"Example Mobile"}]})", ""},
         {"[{", nullptr},
+        {R"([{"id":"A","isp":[{"name":"Example Mobile"}]},])", nullptr},
+        {R"([{"id":"A","isp":[{"name":"Example Mobile",}]}])", nullptr},
+        {"\xEF\xBB\xBF[]", nullptr},
+        {"[+1]", nullptr},
         {"", nullptr},
         {std::string(2000, '['), nullptr},
         {R"([7, null, [], {"isp":[{"name":"Example Mobile"}]}, {"id":"no isp"},
