@@ -1,18 +1,25 @@
 // The state of the link, derived from the dialler's process, its log and the interface's address.
-#include <tavicore/file.h>
+#include <fcntl.h>
 #include <tavicore/process.h>
 #include <tavisdk/network.h>
 #include <taviwireless/usbmodem.h>
 
+#include <cerrno>
+
+#include "base/unique_fd.h"
 #include "common/log.h"
 
 namespace taviwireless::usbmodem_lib {
 
 int USBModem::GetLinkStats() {
     const std::string pidFile = PidFilePath();
-    const bool alive =
-        VEXACFileExist(pidFile.c_str()) == 1 && VEXACProcAliveByPidFile(pidFile.c_str()) == 1;
-    if (!alive) {
+    // The SDK's answer cannot tell a process that is dead from one that could not be looked at.
+    UniqueFd file(open(pidFile.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK));
+    if (!file && errno != ENOENT && errno != ENOTDIR) {
+        return -1;
+    }
+    file.Close();
+    if (VEXACProcAliveByPidFile(pidFile.c_str()) != 1) {
         netStatus_ = connectFailedAttempts_ < 1 ? kDisconnected : kConnectionLost;
         return 0;
     }

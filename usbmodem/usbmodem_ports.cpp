@@ -18,6 +18,8 @@ namespace {
 
 constexpr char kNodePrefix[] = "/dev/ttyUSB";
 
+constexpr char kUsingInterface[] = "Using interface";
+
 // A modem that was just plugged in may need a few seconds until its ports answer.
 constexpr int kAttempts = 3;
 constexpr unsigned int kAttemptPause = 1;  // seconds
@@ -29,6 +31,20 @@ void Retry(Assign assign, LogFailure logFailure) {
         logFailure(attempt);
         sleep(kAttemptPause);
     }
+}
+
+// Where the dialler's log names the interface; npos when it does not. The dialler marks its lines,
+// and what stands between them is what the modem answered. That may look like them, but is over
+// with the last command that the modem was sent.
+size_t FindInterface(const std::string& log) {
+    const std::string lines = '\n' + log;
+    if (!Contains(lines, "\n--> ")) {
+        return log.find(kUsingInterface);
+    }
+    const size_t lastCommand = lines.rfind("\n--> Sending: ");
+    const size_t line = lines.find(std::string("\n--> ") + kUsingInterface,
+                                   lastCommand == std::string::npos ? 0 : lastCommand);
+    return line == std::string::npos ? line : lines.find(kUsingInterface, line) - 1;
 }
 
 }  // namespace
@@ -83,7 +99,9 @@ int USBModem::AssignConnectInfo() {
     }
     std::ifstream file(path);
     std::string log;
-    std::getline(file, log, '\0');  // all of it, a text; iterators would throw when reading fails
+    for (std::string line; std::getline(file, line);) {
+        log += line + '\n';
+    }
     if (!file.is_open() || file.bad()) {
         TAVI_LOG_ERROR("Error on file open: %s", path.c_str());
         return -1;
@@ -94,10 +112,13 @@ int USBModem::AssignConnectInfo() {
     if (!Contains(log, "secondary DNS address")) {
         return 2;
     }
+    const size_t named = FindInterface(log);
+    if (named == std::string::npos && Contains(log, kUsingInterface)) {
+        return 2;  // only the modem spoke of one
+    }
     // Without "Using interface" this wraps to index 14 and reads a word of some other line. Kept:
     // the dialler names the interface before the addresses, so such a log is none of its own.
-    constexpr char kUsing[] = "Using interface";
-    std::istringstream rest(log.substr(log.find(kUsing) + sizeof kUsing - 1));
+    std::istringstream rest(log.substr(named + sizeof kUsingInterface - 1));
     netIFName_.clear();
     rest >> netIFName_;
     return 1;

@@ -97,7 +97,8 @@ class TAVIWIRELESS_API USBModem {
     int AssignQuaryNode();
     // Reads the network interface name from the dialler's log,
     // "/var/lib/usbmodem/wvdial.log." and the IMSI. Returns 1 when it was read, 2 while the link is
-    // still coming up, -1 when the log cannot be read or the dialler is disconnecting.
+    // still coming up, -1 when the log cannot be read or the dialler is disconnecting. In a log
+    // whose lines the dialler marks ("--> "), what the modem answered names no interface.
     int AssignConnectInfo();
 
     // Opens the serial port at the device path node: 9600 baud, hardware flow control, and a lock
@@ -233,7 +234,8 @@ class TAVIWIRELESS_API USBModem {
     // "disconnected", or "connection_lost" after failed attempts; empty with err set on failure.
     std::string GetNetStatus(bool& err);
     bool IsNetDisconnected(bool& err);
-    // Looks at the link; always 0.
+    // Looks at the link; -1, with the state as it was, when the pid file cannot be opened although
+    // there is one, for want of descriptors for instance.
     int GetLinkStats();
     // Reads the address of the connection's interface; 0 also when there is none.
     int UpdateIP();

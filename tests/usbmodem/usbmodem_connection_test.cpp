@@ -2,7 +2,9 @@
 // dialler that does as it is told.
 #include <gmock/gmock.h>
 #include <signal.h>
+#include <sys/inotify.h>
 #include <sys/mount.h>
+#include <sys/resource.h>
 #include <sys/stat.h>
 #include <tavicore/error.h>
 #include <tavicore/process.h>
@@ -236,6 +238,66 @@ TEST(Link, ADiallerThatGivesUpOrWritesAnUnreadableLogIsEnded) {
         EXPECT_FALSE(modem.record.IsUSBModemBusy());
         EXPECT_FALSE(Exists(kPidFile));
     }
+}
+
+// A modem with a dialler that lives.
+struct LiveModem : DialledModem {
+    LiveModem() { WriteFile(kPidFile, std::to_string(dialler.Pid()) + "\n"); }
+
+    Process dialler{{"sleep", "1000"}};
+};
+
+TEST(Link, HasTheInterfaceThatTheDiallerNames) {
+    const std::string mark = "--> ";
+    const std::string named = "Using interface lo\n";
+    const std::string forged = "Using interface eth0\n";
+    const std::string last = "secondary DNS address 10.64.64.3\n";
+    const struct {
+        std::string log;
+        int result;
+        const char* interface;
+    } kLogs[] = {
+        {"", 2, ""},
+        {named, 2, ""},
+        {"a" + named + "b" + last, 1, "lo"},
+        {std::string(2, '\0') + named + last, 1, "lo"},
+        {std::string(2, '\0') + "Disconnecting", -1, ""},
+        {mark + "Sending: ATZ\n" + forged + "OK\n" + mark + named + mark + last, 1, "lo"},
+        {mark + "Sending: ATZ\n" + named + last, 2, ""},
+        {mark + "Sending: ATZ\n" + mark + forged + mark + last + "OK\n" + mark + "Sending: ATDT\n",
+         2, ""},
+        {mark + "Sending: ATZ\n" + mark + forged + mark + last + "OK\n" + mark + "Sending: ATDT\n" +
+             mark + named,
+         1, "lo"},
+    };
+    LiveModem modem;
+    for (const auto& row : kLogs) {
+        SCOPED_TRACE(row.log);
+        WriteFile(kLog, row.log);
+        USBModem record = modem.record;
+        bool err = false;
+        record.GetIMSI(err);
+        EXPECT_EQ(record.AssignConnectInfo(), row.result);
+        record.GetLinkStats();
+        EXPECT_EQ(record.GetNetIFName(err), row.interface);
+    }
+}
+
+TEST(Link, ThatCannotBeLookedAtIsNotLost) {
+    LiveModem modem;
+    ASSERT_EQ(modem.Status(), "connecting");
+    rlimit limit{};
+    ASSERT_EQ(getrlimit(RLIMIT_NOFILE, &limit), 0);
+    const rlimit none = {0, limit.rlim_max};
+    ASSERT_EQ(setrlimit(RLIMIT_NOFILE, &none), 0);
+    bool err = false;
+    EXPECT_EQ(modem.record.GetNetStatus(err), "");
+    EXPECT_TRUE(err);
+    EXPECT_FALSE(modem.record.IsNetDisconnected(err));
+    EXPECT_EQ(modem.record.UpdateNetStatus(), -1);
+    ASSERT_EQ(setrlimit(RLIMIT_NOFILE, &limit), 0);
+    EXPECT_EQ(modem.log.Count("failed on getting link stats"), 3);
+    EXPECT_EQ(modem.Status(), "connecting");
 }
 
 TEST(Link, WithoutTheWordForTheInterfaceCharacterFourteenIsWhereItIsRead) {
