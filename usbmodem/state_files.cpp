@@ -1,15 +1,17 @@
 #include "usbmodem/state_files.h"
 
-#include <sys/stat.h>
+#include <fcntl.h>
 #include <tavicore/file.h>
+
+#include "base/unique_fd.h"
 
 namespace taviwireless::usbmodem_lib {
 
 bool MakeEmptyFile(const std::string& path) {
-    if (VEXACFileExist(path.c_str()) == 1) {
-        VEXACSysUnlink(path.c_str());
-    }
-    return VEXACFileTouch(path.c_str()) == 0 && chmod(path.c_str(), kStateFileMode) == 0;
+    VEXACSysUnlink(path.c_str());
+    const UniqueFd file(
+        open(path.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, kStateFileMode));
+    return static_cast<bool>(file);
 }
 
 }  // namespace taviwireless::usbmodem_lib

@@ -17,7 +17,7 @@ inline constexpr char kStateFilePrefix[] = "/var/lib/usbmodem/usbmodem.conf.";  
 // A profile holds a password, a dialler's log whom the user calls.
 inline constexpr mode_t kStateFileMode = 0600;
 
-// Makes path an empty file that only its owner may read, whatever file it was.
+// Puts an empty file that only its owner may read in the place of whatever file path names.
 bool MakeEmptyFile(const std::string& path);
 
 }  // namespace taviwireless::usbmodem_lib

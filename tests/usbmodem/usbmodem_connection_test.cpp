@@ -151,6 +151,9 @@ TEST(Dialling, GivesTheDiallerItsSettingsInOrder) {
 
 TEST(Dialling, TheDiallerHasNothingOfItsCallersAndLeavesNoZombie) {
     DialledModem modem("ls -l /proc/self/fd > /tmp/fds; exec sleep 1000");
+    ASSERT_EQ(modem.record.InitProfile(), 0);
+    const int changes = inotify_init1(IN_NONBLOCK | IN_CLOEXEC);
+    inotify_add_watch(changes, "/var/lib/usbmodem", IN_ATTRIB);
     const auto before = OpenDescriptors();
     EXPECT_EQ(modem.record.NetConnect(), 1);
     EXPECT_EQ(OpenDescriptors(), before);
@@ -164,7 +167,12 @@ TEST(Dialling, TheDiallerHasNothingOfItsCallersAndLeavesNoZombie) {
     EXPECT_THAT(descriptors, HasSubstr("2 -> " + std::string(kLog)));
     EXPECT_THAT(descriptors, testing::Not(HasSubstr("/dev/pts")));
     EXPECT_THAT(descriptors, testing::Not(HasSubstr("pipe:")));
-    EXPECT_EQ(FileMode(kLog), 0600u);
+    EXPECT_EQ(FileMode(kLog), 0600u);  // from the start, not changed to it
+    char events[4096] = {};
+    const std::string_view changed(events, std::max(read(changes, events, sizeof events), 0L));
+    EXPECT_THAT(changed, HasSubstr("usbmodem.profile"));
+    EXPECT_THAT(changed, testing::Not(HasSubstr("wvdial.log")));
+    close(changes);
     EXPECT_EQ(modem.record.NetDisconnect(), 0);
     EXPECT_TRUE(modem.BecomesStatus("disconnected"));
     EXPECT_EQ(waitpid(-1, nullptr, WNOHANG), 0);  // the simulator lives; nobody else is ours
