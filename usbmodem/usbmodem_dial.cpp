@@ -12,6 +12,7 @@
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
+#include <filesystem>
 #include <vector>
 
 #include "common/log.h"
@@ -31,6 +32,20 @@ std::string OrElse(const std::string& value, const char* standard) {
     return value.empty() ? standard : value;
 }
 
+// As close_range does, which older kernels lack.
+void CloseAllFrom(int first) {
+    std::vector<int> descriptors;
+    std::error_code none;  // without "/proc" nothing can be closed
+    for (const auto& entry : std::filesystem::directory_iterator("/proc/self/fd", none)) {
+        descriptors.push_back(std::stoi(entry.path().filename()));
+    }
+    for (const int descriptor : descriptors) {
+        if (descriptor >= first) {
+            close(descriptor);
+        }
+    }
+}
+
 // In the child of BackgroundExec: becomes the dialler, or aborts. Closing hasPidFile tells the
 // parent that the pid file is written.
 [[noreturn]] void BecomeDialler(char* const arguments[], const char* pidFile, const char* logFile,
@@ -44,7 +59,7 @@ std::string OrElse(const std::string& value, const char* standard) {
     const int nothing = open("/dev/null", O_RDWR);
     dup2(nothing, STDIN_FILENO);
     dup2(nothing, STDOUT_FILENO);
-    close_range(STDERR_FILENO + 1, ~0U, 0);
+    CloseAllFrom(STDERR_FILENO + 1);
     setsid();
     execv(arguments[0], arguments);
     dprintf(STDERR_FILENO, "cannot run %s: %s\n", arguments[0], strerror(errno));
