@@ -2,13 +2,17 @@
 
 #include <unistd.h>
 
-#include <cstring>
+#include <algorithm>
 #include <initializer_list>
+#include <optional>
 #include <sstream>
 #include <string>
+#include <utility>
+#include <vector>
 
 #include "common/log.h"
 #include "dbus/usbmodem_documents.h"
+#include "usbmodem/profile_value.h"
 
 namespace taviwireless::dbus {
 
@@ -89,24 +93,59 @@ char* ToUTF8(const std::string& text) {
 constexpr const char* kProfileKeys[] = {"apn",  "number",   "user", "pass",
                                         "IMSI", "location", "isp",  "default_gw"};
 
-// Sets what a line "KEY=VALUE" says. The key counts wherever it stands in the line: kept, clients
-// write lines such as "usbmodem_apn=x". A line without a key says nothing.
-bool SetProfileLine(USBModem& modem, const std::string& line, GError** error) {
+using Setting = std::pair<std::string, std::string>;  // key and value
+
+// What a line "KEY=VALUE" sets. The key counts wherever it stands in the line: kept, clients write
+// lines such as "usbmodem_apn=x". A line without a key sets nothing.
+std::optional<Setting> ParseSetting(const std::string& line) {
     for (const char* key : kProfileKeys) {
         const std::string begin = std::string(key) + '=';
         const size_t position = line.find(begin);
-        if (position == std::string::npos) {
+        if (position != std::string::npos) {
+            return Setting(key, line.substr(position + begin.size()));
+        }
+    }
+    return std::nullopt;
+}
+
+// The value as it can be shown: a long one is cut, a character that was cut in two made valid.
+std::string Shortened(const std::string& value) {
+    if (value.size() < usbmodem_lib::kProfileValueSize) {
+        return value;
+    }
+    char* begin = ToUTF8(value.substr(0, usbmodem_lib::kProfileValueSize));
+    const std::string shown = std::string(begin) + "...";
+    g_free(begin);
+    return shown;
+}
+
+gboolean FailToSet(USBModem& modem, const Setting& setting, GError** error,
+                   int line = __builtin_LINE()) {
+    const auto& [key, value] = setting;
+    const std::string shown = key == "pass" ? "***" : Shortened(value);
+    return Fail(error, kModemFailed,
+                "Failed to set " + modem.GetDevId() + ": (key,value) = (" + key + "," + shown + ")",
+                line);
+}
+
+// Reads what the lines of a profile set, in their order; of a key that stands in several, the last
+// one, so that there is not more to write than there are keys. False with the error set when one
+// of them cannot be set.
+bool ParseProfile(USBModem& modem, const char* profile, std::vector<Setting>& settings,
+                  GError** error) {
+    std::istringstream lines(profile);
+    for (std::string line; std::getline(lines, line);) {
+        const std::optional<Setting> setting = ParseSetting(line);
+        if (!setting) {
             continue;
         }
-        const std::string value = line.substr(position + begin.size());
-        if (modem.SetProfileWithKey(key, value) < 0) {
-            const std::string shown = std::strcmp(key, "pass") == 0 ? "***" : value;
-            Fail(error, kModemFailed,
-                 "Failed to set " + modem.GetDevId() + ": (key,value) = (" + key + "," + shown +
-                     ")");
+        if (!usbmodem_lib::IsProfileValue(setting->first, setting->second)) {
+            FailToSet(modem, *setting, error);
             return false;
         }
-        return true;
+        const auto isSameKey = [&](const Setting& other) { return other.first == setting->first; };
+        settings.erase(std::remove_if(settings.begin(), settings.end(), isSameKey), settings.end());
+        settings.push_back(*setting);
     }
     return true;
 }
@@ -175,13 +214,17 @@ gboolean usbmodem_set_profile(USBModemObject* object, char* devid, char* profile
     if (isUnknown) {
         return Fail(error, kModemFailed, "Error on checking net status " + id);
     }
+    // All of it before the connection is ended for it.
+    std::vector<Setting> settings;
+    if (!ParseProfile(*modem, profile, settings, error)) {
+        return FALSE;
+    }
     if (wasConnected && modem->NetDisconnect() < 0) {
         return Fail(error, kModemFailed, "Failed to disconnect " + id);
     }
-    std::istringstream lines(profile);
-    for (std::string line; std::getline(lines, line);) {
-        if (!SetProfileLine(*modem, line, error)) {
-            return FALSE;
+    for (const Setting& setting : settings) {
+        if (modem->SetProfileWithKey(setting.first, setting.second) < 0) {
+            return FailToSet(*modem, setting, error);
         }
     }
     if (wasConnected) {

@@ -16,6 +16,7 @@
 #include <vector>
 
 #include "common/log.h"
+#include "usbmodem/profile_value.h"
 #include "usbmodem/state_files.h"
 
 namespace taviwireless::usbmodem_lib {
@@ -158,15 +159,22 @@ bool USBModem::PrepareToDial(DialSettings& settings) {
 }
 
 void USBModem::ReadDialSettings(DialSettings& settings, bool& err) {
+    // A file may hold what is refused today, and a modem may answer anything.
+    const auto checked = [&err](const char* key, const std::string& value) {
+        err = !IsProfileValue(key, value) || err;
+        return value;
+    };
     std::string apn = GetProfileAPN(err);
     if (apn.empty()) {
         apn = GetDefaultAPN(err);
     }
-    settings.init = "Init2=AT+CGDCONT=1,\"ip\",\"" + apn + '"';
+    settings.init = "Init2=AT+CGDCONT=1,\"ip\",\"" + checked("apn", apn) + '"';
     settings.modem = "Modem=" + connectNode_;
-    settings.phone = "Phone=" + OrElse(GetProfilePhone(err), kDefaultNumber);
-    settings.username = "Username=" + OrElse(GetProfileUsername(err), kDefaultUser);
-    settings.password = "Password=" + OrElse(GetProfilePassword(err), kDefaultUser);
+    settings.phone = "Phone=" + checked("number", OrElse(GetProfilePhone(err), kDefaultNumber));
+    settings.username =
+        "Username=" + checked("user", OrElse(GetProfileUsername(err), kDefaultUser));
+    settings.password =
+        "Password=" + checked("pass", OrElse(GetProfilePassword(err), kDefaultUser));
     settings.defaultGateway = GetProfileDefaultGW(err);
 }
 

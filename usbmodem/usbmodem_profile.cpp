@@ -4,8 +4,11 @@
 #include <tavicore/section.h>
 #include <taviwireless/usbmodem.h>
 
+#include <cerrno>
+
 #include "common/log.h"
 #include "common/sz_hash.h"
+#include "usbmodem/profile_value.h"
 #include "usbmodem/state_files.h"
 
 namespace taviwireless::usbmodem_lib {
@@ -19,15 +22,19 @@ constexpr mode_t kDirectoryMode = 0775;
 constexpr char kDefaultNumber[] = "*99#";
 constexpr char kDefaultUser[] = "Unknown";
 
+// An empty file counts as none: a full disk left such.
+bool IsMissing(const std::string& path) {
+    struct stat status {};
+    return stat(path.c_str(), &status) == 0 ? status.st_size == 0 : errno == ENOENT;
+}
+
 }  // namespace
 
 bool USBModem::ComputeProfilePath() {
     bool failed = false;
-    profilePath_ = kProfilePrefix + GetIMSI(failed);
-    if (failed) {
-        profilePath_.clear();
-    }
-    return !failed;
+    const std::string imsi = GetIMSI(failed);
+    profilePath_ = failed || imsi.empty() ? "" : kProfilePrefix + imsi;
+    return !profilePath_.empty();
 }
 
 int USBModem::ResetProfile() {
@@ -39,8 +46,10 @@ int USBModem::ResetProfile() {
         return -1;
     }
     const char* path = profilePath_.c_str();
-    // Closed to others before the first byte is in it; every later write keeps the mode.
-    if (!MakeEmptyFile(profilePath_)) {
+    // Made beside the old one, which stays until this one is whole. Closed to others before the
+    // first byte is in it; every later write keeps the mode.
+    const std::string newPath = profilePath_ + ".new";
+    if (!MakeEmptyFile(newPath)) {
         TAVI_LOG_ERROR("Error on reset profile: touch profile %s", path);
     }
     SzHash profile(1024);
@@ -49,26 +58,32 @@ int USBModem::ResetProfile() {
         return -1;
     }
     FillDefaults(profile);
-    if (VEXACFileAddSection(path, kSection, profile.Get(), kLineFormat) != 1) {
+    if (VEXACFileAddSection(newPath.c_str(), kSection, profile.Get(), kLineFormat) != 1 ||
+        VEXACSysRename(newPath.c_str(), path) != 0) {
         TAVI_LOG_ERROR("Error on reset profile: section %s in profile %s", kSection, path);
+        VEXACSysUnlink(newPath.c_str());
         return -1;
     }
     return 0;
 }
 
-// Query errors are ignored: an empty value is written as it is.
+// Query errors are ignored: an empty value is written as it is, and in the place of what a profile
+// cannot hold, such as an operator's name with a line break.
 void USBModem::FillDefaults(SzHash& profile) {
+    const auto set = [&profile](const char* key, const std::string& value) {
+        profile.Set(key, IsProfileValue(key, value) ? value : "");
+    };
     bool ignored = false;
-    profile.Set("number", kDefaultNumber);
-    profile.Set("user", kDefaultUser);
-    profile.Set("pass", kDefaultUser);
-    profile.Set("IMSI", GetIMSI(ignored));
-    profile.Set("default_gw", "false");
-    profile.Set("location", GetDefaultLocation(ignored));
+    set("number", kDefaultNumber);
+    set("user", kDefaultUser);
+    set("pass", kDefaultUser);
+    set("IMSI", GetIMSI(ignored));
+    set("default_gw", "false");
+    set("location", GetDefaultLocation(ignored));
     const std::string isp = GetDefaultISP(ignored);
     const std::string apn = GetDefaultAPN(ignored);
-    profile.Set("apn", apn);
-    profile.Set("isp", isp.empty() || apn.empty() ? isp : isp + " - " + apn);
+    set("apn", apn);
+    set("isp", isp.empty() || apn.empty() ? isp : isp + " - " + apn);
 }
 
 int USBModem::SetProfileToDefault() {
@@ -79,7 +94,7 @@ int USBModem::InitProfile() {
     if (profilePath_.empty() && !ComputeProfilePath()) {
         return -1;
     }
-    if (VEXACFileExist(profilePath_.c_str()) != 1 && ResetProfile() < 0) {
+    if (IsMissing(profilePath_) && ResetProfile() < 0) {
         TAVI_LOG_ERROR("Error on init profile: reset %s", profilePath_.c_str());
         return -1;
     }
@@ -95,7 +110,8 @@ int USBModem::SetProfileWithKey(const std::string& key, const std::string& value
         TAVI_LOG_ERROR("failed on init profile");
         return -1;
     }
-    if (VEXACFileSetSectionValue(profilePath_.c_str(), kSection, key.c_str(), value.c_str(),
+    if (!IsProfileValue(key, value) ||
+        VEXACFileSetSectionValue(profilePath_.c_str(), kSection, key.c_str(), value.c_str(),
                                  kLineFormat) != 0) {
         TAVI_LOG_ERROR("failed on get key value %s", key.c_str());  // the getter's message. Kept.
         return -1;
@@ -111,7 +127,7 @@ std::string USBModem::GetProfileWithKey(const std::string& key, bool& err) {
         TAVI_LOG_ERROR("sim status is busy or error, cannot get key %s", key.c_str());
         err = true;
     }
-    char value[1024] = {};
+    char value[kProfileValueSize] = {};
     if (InitProfile() == 0 && VEXACFileGetSectionValue(profilePath_.c_str(), kSection, key.c_str(),
                                                        value, sizeof value) != 0) {
         TAVI_LOG_ERROR("failed on get key value %s", key.c_str());

@@ -182,13 +182,17 @@ class TAVIWIRELESS_API USBModem {
     // the password; a new SIM gets one with defaults at its first read or write.
     //   number "*99#"   user, pass "Unknown"   IMSI   default_gw "false"
     //   location, apn   of the modem           isp    operator, and " - " and the APN
-    // A value with a line break is refused; one of 1024 bytes or more cannot be read back.
+    // Refused, with the reason in the log, is a value that would not come back as it went in (of
+    // 1024 bytes or more, or with a line break or a zero byte), and an APN or number that would end
+    // its place in the modem's command (with a control character or a quote; a number with a
+    // semicolon too).
 
-    // Finds the SIM's file and writes it anew with defaults.
+    // Finds the SIM's file and replaces it by one with defaults; what is to be refused is left
+    // empty. When that fails the old file stays.
     int ResetProfile();
     int SetProfileToDefault();
-    // Makes sure that there is a file with mode 0600. A file once found is kept although the SIM
-    // may have changed since; only ResetProfile looks again.
+    // Makes sure that there is a file, which is not empty, with mode 0600. A file once found is
+    // kept although the SIM may have changed since; only ResetProfile looks again.
     int InitProfile();
     int SetProfileWithKey(const std::string& key, const std::string& value);
     // Empty, without err, when the SIM is busy or missing.

@@ -31,7 +31,8 @@ TAVIWIRELESS_API GType usbmodem_object_get_type();
 //   GetProfile(devid)              profile document
 //   SetProfile(devid, profile)     sets what the lines KEY=VALUE say, for the keys apn, number,
 //                                  user, pass, IMSI, location, isp and default_gw; a connected
-//                                  modem is disconnected before and connected again after it.
+//                                  modem is disconnected before and connected again after it,
+//                                  unless one of the values is refused: then nothing is done.
 //                                  A key counts wherever it stands in a line, and the first of
 //                                  this order that is found.
 //   GetUSBModemIfList()            network interfaces of the ready modems, a line each, in the

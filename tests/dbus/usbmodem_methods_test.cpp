@@ -258,13 +258,29 @@ TEST(SetProfile, ReconnectsAModemThatWasConnected) {
     EXPECT_THAT(service.Ask(usbmodem_get_usbmodem, "usbmodem0").text,
                 HasSubstr("\t\"ip\": \"127.0.0.1\",\n"));
     SleepCapture sleeps;
+    std::string tooLong = "user=x";
+    for (int i = 0; i < 600; ++i) {
+        tooLong += "\u00FC";  // two bytes, one of which is cut off
+    }
+    for (const std::string& refused :
+         {tooLong, std::string("apn=x\";D0900666;"), std::string("apn=x\r")}) {
+        const Outcome outcome =
+            service.Do(usbmodem_set_profile, "usbmodem0", "isp=new\n" + refused + "\napn=x");
+        EXPECT_FALSE(outcome.isDone);
+        EXPECT_LT(outcome.text.size(), 4096u);
+        EXPECT_TRUE(g_utf8_validate(outcome.text.c_str(), -1, nullptr));
+        EXPECT_TRUE(service.log.Has("refused a value for "));
+        EXPECT_EQ(service.Ask(usbmodem_get_usbmodem_if_list).text, "lo\n");  // still connected
+    }
+    bool err = false;
+    EXPECT_NE(modem.GetProfileISP(err), "new");
+    EXPECT_TRUE(sleeps.Calls().empty());
     ASSERT_TRUE(service.Do(usbmodem_set_profile, "usbmodem0", "apn=other").isDone);
     EXPECT_THAT(sleeps.Calls(), testing::ElementsAre(3));
     ASSERT_TRUE(becomesConnected());
     EXPECT_TRUE(service.Do(usbmodem_disconnect, "usbmodem0").isDone);
     EXPECT_EQ(service.Do(usbmodem_disconnect, "usbmodem0").text,
               "Failed to disconnect [usbmodem0]");
-    bool err = false;
     EXPECT_EQ(modem.GetProfileAPN(err), "other");
 }
 

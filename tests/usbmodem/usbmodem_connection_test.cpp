@@ -202,6 +202,9 @@ TEST(Dialling, FailsWithTheReasonAndCountsTheAttempt) {
         std::string message;
     } kRows[] = {
         {"no gateway to save", "", "Get default gateway failed"},
+        {"an APN that dials another number",
+         "sed -i 's/^apn=.*/apn=x\";D0900666;/' /var/lib/usbmodem/usbmodem.profile.*",
+         "refused a value for apn of the profile: it would end its place in the modem's command"},
         {"no peer file", std::string("rm ") + kPeer, "failed on set default route"},
     };
     ASSERT_EQ(modem.record.SetProfileDefaultGW("true"), 0);

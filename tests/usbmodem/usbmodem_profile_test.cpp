@@ -41,18 +41,47 @@ TEST(Profile, OfANewSIMHoldsTheDefaultsOfTheModem) {
 TEST(Profile, ValuesComeBackAsTheyWentIn) {
     ReadyModem modem;
     bool err = false;
-    for (const std::string value : {" a b ", "\"quoted\"", "a=b=c", "[USBModem Profile]",
-                                    "# no comment", "\xc3\xbc\xff", "", "%s%n"}) {
+    for (const std::string value :
+         {" a b ", "\"quoted\"", "a=b=c", "[USBModem Profile]", "# no comment", "\xc3\xbc\xff", "",
+          "%s%n", "x\";D1;", std::string(1023, 'p').c_str()}) {
         EXPECT_EQ(modem.record.SetProfilePassword(value), 0);
         EXPECT_EQ(modem.record.GetProfilePassword(err), value);
     }
-    EXPECT_EQ(modem.record.SetProfileAPN("x\npass=forged"), -1);
-    EXPECT_TRUE(modem.log.Has("failed on get key value apn"));
-    EXPECT_EQ(modem.record.GetProfileAPN(err), "internet");
     EXPECT_FALSE(err);
-    EXPECT_EQ(modem.record.SetProfileUsername(std::string(1024, 'u')), 0);
-    EXPECT_EQ(modem.record.GetProfileUsername(err), "");  // does not fit into what is read
-    EXPECT_TRUE(err);
+}
+
+TEST(Profile, RefusesWhatWouldNotComeBackOrWouldEndItsPlaceInACommand) {
+    ReadyModem modem;
+    ASSERT_EQ(modem.record.InitProfile(), 0);
+    const std::string before = ReadFile(kProfile);
+    const struct {
+        const char* key;
+        std::string value;
+        const char* reason;
+    } kValues[] = {
+        {"apn", "x\npass=forged", "it holds a line break or a zero byte"},
+        {"user", "a\rb", "it holds a line break or a zero byte"},
+        {"isp", std::string(1, '\0'), "it holds a line break or a zero byte"},
+        {"user", std::string(1024, 'u'), "it is too long"},
+        {"apn", "x\";D0900666;", "it would end its place in the modem's command"},
+        {"apn", "x\x1a", "it would end its place in the modem's command"},
+        {"number", "*99#;D0900666", "it would end its place in the modem's command"},
+    };
+    for (const auto& row : kValues) {
+        SCOPED_TRACE(std::string(row.key) + "=" + row.value.substr(0, 20));
+        modem.log.Clear();
+        EXPECT_EQ(modem.record.SetProfileWithKey(row.key, row.value), -1);
+        EXPECT_TRUE(modem.log.Has(row.reason)) << modem.log.Text();
+        EXPECT_TRUE(modem.log.Has(std::string("failed on get key value ") + row.key));
+        EXPECT_EQ(ReadFile(kProfile), before);
+    }
+}
+
+TEST(Profile, OfAModemWithAnOddOperatorIsMadeWithoutItsName) {
+    ReadyModem modem;
+    modem.Answer("AT+COPS?", {"+COPS: 0,0,\"Nord", "netz\",2", "OK"});
+    EXPECT_EQ(modem.record.InitProfile(), 0);
+    EXPECT_THAT(ReadFile(kProfile), testing::EndsWith("\napn=internet\nisp=\n"));
 }
 
 TEST(Profile, TwoSIMsNeverTouchEachOthersFile) {
@@ -84,19 +113,31 @@ TEST(Profile, WithoutAUsableSIMThereIsNone) {
     EXPECT_TRUE(unknown.log.Has("sim status is busy or error, cannot get key number"));
 }
 
-TEST(Profile, ADiskThatIsFullOrNoDiskFailsAndALaterResetWorks) {
+TEST(Profile, ThatCannotBeWrittenStaysAsItWasAndALaterResetWorks) {
     ReadyModem modem;
     WriteFile(kDirectory, "a file in the directory's place");
     EXPECT_EQ(modem.record.SetProfileToDefault(), -1);
     EXPECT_TRUE(modem.log.Has("Error on reset profile: makedir /var/lib/usbmodem failed"));
     unlink(kDirectory);
     MakeDirectories(kDirectory);
-    ASSERT_EQ(mount("tiny", kDirectory, "tmpfs", 0, "size=4k,nr_inodes=3"), 0);
-    WriteFile(std::string(kDirectory) + "/filler", std::string(4096, 'x'));
+    ASSERT_EQ(mount("tiny", kDirectory, "tmpfs", 0, "size=8k"), 0);
+    const std::string filler = std::string(kDirectory) + "/filler";
+    WriteFile(filler, std::string(8192, 'x'));
     EXPECT_EQ(modem.record.ResetProfile(), -1);
     EXPECT_TRUE(modem.log.Has("Error on reset profile: section USBModem Profile in profile "));
-    unlink((std::string(kDirectory) + "/filler").c_str());
-    EXPECT_EQ(modem.record.ResetProfile(), 0);
+    EXPECT_FALSE(Exists(kProfile));
+    unlink(filler.c_str());
+    EXPECT_EQ(modem.record.SetProfileUsername("me"), 0);
+
+    const std::string before = ReadFile(kProfile);
+    WriteFile(filler, std::string(4096, 'x'));
+    EXPECT_EQ(modem.record.ResetProfile(), -1);
+    EXPECT_EQ(ReadFile(kProfile), before);
+    unlink(filler.c_str());
+    WriteFile(kProfile, "");  // an earlier version left such
+    bool err = false;
+    EXPECT_EQ(modem.record.GetProfilePhone(err), "*99#");
+    EXPECT_FALSE(err);
 }
 
 }  // namespace
