@@ -189,7 +189,7 @@ TEST(Dialling, ADiallerThatCannotRunLeavesItsReasonInTheLog) {
 
 TEST(Dialling, FailsWithTheReasonAndCountsTheAttempt) {
     DialledModem modem;
-    EXPECT_EQ(modem.record.NetConnect(), 1);
+    ASSERT_EQ(modem.record.NetConnect(), 1) << modem.log.Text();
     EXPECT_EQ(modem.record.NetConnect(), -1);
     EXPECT_TRUE(modem.log.Has("usbmodem0 is not disconnected"));
     EXPECT_EQ(modem.record.GetConnectFailedAttempt(), 1);

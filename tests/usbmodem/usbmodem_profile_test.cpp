@@ -41,9 +41,9 @@ TEST(Profile, OfANewSIMHoldsTheDefaultsOfTheModem) {
 TEST(Profile, ValuesComeBackAsTheyWentIn) {
     ReadyModem modem;
     bool err = false;
-    for (const std::string value :
-         {" a b ", "\"quoted\"", "a=b=c", "[USBModem Profile]", "# no comment", "\xc3\xbc\xff", "",
-          "%s%n", "x\";D1;", std::string(1023, 'p').c_str()}) {
+    for (const std::string& value : std::vector<std::string>{
+             " a b ", "\"quoted\"", "a=b=c", "[USBModem Profile]", "# no comment", "\xc3\xbc\xff",
+             "", "%s%n", "x\";D1;", std::string(1023, 'p')}) {
         EXPECT_EQ(modem.record.SetProfilePassword(value), 0);
         EXPECT_EQ(modem.record.GetProfilePassword(err), value);
     }
