@@ -5,6 +5,7 @@
 #include <taviwireless/usbmodem.h>
 
 #include <cerrno>
+#include <cstring>
 
 #include "base/unique_fd.h"
 #include "common/log.h"
@@ -16,6 +17,7 @@ int USBModem::GetLinkStats() {
     // The SDK's answer cannot tell a process that is dead from one that could not be looked at.
     UniqueFd file(open(pidFile.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK));
     if (!file && errno != ENOENT && errno != ENOTDIR) {
+        TAVI_LOG_ERROR("cannot open %s: %s", pidFile.c_str(), strerror(errno));
         return -1;
     }
     file.Close();

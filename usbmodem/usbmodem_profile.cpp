@@ -33,6 +33,7 @@ bool IsMissing(const std::string& path) {
 bool USBModem::ComputeProfilePath() {
     bool failed = false;
     const std::string imsi = GetIMSI(failed);
+    // While busy, one that was never asked for is empty without an error.
     profilePath_ = failed || imsi.empty() ? "" : kProfilePrefix + imsi;
     return !profilePath_.empty();
 }

@@ -308,6 +308,7 @@ TEST(Link, ThatCannotBeLookedAtIsNotLost) {
     EXPECT_EQ(modem.record.UpdateNetStatus(), -1);
     ASSERT_EQ(setrlimit(RLIMIT_NOFILE, &limit), 0);
     EXPECT_EQ(modem.log.Count("failed on getting link stats"), 3);
+    EXPECT_TRUE(modem.log.Has("usbmodem.pid.0: Too many open files"));
     EXPECT_EQ(modem.Status(), "connecting");
 }
 
