@@ -6,6 +6,8 @@
 
 #include <string>
 
+#include "common/log.h"
+
 namespace taviwireless::usbmodem_lib {
 
 namespace {
@@ -16,6 +18,7 @@ class ToSystemLog : public WvLogRcv {
   protected:
     void _mid_line(const char* text, size_t size) override { line_.append(text, size); }
     void _end_line() override {
+        MakePrintable(line_.data());
         syslog(LOG_DEBUG, "WvStreams: %s", line_.c_str());
         line_.clear();
     }
