@@ -2,7 +2,10 @@
 #include <sys/sem.h>
 #include <taviwireless/semaphore.h>
 
+#include <algorithm>
 #include <cerrno>
+#include <chrono>
+#include <ctime>
 
 #include "common/log.h"
 
@@ -10,7 +13,12 @@ namespace taviwireless::semaphore {
 
 namespace {
 
+using Clock = std::chrono::steady_clock;
+
 constexpr int kPermissions = 0666;
+// Everybody may take the lock, and keep it. An honest holder has it for one exchange with a modem,
+// which takes 4 s at most (1 s until it is quiet, 1 s until it answers, 2 s of answer).
+constexpr std::chrono::seconds kLongestWait{5};
 
 // The caller of semctl defines this union (POSIX).
 union SemaphoreArgument {
@@ -18,6 +26,24 @@ union SemaphoreArgument {
     semid_ds* buf;
     unsigned short* array;
 };
+
+// As semop, but fails with EAGAIN at the deadline. A caught signal does not end the wait: callers
+// release after a failed Enter as well, and a release without a lock lets two holders in.
+int ChangeUntil(Clock::time_point deadline, int semid, sembuf operation) {
+    using std::chrono::nanoseconds;
+    for (;;) {
+        const auto left = std::max<nanoseconds>(deadline - Clock::now(), nanoseconds::zero());
+        const auto seconds = std::chrono::duration_cast<std::chrono::seconds>(left);
+        const timespec limit{static_cast<time_t>(seconds.count()),
+                             static_cast<long>((left - seconds).count())};
+        if (semtimedop(semid, &operation, 1, &limit) == 0) {
+            return 0;
+        }
+        if (errno != EINTR) {
+            return -1;
+        }
+    }
+}
 
 }  // namespace
 
@@ -33,11 +59,13 @@ int Semaphore::Get(int* semid) {
         SemaphoreArgument initial{};
         initial.val = 1;
         if (semctl(id, 0, SETVAL, initial) < 0) {
+            TAVI_LOG_ERROR("semctl fail semid %d errno %d", id, errno);
             return -1;
         }
     } else if (errno == EEXIST) {
         id = semget(key, 1, kPermissions);  // unchecked: a failure shows in semop
     } else {
+        TAVI_LOG_ERROR("semget fail key %u errno %d", key_, errno);  // ENOSPC: no more sets
         return -1;
     }
     *semid = id;
@@ -56,14 +84,7 @@ int Semaphore::Change(short by) {
     int semid = -1;
     // The result is not looked at: with semid -1, semop fails and says why.
     Get(&semid);
-    sembuf operation{0, by, SEM_UNDO};
-    int result = semop(semid, &operation, 1);
-    // A signal is no failure: callers release after a failed Enter as well, and a release without a
-    // lock would let two holders in from then on.
-    while (result < 0 && errno == EINTR) {
-        result = semop(semid, &operation, 1);
-    }
-    if (result < 0) {
+    if (ChangeUntil(Clock::now() + kLongestWait, semid, sembuf{0, by, SEM_UNDO}) != 0) {
         TAVI_LOG_ERROR("semop fail semid %d errno %d", semid, errno);
         return -1;
     }

@@ -1,4 +1,5 @@
 // The lock between processes. The appliance root has semaphores of its own, so keys are free here.
+#include <dlfcn.h>
 #include <gmock/gmock.h>
 #include <sys/prctl.h>
 #include <sys/sem.h>
@@ -7,13 +8,35 @@
 #include <taviwireless/semaphore.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <cerrno>
 #include <chrono>
 #include <csignal>
 #include <functional>
 #include <thread>
 
+#include "tests/support/files.h"
 #include "tests/support/log_capture.h"
+
+namespace {
+
+bool waitsAreCut = false;
+std::chrono::seconds longestWait{0};  // of those that were cut
+
+}  // namespace
+
+// In place of the C library's, for the library as well.
+extern "C" __attribute__((visibility("default"))) int semtimedop(int semid, sembuf* operations,
+                                                                 size_t count,
+                                                                 const timespec* limit) {
+    static const auto next =
+        reinterpret_cast<decltype(&semtimedop)>(dlsym(RTLD_NEXT, "semtimedop"));
+    const timespec none{};
+    if (waitsAreCut) {
+        longestWait = std::max(longestWait, std::chrono::seconds(limit->tv_sec));
+    }
+    return next(semid, operations, count, waitsAreCut ? &none : limit);
+}
 
 namespace taviwireless::test {
 namespace {
@@ -86,6 +109,36 @@ TEST(Semaphore, IsWaitedForThroughSignalsUntilItsHolderIsKilled) {
     EXPECT_TRUE(Becomes(GETNCNT, 1));
     kill(holder, SIGKILL);
     EXPECT_EQ(ExitStatus(waiting), 0);
+}
+
+TEST(Semaphore, IsNotWaitedForForEver) {
+    int semid = -1;
+    ASSERT_EQ(Semaphore(kKey).Get(&semid), 0);
+    const pid_t stranger = Start([semid] {
+        sembuf take{0, -1, 0};
+        semop(semid, &take, 1);
+        return pause();
+    });
+    ASSERT_TRUE(Becomes(GETVAL, 0));
+    waitsAreCut = true;
+    LogCapture log;
+    EXPECT_EQ(Semaphore(kKey).Enter(), -1);
+    EXPECT_TRUE(log.Has(" errno " + std::to_string(EAGAIN))) << log.Text();
+    EXPECT_GE(longestWait.count(), 4);  // an exchange that takes its time
+    EXPECT_LE(longestWait.count(), 5);
+    kill(stranger, SIGKILL);
+}
+
+TEST(Semaphore, ThatCannotBeMadeSaysSo) {
+    const std::string limits = ReadFile("/proc/sys/kernel/sem");
+    WriteFile("/proc/sys/kernel/sem", "32000 1024000 500 1");
+    const int last = semget(IPC_PRIVATE, 1, 0600);
+    LogCapture log;
+    EXPECT_EQ(Semaphore(kKey).Enter(), -1);
+    EXPECT_TRUE(log.Has("semget fail key 7 errno " + std::to_string(ENOSPC))) << log.Text();
+    EXPECT_TRUE(log.Has("semop fail semid -1 errno "));
+    semctl(last, 0, IPC_RMID);
+    WriteFile("/proc/sys/kernel/sem", limits);
 }
 
 TEST(Semaphore, FailsWhenItIsRemovedUnderAWaiter) {
