@@ -1,7 +1,9 @@
 // The serial channel to the modem's AT port, and one command and its reply over it.
+#include <sys/file.h>
 #include <taviwireless/usbmodem.h>
 #include <wvmodem.h>
 
+#include <cerrno>
 #include <chrono>
 #include <cstdio>
 #include <optional>
@@ -88,7 +90,12 @@ bool USBModem::Open(const std::string& node, std::string& error) {
     }
     device_ = std::make_shared<WvModem>(node.c_str(), kBaud, /*rtscts=*/true, /*no_reset=*/false);
     if (device_->isok()) {
-        return true;
+        // Besides the lock file, whose folder is open to everybody. Not TIOCEXCL: root is let in
+        // all the same, and a pseudo-terminal keeps it when its holder is killed.
+        if (flock(device_->getfd(), LOCK_EX | LOCK_NB) == 0) {
+            return true;
+        }
+        device_->seterr(EBUSY);
     }
     error = device_->errstr().cstr();
     TAVI_LOG_ERROR("modem Init failed: %s", error.c_str());

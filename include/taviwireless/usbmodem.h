@@ -101,9 +101,10 @@ class TAVIWIRELESS_API USBModem {
     // whose lines the dialler marks ("--> "), what the modem answered names no interface.
     int AssignConnectInfo();
 
-    // Opens the serial port at the device path node: 9600 baud, hardware flow control, and a lock
-    // file in "/var/lock". A channel that is open already is replaced but stays open until
-    // CloseFileDevice.
+    // Opens the serial port at the device path node: 9600 baud, hardware flow control. Fails when
+    // another process has it: by a lock file in "/var/lock" that root or the own user wrote and
+    // whose process lives, or by flock on the port itself; leaves both behind for others. A channel
+    // that is open already is replaced but stays open until CloseFileDevice.
     int OpenFileDevice(const std::string& node);
     // Closes the record's channel, if it is open.
     void CloseFileDevice();

@@ -1,10 +1,14 @@
 // The serial channel: opening, one command and its reply, and modems that misbehave.
 #include <sys/sem.h>
+#include <sys/stat.h>
+#include <unistd.h>
 
 #include <chrono>
 #include <ctime>
+#include <functional>
 
 #include "tests/support/descriptors.h"
+#include "tests/support/files.h"
 #include "tests/usbmodem/opened_modem.h"
 
 namespace taviwireless::test {
@@ -14,6 +18,8 @@ using testing::ElementsAre;
 using testing::HasSubstr;
 using testing::IsEmpty;
 using usbmodem_lib::USBModem;
+
+constexpr char kLockFile[] = "/var/lock/LCK..ttyUSB1";
 
 // Whether work takes less than 3 s, and less than 0.2 s of them on the processor.
 template <typename Work>
@@ -48,6 +54,58 @@ TEST(Channel, ReplacesAnOpenOneAndKeepsThatUntilBothAreClosed) {
     EXPECT_THAT(simulator.Received("1.2"), ElementsAre("AT+CGMM"));
     record.CloseFileDevice();
     EXPECT_EQ(OpenDescriptors(), before);
+}
+
+// Who may write in "/var/lock" (everybody) is not who may have a port.
+TEST(Channel, IsNotKeptFromItsPortByWhatStrangersPutAtItsLockFile) {
+    constexpr uid_t kStranger = 1;
+    const std::string living = std::to_string(getppid()) + "\n";
+    const std::string dead = "4194305\n";  // no process has a number that high
+    const struct {
+        const char* what;
+        std::function<void()> put;
+        uid_t owner;
+        bool counts;
+    } kFiles[] = {
+        {"nothing", [] {}, 0, false},
+        {"a dead process", [&] { WriteFile(kLockFile, dead); }, 0, false},
+        {"a living process", [&] { WriteFile(kLockFile, living); }, 0, true},
+        {"nobody yet", [] { WriteFile(kLockFile, ""); }, 0, true},
+        {"a stranger's living process", [&] { WriteFile(kLockFile, living); }, kStranger, false},
+        {"a pipe", [] { mkfifo(kLockFile, 0666); }, kStranger, false},
+        {"a link", [] { symlink("/etc/passwd", kLockFile); }, kStranger, false},
+        {"a folder", [] { MakeDirectories(std::string(kLockFile) + "/full"); }, kStranger, false},
+    };
+    OpenedModem modem("generic");
+    for (const auto& file : kFiles) {
+        SCOPED_TRACE(file.what);
+        modem.record.CloseFileDevice();
+        ASSERT_FALSE(Exists(kLockFile));
+        file.put();
+        if (file.owner != 0) {
+            ASSERT_EQ(lchown(kLockFile, file.owner, file.owner), 0);
+        }
+        modem.log.Clear();
+        EXPECT_EQ(modem.record.OpenFileDevice(kQueryPort), file.counts ? -1 : 0);
+        EXPECT_EQ(modem.log.Has("modem Init failed: Device or resource busy"), file.counts);
+        if (file.counts) {
+            EXPECT_EQ(unlink(kLockFile), 0);  // it was left alone
+        } else if (std::string(file.what) != "a folder") {
+            EXPECT_EQ(std::stoi(ReadFile(kLockFile)), getpid());
+        }
+    }
+}
+
+TEST(Channel, HasItsPortForItselfWithoutALockFileToo) {
+    OpenedModem modem("generic");
+    ASSERT_EQ(unlink(kLockFile), 0);
+    USBModem second(1, kInfo1);
+    EXPECT_EQ(second.OpenFileDevice(kQueryPort), -1);
+    EXPECT_TRUE(modem.log.Has("modem Init failed: Device or resource busy")) << modem.log.Text();
+    std::string reply;
+    EXPECT_EQ(modem.record.ModemCmd("AT", reply), 0);
+    modem.record.CloseFileDevice();
+    EXPECT_EQ(second.OpenFileDevice(kQueryPort), 0);
 }
 
 TEST(Command, WithoutAChannelOrATextIsRefusedAndLeavesTheLockOpen) {

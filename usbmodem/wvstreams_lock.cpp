@@ -1,0 +1,89 @@
+// WvStreams' lock file of a serial port, "/var/lock/LCK.." and the port's name, in our own way: as
+// everybody can write in that folder, only what root or the own user wrote there counts, and
+// nothing there is ever waited for. It takes the place of WvStreams' own, which the linker then
+// leaves in its archive.
+#include <fcntl.h>
+#include <sys/stat.h>
+#include <unistd.h>
+#include <wvlockdev.h>
+
+#include <cerrno>
+#include <csignal>
+#include <cstdio>
+#include <cstdlib>
+#include <optional>
+#include <string>
+
+#include "base/trusted_file.h"
+
+namespace {
+
+using taviwireless::ReadTrusted;
+using taviwireless::UniqueFd;
+
+constexpr char kLockPrefix[] = "/var/lock/LCK..";
+constexpr mode_t kLockMode = 0644;  // for other programs that use ports
+// Of a file that somebody makes anew as often as it is removed.
+constexpr int kAttempts = 3;
+
+bool MakeLockFile(const char* path) {
+    const UniqueFd file(open(path, O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, kLockMode));
+    return file && dprintf(file.Get(), "%10d\n", static_cast<int>(getpid())) > 0;
+}
+
+// Returns the process that a lock file which counts names: 0 when it names none. Nothing, with
+// errno, when there is no such file.
+std::optional<pid_t> Holder(const char* path) {
+    const std::optional<std::string> text = ReadTrusted(path);
+    if (!text) {
+        return std::nullopt;
+    }
+    return static_cast<pid_t>(std::strtol(text->c_str(), nullptr, 10));
+}
+
+// Whether the lock file is there and counts. One that names no process may still be in the making,
+// and one that cannot be read is not ours to judge.
+bool IsHeld(const char* path) {
+    const std::optional<pid_t> holder = Holder(path);
+    if (!holder) {
+        const bool isMissingOrAStrangers = errno == ENOENT || errno == EPERM || errno == ELOOP;
+        return !isMissingOrAStrangers;
+    }
+    return *holder <= 0 || kill(*holder, 0) == 0 || errno != ESRCH;
+}
+
+}  // namespace
+
+WvLockDev::WvLockDev(WvString device) : devicename(device), lock_count(0) {
+    const std::string path = device.cstr();
+    filename = (kLockPrefix + path.substr(path.rfind('/') + 1)).c_str();
+}
+
+WvLockDev::~WvLockDev() {
+    if (lock_count > 0) {
+        lock_count = 1;
+        unlock();
+    }
+}
+
+// Where a stranger keeps the name taken (by a folder, say) there is no lock file: the port itself
+// is locked as well.
+bool WvLockDev::lock() {
+    for (int attempt = 0; lock_count == 0 && attempt < kAttempts; ++attempt) {
+        if (MakeLockFile(filename)) {
+            break;
+        }
+        if (errno != EEXIST || IsHeld(filename)) {
+            return false;
+        }
+        unlink(filename);
+    }
+    ++lock_count;
+    return true;
+}
+
+void WvLockDev::unlock() {
+    if (lock_count > 0 && --lock_count == 0 && Holder(filename) == getpid()) {
+        unlink(filename);
+    }
+}
