@@ -3,6 +3,7 @@
 #include <taviwireless/usbmodem.h>
 #include <wvmodem.h>
 
+#include <algorithm>
 #include <cerrno>
 #include <chrono>
 #include <cstdio>
@@ -16,34 +17,55 @@ namespace taviwireless::usbmodem_lib {
 
 namespace {
 
+using std::chrono::milliseconds;
 using Clock = std::chrono::steady_clock;
 
 constexpr int kBaud = 9600;
-constexpr time_t kFirstByteWait = 1000;  // ms until a reply begins
-constexpr time_t kReplyQuiet = 200;      // ms without input that end a reply
-constexpr time_t kDrainQuiet = 100;      // ms without input after which the modem is quiet
-constexpr size_t kMaxReply = 1024;       // bytes
-// A modem that never stops talking must not hold the lock, and its caller, for ever.
-constexpr std::chrono::seconds kTalkLimit{10};
+constexpr milliseconds kFirstByteWait{1000};  // until a reply begins
+constexpr milliseconds kReplyQuiet{200};      // without input: the reply has ended
+constexpr milliseconds kDrainQuiet{100};      // without input: the modem is quiet
+constexpr size_t kMaxReply = 1024;            // bytes
+// A modem that never stops talking must not hold the lock, and its caller, for longer.
+constexpr milliseconds kDrainLimit{1000};
+constexpr milliseconds kReplyLimit{2000};
 
-bool WaitReadable(WvModem& modem, time_t milliseconds) {
-    return modem.select(milliseconds, true, false);
+enum class Input { kCame, kTimeOut, kHungUp };
+
+// Waits for input and reads what has come behind text, at most kMaxReply bytes in all. Only the
+// deadline ends the wait: WvStreams' own wait is over at any signal that was caught.
+Input Receive(WvModem& modem, milliseconds patience, std::string& text) {
+    const auto deadline = Clock::now() + patience;
+    while (modem.isok()) {
+        const auto left = std::chrono::ceil<milliseconds>(deadline - Clock::now());
+        const time_t wait = std::max(left, milliseconds::zero()).count();
+        if (modem.select(wait, /*readable=*/true, /*writable=*/false)) {
+            char buffer[kMaxReply];
+            const size_t count = modem.read(buffer, kMaxReply - text.size());
+            text.append(buffer, count);
+            if (count > 0) {
+                return Input::kCame;
+            }
+        }
+        if (Clock::now() >= deadline) {
+            return Input::kTimeOut;
+        }
+    }
+    return Input::kHungUp;
 }
 
-// Reads until the reply ends or kMaxReply bytes are there, and returns what was read; nothing when
-// no byte came.
+// Returns what was read until the reply ended, at most kMaxReply bytes; nothing when no byte came,
+// or when the modem was unplugged within a line.
 std::optional<std::string> ReadReply(WvModem& modem) {
-    const auto limit = Clock::now() + kTalkLimit;
-    char buffer[kMaxReply + 1] = {};
-    size_t count = modem.read(buffer, kMaxReply);
-    while (count < kMaxReply && modem.isok() && Clock::now() < limit &&
-           WaitReadable(modem, kReplyQuiet)) {
-        count += modem.read(buffer + count, kMaxReply - count);
+    std::string reply;
+    Input input = Receive(modem, kFirstByteWait, reply);
+    const auto limit = Clock::now() + kReplyLimit;
+    while (input == Input::kCame && reply.size() < kMaxReply && Clock::now() < limit) {
+        input = Receive(modem, kReplyQuiet, reply);
     }
-    if (count == 0) {
+    if (reply.empty() || (input == Input::kHungUp && reply.back() != '\n')) {
         return std::nullopt;
     }
-    return buffer;  // a zero byte ends the reply
+    return reply.substr(0, reply.find('\0'));  // a zero byte ends the reply
 }
 
 // Returns the lines of data that are neither blank nor the echo of cmd, each ended by a line feed.
@@ -58,10 +80,8 @@ std::string CleanReply(const std::string& data, const std::string& cmd) {
         }
         const bool isCut = end == std::string::npos && line.find('\r') == std::string::npos;
         begin = end == std::string::npos ? data.size() : end + 1;
-        // A cut line is dropped: half a number would pass for a whole one. So is the late echo of
-        // an earlier command with a PIN, which would reach the log with the reply.
-        if (isCut || line.find(cmd) != std::string::npos || line[0] == '\r' ||
-            CarriesSecret(line)) {
+        // A cut line is dropped: half a number would pass for a whole one.
+        if (isCut || line.find(cmd) != std::string::npos || line[0] == '\r') {
             continue;
         }
         const size_t carriageReturn = line.find('\r');
@@ -74,6 +94,23 @@ std::string CleanReply(const std::string& data, const std::string& cmd) {
     }
     return reply;
 }
+
+// Gives a modem's lock back, on whatever way out. Also after a failed Enter. Kept: other processes
+// count on the same arithmetic, and it frees a lock that nobody would ever give back.
+class Release {
+  public:
+    explicit Release(semaphore::Semaphore& semaphore) : semaphore_(semaphore) {}
+    Release(const Release&) = delete;
+    Release& operator=(const Release&) = delete;
+    ~Release() {
+        if (semaphore_.Release() != 0) {
+            TAVI_LOG_ERROR("Error on release Semaphore");
+        }
+    }
+
+  private:
+    semaphore::Semaphore& semaphore_;
+};
 
 }  // namespace
 
@@ -114,29 +151,23 @@ int USBModem::DrainDeviceBuffer() {
         return -1;
     }
     device_->write("\r\r\r\r\r");
-    const auto limit = Clock::now() + kTalkLimit;
-    char discarded[kMaxReply];
-    while (device_->isok() && WaitReadable(*device_, kDrainQuiet)) {
-        if (Clock::now() > limit) {
+    const auto limit = Clock::now() + kDrainLimit;
+    for (std::string discarded; Receive(*device_, kDrainQuiet, discarded) == Input::kCame;
+         discarded.clear()) {
+        if (Clock::now() >= limit) {
             return -1;
         }
-        device_->read(discarded, sizeof discarded);
     }
     return 0;
 }
 
 int USBModem::ModemCmd(const std::string& cmd, std::string& reply) {
-    int result = -1;
-    if (semaphore_.Enter() == 0) {
-        result = Exchange(cmd, reply);
-    } else {
+    const Release release(semaphore_);
+    if (semaphore_.Enter() != 0) {
         TAVI_LOG_ERROR("Error on enter Semaphore");
+        return -1;
     }
-    // Also after a failed Enter. Kept: other processes count on the same arithmetic.
-    if (semaphore_.Release() != 0) {
-        TAVI_LOG_ERROR("Error on release Semaphore");
-    }
-    return result;
+    return Exchange(cmd, reply);
 }
 
 int USBModem::Exchange(const std::string& cmd, std::string& reply) {
@@ -150,9 +181,8 @@ int USBModem::Exchange(const std::string& cmd, std::string& reply) {
     }
     const std::string line = cmd + '\r';
     device_->write(line.data(), line.size());
-    const std::optional<std::string> data =
-        WaitReadable(*device_, kFirstByteWait) ? ReadReply(*device_) : std::nullopt;
-    if (!data) {  // also when the modem was unplugged, which wakes the wait
+    const std::optional<std::string> data = ReadReply(*device_);
+    if (!data) {  // also when the modem was unplugged
         TAVI_LOG_ERROR("No respond on modem cmd %s", LoggableCommand(cmd).c_str());
         return -1;
     }

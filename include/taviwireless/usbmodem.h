@@ -109,13 +109,15 @@ class TAVIWIRELESS_API USBModem {
     // Closes the record's channel, if it is open.
     void CloseFileDevice();
     // Ends a half-typed command line in the modem and discards input until 100 ms pass without any.
-    // Fails when no channel is open, or when the modem is not quiet within 10 s.
+    // Fails when no channel is open, or when the modem is not quiet within 1 s.
     int DrainDeviceBuffer();
     // Sends cmd and a carriage return under the modem's semaphore and collects the reply, at most
-    // 1024 bytes, until 200 ms pass without any; -1 when none begins within 1000 ms. reply then
+    // 1024 bytes, until 200 ms pass without any or 2 s are over; -1 when none begins within 1000 ms,
+    // when the modem is not quiet before it, or when it is unplugged within a line. reply then
     // holds its lines, each ended by a line feed, without blank lines and lines that repeat cmd. A
     // line that was cut off before its end is dropped. Whether the modem reported an error is for
-    // the caller to see: that is a reply too.
+    // the caller to see: that is a reply too. With the wait for the semaphore a call takes 9 s at
+    // most.
     int ModemCmd(const std::string& cmd, std::string& reply);
     // Opens the port at node, sends cmd and prints the dialogue on standard output. Returns -1 when
     // the port cannot be opened, else the result of ModemCmd. Closes the channel.

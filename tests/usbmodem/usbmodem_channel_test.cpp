@@ -1,15 +1,51 @@
 // The serial channel: opening, one command and its reply, and modems that misbehave.
+#include <dlfcn.h>
 #include <sys/sem.h>
 #include <sys/stat.h>
+#include <sys/time.h>
 #include <unistd.h>
 
 #include <chrono>
+#include <csignal>
+#include <cstdlib>
 #include <ctime>
 #include <functional>
+#include <new>
 
 #include "tests/support/descriptors.h"
 #include "tests/support/files.h"
 #include "tests/usbmodem/opened_modem.h"
+
+namespace {
+
+constexpr size_t kLarge = 100000;  // bytes
+bool memoryIsShort = false;        // whether there is none for anything large
+bool lockIsKept = false;           // whether nobody gives a modem's lock back
+
+}  // namespace
+
+// In place of the C++ and the C library's, for the library as well.
+void* operator new(size_t size) {
+    void* const memory = memoryIsShort && size >= kLarge ? nullptr : std::malloc(size);
+    if (memory == nullptr) {
+        throw std::bad_alloc();
+    }
+    return memory;
+}
+void operator delete(void* memory) noexcept {
+    std::free(memory);
+}
+void operator delete(void* memory, size_t) noexcept {
+    std::free(memory);
+}
+extern "C" __attribute__((visibility("default"))) int semtimedop(int semid, sembuf* operations,
+                                                                 size_t count,
+                                                                 const timespec* limit) {
+    static const auto next =
+        reinterpret_cast<decltype(&semtimedop)>(dlsym(RTLD_NEXT, "semtimedop"));
+    const timespec none{};
+    return next(semid, operations, count, lockIsKept ? &none : limit);
+}
 
 namespace taviwireless::test {
 namespace {
@@ -21,14 +57,18 @@ using usbmodem_lib::USBModem;
 
 constexpr char kLockFile[] = "/var/lock/LCK..ttyUSB1";
 
+template <typename Work>
+bool EndsWithin(int seconds, Work work) {
+    const auto begin = std::chrono::steady_clock::now();
+    work();
+    return std::chrono::steady_clock::now() - begin < std::chrono::seconds(seconds);
+}
+
 // Whether work takes less than 3 s, and less than 0.2 s of them on the processor.
 template <typename Work>
 bool IsQuick(Work work) {
-    const auto begin = std::chrono::steady_clock::now();
     const std::clock_t processor = std::clock();
-    work();
-    return std::chrono::steady_clock::now() - begin < std::chrono::seconds(3) &&
-           std::clock() - processor < CLOCKS_PER_SEC / 5;
+    return EndsWithin(3, work) && std::clock() - processor < CLOCKS_PER_SEC / 5;
 }
 
 bool IsUnlocked() {
@@ -123,6 +163,31 @@ TEST(Command, WithoutAChannelOrATextIsRefusedAndLeavesTheLockOpen) {
     EXPECT_THAT(modem.Received(), IsEmpty());
 }
 
+TEST(Command, FailsWhileAStrangerKeepsTheLockAndFreesIt) {
+    OpenedModem modem;
+    std::string reply;
+    ASSERT_EQ(modem.record.ModemCmd("AT", reply), 0);
+    ASSERT_EQ(semctl(semget(1, 1, 0), 0, SETVAL, 0), 0);
+    modem.Received();
+    lockIsKept = true;
+    EXPECT_EQ(modem.record.ModemCmd("AT", reply), -1);
+    lockIsKept = false;
+    EXPECT_TRUE(modem.log.Has(" errno " + std::to_string(EAGAIN))) << modem.log.Text();
+    EXPECT_TRUE(modem.log.Has("Error on enter Semaphore"));
+    EXPECT_THAT(modem.Received(), IsEmpty());
+    EXPECT_EQ(modem.record.ModemCmd("AT", reply), 0);
+}
+
+TEST(Command, GivesTheLockBackWhenMemoryRunsOut) {
+    OpenedModem modem;
+    std::string reply;
+    const std::string command(kLarge, 'A');
+    memoryIsShort = true;
+    EXPECT_THROW(modem.record.ModemCmd(command, reply), std::bad_alloc);
+    memoryIsShort = false;
+    EXPECT_TRUE(IsUnlocked());
+}
+
 struct ReplyCase {
     const char* what;
     std::string sent;
@@ -146,7 +211,7 @@ void CheckReplies(bool echo, const std::vector<ReplyCase>& cases) {
 TEST(Reply, HasNeitherBlankNorCutLinesNorEchoes) {
     CheckReplies(true,
                  {{"blank lines alone", "\r\n\r\n\r\n", ""},
-                  {"the late echo of a PIN", Framed({"AT+CPIN=1357", "OK"}), "OK\n"},
+                  {"the late echo of a PIN", Framed({"AT+CPIN=1357", "OK"}), "AT+CPIN=1357\nOK\n"},
                   {"more echoes", Framed({"A", "AT+CSQ", "B", "xAT+CSQ=y", "OK"}), "A\nB\nOK\n"},
                   {"an unsolicited line", Framed({"^RSSI:21", "+CSQ: 17,99", "OK"}),
                    "^RSSI:21\n+CSQ: 17,99\nOK\n"},
@@ -237,19 +302,63 @@ TEST(TestDialogue, PrintsTheReplyOrWhatFailedAndClosesThePort) {
               "Error return on modem cmd: -1\n");
 }
 
-// The limit on a talk is 10 s and is waited for in full: nothing else ends it.
-TEST(Babble, IsGivenUpInsteadOfHoldingTheLockForEver) {
+TEST(Babble, IsGivenUpInsteadOfHoldingTheLockForLong) {
     OpenedModem modem;
     modem.simulator.Fault("1.1", "babble");
     std::string reply;
     // On a loaded machine the babble may pause long enough to count as quiet: then once more.
     int result = 0;
     for (int tries = 0; tries < 3 && result == 0; ++tries) {
-        result = modem.record.ModemCmd("AT+CSQ", reply);
+        EXPECT_TRUE(EndsWithin(6, [&] { result = modem.record.ModemCmd("AT+CSQ", reply); }));
     }
     EXPECT_EQ(result, -1);
     EXPECT_TRUE(modem.log.Has("failed on drain buffer"));
     EXPECT_TRUE(IsUnlocked());
+}
+
+TEST(Babble, ThatACommandSetsOffIsCutOffInItsReply) {
+    OpenedModem modem;
+    modem.simulator.Fault("1.1", "pieces=1/100");  // would go on for 50 s
+    modem.simulator.Fault("1.1", "long=500");
+    std::string reply;
+    EXPECT_TRUE(EndsWithin(8, [&] { EXPECT_EQ(modem.record.ModemCmd("AT+CSQ", reply), 0); }));
+    EXPECT_TRUE(IsUnlocked());
+}
+
+// A signal that comes every 20 ms and is caught, as that of a timer.
+class Signals {
+  public:
+    Signals() {
+        struct sigaction caught {};
+        caught.sa_handler = [](int) {};
+        sigaction(SIGALRM, &caught, &before_);
+        const itimerval often{{0, 20000}, {0, 20000}};
+        setitimer(ITIMER_REAL, &often, nullptr);
+    }
+    Signals(const Signals&) = delete;
+    Signals& operator=(const Signals&) = delete;
+    ~Signals() {
+        const itimerval never{};
+        setitimer(ITIMER_REAL, &never, nullptr);
+        sigaction(SIGALRM, &before_, nullptr);
+    }
+
+  private:
+    struct sigaction before_ {};
+};
+
+TEST(Reply, IsWaitedForThroughSignals) {
+    OpenedModem modem;
+    std::string reply;
+    for (const char* fault : {"slow=300", "pieces=9/60"}) {
+        SCOPED_TRACE(fault);
+        modem.simulator.Fault("1", "off");
+        modem.simulator.Fault("1", "noecho");
+        modem.simulator.Fault("1", fault);
+        const Signals signals;
+        EXPECT_EQ(modem.record.ModemCmd("AT+CSQ", reply), 0);
+        EXPECT_EQ(reply, "+CSQ: 17,99\nOK\n");
+    }
 }
 
 TEST(Unplugging, BetweenCommandsFailsThemQuicklyUntilThePortIsOpenedAnew) {
@@ -275,7 +384,11 @@ TEST(Unplugging, WithinAReplyEndsIt) {
         const char* fault;
         bool echo;  // without one nothing at all comes
         int result;
-    } kFaults[] = {{"vanish=9", true, 0}, {"vanish=0", true, 0}, {"vanish=0", false, -1}};
+        const char* reply;
+    } kFaults[] = {{"vanish=15", true, 0, "+CSQ: 17,99\n"},  // behind its first line
+                   {"vanish=9", true, -1, ""},
+                   {"vanish=0", true, -1, ""},
+                   {"vanish=0", false, -1, ""}};
     for (const auto& row : kFaults) {
         SCOPED_TRACE(row.fault);
         OpenedModem modem;
@@ -284,7 +397,7 @@ TEST(Unplugging, WithinAReplyEndsIt) {
         std::string reply;
         EXPECT_TRUE(
             IsQuick([&] { EXPECT_EQ(modem.record.ModemCmd("AT+CSQ", reply), row.result); }));
-        EXPECT_EQ(reply, "");
+        EXPECT_EQ(reply, row.reply);
         EXPECT_TRUE(IsUnlocked());
     }
 }
