@@ -16,6 +16,10 @@ std::string USBModem_ATIF_DLink::GetATCommandSetSIMPUK(const std::string& puk,
     return "AT+CPIN=\"" + puk + "\",\"" + newPin + "\"";
 }
 
+std::string USBModem_ATIF_DLink::GetATCommandPINPUKAttempt() {
+    return "AT+EPINC?";
+}
+
 USBModem_ATIF* USBModem_ATIF::CreateATIFHuawei() {
     return new USBModem_ATIF_Huawei;
 }

@@ -15,7 +15,8 @@ namespace taviwireless::usbmodem_lib {
 // USBModem::ModemCmd: lines ended by a line feed, without echo and blank lines.
 class TAVIWIRELESS_API USBModem_ATIF {
   public:
-    // Commands. Arguments are inserted as they stand, without quoting or checking. The empty text
+    // Commands. Arguments are inserted as they stand, without quoting or checking: USBModem refuses
+    // codes that would end their place before it builds a command. The empty text
     // means that this command set does not support the operation.
     virtual std::string GetATCommandQuarySIMStatus();
     virtual std::string GetATCommandSetSIMPIN(const std::string& pin);
@@ -86,11 +87,13 @@ class TAVIWIRELESS_API USBModem_ATIF {
     static void DeleteATIF(USBModem_ATIF* commandSet);
 };
 
-// USB vendor id "2001": wants the PIN and PUK quoted.
+// USB vendor id "2001": wants the PIN and PUK quoted, and counts attempts in its own way, which is
+// that of the generic set so far.
 class TAVIWIRELESS_API USBModem_ATIF_DLink : public USBModem_ATIF {
   public:
     std::string GetATCommandSetSIMPIN(const std::string& pin) override;
     std::string GetATCommandSetSIMPUK(const std::string& puk, const std::string& newPin) override;
+    std::string GetATCommandPINPUKAttempt() override;
 };
 
 // USB vendor id "12d1": counts attempts with AT^CPIN? and can silence its unsolicited reports.
