@@ -1,51 +1,99 @@
 #include "usbmodem/loggable.h"
 
+#include <strings.h>
+
 #include <algorithm>
+#include <cctype>
+#include <cstring>
 #include <iterator>
 #include <sstream>
-
-#include "usbmodem/text.h"
 
 namespace taviwireless::usbmodem_lib {
 
 namespace {
 
-// What stands in front of the secrets in the commands that carry them.
-constexpr const char* kBeforeSecrets[] = {"AT+CPIN=", "AT+CPWD=\"SC\",", "AT+CLCK=\"SC\",0,",
-                                          "AT+CLCK=\"SC\",1,"};
+constexpr char kMask[] = "***";
 
-// How the lines begin that a modem writes itself.
-constexpr const char* kOwnLines[] = {"OK", "ERROR", "+CME ERROR:", "+CPIN: ", "BUSY"};
+// The commands that carry codes, and how many commas stand in front of the first one.
+constexpr struct {
+    const char* name;
+    int commas;
+} kWithCodes[] = {{"CPIN=", 0}, {"CPWD=", 1}, {"CLCK=", 2}};
 
-bool IsModemsOwn(const std::string& line) {
-    return std::any_of(std::begin(kOwnLines), std::end(kOwnLines),
-                       [&line](const char* begin) { return line.rfind(begin, 0) == 0; });
+// How lines begin in which a modem says what went wrong, with numbers that are worth reading.
+constexpr const char* kDiagnostics[] = {"ERROR", "+CME ERROR", "+CMS ERROR", "+CPIN:", "+CLCK:"};
+
+bool IsDiagnostic(const std::string& line) {
+    return std::any_of(std::begin(kDiagnostics), std::end(kDiagnostics), [&line](const char* text) {
+        return strncasecmp(line.c_str(), text, std::strlen(text)) == 0;
+    });
+}
+
+// Returns where the first code stands in the line; npos if it holds none.
+size_t FindCode(const std::string& line) {
+    size_t first = std::string::npos;
+    for (const auto& command : kWithCodes) {
+        const char* const end = command.name + std::strlen(command.name);
+        const auto found =
+            std::search(line.begin(), line.end(), command.name, end,
+                        [](unsigned char a, char b) { return std::toupper(a) == b; });
+        size_t code = static_cast<size_t>(found - line.begin()) + std::strlen(command.name);
+        for (int i = 0; i < command.commas && code < line.size(); ++i) {
+            const size_t comma = line.find(',', code);
+            code = comma == std::string::npos ? comma : comma + 1;
+        }
+        if (code < line.size()) {
+            first = std::min(first, code);
+        }
+    }
+    return first;
+}
+
+std::string MaskCommand(const std::string& line) {
+    const size_t code = FindCode(line);
+    return code == std::string::npos ? line : line.substr(0, code) + kMask;
+}
+
+std::string MaskCodes(std::string line, std::initializer_list<std::string> codes) {
+    for (const std::string& code : codes) {
+        for (size_t at = line.find(code); !code.empty() && at != std::string::npos;
+             at = line.find(code, at + std::strlen(kMask))) {
+            line.replace(at, code.size(), kMask);
+        }
+    }
+    if (!IsDiagnostic(line)) {
+        std::replace_if(
+            line.begin(), line.end(), [](unsigned char c) { return std::isdigit(c) != 0; }, '*');
+    }
+    return line;
+}
+
+// Returns the lines of text, each changed by mask, with separator between them.
+template <typename Mask>
+std::string MaskLines(const std::string& text, char separator, Mask mask) {
+    std::istringstream lines(text);
+    std::string masked;
+    for (std::string line; std::getline(lines, line);) {
+        line.erase(0, line.find_first_not_of('\r'));  // left over from the end of an echo
+        masked += (masked.empty() ? "" : std::string(1, separator)) + mask(line);
+    }
+    return masked;
 }
 
 }  // namespace
 
-bool CarriesSecret(const std::string& line) {
-    return std::any_of(std::begin(kBeforeSecrets), std::end(kBeforeSecrets),
-                       [&line](const char* before) { return Contains(line, before); });
-}
-
-std::string LoggableCommand(const std::string& command) {
-    for (const std::string prefix : kBeforeSecrets) {
-        if (command.rfind(prefix, 0) == 0) {
-            return prefix + "***";
-        }
-    }
-    return command;
+std::string LoggableCommand(const std::string& text) {
+    return MaskLines(text, '\n', MaskCommand);
 }
 
 std::string LoggableReply(const std::string& reply) {
-    std::istringstream lines(reply);
-    std::string loggable;
-    for (std::string line; std::getline(lines, line);) {
-        line.erase(0, line.find_first_not_of('\r'));  // left over from the end of an echo
-        loggable += IsModemsOwn(line) ? line + '\n' : "***\n";
-    }
-    return loggable;
+    return MaskLines(reply, ' ', MaskCommand);
+}
+
+std::string LoggableReply(const std::string& reply, std::initializer_list<std::string> codes) {
+    return MaskLines(reply, ' ', [&codes](const std::string& line) {
+        return MaskCodes(MaskCommand(line), codes);
+    });
 }
 
 }  // namespace taviwireless::usbmodem_lib

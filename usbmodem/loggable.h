@@ -1,21 +1,25 @@
 #ifndef TAVIWIRELESS_USBMODEM_LOGGABLE_H
 #define TAVIWIRELESS_USBMODEM_LOGGABLE_H
 
+#include <initializer_list>
 #include <string>
 
-// PINs and PUKs never reach the log or a terminal.
+// PINs and PUKs never reach the log or a terminal; whatever else a modem is told or says stays
+// readable there. What callers receive is not touched.
 namespace taviwireless::usbmodem_lib {
 
-// Whether the line holds a command that carries a PIN or PUK.
-bool CarriesSecret(const std::string& line);
+// Returns the lines of text with "***" in place of the PINs and PUKs in the AT commands that carry
+// some, in whatever case these are written. A line of a reply may be such a command, too: its echo
+// may come late.
+std::string LoggableCommand(const std::string& text);
 
-// Returns an AT command with "***" in place of the PINs and PUKs in it.
-std::string LoggableCommand(const std::string& command);
-
-// Returns the reply to a command that carried a PIN or PUK with "***" in place of every line that
-// is no result or status: a modem may repeat the command damaged, so that it is not known as its
-// echo.
+// Returns a reply as one line, masked likewise.
 std::string LoggableReply(const std::string& reply);
+
+// The same of the reply to a command with these codes, in which they are masked wherever they
+// stand. A modem may repeat the command damaged, so that a piece of a code is left; hence of lines
+// that are no diagnostics the digits are masked as well.
+std::string LoggableReply(const std::string& reply, std::initializer_list<std::string> codes);
 
 }  // namespace taviwireless::usbmodem_lib
 

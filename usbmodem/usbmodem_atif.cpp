@@ -4,6 +4,7 @@
 #include <sstream>
 
 #include "common/log.h"
+#include "usbmodem/loggable.h"
 #include "usbmodem/text.h"
 
 namespace taviwireless::usbmodem_lib {
@@ -145,7 +146,7 @@ int USBModem_ATIF::ParseRetStringDefaultFormat(const std::string& reply, std::st
         return -1;
     }
     if (Contains(reply, "ERROR")) {
-        TAVI_LOG_ERROR("error on input string: %s", reply.c_str());
+        TAVI_LOG_ERROR("error on input string: %s", LoggableReply(reply).c_str());
         return -1;
     }
     const size_t colon = reply.find(':');
@@ -171,7 +172,7 @@ int USBModem_ATIF::GetLineWithDelim(const std::string& reply, char delim, int fi
         return -1;
     }
     if (Contains(reply, "ERROR")) {
-        TAVI_LOG_ERROR("error on input string: %s", reply.c_str());
+        TAVI_LOG_ERROR("error on input string: %s", LoggableReply(reply).c_str());
         return -1;
     }
     std::istringstream stream(reply);

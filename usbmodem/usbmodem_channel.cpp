@@ -8,6 +8,7 @@
 #include <chrono>
 #include <cstdio>
 #include <optional>
+#include <sstream>
 
 #include "common/log.h"
 #include "usbmodem/loggable.h"
@@ -203,7 +204,13 @@ int USBModem::TestATCmd(const std::string& cmd, const std::string& node) {
     if (result != 0) {
         std::printf("Error return on modem cmd: %d\n", result);
     } else {
-        std::printf("Get return string as follow:\n%s\n", reply.c_str());
+        std::printf("Get return string as follow:\n");
+        std::istringstream lines(LoggableCommand(reply));
+        for (std::string printed; std::getline(lines, printed);) {
+            MakePrintable(printed.data());
+            std::printf("%s\n", printed.c_str());
+        }
+        std::printf("\n");
     }
     CloseFileDevice();
     return result;

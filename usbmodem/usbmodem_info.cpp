@@ -6,6 +6,7 @@
 #include <fstream>
 
 #include "common/log.h"
+#include "usbmodem/loggable.h"
 #include "usbmodem/text.h"
 
 namespace taviwireless::usbmodem_lib {
@@ -67,7 +68,7 @@ bool USBModem::Refresh(Command command, Parser parser, std::string& cache,
         return false;
     }
     if ((CommandSet().*parser)(reply, cache) != 0) {
-        logParseFailure(reply.c_str());
+        logParseFailure(LoggableReply(reply).c_str());
         return false;
     }
     return true;
@@ -224,7 +225,8 @@ int USBModem::SetHardwareFuncLvl(const std::string& level) {
         return -1;
     }
     if (CommandSet().ParseRetStringIsOK(reply) != 0) {
-        TAVI_LOG_ERROR("error on setting hardware function lvl, ret: %s", reply.c_str());
+        TAVI_LOG_ERROR("error on setting hardware function lvl, ret: %s",
+                       LoggableReply(reply).c_str());
         return -1;
     }
     return 0;
@@ -251,7 +253,8 @@ int USBModem::SetUnsolicitedReports(bool enable) {
         return -1;
     }
     if (CommandSet().ParseRetStringIsOK(reply) != 0) {
-        TAVI_LOG_ERROR("error on changing unsolicited reports setting, ret: %s", reply.c_str());
+        TAVI_LOG_ERROR("error on changing unsolicited reports setting, ret: %s",
+                       LoggableReply(reply).c_str());
         return -1;
     }
     return 0;

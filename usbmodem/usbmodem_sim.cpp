@@ -2,6 +2,10 @@
 #include <taviwireless/usbmodem.h>
 #include <taviwireless/usbmodem_atif.h>
 
+#include <algorithm>
+#include <cctype>
+#include <cstring>
+
 #include "common/log.h"
 #include "usbmodem/loggable.h"
 #include "usbmodem/text.h"
@@ -13,6 +17,23 @@ namespace {
 constexpr int kRefused = -1;
 constexpr int kNotOK = -2;
 constexpr int kBusy = 2;
+
+// Whether code can stand in a command as it is. A modem takes what follows one of these characters
+// for the next part of the line, or for a command of its own: "1234;D112;" dials.
+bool FitsInCommand(const std::string& code) {
+    constexpr char kEnds[] = "\",;";
+    return std::none_of(code.begin(), code.end(), [&kEnds](unsigned char c) {
+        return std::iscntrl(c) != 0 || std::strchr(kEnds, c) != nullptr;
+    });
+}
+
+bool FitInCommand(const std::string& first, const std::string& second = "") {
+    const bool isFit = FitsInCommand(first) && FitsInCommand(second);
+    if (!isFit) {
+        TAVI_LOG_ERROR("refused: a code with a quote, comma, semicolon or control character");
+    }
+    return isFit;
+}
 
 }  // namespace
 
@@ -99,6 +120,9 @@ int USBModem::ChangePINEnable(const std::string& pin, bool enable) {
         TAVI_LOG_ERROR("Cannot change enable when SIM is not ready");
         return kRefused;
     }
+    if (!FitInCommand(pin)) {
+        return kRefused;
+    }
     const int current = GetPINEnable();
     if (current < 0) {
         TAVI_LOG_ERROR("error on getting current PIN enable setting");
@@ -113,7 +137,8 @@ int USBModem::ChangePINEnable(const std::string& pin, bool enable) {
         return kRefused;
     }
     if (CommandSet().ParseRetStringIsOK(reply) != 0) {
-        TAVI_LOG_ERROR("error on enable PIN protection, ret: %s", LoggableReply(reply).c_str());
+        TAVI_LOG_ERROR("error on enable PIN protection, ret: %s",
+                       LoggableReply(reply, {pin}).c_str());
         return kNotOK;
     }
     return 0;
@@ -131,13 +156,17 @@ int USBModem::ChangePIN(const std::string& oldPin, const std::string& newPin) {
         TAVI_LOG_ERROR("error on change pin: input args should not be null");
         return kRefused;
     }
+    if (!FitInCommand(oldPin, newPin)) {
+        return kRefused;
+    }
     std::string reply;
     if (ModemCmd(CommandSet().GetATCommandChangePINCode(oldPin, newPin), reply) != 0) {
         TAVI_LOG_ERROR("error on modem cmd: change pin");
         return kRefused;
     }
     if (CommandSet().ParseRetStringIsOK(reply) != 0) {
-        TAVI_LOG_ERROR("error on changing PIN, ret: %s", LoggableReply(reply).c_str());
+        TAVI_LOG_ERROR("error on changing PIN, ret: %s",
+                       LoggableReply(reply, {oldPin, newPin}).c_str());
         return kNotOK;
     }
     return 0;
@@ -145,7 +174,7 @@ int USBModem::ChangePIN(const std::string& oldPin, const std::string& newPin) {
 
 int USBModem::PINSet(const std::string& pin, const std::string& newPin, bool enable) {
     newPlugIn_ = false;
-    int result = ChangePINEnable(pin, enable);
+    int result = FitInCommand(pin, newPin) ? ChangePINEnable(pin, enable) : kRefused;
     if (result != 0) {
         TAVI_LOG_ERROR("failed on PIN enable");
     } else if (!newPin.empty()) {
@@ -166,6 +195,9 @@ int USBModem::PINUnlock(const std::string& pin) {
 }
 
 int USBModem::EnterPIN(const std::string& pin) {
+    if (!FitInCommand(pin)) {
+        return kRefused;
+    }
     std::string reply;
     if (QuerySIMStatus(reply) != 0) {
         TAVI_LOG_ERROR("error on checking PIN stats, ret: %s", reply.c_str());
@@ -175,12 +207,12 @@ int USBModem::EnterPIN(const std::string& pin) {
         return 0;
     }
     if (ModemCmd(CommandSet().GetATCommandSetSIMPIN(pin), reply) != 0) {
-        TAVI_LOG_ERROR("error on entering PIN, ret: %s", LoggableReply(reply).c_str());
+        TAVI_LOG_ERROR("error on entering PIN, ret: %s", LoggableReply(reply, {pin}).c_str());
         return kRefused;
     }
     if (CommandSet().ParseRetStringIsOK(reply) != 0) {
         TAVI_LOG_ERROR("Cannot find OK in respond of PIN unlock, ret: %s",
-                       LoggableReply(reply).c_str());
+                       LoggableReply(reply, {pin}).c_str());
         return kNotOK;
     }
     return 0;
@@ -198,13 +230,17 @@ int USBModem::EnterPUK(const std::string& puk, const std::string& newPin) {
         TAVI_LOG_ERROR("Cannot set PUK at this SIM stat");
         return kRefused;
     }
+    if (!FitInCommand(puk, newPin)) {
+        return kRefused;
+    }
     std::string reply;
     if (ModemCmd(CommandSet().GetATCommandSetSIMPUK(puk, newPin), reply) != 0) {
         TAVI_LOG_ERROR("error on modem cmd: change pin with puk");
         return kRefused;
     }
     if (CommandSet().ParseRetStringIsOK(reply) != 0) {
-        TAVI_LOG_ERROR("error on changing pin with puk, ret: %s", LoggableReply(reply).c_str());
+        TAVI_LOG_ERROR("error on changing pin with puk, ret: %s",
+                       LoggableReply(reply, {puk, newPin}).c_str());
         return kNotOK;
     }
     return 0;
@@ -234,7 +270,7 @@ int USBModem::AttemptRemain(Parser parser, int& cache) {
     }
     std::string count;
     if ((CommandSet().*parser)(reply, count) != 0) {
-        TAVI_LOG_ERROR("error on parsing AT command ret string: %s", reply.c_str());
+        TAVI_LOG_ERROR("error on parsing AT command ret string: %s", LoggableReply(reply).c_str());
         return -1;
     }
     cache = ToInt(count);

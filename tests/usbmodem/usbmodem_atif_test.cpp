@@ -3,6 +3,7 @@
 #include <taviwireless/usbmodem_atif.h>
 
 #include <memory>
+#include <type_traits>
 
 #include "tests/support/log_capture.h"
 
@@ -66,6 +67,9 @@ TEST(Atif, BuildsTheCommandOfEachOperationForEachVendor) {
     quoted[1] = "AT+CPIN=\"12345678\",\"4321\"";
     USBModem_ATIF_DLink dLink;
     EXPECT_EQ(Commands(dLink), quoted);
+    static_assert(std::is_same_v<decltype(&USBModem_ATIF_DLink::GetATCommandPINPUKAttempt),
+                                 std::string (USBModem_ATIF_DLink::*)()>,
+                  "its own, should its modems ever differ");
     const std::string own[] = {"AT^CPIN?", "AT^CURC?", "AT^CURC=1", "AT^CURC=0"};
     std::copy(std::begin(own), std::end(own), expected.begin() + 2);
     USBModem_ATIF_Huawei huawei;
@@ -173,6 +177,28 @@ TEST(Parsers, ReadGoodRepliesAndRefuseBadOnesWithALogLine) {
         EXPECT_EQ(result, row.result ? row.result : "kept");
         EXPECT_EQ(log.Lines().size(), row.result ? 0u : 1u) << log.Text();
         EXPECT_EQ(log.Count("error on input "), row.result ? 0 : 1) << log.Text();
+    }
+}
+
+TEST(Parsers, LogARefusedReplyOnOneLineAndWithoutTheCodesInIt) {
+    const struct {
+        const char* reply;
+        const char* logged;
+    } kReplies[] = {
+        {"+CMS ERROR: 303\n", "+CMS ERROR: 303"},
+        {"^RSSI:21\nERROR\n", "^RSSI:21 ERROR"},
+        {"AT+CPIN=1357\nERROR\n", "AT+CPIN=*** ERROR"},
+        {"at+cpin=\"1357\",\"2468\"\nERROR\n", "at+cpin=*** ERROR"},
+        {"AT+CPWD=\"P2\",\"1357\",\"2468\"\nERROR\n", "AT+CPWD=\"P2\",*** ERROR"},
+        {"AT+CLCK=\"SC\",1,\"1357\"\nERROR\n", "AT+CLCK=\"SC\",1,*** ERROR"},
+        {"AT+CLCK=\"SC\",2\nERROR\n", "AT+CLCK=\"SC\",2 ERROR"},
+        {"\033[2JERROR\n", "?[2JERROR"},
+    };
+    for (const auto& row : kReplies) {
+        LogCapture log;
+        std::string result;
+        EXPECT_EQ(USBModem_ATIF().ParseRetStringGetRSSI(row.reply, result), -1);
+        EXPECT_THAT(log.Text(), testing::EndsWith(std::string("string: ") + row.logged + "\n"));
     }
 }
 

@@ -257,11 +257,12 @@ TEST(Secrets, AreNotLoggedWhenTheModemIsSilent) {
     std::string reply;
     for (const char* command : {"AT+CPIN=1357", "AT+CPIN=\"1357\"", "AT+CPIN=98765432,2468",
                                 "AT+CPIN=\"98765432\",\"2468\"", "AT+CPWD=\"SC\",\"1357\",\"2468\"",
-                                "AT+CLCK=\"SC\",1,\"1357\"", "AT+CLCK=\"SC\",0,\"1357\""}) {
+                                "AT+CLCK=\"SC\",1,\"1357\"", "AT+CLCK=\"SC\",0,\"1357\"",
+                                "at+cpin=1357", "AT+CSQ;+cpin=1357"}) {
         EXPECT_EQ(modem.record.ModemCmd(command, reply), -1);
     }
-    EXPECT_EQ(modem.log.Count("No respond on modem cmd AT+C"), 7) << modem.log.Text();
-    EXPECT_EQ(modem.log.Count("***"), 7);
+    EXPECT_EQ(modem.log.Count("No respond on modem cmd "), 9) << modem.log.Text();
+    EXPECT_EQ(modem.log.Count("***"), 9);
     EXPECT_FALSE(HasSecret(modem.log.Text())) << modem.log.Text();
 }
 
@@ -272,9 +273,9 @@ TEST(Secrets, AreNotLoggedWhenTheModemRepeatsThemDamaged) {
         SCOPED_TRACE(echo);
         modem.log.Clear();
         modem.simulator.ReplyOnce("1", "AT+CPIN=*",
-                                  std::string(echo) + "\r\r\n" + Framed({"+CME ERROR: wrong"}));
+                                  std::string(echo) + "\r\r\n" + Framed({"+CMS ERROR: 303"}));
         EXPECT_EQ(modem.record.PINUnlock("1357"), -2);
-        EXPECT_TRUE(modem.log.Has("+CME ERROR: wrong"));
+        EXPECT_TRUE(modem.log.Has("+CMS ERROR: 303"));
         EXPECT_FALSE(HasSecret(modem.log.Text())) << modem.log.Text();
     }
 }
@@ -296,6 +297,8 @@ TEST(TestDialogue, PrintsTheReplyOrWhatFailedAndClosesThePort) {
     EXPECT_EQ(dialogue("/dev/ttyUSB9", -1),
               "Initializing Modem for node /dev/ttyUSB9\n"
               "modem Init failed: No such file or directory\n");
+    modem.simulator.Reply("1", "AT+CSQ", Framed({"\033[2Jat+cpin=1357", "OK"}));
+    EXPECT_THAT(dialogue(kQueryPort, 0), testing::EndsWith(":\n?[2Jat+cpin=***\nOK\n\n"));
     modem.simulator.Fault("1", "silent");
     EXPECT_EQ(dialogue(kQueryPort, -1),
               "Initializing Modem for node /dev/ttyUSB1\nSend command AT+CSQ\n"

@@ -1,4 +1,6 @@
 // SIM status, PIN and PUK, against a card that keeps its state and against single odd replies.
+#include <functional>
+
 #include "tests/usbmodem/opened_modem.h"
 
 namespace taviwireless::test {
@@ -6,6 +8,7 @@ namespace {
 
 using testing::ElementsAre;
 using testing::IsEmpty;
+using usbmodem_lib::USBModem;
 
 constexpr char kQuery[] = "AT+CPIN?";
 constexpr char kQueryLock[] = "AT+CLCK=\"SC\",2";
@@ -139,6 +142,35 @@ TEST(PINUnlock, RefusesAWrongPINUntilThePUKSetsANewOne) {
         EXPECT_TRUE(modem.record.IsPINReady(err));
         EXPECT_FALSE(err);
     }
+}
+
+TEST(Codes, ThatWouldEndTheirPlaceInACommandAreRefused) {
+    OpenedModem modem("generic");
+    USBModem& record = modem.record;
+    // Whether it is refused, with nothing sent but questions for the status.
+    const auto isRefused = [&](const std::function<int()>& operation) {
+        modem.Received();
+        modem.log.Clear();
+        const bool isFailure = operation() == -1;
+        const std::vector<std::string> sent = modem.Received();
+        return isFailure && modem.log.Count("refused: a code with") == 1 &&
+               !modem.log.Has("0900") && sent == std::vector<std::string>(sent.size(), kQuery);
+    };
+    ASSERT_EQ(record.UpdateSIMStatus(), 1);
+    for (const char* code :
+         {"1234\rATD0900;", "1\n", "1234;D0900;", "1\",\"0900", "1,0900", "0900\x1B", "\x7F"}) {
+        EXPECT_TRUE(isRefused([&] { return record.ChangePIN(code, "4321"); })) << code;
+    }
+    const char* const code = "1234\rATD0900;";
+    EXPECT_TRUE(isRefused([&] { return record.ChangePIN("1234", code); }));
+    EXPECT_TRUE(isRefused([&] { return record.ChangePINEnable(code, true); }));
+    EXPECT_TRUE(isRefused([&] { return record.PINSet(code, "", true); }));
+    EXPECT_TRUE(isRefused([&] { return record.PINSet("1234", code, true); }));
+    EXPECT_TRUE(isRefused([&] { return record.PINUnlock(code); }));
+    modem.Answer(kQuery, {"+CPIN: SIM PUK"});
+    ASSERT_EQ(record.UpdateSIMStatus(), 0);
+    EXPECT_TRUE(isRefused([&] { return record.PUKSet(code, "4321"); }));
+    EXPECT_TRUE(isRefused([&] { return record.PUKSet("12345678", code); }));
 }
 
 TEST(Attempts, AreReadFromTheLayoutOfTheVendorAndKeptWithoutAUsableCard) {
