@@ -5,7 +5,12 @@
 
 namespace taviwireless::usbmodem_lib {
 
-// Returns the value of key in a modem's info file; empty when there is none.
+// Whether the file counts as an info file: everybody can write in "/tmp/", so only a regular file
+// of root or of the own user does, see base/trusted_file.h.
+bool IsTrustedInfo(const std::string& infoPath);
+
+// Returns the value of key in a modem's info file; empty when there is none, or when the file does
+// not count.
 std::string ReadInfo(const std::string& infoPath, const char* key);
 
 }  // namespace taviwireless::usbmodem_lib

@@ -10,6 +10,7 @@
 
 #include "common/log.h"
 #include "common/sz_list.h"
+#include "usbmodem/info_file.h"
 
 namespace taviwireless::usbmodem_lib {
 
@@ -31,6 +32,14 @@ std::optional<int> ParseInterfaceId(const std::string& name) {
         return std::nullopt;
     }
     return static_cast<int>(number);
+}
+
+std::string InfoPath(int interfaceId) {
+    return std::string(kInfoDirectory) + kInfoName + std::to_string(interfaceId);
+}
+
+bool IsPluggedIn(const USBModem& modem) {
+    return modem.IsInfoExist() && IsTrustedInfo(InfoPath(static_cast<int>(modem.GetIfid())));
 }
 
 }  // namespace
@@ -57,10 +66,10 @@ int USBModemList::SearchInfoPath() {
         return -1;
     }
     for (int i = 0; i < names.Count(); ++i) {
-        const std::string name = names[i];
-        const std::optional<int> interfaceId = ParseInterfaceId(name);
-        if (interfaceId && FindUSBModem(*interfaceId).IsNull()) {
-            records_.emplace_back(*interfaceId, kInfoDirectory + name);
+        const std::optional<int> interfaceId = ParseInterfaceId(names[i]);
+        if (interfaceId && FindUSBModem(*interfaceId).IsNull() &&
+            IsTrustedInfo(InfoPath(*interfaceId))) {
+            records_.emplace_back(*interfaceId, InfoPath(*interfaceId));
         }
     }
     return 0;
@@ -70,7 +79,7 @@ void USBModemList::DropUnplugged() {
     // The record that moves into a freed place is not looked at until the next call. Kept: clients
     // may count on seeing modems go one by one.
     for (size_t i = 0; i < records_.size(); ++i) {
-        if (!records_.at(i).IsInfoExist()) {
+        if (!IsPluggedIn(records_.at(i))) {
             records_.erase(records_.begin() + static_cast<std::ptrdiff_t>(i));
         }
     }

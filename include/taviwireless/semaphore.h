@@ -23,9 +23,9 @@ class TAVIWIRELESS_API Semaphore {
     // then shows in semop.
     int Get(int* semid);
 
-    // Takes the lock, waiting while another holder has it, 5 s at most: whoever may open the set can
-    // keep it. Signals do not shorten the wait. Returns 0, or -1 with a line in the log, which has
-    // errno 11 (EAGAIN) when the time is over.
+    // Takes the lock, waiting while another holder has it, 5 s at most: whoever may open the set
+    // can keep it. Signals do not shorten the wait. Returns 0, or -1 with a line in the log, which
+    // has errno 11 (EAGAIN) when the time is over.
     int Enter();
 
     // Gives the lock back. Returns 0, or -1 with a line in the log.

@@ -41,6 +41,7 @@ class USBModem_ATIF;
 //   USB_ID_VENDOR  USB vendor id, four lowercase hexadecimal digits
 //   CONNECTNODE    number k of the dial port "/dev/ttyUSBk"
 //   DEVICENODE     numbers of all serial ports of the modem, separated by ","
+// Nothing is read from it unless it is a regular file of root or of the own user, of 64 KB at most.
 class TAVIWIRELESS_API USBModem {
   public:
     // Makes a record with nothing known yet. Touches no file and no device.
@@ -112,8 +113,8 @@ class TAVIWIRELESS_API USBModem {
     // Fails when no channel is open, or when the modem is not quiet within 1 s.
     int DrainDeviceBuffer();
     // Sends cmd and a carriage return under the modem's semaphore and collects the reply, at most
-    // 1024 bytes, until 200 ms pass without any or 2 s are over; -1 when none begins within 1000 ms,
-    // when the modem is not quiet before it, or when it is unplugged within a line. reply then
+    // 1024 bytes, until 200 ms pass without any or 2 s are over; -1 when none begins within 1000
+    // ms, when the modem is not quiet before it, or when it is unplugged within a line. reply then
     // holds its lines, each ended by a line feed, without blank lines and lines that repeat cmd. A
     // line that was cut off before its end is dropped. Whether the modem reported an error is for
     // the caller to see: that is a reply too. With the wait for the semaphore a call takes 9 s at

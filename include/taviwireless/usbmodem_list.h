@@ -19,12 +19,12 @@ class TAVIWIRELESS_API USBModemList {
     virtual ~USBModemList();
 
     // Adds a record for every info file "/tmp/usbmodem.info" + n that has none yet. Names are
-    // exact: no leading zeros, nothing behind the number. Returns 0, or -1 when "/tmp/" cannot be
-    // listed.
+    // exact: no leading zeros, nothing behind the number. Only regular files of root or of the own
+    // user count, of 64 KB at most. Returns 0, or -1 when "/tmp/" cannot be listed.
     int SearchInfoPath();
 
-    // Drops the modems whose info file is gone. Of two modems unplugged at once whose records are
-    // neighbours, the second is dropped by the next call.
+    // Drops the modems whose info file is gone, or is not one that counts any more. Of two modems
+    // unplugged at once whose records are neighbours, the second is dropped by the next call.
     void DropUnplugged();
 
     // Brings the list up to date: SearchInfoPath, DropUnplugged, and InitInfo for each modem that

@@ -1,9 +1,11 @@
 // Discovery: which files are modems, what an update does with them, and what it opens.
 #include <dlfcn.h>
+#include <sys/stat.h>
 #include <tavicore/error.h>
 #include <tavicore/file.h>
 #include <tavicore/szlist.h>
 #include <taviwireless/usbmodem_list.h>
+#include <unistd.h>
 
 #include <cstdlib>
 #include <filesystem>
@@ -70,6 +72,46 @@ TEST(Search, TakesExactlyTheNamesOfInfoFiles) {
     EXPECT_THAT(DevIds(list), testing::UnorderedElementsAre(
                                   "usbmodem0", "usbmodem1", "usbmodem12", "usbmodem2147483647",
                                   "usbmodem4294967291", "usbmodem2147483648"));
+}
+
+// Puts a file of somebody who is not the owner of the modems at path.
+void PutStrangersFile(const std::string& path) {
+    constexpr uid_t kStranger = 1;
+    WriteFile(path, "USB_ID_VENDOR=12d1\nCONNECTNODE=0\nDEVICENODE=0,1\n");
+    ASSERT_EQ(chown(path.c_str(), kStranger, kStranger), 0);
+}
+
+TEST(Search, TakesNothingThatAStrangerPutThere) {
+    WriteFile(kInfo1, "CONNECTNODE=0\n");
+    WriteFile("/tmp/usbmodem.info2", "");
+    ASSERT_EQ(truncate("/tmp/usbmodem.info2", 3LL << 30), 0);
+    ASSERT_EQ(symlink(kInfo1, "/tmp/usbmodem.info3"), 0);
+    ASSERT_EQ(mkfifo("/tmp/usbmodem.info4", 0666), 0);
+    for (int i = 5; i < 305; ++i) {
+        PutStrangersFile("/tmp/usbmodem.info" + std::to_string(i));
+    }
+    USBModemList list;
+    EXPECT_EQ(list.SearchInfoPath(), 0);
+    EXPECT_THAT(DevIds(list), ElementsAre("usbmodem1"));
+    LogCapture log;
+    for (int i = 2; i < 6; ++i) {
+        USBModem modem(i, "/tmp/usbmodem.info" + std::to_string(i));
+        modem.SetATInterface();
+        EXPECT_EQ(modem.AssignConnectNode(), -1);
+        EXPECT_EQ(modem.AssignQuaryNode(), -1);
+        EXPECT_EQ(modem.IsInfoExist(), true);
+    }
+    EXPECT_EQ(log.Count("Cannot parsing USB_ID_VENDOR from "), 4) << log.Text();
+}
+
+TEST(Search, DropsAModemWhoseInfoFileIsAStrangersNow) {
+    WriteFile(kInfo1, "CONNECTNODE=0\n");
+    USBModemList list;
+    ASSERT_EQ(list.SearchInfoPath(), 0);
+    std::filesystem::remove(kInfo1);
+    PutStrangersFile(kInfo1);
+    list.DropUnplugged();
+    EXPECT_THAT(DevIds(list), IsEmpty());
 }
 
 TEST(Search, ThatFailsDropsNothing) {
