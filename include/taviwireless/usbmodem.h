@@ -28,9 +28,11 @@ class USBModem_ATIF;
 // Conventions of all operations:
 // - Nothing throws on a device, file or parse failure; each failure is one line in the system log.
 // - An int result is 0 for success and -1 for failure where nothing else is said.
-// - A bool& err is only ever set to true; the caller clears it before the call. The text returned
-// is
-//   then the last good value, which may be empty.
+// - A bool& err is only ever set to true; the caller clears it before the call. Only
+//   GetDefaultLocation also sets it to false, when it could look the operator up. With err the text
+//   returned is the last good value, which may be empty, where nothing else is said.
+// - "The SIM is ready" means: was so when it was last asked (UpdateSIMStatus, and what ends with
+//   it). A new record has not asked yet; InitInfo does.
 // - "Busy" is the time in which a dial-up connection owns the modem: nothing is sent, and queries
 //   give what they last knew.
 // - Operations that talk to the modem send through the open channel (OpenFileDevice) with the
@@ -73,7 +75,8 @@ class TAVIWIRELESS_API USBModem {
     // Counts one error and returns the new count.
     int IncreaseErrorCounter();
     bool IsUSBModemBusy();
-    // True until SetNotNewPlugIn or an operation that enters or changes a PIN.
+    // True until SetNotNewPlugIn, PINSet, PINUnlock, ChangePINWithPUK, PUKSet, NetConnect or
+    // NetDisconnect, whether these succeed or not.
     bool IsNewPlugIn();
     void SetNotNewPlugIn();
     int GetConnectFailedAttempt();
@@ -126,7 +129,9 @@ class TAVIWIRELESS_API USBModem {
 
     // SIM and PIN. The operations that change something return 0 when it is done or need not be,
     // -1 when it was refused or could not be sent, -2 when the modem did not answer OK, 2 when
-    // busy.
+    // busy. A code with a quote, comma, semicolon or control character is refused before anything
+    // is sent: it would end its place in the command. PINSet, PINUnlock, ChangePINWithPUK and
+    // PUKSet end with UpdateSIMStatus.
 
     // Asks for the SIM status, unless busy. Returns 1 ready, 0 PIN or PUK required, 2 SIM busy or
     // error, -1 unknown.
@@ -155,21 +160,28 @@ class TAVIWIRELESS_API USBModem {
     int PINGetAttemptRemain();
     int PUKGetAttemptRemain();
 
-    // Information. The SIM must be ready for all but the vendor and product name.
+    // Information. When busy, each gives what it last knew.
+
+    // The SIM must be ready, or err is set.
     std::string GetDefaultAPN(bool& err);
     // Empty, without err, while the SIM is not ready.
     std::string GetDefaultISP(bool& err);
-    // The location of the operator by the APN database, empty when it is not listed.
+    // The location of the operator by the APN database, empty when it is not listed. Also empty,
+    // and without err, while the SIM is not ready; empty with err when the operator or the database
+    // cannot be read.
     std::string GetDefaultLocation(bool& err);
-    // "true" or "false"; asked only while connected.
+    // "true" or "false"; asked only while connected, whatever the SIM.
     std::string GetRoaming(bool& err);
-    // 6 to 15 digits; any other answer is a failure.
+    // 6 to 15 digits; any other answer is a failure. The SIM must be ready, or err is set.
     std::string GetIMSI(bool& err);
+    // These need no SIM.
     std::string GetProductName(bool& err);
     std::string GetVendorName(bool& err);
-    // Asks for the signal strength and keeps it; 0 also when there was nothing to ask.
+    // Asks for the signal strength and keeps it; 0 also when there was nothing to ask: when busy or
+    // while the SIM is not ready.
     int GetRSSI();
-    // Signal strength in percent of the scale of TS 27.007, 8.5 (0 to 31); 0 when it is not known.
+    // Signal strength in percent of the scale of TS 27.007, 8.5 (0 to 31); 0 when it is not known
+    // and, without err, while the SIM is not ready.
     int GetSignalQuality(bool& err);
     // Sets +CFUN to level ("1": full functionality). 0 also when the modem does not know +CFUN;
     // 2 when busy.
