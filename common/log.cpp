@@ -3,6 +3,7 @@
 #include <cerrno>
 #include <cstdarg>
 #include <cstdio>
+#include <cstring>
 
 namespace taviwireless {
 
@@ -46,7 +47,7 @@ size_t CharacterLength(const unsigned char* text) {
 }  // namespace
 
 void MakePrintable(char* text) {
-    while (*text != '\0') {
+    while (*text != '\0' && std::strcmp(text, "\n") != 0) {
         const size_t length = CharacterLength(reinterpret_cast<const unsigned char*>(text));
         if (length == 0) {
             *text = '?';

@@ -26,7 +26,8 @@ void WriteLog(int priority, const char* file, int line, const char* format, ...)
     __attribute__((format(printf, 4, 5)));
 
 // Puts "?" in place of every byte of text that is neither printable ASCII nor part of a UTF-8
-// character. Control characters, line breaks and those beyond ASCII among them, are not printable.
+// character. Control characters, line breaks and those beyond ASCII among them, are not printable;
+// only a line feed at the end stays, since it ends the line in any case.
 void MakePrintable(char* text);
 
 }  // namespace taviwireless

@@ -75,9 +75,13 @@ std::string MaskLines(const std::string& text, char separator, Mask mask) {
     std::string masked;
     for (std::string line; std::getline(lines, line);) {
         line.erase(0, line.find_first_not_of('\r'));  // left over from the end of an echo
-        masked += (masked.empty() ? "" : std::string(1, separator)) + mask(line);
+        if (!masked.empty()) {
+            masked += separator;
+        }
+        masked += mask(line);
     }
-    return masked;
+    const bool isEnded = !text.empty() && text.back() == '\n';
+    return isEnded ? masked + '\n' : masked;
 }
 
 }  // namespace

@@ -13,7 +13,7 @@ namespace taviwireless::usbmodem_lib {
 // may come late.
 std::string LoggableCommand(const std::string& text);
 
-// Returns a reply as one line, masked likewise.
+// Returns a reply as one line, masked likewise, with its last line feed.
 std::string LoggableReply(const std::string& reply);
 
 // The same of the reply to a command with these codes, in which they are masked wherever they

@@ -17,6 +17,8 @@ TEST(Log, IsPrintableWhateverStandsInIt) {
         {"\033[2J\033]0;title\a", "?[2J?]0;title?"},
         {"OK\nusbmodem1 is ready\r", "OK?usbmodem1 is ready?"},
         {"\t\x7F", "??"},
+        {"ERROR\n", "ERROR\n"},  // it ends the line in any case
+        {"\n\n", "?\n"},
         {"Telef\xC3\xB3nica \xE4\xB8\xAD\xF0\x9F\x93\xB6",
          "Telef\xC3\xB3nica \xE4\xB8\xAD\xF0\x9F\x93\xB6"},
         {"\xC2\x9B"

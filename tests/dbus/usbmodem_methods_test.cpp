@@ -7,6 +7,7 @@
 #include <memory>
 #include <set>
 
+#include "common/log.h"
 #include "tests/support/files.h"
 #include "tests/support/log_capture.h"
 #include "tests/support/modem_simulator.h"
@@ -68,7 +69,9 @@ struct Service {
             return {true, text};
         }
         EXPECT_EQ(error->domain, 3u);
-        EXPECT_TRUE(log.Has(std::string(" ") + error->message)) << log.Text();
+        std::string logged = std::string(" ") + error->message;
+        MakePrintable(logged.data());
+        EXPECT_TRUE(log.Has(logged)) << log.Text();
         const Outcome outcome{false, error->message, error->code};
         g_error_free(error);
         return outcome;

@@ -198,7 +198,7 @@ TEST(Parsers, LogARefusedReplyOnOneLineAndWithoutTheCodesInIt) {
         LogCapture log;
         std::string result;
         EXPECT_EQ(USBModem_ATIF().ParseRetStringGetRSSI(row.reply, result), -1);
-        EXPECT_THAT(log.Text(), testing::EndsWith(std::string("string: ") + row.logged + "\n"));
+        EXPECT_THAT(log.Text(), testing::EndsWith(std::string("string: ") + row.logged + "\n\n"));
     }
 }
 

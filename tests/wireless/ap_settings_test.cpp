@@ -140,7 +140,7 @@ TEST(SetAPConfig, SwitchingOffChangesOneLine) {
     EXPECT_EQ(ReadFile(kFile), after);
     SetField(settings.name, "a\nb");
     EXPECT_EQ(TAVIWirelessSetAPConfig(&settings), 0);
-    EXPECT_TRUE(here.log.Has("Failed to set key[enable] of sec[a\nb] in file[" + kFile + "]."));
+    EXPECT_TRUE(here.log.Has("Failed to set key[enable] of sec[a?b] in file[" + kFile + "]."));
     EXPECT_EQ(ReadFile(kFile), after);
 }
 
