@@ -28,7 +28,11 @@ constexpr int kAttempts = 3;
 
 bool MakeLockFile(const char* path) {
     const UniqueFd file(open(path, O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, kLockMode));
-    return file && dprintf(file.Get(), "%10d\n", static_cast<int>(getpid())) > 0;
+    if (file && dprintf(file.Get(), "%10d\n", static_cast<int>(getpid())) < 0) {
+        unlink(path);  // the disk is full; an empty one would count for ever
+        return false;
+    }
+    return static_cast<bool>(file);
 }
 
 // Returns the process that a lock file which counts names: 0 when it names none. Nothing, with

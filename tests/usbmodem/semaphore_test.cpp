@@ -1,5 +1,4 @@
 // The lock between processes. The appliance root has semaphores of its own, so keys are free here.
-#include <dlfcn.h>
 #include <gmock/gmock.h>
 #include <sys/prctl.h>
 #include <sys/sem.h>
@@ -8,7 +7,6 @@
 #include <taviwireless/semaphore.h>
 #include <unistd.h>
 
-#include <algorithm>
 #include <cerrno>
 #include <chrono>
 #include <csignal>
@@ -17,26 +15,7 @@
 
 #include "tests/support/files.h"
 #include "tests/support/log_capture.h"
-
-namespace {
-
-bool waitsAreCut = false;
-std::chrono::seconds longestWait{0};  // of those that were cut
-
-}  // namespace
-
-// In place of the C library's, for the library as well.
-extern "C" __attribute__((visibility("default"))) int semtimedop(int semid, sembuf* operations,
-                                                                 size_t count,
-                                                                 const timespec* limit) {
-    static const auto next =
-        reinterpret_cast<decltype(&semtimedop)>(dlsym(RTLD_NEXT, "semtimedop"));
-    const timespec none{};
-    if (waitsAreCut) {
-        longestWait = std::max(longestWait, std::chrono::seconds(limit->tv_sec));
-    }
-    return next(semid, operations, count, waitsAreCut ? &none : limit);
-}
+#include "tests/usbmodem/lock_waits.h"
 
 namespace taviwireless::test {
 namespace {
@@ -120,12 +99,12 @@ TEST(Semaphore, IsNotWaitedForForEver) {
         return pause();
     });
     ASSERT_TRUE(Becomes(GETVAL, 0));
-    waitsAreCut = true;
+    lockWaitsAreCut = true;
     LogCapture log;
     EXPECT_EQ(Semaphore(kKey).Enter(), -1);
     EXPECT_TRUE(log.Has(" errno " + std::to_string(EAGAIN))) << log.Text();
-    EXPECT_GE(longestWait.count(), 4);  // an exchange that takes its time
-    EXPECT_LE(longestWait.count(), 5);
+    EXPECT_GE(longestCutWait.count(), 4);  // an exchange that takes its time
+    EXPECT_LE(longestCutWait.count(), 5);
     kill(stranger, SIGKILL);
 }
 

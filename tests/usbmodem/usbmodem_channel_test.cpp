@@ -1,5 +1,4 @@
 // The serial channel: opening, one command and its reply, and modems that misbehave.
-#include <dlfcn.h>
 #include <sys/sem.h>
 #include <sys/stat.h>
 #include <sys/time.h>
@@ -14,17 +13,17 @@
 
 #include "tests/support/descriptors.h"
 #include "tests/support/files.h"
+#include "tests/usbmodem/lock_waits.h"
 #include "tests/usbmodem/opened_modem.h"
 
 namespace {
 
 constexpr size_t kLarge = 100000;  // bytes
 bool memoryIsShort = false;        // whether there is none for anything large
-bool lockIsKept = false;           // whether nobody gives a modem's lock back
 
 }  // namespace
 
-// In place of the C++ and the C library's, for the library as well.
+// In place of the C++ library's, for the library as well.
 void* operator new(size_t size) {
     void* const memory = memoryIsShort && size >= kLarge ? nullptr : std::malloc(size);
     if (memory == nullptr) {
@@ -37,14 +36,6 @@ void operator delete(void* memory) noexcept {
 }
 void operator delete(void* memory, size_t) noexcept {
     std::free(memory);
-}
-extern "C" __attribute__((visibility("default"))) int semtimedop(int semid, sembuf* operations,
-                                                                 size_t count,
-                                                                 const timespec* limit) {
-    static const auto next =
-        reinterpret_cast<decltype(&semtimedop)>(dlsym(RTLD_NEXT, "semtimedop"));
-    const timespec none{};
-    return next(semid, operations, count, lockIsKept ? &none : limit);
 }
 
 namespace taviwireless::test {
@@ -169,9 +160,9 @@ TEST(Command, FailsWhileAStrangerKeepsTheLockAndFreesIt) {
     ASSERT_EQ(modem.record.ModemCmd("AT", reply), 0);
     ASSERT_EQ(semctl(semget(1, 1, 0), 0, SETVAL, 0), 0);
     modem.Received();
-    lockIsKept = true;
+    lockWaitsAreCut = true;
     EXPECT_EQ(modem.record.ModemCmd("AT", reply), -1);
-    lockIsKept = false;
+    lockWaitsAreCut = false;
     EXPECT_TRUE(modem.log.Has(" errno " + std::to_string(EAGAIN))) << modem.log.Text();
     EXPECT_TRUE(modem.log.Has("Error on enter Semaphore"));
     EXPECT_THAT(modem.Received(), IsEmpty());
