@@ -16,8 +16,8 @@ namespace taviwireless::usbmodem_lib {
 class TAVIWIRELESS_API USBModem_ATIF {
   public:
     // Commands. Arguments are inserted as they stand, without quoting or checking: USBModem refuses
-    // codes that would end their place before it builds a command. The empty text
-    // means that this command set does not support the operation.
+    // codes that would end their place before it builds a command. The empty text means that this
+    // command set does not support the operation.
     virtual std::string GetATCommandQuarySIMStatus();
     virtual std::string GetATCommandSetSIMPIN(const std::string& pin);
     virtual std::string GetATCommandSetSIMPUK(const std::string& puk, const std::string& newPin);
