@@ -8,6 +8,7 @@
 #include <csignal>
 #include <cstdlib>
 #include <ctime>
+#include <filesystem>
 #include <functional>
 #include <new>
 
@@ -23,18 +24,20 @@ bool memoryIsShort = false;        // whether there is none for anything large
 
 }  // namespace
 
-// In place of the C++ library's, for the library as well.
-void* operator new(size_t size) {
+// In place of the C++ library's, for the library as well. Inlined, g++ would take free() for a
+// mistake.
+#define TAKEN_OVER __attribute__((noinline))
+TAKEN_OVER void* operator new(size_t size) {
     void* const memory = memoryIsShort && size >= kLarge ? nullptr : std::malloc(size);
     if (memory == nullptr) {
         throw std::bad_alloc();
     }
     return memory;
 }
-void operator delete(void* memory) noexcept {
+TAKEN_OVER void operator delete(void* memory) noexcept {
     std::free(memory);
 }
-void operator delete(void* memory, size_t) noexcept {
+TAKEN_OVER void operator delete(void* memory, size_t) noexcept {
     std::free(memory);
 }
 
@@ -104,7 +107,8 @@ TEST(Channel, IsNotKeptFromItsPortByWhatStrangersPutAtItsLockFile) {
         {"nobody yet", [] { WriteFile(kLockFile, ""); }, 0, true},
         {"a stranger's living process", [&] { WriteFile(kLockFile, living); }, kStranger, false},
         {"a pipe", [] { mkfifo(kLockFile, 0666); }, kStranger, false},
-        {"a link", [] { symlink("/etc/passwd", kLockFile); }, kStranger, false},
+        {"a link", [] { std::filesystem::create_symlink("/etc/passwd", kLockFile); }, kStranger,
+         false},
         {"a folder", [] { MakeDirectories(std::string(kLockFile) + "/full"); }, kStranger, false},
     };
     OpenedModem modem("generic");
