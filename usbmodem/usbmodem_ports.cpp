@@ -38,12 +38,11 @@ void Retry(Assign assign, LogFailure logFailure) {
 // with the last command that the modem was sent.
 size_t FindInterface(const std::string& log) {
     const std::string lines = '\n' + log;
-    if (!Contains(lines, "\n--> ")) {
-        return log.find(kUsingInterface);
-    }
     const size_t lastCommand = lines.rfind("\n--> Sending: ");
-    const size_t line = lines.find(std::string("\n--> ") + kUsingInterface,
-                                   lastCommand == std::string::npos ? 0 : lastCommand);
+    if (lastCommand == std::string::npos) {
+        return log.find(kUsingInterface);  // the modem was not asked anything
+    }
+    const size_t line = lines.find(std::string("\n--> ") + kUsingInterface, lastCommand);
     return line == std::string::npos ? line : lines.find(kUsingInterface, line) - 1;
 }
 

@@ -101,8 +101,8 @@ class TAVIWIRELESS_API USBModem {
     int AssignQuaryNode();
     // Reads the network interface name from the dialler's log,
     // "/var/lib/usbmodem/wvdial.log." and the IMSI. Returns 1 when it was read, 2 while the link is
-    // still coming up, -1 when the log cannot be read or the dialler is disconnecting. In a log
-    // whose lines the dialler marks ("--> "), what the modem answered names no interface.
+    // still coming up, -1 when the log cannot be read or the dialler is disconnecting. What
+    // the modem answered to the dialler's commands ("--> Sending: ") names no interface.
     int AssignConnectInfo();
 
     // Opens the serial port at the device path node: 9600 baud, hardware flow control. Fails when
