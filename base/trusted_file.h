@@ -18,17 +18,24 @@ namespace taviwireless {
 
 constexpr off_t kTrustedFileLimit = 65536;  // bytes; far above what any of these files holds
 
-// Opens path for reading. Never follows a link at its end and never waits for the other end of a
-// pipe. Without a descriptor errno tells why: ENOENT when nothing is there, ELOOP for a link, EPERM
-// for what is no regular file or somebody else's, EFBIG when it holds more than limit bytes.
-inline UniqueFd OpenTrusted(const std::string& path, off_t limit = kTrustedFileLimit) {
-    UniqueFd file(open(path.c_str(), O_RDONLY | O_NOFOLLOW | O_NONBLOCK | O_NOCTTY | O_CLOEXEC));
+// Whether what this user owns is trusted: root's, or one's own.
+inline bool IsTrustedOwner(uid_t owner) {
+    return owner == 0 || owner == geteuid();
+}
+
+// Opens path, from the folder on where it is relative, for reading. Never follows a link at its end
+// and never waits for the other end of a pipe. Without a descriptor errno tells why: ENOENT when
+// nothing is there, ELOOP for a link, EPERM for what is no regular file or somebody else's, EFBIG
+// when it holds more than limit bytes.
+inline UniqueFd OpenTrustedAt(int folder, const std::string& path,
+                              off_t limit = kTrustedFileLimit) {
+    UniqueFd file(
+        openat(folder, path.c_str(), O_RDONLY | O_NOFOLLOW | O_NONBLOCK | O_NOCTTY | O_CLOEXEC));
     struct stat status {};
     if (!file || fstat(file.Get(), &status) != 0) {
         return UniqueFd();
     }
-    const bool isOurs = status.st_uid == 0 || status.st_uid == geteuid();
-    if (!S_ISREG(status.st_mode) || !isOurs) {
+    if (!S_ISREG(status.st_mode) || !IsTrustedOwner(status.st_uid)) {
         file.Close();
         errno = EPERM;
     } else if (status.st_size > limit) {
@@ -36,6 +43,10 @@ inline UniqueFd OpenTrusted(const std::string& path, off_t limit = kTrustedFileL
         errno = EFBIG;
     }
     return file;
+}
+
+inline UniqueFd OpenTrusted(const std::string& path, off_t limit = kTrustedFileLimit) {
+    return OpenTrustedAt(AT_FDCWD, path, limit);
 }
 
 // The whole text of path, which OpenTrusted must accept; nothing, with errno, when it does not or

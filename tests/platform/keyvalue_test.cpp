@@ -44,6 +44,7 @@ TEST(KeyValue, ReadsValuesAsAShellWould) {
 }
 
 TEST(KeyValue, AValueThatDoesNotFitIsRefusedAndNothingIsOverrun) {
+    constexpr char kFile[] = "/etc/settings";  // in "/tmp" it would be too big to be read at all
     WriteFile(kFile, "BIG=" + std::string(1 << 20, 'x') + "\nKEY=12345\n");
     for (size_t size : {1, 5, 6}) {
         char value[8] = "#######";

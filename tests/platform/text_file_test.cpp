@@ -1,6 +1,8 @@
 // Replacing a file: in one step, alike, and one writer after the other.
+#include <fcntl.h>
 #include <gmock/gmock.h>
 #include <signal.h>
+#include <sys/file.h>
 #include <sys/mount.h>
 #include <sys/stat.h>
 #include <sys/wait.h>
@@ -9,10 +11,14 @@
 #include <tavicore/section.h>
 #include <unistd.h>
 
+#include <memory>
 #include <random>
+#include <utility>
 
+#include "tests/platform/skipped_waits.h"
 #include "tests/support/descriptors.h"
 #include "tests/support/files.h"
+#include "tests/support/log_capture.h"
 
 namespace taviwireless::test {
 namespace {
@@ -116,6 +122,137 @@ TEST(Replacing, AKilledWriterNeverLeavesATornFile) {
     }
     EXPECT_EQ(VEXACFileSetKeyValue(kFile, "PAIR", "1-1", "%s=%s\n"), 1);
     EXPECT_FALSE(Exists("/tmp/state/.file.new"));  // what the last killed one left
+}
+
+constexpr char kLock[] = "/tmp/state/.file.lock";
+constexpr uid_t kStranger = 65534;
+
+int SetKey(const char* path, const char* value) {
+    return VEXACFileSetKeyValue(path, "A", value, "%s=%s\n");
+}
+
+// A writer that has the lock and goes no further: stopped until it is killed.
+class StoppedWriter {
+  public:
+    StoppedWriter()
+        : pid_(Fork([] {
+              AtEachSync([] { raise(SIGSTOP); });
+              SetKey(kFile, "stopped");
+          })) {
+        waitpid(pid_, nullptr, WUNTRACED);
+    }
+    ~StoppedWriter() { End(); }
+    StoppedWriter(const StoppedWriter&) = delete;
+    StoppedWriter& operator=(const StoppedWriter&) = delete;
+
+    pid_t Pid() const { return pid_; }
+    void End() {
+        if (pid_ > 0) {
+            kill(pid_, SIGKILL);
+            waitpid(std::exchange(pid_, -1), nullptr, 0);
+        }
+    }
+
+  private:
+    pid_t pid_;
+};
+
+struct Locking : testing::Test {
+    Locking() { WriteFile(kFile, "A=1\n"); }
+
+    LogCapture log_;
+    SkippedWaits waits_;
+};
+
+TEST_F(Locking, AWriterThatDoesNotGoOnIsWaitedForTwoSecondsAndNamed) {
+    ASSERT_EQ(symlink("/tmp/state/file", "/tmp/other-name"), 0);
+    const auto before = OpenDescriptors();
+    const StoppedWriter holder;
+    for (const char* path : {kFile, "/tmp/state/../state/file", "/tmp/other-name"}) {
+        const double begin = waits_.Seconds();
+        log_.Clear();
+        EXPECT_EQ(SetKey(path, "2"), -1);
+        EXPECT_EQ(VEXACErrGet(), VEXAC_ERR_LOCKED);
+        EXPECT_LE(waits_.Seconds() - begin, 2.001);
+        EXPECT_THAT(log_.Text(),
+                    testing::HasSubstr("Cannot write " + std::string(path) + ": process " +
+                                       std::to_string(holder.Pid()) + " (tavicore_test) holds"));
+    }
+    EXPECT_EQ(SetKey("/tmp/state/another", "2"), 1);  // locks are of single files
+    EXPECT_EQ(ReadFile(kFile), "A=1\n");
+    EXPECT_EQ(OpenDescriptors(), before);
+}
+
+TEST_F(Locking, AKilledWritersLockIsTakenOver) {
+    StoppedWriter().End();
+    EXPECT_TRUE(Exists(kLock));
+    EXPECT_EQ(SetKey(kFile, "2"), 1);
+    EXPECT_EQ(waits_.Seconds(), 0);
+    EXPECT_FALSE(Exists(kLock));
+    EXPECT_EQ(ReadFile(kFile), "A=2\n");
+}
+
+// Locks whatever this user can open in the folder, and the folder, for as long as it lives.
+void LockAll(const std::string& folder) {
+    for (const char* name : {"", "file", ".file.new", ".file.lock"}) {
+        const int file = open((folder + name).c_str(), O_RDONLY);
+        if (file >= 0) {
+            flock(file, LOCK_EX);
+        }
+    }
+}
+
+TEST_F(Locking, AStrangerLocksNothingThatAWriterNeeds) {
+    StoppedWriter holder;  // while it writes, all its files are there
+    int ready[2];
+    ASSERT_EQ(pipe(ready), 0);
+    const pid_t stranger = Fork([&ready] {
+        if (setuid(kStranger) == 0) {
+            LockAll("/tmp/state/");
+            close(ready[0]);
+            close(ready[1]);
+            pause();
+        }
+    });
+    close(ready[1]);
+    char none = 0;
+    ASSERT_EQ(read(ready[0], &none, 1), 0);
+    close(ready[0]);
+    holder.End();
+    EXPECT_EQ(SetKey(kFile, "2"), 1);
+    EXPECT_EQ(waits_.Seconds(), 0);
+    kill(stranger, SIGKILL);
+    waitpid(stranger, nullptr, 0);
+}
+
+// An ordinary user who may write in the folder does not get root's lock, and gets his own.
+TEST_F(Locking, AnOrdinaryUserLocksToo) {
+    ASSERT_EQ(chown("/tmp/state", kStranger, kStranger), 0);
+    ASSERT_EQ(chown(kFile, kStranger, kStranger), 0);
+    for (const bool isHeld : {true, false}) {
+        std::unique_ptr<StoppedWriter> holder(isHeld ? new StoppedWriter : nullptr);
+        const pid_t user = Fork([isHeld] {
+            const bool isWritten =
+                setgid(kStranger) == 0 && setuid(kStranger) == 0 && SetKey(kFile, "2") == 1;
+            _exit(isWritten != isHeld && (!isHeld || VEXACErrGet() == VEXAC_ERR_LOCKED) ? 0 : 1);
+        });
+        int status = -1;
+        waitpid(user, &status, 0);
+        EXPECT_EQ(status, 0) << isHeld;
+        holder.reset();
+        unlink(kLock);
+        unlink("/tmp/state/.file.new");
+    }
+    EXPECT_EQ(ReadFile(kFile), "A=2\n");
+}
+
+TEST_F(Locking, AFolderThatCannotBeWrittenNeedsNoLock) {
+    ASSERT_EQ(mount("/tmp/state", "/tmp/state", nullptr, MS_BIND, nullptr), 0);
+    ASSERT_EQ(mount(nullptr, "/tmp/state", nullptr, MS_BIND | MS_REMOUNT | MS_RDONLY, nullptr), 0);
+    EXPECT_EQ(SetKey(kFile, "1"), 1);  // as it is
+    EXPECT_EQ(SetKey(kFile, "2"), -1);
+    EXPECT_EQ(VEXACErrGet(), VEXAC_ERR_IO);
+    EXPECT_EQ(waits_.Seconds(), 0);
 }
 
 }  // namespace

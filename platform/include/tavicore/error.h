@@ -19,6 +19,7 @@ enum {
     VEXAC_ERR_NOT_FOUND = 0x0700,     /* no such file, section, key or process */
     VEXAC_ERR_IO = 0x0800,            /* the file cannot be opened, read, written or replaced */
     VEXAC_ERR_TOO_LONG = 0x0900,      /* the value does not fit into the caller's buffer */
+    VEXAC_ERR_LOCKED = 0x0A00,        /* another process has kept the file's lock for 2 s */
     VEXAC_ERR_BAD_PARAMETER = 0x0D00, /* a null argument, or text that the file cannot hold */
     VEXAC_ERR_FORK_FAILED = 0x2A00
 };

@@ -10,7 +10,9 @@
  * Writing replaces the file in one step (a new file beside it, synced and renamed), so a reader or
  * a crash sees the old or the new content, never a mixture. Mode and owner of the file are kept, a
  * symbolic link keeps pointing to it, every line that is not concerned survives as it stands, and
- * writers in different processes wait for each other.
+ * writers in different processes wait for each other. The lock is on a file ".NAME.lock" beside it
+ * that nobody else can open and that is there only meanwhile; a writer that has not got it after 2 s
+ * fails with VEXAC_ERR_LOCKED and names the holder in the system log.
  */
 #ifndef TAVICORE_KEYVALUE_H
 #define TAVICORE_KEYVALUE_H

@@ -2,20 +2,19 @@
 #include "text_file.h"
 
 #include <fcntl.h>
-#include <sys/file.h>
 
-#include <climits>
 #include <optional>
 
+#include "base/trusted_file.h"
 #include "failure.h"
+#include "file_lock.h"
 
 namespace tavicore {
 namespace {
 
-// For whatever a foreign hand may have put at the path: no waiting for a fifo's or a serial line's
-// other end, no terminal taken over.
-constexpr int kCarefully = O_CLOEXEC | O_NONBLOCK | O_NOCTTY;
-constexpr int kMostLinks = 40;  // as the kernel follows
+// For whatever may be at the path: no waiting for a fifo's or a serial line's other end, no
+// terminal taken over.
+constexpr int kCarefully = O_RDONLY | O_NOFOLLOW | O_CLOEXEC | O_NONBLOCK | O_NOCTTY;
 
 void WriteAll(int descriptor, std::string_view text) {
     while (!text.empty()) {
@@ -27,82 +26,71 @@ void WriteAll(int descriptor, std::string_view text) {
     }
 }
 
-std::string DirectoryOf(const std::string& path) {
-    return path.substr(0, path.rfind('/') + 1);
-}
-
-// Where the path leads when it is a symbolic link, also when nothing is there yet.
-std::string FollowLinks(std::string path) {
-    for (int links = 0; links < kMostLinks; ++links) {
-        char target[PATH_MAX];
-        const ssize_t length = readlink(path.c_str(), target, sizeof target);
-        if (length < 0) {
-            return path;
+Place FindForWriting(const char* path, IfMissing ifMissing) {
+    try {
+        return FindPlace(path);
+    } catch (const Failure&) {
+        if (ifMissing == IfMissing::kFail) {
+            throw;
         }
-        const std::string text(target, length);
-        path = text.front() == '/' ? text : DirectoryOf(path) + text;
+        throw Failure{VEXAC_ERR_IO};  // no folder to create it in
     }
-    throw Failure{VEXAC_ERR_IO};
 }
 
-// The place of a file that is to be replaced. The lock is on its directory: a lock on the file
-// would be on the file that is being replaced, and a file to lock would be one more to leave
-// behind.
+// The place of a file that is to be replaced, which no other writer replaces meanwhile.
 class LockedPlace {
   public:
-    LockedPlace(const char* path, IfMissing ifMissing) {
-        const std::string place = FollowLinks(path);
-        const std::string directory = DirectoryOf(place);
-        name_ = place.substr(directory.size());
-        newName_ = "." + name_ + ".new";
-        directory_ = UniqueFd(
-            open(directory.empty() ? "." : directory.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC));
-        if (!directory_) {
-            throw ifMissing == IfMissing::kFail ? FileFailure() : Failure{VEXAC_ERR_IO};
-        }
-        if (name_.empty()) {
-            throw Failure{VEXAC_ERR_IO};
-        }
-        while (flock(directory_.Get(), LOCK_EX) != 0) {
-            if (errno != EINTR) {
-                throw Failure{VEXAC_ERR_IO};
-            }
-        }
-    }
-    // Closing alone would not unlock while a child that another thread forked has the descriptor.
-    ~LockedPlace() { flock(directory_.Get(), LOCK_UN); }
-    LockedPlace(const LockedPlace&) = delete;
-    LockedPlace& operator=(const LockedPlace&) = delete;
+    LockedPlace(const char* path, IfMissing ifMissing)
+        : place_(FindForWriting(path, ifMissing)),
+          newName_("." + place_.name + ".new"),
+          lock_(place_, path) {}
 
     // Nothing when there is no file.
     std::optional<TextFile> Read() const {
-        UniqueFd file(openat(directory_.Get(), name_.c_str(), O_RDONLY | O_NOFOLLOW | kCarefully));
-        if (!file && errno == ENOENT) {
+        try {
+            return TextFile(place_);
+        } catch (const Failure& failure) {
+            if (failure.code != VEXAC_ERR_NOT_FOUND) {
+                throw;
+            }
             return std::nullopt;
         }
-        return TextFile(std::move(file));
+    }
+
+    // Throws when something stands there that is no regular file, whoever's it is.
+    void RequireReplaceable() const {
+        struct stat status {};
+        const int result = fstatat(Directory(), place_.name.c_str(), &status, AT_SYMLINK_NOFOLLOW);
+        if (result == 0 ? !S_ISREG(status.st_mode) : errno != ENOENT) {
+            throw Failure{VEXAC_ERR_IO};
+        }
     }
 
     // `like`, when it is not null, gives the new file's mode and owner.
     void Replace(const std::string& text, const struct stat* like) const {
+        if (!lock_.IsTaken()) {
+            throw Failure{VEXAC_ERR_IO};
+        }
         try {
             WriteNew(text, like);
-            if (renameat(directory_.Get(), newName_.c_str(), directory_.Get(), name_.c_str()) !=
-                0) {
+            if (renameat(Directory(), newName_.c_str(), Directory(), place_.name.c_str()) != 0) {
                 throw Failure{VEXAC_ERR_IO};
             }
         } catch (...) {
-            unlinkat(directory_.Get(), newName_.c_str(), 0);
+            unlinkat(Directory(), newName_.c_str(), 0);
             throw;
         }
-        fsync(directory_.Get());  // a failure here cannot take the new text back
+        const UniqueFd folder(openat(Directory(), ".", O_RDONLY | O_DIRECTORY | O_CLOEXEC));
+        fsync(folder.Get());  // a failure here cannot take the new text back
     }
 
   private:
+    int Directory() const { return place_.directory.Get(); }
+
     void WriteNew(const std::string& text, const struct stat* like) const {
-        unlinkat(directory_.Get(), newName_.c_str(), 0);
+        unlinkat(Directory(), newName_.c_str(), 0);
         // The old file may hold a key that only its owner may read: 0600 until it has its own mode.
-        UniqueFd file(openat(directory_.Get(), newName_.c_str(),
+        UniqueFd file(openat(Directory(), newName_.c_str(),
                              O_WRONLY | O_CREAT | O_EXCL | O_NOFOLLOW | O_CLOEXEC,
                              like != nullptr ? 0600 : 0644));
         // The owner first, since giving a file away takes set-id bits off its mode.
@@ -116,16 +104,19 @@ class LockedPlace {
         }
     }
 
-    std::string name_;
-    std::string newName_;
-    UniqueFd directory_;
+    const Place place_;
+    const std::string newName_;
+    const FileLock lock_;
 };
 
 }  // namespace
 
-TextFile::TextFile(const char* path) : TextFile(UniqueFd(open(path, O_RDONLY | kCarefully))) {}
+TextFile::TextFile(const char* path) : TextFile(FindPlace(path)) {}
 
-TextFile::TextFile(UniqueFd file) : file_(std::move(file)) {
+TextFile::TextFile(const Place& place)
+    : file_(place.isShared
+                ? taviwireless::OpenTrustedAt(place.directory.Get(), place.name)
+                : UniqueFd(openat(place.directory.Get(), place.name.c_str(), kCarefully))) {
     if (!file_) {
         throw FileFailure();
     }
@@ -185,7 +176,7 @@ void ChangeText(const char* path, IfMissing ifMissing,
 
 void ReplaceFile(const char* path, const std::string& text) {
     const LockedPlace place(path, IfMissing::kCreate);
-    place.Read();  // refuses what is no regular file
+    place.RequireReplaceable();
     place.Replace(text, nullptr);
 }
 

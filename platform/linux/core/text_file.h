@@ -6,19 +6,18 @@
 #include <functional>
 #include <string>
 
-#include "base/unique_fd.h"
+#include "place.h"
 
 // Whole text files: read, and replaced in one step. Everything here throws Failure.
 namespace tavicore {
 
-using taviwireless::UniqueFd;
-
 // A regular file that is open for reading. Anything else at the path is a failure and is never
-// waited for.
+// waited for; so is, in a folder that others can write in, a file that is neither root's nor one's
+// own, or one of more than 64 KB.
 class TextFile {
   public:
     explicit TextFile(const char* path);
-    explicit TextFile(UniqueFd file);
+    explicit TextFile(const Place& place);
 
     // As it was when the file was opened.
     const struct stat& Status() const { return status_; }
@@ -38,7 +37,7 @@ enum class IfMissing { kFail, kCreate };
 // Replaces the text of a file by what `change` makes of it; a missing file that is to be created is
 // the empty text. The file keeps its mode and owner, a new one has 0644 less the umask; a symbolic
 // link stays and leads to the new text. A text that `change` leaves alone is not written. While it
-// runs, this and every other writer of a file in the same directory waits.
+// runs, every other writer of the file waits.
 //
 // The new text is written and synced beside the file as ".NAME.new" and renamed, so at any moment
 // the path names the old or the new text. What a killed writer leaves of ".NAME.new", the next one

@@ -1,0 +1,165 @@
+#include "file_lock.h"
+
+#include <fcntl.h>
+#include <sys/file.h>
+#include <sys/stat.h>
+#include <syslog.h>
+
+#include <chrono>
+#include <fstream>
+
+#include "base/trusted_file.h"
+#include "failure.h"
+
+namespace tavicore {
+namespace {
+
+using Clock = std::chrono::steady_clock;
+
+constexpr std::chrono::seconds kLongestWait{2};
+constexpr useconds_t kPause = 1000;  // µs
+constexpr int kCarefully = O_NOFOLLOW | O_NONBLOCK | O_NOCTTY | O_CLOEXEC;
+
+bool IsOurs(int file, const Place& place) {
+    struct stat status {};
+    struct stat folder {};
+    return fstat(file, &status) == 0 && fstat(place.directory.Get(), &folder) == 0 &&
+           S_ISREG(status.st_mode) &&
+           (taviwireless::IsTrustedOwner(status.st_uid) || status.st_uid == folder.st_uid);
+}
+
+// Marks beside the lock itself, of which flock() tells nothing: who has it, and that it is awaited.
+constexpr off_t kHolderMark = 0;
+constexpr off_t kWaiterMark = 1;
+
+struct flock Mark(off_t which, short type) {
+    struct flock mark {};
+    mark.l_type = type;
+    mark.l_start = which;
+    mark.l_len = 1;
+    return mark;
+}
+
+void PutHolderMark(int file) {
+    struct flock mark = Mark(kHolderMark, F_WRLCK);
+    fcntl(file, F_SETLK, &mark);  // of the process: the kernel knows its number
+}
+
+// 0 when it is this process, or one that cannot be seen from here.
+pid_t HolderOf(int file) {
+    struct flock mark = Mark(kHolderMark, F_WRLCK);
+    const bool isMarked = fcntl(file, F_GETLK, &mark) == 0 && mark.l_type != F_UNLCK;
+    return isMarked && mark.l_pid > 0 ? mark.l_pid : 0;
+}
+
+void PutWaiterMark(int file) {
+    struct flock mark = Mark(kWaiterMark, F_RDLCK);
+    fcntl(file, F_OFD_SETLK, &mark);
+}
+
+bool IsAwaited(int file) {
+    struct flock mark = Mark(kWaiterMark, F_WRLCK);
+    return fcntl(file, F_OFD_GETLK, &mark) == 0 && mark.l_type != F_UNLCK;
+}
+
+std::string ProgramOf(pid_t pid) {
+    std::ifstream file("/proc/" + std::to_string(pid) + "/comm");
+    std::string name;
+    std::getline(file, name);
+    return name;
+}
+
+}  // namespace
+
+FileLock::FileLock(const Place& place, const char* path)
+    : place_(place), name_("." + place.name + ".lock") {
+    const auto deadline = Clock::now() + kLongestWait;
+    while (!Try()) {
+        if (Clock::now() >= deadline) {
+            syslog(LOG_ERR, "%s:%d Cannot write %s: %s holds its lock", "file_lock.cpp", __LINE__,
+                   path, Holder().c_str());
+            throw Failure{VEXAC_ERR_LOCKED};
+        }
+        usleep(kPause);
+    }
+}
+
+FileLock::~FileLock() {
+    if (!isTaken_) {
+        return;
+    }
+    const bool isAwaited = IsAwaited(file_.Get());
+    unlinkat(place_.directory.Get(), name_.c_str(), 0);
+    // Closing alone would not unlock while a child that another thread forked has the file.
+    flock(file_.Get(), LOCK_UN);
+    if (isAwaited) {
+        usleep(2 * kPause);  // or who writes again at once would keep those who wait from it
+    }
+}
+
+// True when there is nothing more to wait for.
+bool FileLock::Try() {
+    if (!file_ && !Open()) {
+        return true;
+    }
+    if (!file_ || !IsOurs(file_.Get(), place_)) {
+        file_.Close();
+        return false;
+    }
+    if (flock(file_.Get(), LOCK_EX | LOCK_NB) != 0) {
+        if (errno != EWOULDBLOCK) {
+            throw Failure{VEXAC_ERR_IO};
+        }
+        PutWaiterMark(file_.Get());
+        return false;
+    }
+    if (!IsStillThere()) {  // its holder has just removed it
+        file_.Close();
+        return false;
+    }
+    PutHolderMark(file_.Get());
+    isTaken_ = true;
+    return true;
+}
+
+// False when the folder cannot be written. Another user's file stays unopened.
+bool FileLock::Open() {
+    file_ = UniqueFd(
+        openat(place_.directory.Get(), name_.c_str(), O_RDWR | O_CREAT | kCarefully, 0600));
+    if (file_) {
+        return true;
+    }
+    if (errno != EROFS && errno != EACCES) {
+        throw Failure{VEXAC_ERR_IO};
+    }
+    return errno == EACCES && !IsMissing();
+}
+
+bool FileLock::IsMissing() const {
+    struct stat status {};
+    const bool isMissing =
+        fstatat(place_.directory.Get(), name_.c_str(), &status, AT_SYMLINK_NOFOLLOW) != 0 &&
+        errno == ENOENT;
+    errno = EACCES;
+    return isMissing;
+}
+
+bool FileLock::IsStillThere() const {
+    struct stat locked {};
+    struct stat there {};
+    return fstat(file_.Get(), &locked) == 0 &&
+           fstatat(place_.directory.Get(), name_.c_str(), &there, AT_SYMLINK_NOFOLLOW) == 0 &&
+           locked.st_dev == there.st_dev && locked.st_ino == there.st_ino;
+}
+
+std::string FileLock::Holder() const {
+    const pid_t pid = file_ ? HolderOf(file_.Get()) : 0;
+    if (pid != 0) {
+        return "process " + std::to_string(pid) + " (" + ProgramOf(pid) + ')';
+    }
+    struct stat status {};
+    fstatat(place_.directory.Get(), name_.c_str(), &status, AT_SYMLINK_NOFOLLOW);
+    return "a process of user " + std::to_string(status.st_uid);
+}
+
+}  // namespace tavicore

@@ -1,0 +1,30 @@
+#ifndef TAVICORE_PLACE_H
+#define TAVICORE_PLACE_H
+
+#include <string>
+
+#include "base/unique_fd.h"
+
+// Where a path leads.
+namespace tavicore {
+
+using taviwireless::UniqueFd;
+
+// An entry of a folder, whether or not something is there, that was no symbolic link when it was
+// looked at.
+struct Place {
+    UniqueFd directory;  // names the folder, cannot be read itself (O_PATH)
+    std::string name;
+    // True when others can put entries into the folder, such as "/tmp": what is there counts only
+    // when it is root's or one's own.
+    bool isShared = false;
+};
+
+// Follows the links at the end of the path, in a shared folder only those of root or of one's own:
+// as the kernel does where it protects links, which not every kernel is told to. Throws Failure,
+// also when there is no such folder.
+Place FindPlace(const std::string& path);
+
+}  // namespace tavicore
+
+#endif
