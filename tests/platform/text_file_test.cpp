@@ -225,23 +225,34 @@ TEST_F(Locking, AStrangerLocksNothingThatAWriterNeeds) {
     waitpid(stranger, nullptr, 0);
 }
 
-// An ordinary user who may write in the folder does not get root's lock, and gets his own.
+// What he puts at the lock's place in a folder where he may, is in nobody's way.
+TEST_F(Locking, AStrangersFileOrLinkIsNoLock) {
+    constexpr char kSharedFile[] = "/tmp/file";
+    constexpr char kSharedLock[] = "/tmp/.file.lock";
+    WriteFile(kSharedLock, "");
+    for (const bool isLink : {false, true}) {
+        ASSERT_EQ(lchown(kSharedLock, kStranger, kStranger), 0);
+        EXPECT_EQ(SetKey(kSharedFile, "2"), 1) << isLink;
+        EXPECT_LT(waits_.Seconds(), 0.1);
+        ASSERT_EQ(symlink("/etc/passwd", kSharedLock), 0);
+    }
+}
+
+// An ordinary user in a folder of his own meets root's lock, and takes over a killed root's.
 TEST_F(Locking, AnOrdinaryUserLocksToo) {
     ASSERT_EQ(chown("/tmp/state", kStranger, kStranger), 0);
     ASSERT_EQ(chown(kFile, kStranger, kStranger), 0);
-    for (const bool isHeld : {true, false}) {
-        std::unique_ptr<StoppedWriter> holder(isHeld ? new StoppedWriter : nullptr);
-        const pid_t user = Fork([isHeld] {
-            const bool isWritten =
-                setgid(kStranger) == 0 && setuid(kStranger) == 0 && SetKey(kFile, "2") == 1;
-            _exit(isWritten != isHeld && (!isHeld || VEXACErrGet() == VEXAC_ERR_LOCKED) ? 0 : 1);
+    StoppedWriter root;
+    for (const int expected : {-1, 1}) {
+        const pid_t user = Fork([expected] {
+            const bool isUser = setgid(kStranger) == 0 && setuid(kStranger) == 0;
+            const bool isLocked = SetKey(kFile, "2") == -1 && VEXACErrGet() == VEXAC_ERR_LOCKED;
+            _exit(isUser && isLocked == (expected == -1) ? 0 : 1);
         });
         int status = -1;
         waitpid(user, &status, 0);
-        EXPECT_EQ(status, 0) << isHeld;
-        holder.reset();
-        unlink(kLock);
-        unlink("/tmp/state/.file.new");
+        EXPECT_EQ(status, 0) << expected;
+        root.End();
     }
     EXPECT_EQ(ReadFile(kFile), "A=2\n");
 }

@@ -18,14 +18,12 @@ using Clock = std::chrono::steady_clock;
 
 constexpr std::chrono::seconds kLongestWait{2};
 constexpr useconds_t kPause = 1000;  // µs
-constexpr int kCarefully = O_NOFOLLOW | O_NONBLOCK | O_NOCTTY | O_CLOEXEC;
+constexpr int kCarefully = O_RDWR | O_NOFOLLOW | O_NONBLOCK | O_NOCTTY | O_CLOEXEC;
 
-bool IsOurs(int file, const Place& place) {
-    struct stat status {};
-    struct stat folder {};
-    return fstat(file, &status) == 0 && fstat(place.directory.Get(), &folder) == 0 &&
-           S_ISREG(status.st_mode) &&
-           (taviwireless::IsTrustedOwner(status.st_uid) || status.st_uid == folder.st_uid);
+// Whoever has the folder may have the lock of a file in it.
+bool IsOurs(const struct stat& lock, const Place& place) {
+    return S_ISREG(lock.st_mode) &&
+           (taviwireless::IsTrustedOwner(lock.st_uid) || lock.st_uid == place.owner);
 }
 
 // Marks beside the lock itself, of which flock() tells nothing: who has it, and that it is awaited.
@@ -102,8 +100,10 @@ bool FileLock::Try() {
     if (!file_ && !Open()) {
         return true;
     }
-    if (!file_ || !IsOurs(file_.Get(), place_)) {
+    struct stat status {};
+    if (!file_ || fstat(file_.Get(), &status) != 0 || !IsOurs(status, place_)) {
         file_.Close();
+        RemoveStrangers();
         return false;
     }
     if (flock(file_.Get(), LOCK_EX | LOCK_NB) != 0) {
@@ -122,33 +122,46 @@ bool FileLock::Try() {
     return true;
 }
 
-// False when the folder cannot be written. Another user's file stays unopened.
+// False when the folder cannot be written. What is there and cannot be opened stays unopened.
 bool FileLock::Open() {
-    file_ = UniqueFd(
-        openat(place_.directory.Get(), name_.c_str(), O_RDWR | O_CREAT | kCarefully, 0600));
+    const int folder = place_.directory.Get();
+    file_ = UniqueFd(openat(folder, name_.c_str(), O_CREAT | O_EXCL | kCarefully, 0600));
     if (file_) {
+        // So that the owner of the folder can take over what a killed root leaves; only root can.
+        [[maybe_unused]] const int result = fchown(file_.Get(), place_.owner, -1);
         return true;
     }
-    if (errno != EROFS && errno != EACCES) {
+    const bool isThere = errno == EEXIST;
+    if (isThere) {
+        file_ = UniqueFd(openat(folder, name_.c_str(), kCarefully));
+    }
+    if (!file_ && (errno == EROFS || (!isThere && errno == EACCES))) {
+        return false;
+    }
+    if (!isThere) {
         throw Failure{VEXAC_ERR_IO};
     }
-    return errno == EACCES && !IsMissing();
+    return true;
 }
 
-bool FileLock::IsMissing() const {
+// Removes what somebody else put there, if he may not keep it; he may where we may not. Another
+// writer may have put his lock there since the look: then one of two changes is lost, which is less
+// than to be kept from writing.
+void FileLock::RemoveStrangers() const {
     struct stat status {};
-    const bool isMissing =
-        fstatat(place_.directory.Get(), name_.c_str(), &status, AT_SYMLINK_NOFOLLOW) != 0 &&
-        errno == ENOENT;
-    errno = EACCES;
-    return isMissing;
+    if (LookAtPath(&status) && !IsOurs(status, place_)) {
+        unlinkat(place_.directory.Get(), name_.c_str(), 0);
+    }
+}
+
+bool FileLock::LookAtPath(struct stat* status) const {
+    return fstatat(place_.directory.Get(), name_.c_str(), status, AT_SYMLINK_NOFOLLOW) == 0;
 }
 
 bool FileLock::IsStillThere() const {
     struct stat locked {};
     struct stat there {};
-    return fstat(file_.Get(), &locked) == 0 &&
-           fstatat(place_.directory.Get(), name_.c_str(), &there, AT_SYMLINK_NOFOLLOW) == 0 &&
+    return fstat(file_.Get(), &locked) == 0 && LookAtPath(&there) &&
            locked.st_dev == there.st_dev && locked.st_ino == there.st_ino;
 }
 
@@ -158,7 +171,7 @@ std::string FileLock::Holder() const {
         return "process " + std::to_string(pid) + " (" + ProgramOf(pid) + ')';
     }
     struct stat status {};
-    fstatat(place_.directory.Get(), name_.c_str(), &status, AT_SYMLINK_NOFOLLOW);
+    LookAtPath(&status);
     return "a process of user " + std::to_string(status.st_uid);
 }
 

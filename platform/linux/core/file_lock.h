@@ -1,6 +1,8 @@
 #ifndef TAVICORE_FILE_LOCK_H
 #define TAVICORE_FILE_LOCK_H
 
+#include <sys/stat.h>
+
 #include <string>
 
 #include "place.h"
@@ -27,7 +29,8 @@ class FileLock {
   private:
     bool Try();
     bool Open();
-    bool IsMissing() const;
+    void RemoveStrangers() const;
+    bool LookAtPath(struct stat* status) const;
     bool IsStillThere() const;
     std::string Holder() const;
 

@@ -42,6 +42,7 @@ Place EntryOf(const std::string& directory, const std::string& path) {
     if (!place.directory || fstat(place.directory.Get(), &status) != 0) {
         throw FileFailure();
     }
+    place.owner = status.st_uid;
     place.isShared = (status.st_mode & (S_IWOTH | S_ISVTX)) != 0;
     place.name = path.substr(directory.size());
     if (place.name.empty()) {

@@ -1,6 +1,8 @@
 #ifndef TAVICORE_PLACE_H
 #define TAVICORE_PLACE_H
 
+#include <sys/types.h>
+
 #include <string>
 
 #include "base/unique_fd.h"
@@ -14,6 +16,7 @@ using taviwireless::UniqueFd;
 // looked at.
 struct Place {
     UniqueFd directory;  // names the folder, cannot be read itself (O_PATH)
+    uid_t owner = 0;     // of the folder
     std::string name;
     // True when others can put entries into the folder, such as "/tmp": what is there counts only
     // when it is root's or one's own.
