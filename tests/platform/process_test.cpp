@@ -48,9 +48,11 @@ TEST(Process, AStalePidFileDoesNotHarmWhoHasTheNumberNow) {
     WriteFile(kPidFile, self + "\n1\n");  // started at tick 1, which this process did not
     EXPECT_EQ(VEXACProcAliveByPidFile(kPidFile), 0);
     EXPECT_EQ(VEXACProcSignalByPidFile(kPidFile, SIGKILL), -1);
+    EXPECT_EQ(VEXACReadPidFile(kPidFile), 0);  // so that nobody signals that number either
     for (const char* rest : {"\n", "\nsome remark\n"}) {  // writers that record no start time
         WriteFile(kPidFile, self + rest);
         EXPECT_EQ(VEXACProcAliveByPidFile(kPidFile), 1);
+        EXPECT_EQ(VEXACReadPidFile(kPidFile), getpid());
     }
 }
 
@@ -68,6 +70,35 @@ TEST(Exec, GivesTheExitStatus) {
     EXPECT_EQ(VEXACExec("/bin/sh", "-c", "kill -9 $$", nullptr), -1);
     EXPECT_EQ(VEXACExec("/no/such/program", nullptr), -1);
     EXPECT_EQ(VEXACExec(nullptr, nullptr), -1);
+}
+
+void ReapAll(int) {
+    while (waitpid(-1, nullptr, WNOHANG) > 0) {
+    }
+}
+
+// Whatever the caller does about its children.
+TEST(Exec, GivesTheExitStatusToWhoDoesNotWait) {
+    struct sigaction ignore {};
+    ignore.sa_handler = SIG_IGN;
+    struct sigaction noZombies {};
+    noZombies.sa_flags = SA_NOCLDWAIT;
+    struct sigaction reap {};
+    reap.sa_handler = ReapAll;
+    for (const auto& action : {ignore, noZombies, reap}) {
+        ASSERT_EQ(sigaction(SIGCHLD, &action, nullptr), 0);
+        EXPECT_EQ(VEXACExec("true", nullptr), 0);
+        EXPECT_EQ(VEXACExec("sh", "-c", "true; exit 3", nullptr), 3);
+        EXPECT_EQ(VEXACExec("/no/such/program", nullptr), -1);
+        EXPECT_EQ(VEXACErrGet(), VEXAC_ERR_NOT_FOUND);
+        const pid_t child = VEXACProcForkChildNoWait();
+        if (child == 0) {
+            _exit(0);
+        }
+        EXPECT_GT(child, 0);
+    }
+    signal(SIGCHLD, SIG_DFL);
+    EXPECT_EQ(waitpid(-1, nullptr, WNOHANG), -1);  // nothing is left behind
 }
 
 TEST(Exec, TheProgramInheritsNoDescriptorAndNoIgnoredSignal) {

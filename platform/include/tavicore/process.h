@@ -21,7 +21,8 @@ extern "C" {
  * Runs program (a path, or a name looked up in PATH) with the arguments that follow it, up to a
  * null, without a shell, and waits for it to end. It gets /dev/null as standard input, shares the
  * other standard descriptors and inherits no further descriptor. Returns the program's exit status
- * (0 is success), or -1 when it could not be run or was ended by a signal.
+ * (0 is success), or -1 when it could not be run or was ended by a signal; also while the caller
+ * ignores SIGCHLD. The program's parent is a process in between.
  */
 TAVI_SDK_API int VEXACExec(const char* program, ...) __attribute__((sentinel));
 
@@ -51,8 +52,8 @@ TAVI_SDK_API int VEXACProcAliveByPidFile(const char* file);
 TAVI_SDK_API int VEXACProcSignalByPidFile(const char* file, int signal);
 
 /*
- * Returns the process id in the pid file; 0 when the file holds no positive number; -1 when it
- * cannot be read.
+ * Returns the process id in the pid file; 0 when the file holds no positive number, or has a start
+ * time and its process is not there any more; -1 when it cannot be read.
  */
 TAVI_SDK_API pid_t VEXACReadPidFile(const char* file);
 

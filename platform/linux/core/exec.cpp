@@ -2,11 +2,13 @@
 #include <spawn.h>
 #include <sys/wait.h>
 #include <tavicore/process.h>
+#include <unistd.h>
 
 #include <cerrno>
 #include <cstdarg>
 #include <vector>
 
+#include "child_report.h"
 #include "failure.h"
 
 namespace {
@@ -52,6 +54,32 @@ class SpawnSettings {
     posix_spawn_file_actions_t actions_;
 };
 
+// Told instead of an exit status.
+constexpr int kNotRun = -1;
+constexpr int kKilled = -2;
+
+// Runs the program in this child of the caller and tells how it ended. The caller may ignore
+// SIGCHLD, and then nobody learns how a child of its own ended.
+[[noreturn]] void RunAndTell(const SpawnSettings& settings, const char* program,
+                             char* const* arguments, int writeEnd) {
+    sigset_t all;
+    sigfillset(&all);
+    sigprocmask(SIG_SETMASK, &all,
+                nullptr);  // the caller's handlers are not meant for this process
+    signal(SIGCHLD, SIG_DFL);
+    dup2(writeEnd, kFirstPrivateDescriptor);
+    closefrom(kFirstPrivateDescriptor + 1);  // nothing of the caller's is kept open by this process
+
+    int told = kNotRun;
+    const pid_t child = settings.Spawn(program, arguments);
+    if (child > 0) {
+        int status = 0;
+        const bool isKnown = waitpid(child, &status, 0) == child;
+        told = isKnown && WIFEXITED(status) ? WEXITSTATUS(status) : kKilled;
+    }
+    _exit(ChildReport::Tell(kFirstPrivateDescriptor, told) ? 0 : 1);
+}
+
 }  // namespace
 
 int VEXACExec(const char* program, ...) {
@@ -64,20 +92,22 @@ int VEXACExec(const char* program, ...) {
             arguments.push_back(va_arg(list, char*));
         } while (arguments.back() != nullptr);
 
-        const pid_t child = SpawnSettings().Spawn(program, arguments.data());
-        if (child < 0) {
-            throw Failure{VEXAC_ERR_NOT_FOUND};
+        const SpawnSettings settings;
+        ChildReport report;
+        const pid_t between = fork();
+        if (between == 0) {
+            RunAndTell(settings, program, arguments.data(), report.WriteEnd());
         }
-        int status = 0;
-        while (waitpid(child, &status, 0) < 0) {
-            if (errno != EINTR) {
-                throw Failure{VEXAC_ERR_IO};
-            }
+        if (between < 0) {
+            throw Failure{VEXAC_ERR_FORK_FAILED};
         }
-        if (!WIFEXITED(status)) {
-            throw Failure{VEXAC_ERR_IO};
+        const int told = report.Hear().value_or(kKilled);
+        while (waitpid(between, nullptr, 0) < 0 && errno == EINTR) {
         }
-        return WEXITSTATUS(status);
+        if (told < 0) {
+            throw Failure{told == kNotRun ? VEXAC_ERR_NOT_FOUND : VEXAC_ERR_IO};
+        }
+        return told;
     });
     va_end(list);
     return result;

@@ -12,6 +12,7 @@
 #include <string>
 
 #include "core/failure.h"
+#include "core/pid_file.h"
 #include "sdk/dhcp_client.h"
 #include "sdk/netlink.h"
 
@@ -35,7 +36,7 @@ std::string PidFileOf(const char* interface) {
     return FileOf(interface, ".pid");
 }
 
-// The pid file outlives a restart of the system, and its number may be another program's by then.
+// The number in the pid file may be another program's: the client writes no more than it.
 bool ClientRuns(const char* interface) {
     const std::string file = PidFileOf(interface);
     if (VEXACProcAliveByPidFile(file.c_str()) == 0) {
@@ -57,9 +58,16 @@ bool ClientSettles(const char* interface) {
 
 bool RunClient(const char* interface) {
     mkdir(kFolder, 0755);  // it mostly exists
-    return VEXACExec("/bin/sh", "-c", kRunClient, kClientName, "-i", interface, "-s", kLeaseScript,
-                     "-p", PidFileOf(interface).c_str(), nullptr) == 0 &&
-           ClientSettles(interface);
+    const std::string pidFile = PidFileOf(interface);
+    if (VEXACExec("/bin/sh", "-c", kRunClient, kClientName, "-i", interface, "-s", kLeaseScript,
+                  "-p", pidFile.c_str(), nullptr) != 0 ||
+        !ClientSettles(interface)) {
+        return false;
+    }
+    // With the start time: the file outlives the client when the machine is restarted, and its
+    // number is some other program's then.
+    WritePidFile(pidFile.c_str(), VEXACReadPidFile(pidFile.c_str()));
+    return true;
 }
 
 void ReadLease(const char* file, const char* key, char (&value)[TAVI_NET_ADDRESS_SIZE]) {
