@@ -3,6 +3,10 @@
 #include <tavicore/error.h>
 #include <tavicore/keyvalue.h>
 #include <tavisdk/bridge.h>
+#include <unistd.h>
+
+#include <functional>
+#include <utility>
 
 #include "common/sz_list.h"
 #include "tests/platform/veth.h"
@@ -90,6 +94,29 @@ TEST(BridgeConfig, ThatIsWrongIsNotWritten) {
     }
     EXPECT_EQ(TAVINetSetBridgeConfig(nullptr, nullptr), -1);
     EXPECT_FALSE(Exists(kFile));
+}
+
+// As on a disk with errors: what is there must not be made anew because it cannot be read now.
+TEST(Settings, ThatCannotBeReadAreNotMissing) {
+    TAVINetDhcpServer server;
+    char gateway[TAVI_NET_ADDRESS_SIZE];
+    MakeDirectories("/etc/sysconfig/network-scripts");
+    MakeDirectories("/etc/dhcpd");
+    WriteFile(kInterfaceFile + "eth7", "GATEWAY=10.7.0.1\n");
+    const std::string dhcp = "/etc/dhcpd/dhcpd-lbr0-lbr0.info";
+    const std::pair<std::string, std::function<int()>> kRows[] = {
+        {kFile, [] { return Config("lbr0") == "none" ? -1 : 0; }},
+        {kInterfaceFile + "eth8", [] { return Members("lbr0") == "-1" ? -1 : 0; }},
+        {dhcp, [&] { return TAVINetGetDhcpServerConf("lbr0", "lbr0", &server); }},
+        {"/etc/sysconfig/network",
+         [&] { return TAVINetDefaultGatewayGetConf(gateway, sizeof gateway); }},
+    };
+    for (const auto& [file, read] : kRows) {
+        ASSERT_EQ(symlink(file.c_str(), file.c_str()), 0);
+        EXPECT_EQ(read(), -1) << file;
+        EXPECT_EQ(VEXACErrGet(), VEXAC_ERR_IO) << file;
+        ASSERT_EQ(unlink(file.c_str()), 0);
+    }
 }
 
 TEST(BridgeMembers, AreSavedOnesUntilThereIsABridge) {

@@ -5,8 +5,10 @@
 #include <tavicore/keyvalue.h>
 #include <tavicore/process.h>
 #include <tavicore/section.h>
+#include <unistd.h>
 
 #include <functional>
+#include <vector>
 
 #include "tests/support/files.h"
 
@@ -76,6 +78,101 @@ TEST(File, WhatIsNoRegularFileIsRefusedByEveryCall) {
     }
     VEXACSzHashFree(hash);
     VEXACSzListFree(list);
+}
+
+constexpr uid_t kStranger = 65534;
+
+// Every way to read a file: as 0 when it was read, -1 when not.
+std::vector<std::function<int(const char*)>> Readers() {
+    return {
+        [](const char* f) { return VEXACFileCheckKeyValue(f, "K", "v", 0) - 1; },
+        [](const char* f) {
+            char value[8];
+            return VEXACFileGetKeyValue(f, "K", value, sizeof value) == 1 ? 0 : -1;
+        },
+        [](const char* f) {
+            char value[8];
+            return VEXACFileGetSectionValue(f, "S", "L", value, sizeof value);
+        },
+        [](const char* f) { return VEXACReadPidFile(f) == 7 ? 0 : -1; },
+        [](const char* f) { return VEXACFileSetKeyValue(f, "K", "v", "%s=%s\n") == 1 ? 0 : -1; }};
+}
+
+// Where everybody can put files, those of strangers are none, and nobody leads root elsewhere.
+TEST(SharedFolder, OnlyRegularFilesOfRootOrOneselfCount) {
+    constexpr char kText[] = "7\nK=v\n[S]\nL=v\n";
+    WriteFile("/etc/target", kText);
+    WriteFile("/tmp/own", kText);
+    WriteFile("/tmp/big", kText + std::string(65536, '\n'));
+    WriteFile("/tmp/strange", kText);
+    ASSERT_EQ(chown("/tmp/strange", kStranger, kStranger), 0);
+    ASSERT_EQ(symlink("/etc/target", "/tmp/own-link"), 0);
+    ASSERT_EQ(symlink("/etc/target", "/tmp/strange-link"), 0);
+    ASSERT_EQ(lchown("/tmp/strange-link", kStranger, kStranger), 0);
+    ASSERT_EQ(symlink("/tmp/strange-link", "/etc/link"), 0);
+    const struct {
+        const char* path;
+        bool isRead;
+    } kRows[] = {{"/tmp/own", true},      {"/tmp/own-link", true},      {"/tmp/big", false},
+                 {"/tmp/strange", false}, {"/tmp/strange-link", false}, {"/etc/link", false},
+                 {"/etc/target", true}};
+    for (const auto& row : kRows) {
+        for (const auto& read : Readers()) {
+            EXPECT_EQ(read(row.path), row.isRead ? 0 : -1) << row.path;
+            EXPECT_TRUE(row.isRead || VEXACErrGet() == VEXAC_ERR_IO);
+        }
+    }
+    EXPECT_EQ(ReadFile("/etc/target"), kText);
+}
+
+TEST(SharedFolder, AStrangersLinkIsNotTouched) {
+    ASSERT_EQ(symlink("/etc/nologin", "/var/tmp/flag"), 0);
+    EXPECT_EQ(VEXACFileTouch("/var/tmp/flag"), 0);
+    EXPECT_EQ(unlink("/etc/nologin"), 0);
+    ASSERT_EQ(lchown("/var/tmp/flag", kStranger, kStranger), 0);
+    EXPECT_EQ(VEXACFileTouch("/var/tmp/flag"), -1);
+    EXPECT_EQ(VEXACErrGet(), VEXAC_ERR_IO);
+    EXPECT_FALSE(Exists("/etc/nologin"));
+}
+
+// A pid file may take the place of whatever regular file stands there.
+TEST(SharedFolder, AStrangersPidFileIsReplaced) {
+    WriteFile("/tmp/pid", "1\n");
+    ASSERT_EQ(chown("/tmp/pid", kStranger, kStranger), 0);
+    EXPECT_EQ(VEXACProcPidFileCreate("/tmp/pid"), 0);
+    EXPECT_EQ(VEXACReadPidFile("/tmp/pid"), getpid());
+}
+
+TEST(File, MissingIsOnlyWhatTheSystemSaysIsMissing) {
+    WriteFile("/tmp/file", "K=v\n");
+    ASSERT_EQ(symlink("/tmp/loop", "/tmp/loop"), 0);
+    ASSERT_EQ(symlink("/tmp/none", "/tmp/nowhere"), 0);
+    const std::string tooLong = "/tmp/" + std::string(300, 'x');
+    const struct {
+        const char* path;
+        int error;
+    } kRows[] = {{"/tmp/none", VEXAC_ERR_NOT_FOUND},   {"/tmp/none/x", VEXAC_ERR_NOT_FOUND},
+                 {"/tmp/file/x", VEXAC_ERR_NOT_FOUND}, {"/tmp/nowhere", VEXAC_ERR_NOT_FOUND},
+                 {"/tmp/loop", VEXAC_ERR_IO},          {tooLong.c_str(), VEXAC_ERR_IO}};
+    const std::function<int(const char*)> kLooks[] = {
+        VEXACFileExist, VEXACFileCheckDir,
+        [](const char* f) { return VEXACFileCheckKeyValue(f, "K", "v", 0); },
+        [](const char* f) {
+            char value[8];
+            return VEXACFileGetSectionValue(f, "S", "K", value, sizeof value) + 1;
+        }};
+    for (const auto& row : kRows) {
+        for (const auto& look : kLooks) {
+            VEXACErrSet(VEXAC_ERR_NONE);
+            EXPECT_EQ(look(row.path), 0) << row.path;
+            EXPECT_EQ(VEXACErrGet(), row.error) << row.path;
+        }
+    }
+    VEXACErrSet(VEXAC_ERR_NONE);
+    EXPECT_EQ(VEXACFileExist("/tmp/file"), 1);
+    EXPECT_EQ(VEXACErrGet(), VEXAC_ERR_NONE);
+    EXPECT_EQ(VEXACFileCheckKeyValue("/tmp/file", "K", "w", 0), 0);
+    EXPECT_EQ(VEXACErrGet(), VEXAC_ERR_NOT_FOUND);
 }
 
 }  // namespace

@@ -3,6 +3,10 @@
  *
  * A failure sets the error code: VEXAC_ERR_NOT_FOUND when the file does not exist,
  * VEXAC_ERR_BAD_PARAMETER for a null or empty path, otherwise VEXAC_ERR_IO.
+ *
+ * In a folder that others can write in, such as "/tmp", every reader of the SDK takes a file only
+ * when it is a regular one of root or of the caller's own user and of 64 KB at most, and follows a
+ * link there only when it is root's or the caller's own. Else it fails with VEXAC_ERR_IO.
  */
 #ifndef TAVICORE_FILE_H
 #define TAVICORE_FILE_H
@@ -14,15 +18,19 @@
 extern "C" {
 #endif
 
-/* Returns 1 when path names an existing file of any kind (a link is followed), else 0. */
+/*
+ * Returns 1 when path names an existing file of any kind (a link is followed), else 0: with
+ * VEXAC_ERR_NOT_FOUND when there is none, and VEXAC_ERR_IO when that cannot be told.
+ */
 TAVI_SDK_API int VEXACFileExist(const char* path);
 
-/* Returns 1 when path names an existing directory, else 0. */
+/* The same for an existing directory. */
 TAVI_SDK_API int VEXACFileCheckDir(const char* path);
 
 /*
  * Makes sure that the file exists: creates it empty with mode 0644, less the process's umask, or
- * sets the times of an existing one to now. Returns 0, or -1.
+ * sets the times of an existing one to now. A link that leads nowhere is followed, too, unless
+ * others can write in its folder and it is somebody else's. Returns 0, or -1.
  */
 TAVI_SDK_API int VEXACFileTouch(const char* path);
 

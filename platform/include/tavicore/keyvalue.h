@@ -43,7 +43,7 @@ TAVI_SDK_API int VEXACFileGetKeyValue(const char* file, const char* key, char* v
  * created with mode 0644, less the process's umask.
  *
  * Returns 1 on success. Returns -1 and leaves the file as it was when it cannot be read or replaced
- * (VEXAC_ERR_IO), or an argument is null, the format is another one, the key is empty or holds "=",
+ * (VEXAC_ERR_IO, VEXAC_ERR_LOCKED), or an argument is null, the format is another one, the key is empty or holds "=",
  * "#" at its start, a blank or a line break, or the value holds a line break
  * (VEXAC_ERR_BAD_PARAMETER).
  */
@@ -51,8 +51,8 @@ TAVI_SDK_API int VEXACFileSetKeyValue(const char* file, const char* key, const c
                                       const char* format);
 
 /*
- * Returns 1 when key stands in file with exactly the given value, else 0 (also when the file cannot
- * be read). flags is reserved and is 0.
+ * Returns 1 when key stands in file with exactly the given value, else 0: with VEXAC_ERR_NOT_FOUND
+ * when it does not, and VEXAC_ERR_IO when the file cannot be read. flags is reserved and is 0.
  */
 TAVI_SDK_API int VEXACFileCheckKeyValue(const char* file, const char* key, const char* value,
                                         int flags);

@@ -21,7 +21,8 @@
  * VEXAC_ERR_BAD_PARAMETER, so that no value can forge another line.
  *
  * Unless stated otherwise, a failure returns -1 and sets VEXAC_ERR_NOT_FOUND when the file does not
- * exist, VEXAC_ERR_IO when it cannot be read or replaced or is not a regular file, and
+ * exist, VEXAC_ERR_IO when it cannot be read or replaced or is not a regular file, VEXAC_ERR_LOCKED
+ * when another writer keeps it for 2 s, VEXAC_ERR_OUT_OF_MEMORY when there is no memory, and
  * VEXAC_ERR_BAD_PARAMETER for a null argument; a failed write leaves the file as it was.
  */
 #ifndef TAVICORE_SECTION_H

@@ -1,4 +1,9 @@
-/* Network bridges and their DHCP service, as the appliance's saved settings describe them. */
+/*
+ * Network bridges and their DHCP service, as the appliance's saved settings describe them.
+ *
+ * A failure sets the error code of <tavicore/error.h>: VEXAC_ERR_NOT_FOUND alone says that there
+ * are no such settings; with any other code, they may be there and could not be read or written.
+ */
 #ifndef TAVISDK_BRIDGE_H
 #define TAVISDK_BRIDGE_H
 

@@ -5,6 +5,7 @@
 
 #include <cerrno>
 #include <exception>
+#include <stdexcept>
 
 namespace tavicore {
 
@@ -13,9 +14,10 @@ struct Failure {
     int code;  // VEXAC_ERR_...
 };
 
-// What errno says about a file.
+// What errno says about a file. ESRCH is of a process's file in "/proc" when that has ended.
 inline Failure FileFailure() {
-    return {errno == ENOENT || errno == ENOTDIR ? VEXAC_ERR_NOT_FOUND : VEXAC_ERR_IO};
+    const bool isMissing = errno == ENOENT || errno == ENOTDIR || errno == ESRCH;
+    return {isMissing ? VEXAC_ERR_NOT_FOUND : VEXAC_ERR_IO};
 }
 
 // Throws when one of the pointers is null.
@@ -34,6 +36,8 @@ Result Guarded(Result failed, Body body) {
         return body();
     } catch (const Failure& failure) {
         VEXACErrSet(failure.code);
+    } catch (const std::out_of_range&) {  // a file that ends too early
+        VEXACErrSet(VEXAC_ERR_IO);
     } catch (const std::exception&) {  // bad_alloc, or length_error of a container
         VEXACErrSet(VEXAC_ERR_OUT_OF_MEMORY);
     }

@@ -12,9 +12,9 @@
 #include <string>
 #include <vector>
 
-#include "base/unique_fd.h"
 #include "failure.h"
 #include "line.h"
+#include "place.h"
 #include "text_file.h"
 
 using namespace tavicore;
@@ -46,6 +46,16 @@ int Try(Call call) {
     });
 }
 
+// What stands at the path, where links lead; throws when there is nothing or it cannot be told.
+struct stat LookAt(const char* path) {
+    RequireAll(path);
+    struct stat status {};
+    if (stat(path, &status) != 0) {
+        throw FileFailure();
+    }
+    return status;
+}
+
 struct CloseDirectory {
     void operator()(DIR* directory) const { closedir(directory); }
 };
@@ -61,7 +71,15 @@ std::vector<std::string> FileNames(const char* directory, const char* prefix) {
         throw FileFailure();
     }
     std::vector<std::string> names;
-    while (const dirent* entry = readdir(open.get())) {
+    for (;;) {
+        errno = 0;
+        const dirent* entry = readdir(open.get());
+        if (entry == nullptr && errno != 0) {
+            throw Failure{VEXAC_ERR_IO};
+        }
+        if (entry == nullptr) {
+            break;
+        }
         if (std::strncmp(entry->d_name, prefix, std::strlen(prefix)) == 0 &&
             !IsDirectory(dirfd(open.get()), entry->d_name)) {
             names.emplace_back(entry->d_name);
@@ -76,19 +94,28 @@ std::vector<std::string> FileNames(const char* directory, const char* prefix) {
 }  // namespace
 
 int VEXACFileExist(const char* path) {
-    struct stat status {};
-    return path != nullptr && stat(path, &status) == 0 ? 1 : 0;
+    return Guarded(0, [&] {
+        LookAt(path);
+        return 1;
+    });
 }
 
 int VEXACFileCheckDir(const char* path) {
-    return path != nullptr && IsDirectory(AT_FDCWD, path) ? 1 : 0;
+    return Guarded(0, [&] {
+        if (!S_ISDIR(LookAt(path).st_mode)) {
+            throw Failure{VEXAC_ERR_NOT_FOUND};
+        }
+        return 1;
+    });
 }
 
 int VEXACFileTouch(const char* path) {
     return Try([path] {
         RequirePath(path);
-        const UniqueFd file(
-            open(path, O_WRONLY | O_CREAT | O_CLOEXEC | O_NONBLOCK | O_NOCTTY, kNewFileMode));
+        const Place place = FindPlace(path);
+        const UniqueFd file(openat(
+            place.directory.Get(), place.name.c_str(),
+            O_WRONLY | O_CREAT | O_NOFOLLOW | O_CLOEXEC | O_NONBLOCK | O_NOCTTY, kNewFileMode));
         return file && futimens(file.Get(), nullptr) == 0;
     });
 }

@@ -93,6 +93,9 @@ int VEXACFileCheckKeyValue(const char* file, const char* key, const char* value,
     return Guarded(0, [&] {
         RequireAll(file, key, value);
         const std::string text = ReadText(file);
-        return FindValue(text, key) == value ? 1 : 0;
+        if (FindValue(text, key) != value) {
+            throw Failure{VEXAC_ERR_NOT_FOUND};
+        }
+        return 1;
     });
 }

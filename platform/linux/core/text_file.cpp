@@ -144,7 +144,7 @@ std::string TextFile::Read(size_t begin, size_t end) const {
         const ssize_t count = pread(file_.Get(), &text[length], text.size() - length,
                                     static_cast<off_t>(begin + length));
         if (count < 0 && errno != EINTR) {
-            throw Failure{VEXAC_ERR_IO};
+            throw FileFailure();
         }
         if (count == 0) {
             break;

@@ -1,7 +1,6 @@
 // Bridges, as the files of the network script describe them and as the kernel has them.
 #include <net/if.h>
 #include <tavicore/file.h>
-#include <tavicore/keyvalue.h>
 #include <tavisdk/bridge.h>
 
 #include <cstring>
@@ -11,6 +10,7 @@
 #include "core/text_file.h"
 #include "sdk/interface_name.h"
 #include "sdk/netlink.h"
+#include "sdk/settings_files.h"
 
 using namespace tavicore;
 using namespace tavisdk;
@@ -22,16 +22,6 @@ constexpr char kFilePrefix[] = "ifcfg-";
 
 std::string FileOf(const char* interface) {
     return std::string(kInterfaceFiles) + '/' + kFilePrefix + interface;
-}
-
-using StringList = std::unique_ptr<VEXACSzList, decltype(&VEXACSzListFree)>;
-
-StringList NewList() {
-    StringList list(VEXACSzListAlloc(1024), VEXACSzListFree);
-    if (!list) {
-        throw Failure{VEXAC_ERR_OUT_OF_MEMORY};
-    }
-    return list;
 }
 
 void Append(VEXACSzList** list, const char* text) {
@@ -61,18 +51,14 @@ int AppendRealMembers(const char* bridge, VEXACSzList** list) {
 
 // The interfaces that the files put into the bridge.
 int AppendSavedMembers(const char* bridge, VEXACSzList** list) {
-    StringList files = NewList();
-    VEXACSzList* found = files.release();  // it may move as it grows
-    const int result = VEXACFileEnumDir(kInterfaceFiles, kFilePrefix, &found, VEXAC_ENUM_FILES);
-    files.reset(found);
-    if (result < 0) {
+    if (VEXACFileCheckDir(kInterfaceFiles) == 0) {
         throw Failure{VEXACErrGet()};
     }
+    const StringList files = ListFiles(kInterfaceFiles, kFilePrefix);
     int count = 0;
     for (int i = 0; i < files->count; ++i) {
         const char* interface = VEXACSzListGet(files.get(), i) + strlen(kFilePrefix);
-        if (IsInterfaceName(interface) &&
-            VEXACFileCheckKeyValue(FileOf(interface).c_str(), "BRIDGE", bridge, 0) == 1) {
+        if (IsInterfaceName(interface) && HasSetting(FileOf(interface), "BRIDGE", bridge)) {
             Append(list, interface);
             ++count;
         }
@@ -83,13 +69,16 @@ int AppendSavedMembers(const char* bridge, VEXACSzList** list) {
 // PRIMARY names the first member; a file by somebody else may lack it.
 std::string FirstMember(const char* bridge) {
     char primary[TAVI_NET_IF_NAME_SIZE];
-    if (VEXACFileGetKeyValue(FileOf(bridge).c_str(), "PRIMARY", primary, sizeof primary) > 0) {
+    if (ReadSetting(FileOf(bridge), "PRIMARY", primary, sizeof primary)) {
         return primary;
     }
     StringList members = NewList();
     VEXACSzList* list = members.release();
-    VEXANetBridgeSlaveEnum(bridge, &list);
+    const int result = VEXANetBridgeSlaveEnum(bridge, &list);
     members.reset(list);
+    if (result < 0) {
+        throw Failure{VEXACErrGet()};
+    }
     return members->count > 0 ? VEXACSzListGet(members.get(), 0) : "";
 }
 
@@ -100,9 +89,8 @@ bool IsWireless(const std::string& interface) {
 // What the file says, or where it is silent, what the first member is.
 bool IsLocal(const std::string& file, const std::string& firstMember) {
     char local[8];
-    return VEXACFileGetKeyValue(file.c_str(), "LOCAL_LAN", local, sizeof local) > 0
-               ? strcmp(local, "yes") == 0
-               : IsWireless(firstMember);
+    return ReadSetting(file, "LOCAL_LAN", local, sizeof local) ? strcmp(local, "yes") == 0
+                                                               : IsWireless(firstMember);
 }
 
 std::string Rendered(const TAVINetBridge& config, const TAVINetBridgeMember& member) {
@@ -140,14 +128,14 @@ int TAVINetGetBridgeConfig(const char* bridge, TAVINetBridge* config, TAVINetBri
         RequireInterfaceName(bridge);
         const std::string file = FileOf(bridge);
         if (VEXACFileExist(file.c_str()) == 0) {
-            throw Failure{VEXAC_ERR_NOT_FOUND};
+            throw Failure{VEXACErrGet()};
         }
         CopyOut(bridge, config->name, sizeof config->name);
         CopyOut(FirstMember(bridge), member->interface, sizeof member->interface);
         config->isLocal = IsLocal(file, member->interface) ? 1 : 0;
         member->kind = config->isLocal != 0 ? TAVI_NET_MEMBER_WIRELESS : TAVI_NET_MEMBER_WIRED;
-        VEXACFileGetKeyValue(file.c_str(), "IPADDR", config->address, sizeof config->address);
-        VEXACFileGetKeyValue(file.c_str(), "NETMASK", config->netmask, sizeof config->netmask);
+        ReadSetting(file, "IPADDR", config->address, sizeof config->address);
+        ReadSetting(file, "NETMASK", config->netmask, sizeof config->netmask);
         if (config->address[0] == '\0' && (config->isLocal != 0 || member->interface[0] == '\0')) {
             throw Failure{VEXAC_ERR_NOT_FOUND};  // a rest, such as ONBOOT alone
         }

@@ -1,12 +1,11 @@
 // The default gateway: in force, and in the saved settings.
 #include <linux/rtnetlink.h>
-#include <tavicore/file.h>
-#include <tavicore/keyvalue.h>
 #include <tavisdk/network.h>
 
 #include "core/failure.h"
 #include "core/line.h"
 #include "sdk/netlink.h"
+#include "sdk/settings_files.h"
 
 using namespace tavicore;
 using namespace tavisdk;
@@ -65,22 +64,12 @@ Address Everywhere() {
     return everywhere;
 }
 
-// True when the file has a gateway, which is then in the buffer.
-bool ReadGateway(const std::string& file, char* gateway, size_t size) {
-    return VEXACFileGetKeyValue(file.c_str(), kGatewayKey, gateway, size) > 0;
-}
-
 bool ReadGatewayOfInterfaces(char* gateway, size_t size) {
-    VEXACSzList* list = VEXACSzListAlloc(1024);
-    if (list == nullptr) {
-        throw Failure{VEXAC_ERR_OUT_OF_MEMORY};
-    }
-    VEXACFileEnumDir(kInterfaceFiles, "ifcfg-", &list, VEXAC_ENUM_FILES);  // no folder, no names
-    const std::unique_ptr<VEXACSzList, decltype(&VEXACSzListFree)> names(list, VEXACSzListFree);
+    const StringList names = ListFiles(kInterfaceFiles, "ifcfg-");
     for (int i = 0; i < names->count; ++i) {
-        const std::string file = std::string(kInterfaceFiles) + '/' + VEXACSzListGet(list, i);
-        if (VEXACFileCheckKeyValue(file.c_str(), "ONBOOT", "no", 0) == 0 &&
-            ReadGateway(file, gateway, size)) {
+        const std::string file =
+            std::string(kInterfaceFiles) + '/' + VEXACSzListGet(names.get(), i);
+        if (!HasSetting(file, "ONBOOT", "no") && ReadSetting(file, kGatewayKey, gateway, size)) {
             return true;
         }
     }
@@ -132,7 +121,8 @@ int TAVINetDefaultGatewaySet(const char* gateway) {
 int TAVINetDefaultGatewayGetConf(char* gateway, size_t size) {
     return Guarded(-1, [&] {
         RequireAll(gateway);
-        if (!ReadGateway(kNetworkFile, gateway, size) && !ReadGatewayOfInterfaces(gateway, size)) {
+        if (!ReadSetting(kNetworkFile, kGatewayKey, gateway, size) &&
+            !ReadGatewayOfInterfaces(gateway, size)) {
             throw Failure{VEXAC_ERR_NOT_FOUND};
         }
         return 0;

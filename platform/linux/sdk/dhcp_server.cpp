@@ -2,19 +2,18 @@
 // one server, for each; the network script runs those whose ".info" file is switched on.
 #include <arpa/inet.h>
 #include <tavicore/file.h>
-#include <tavicore/keyvalue.h>
 #include <tavisdk/bridge.h>
 
 #include <algorithm>
 #include <cstdlib>
 #include <cstring>
-#include <memory>
 #include <string>
 
 #include "core/failure.h"
 #include "core/line.h"
 #include "core/text_file.h"
 #include "sdk/interface_name.h"
+#include "sdk/settings_files.h"
 
 using namespace tavicore;
 using namespace tavisdk;
@@ -38,7 +37,7 @@ bool EndsWith(const std::string& text, const char* end) {
 
 template <size_t size>
 void Read(const std::string& file, const char* key, char (&value)[size]) {
-    VEXACFileGetKeyValue(file.c_str(), key, value, size);  // what is missing is empty
+    ReadSetting(file, key, value, size);  // what is missing is empty
 }
 
 int ReadNumber(const std::string& file, const char* key) {
@@ -49,7 +48,7 @@ int ReadNumber(const std::string& file, const char* key) {
 
 TAVINetDhcpServer ReadServer(const std::string& file) {
     TAVINetDhcpServer server{};
-    server.enabled = VEXACFileCheckKeyValue(file.c_str(), "enable", "yes", 0);
+    server.enabled = HasSetting(file, "enable", "yes") ? 1 : 0;
     server.reserved = ReadNumber(file, "reserved");
     server.leaseTime = ReadNumber(file, "lease");
     Read(file, "start", server.rangeStart);
@@ -124,8 +123,9 @@ std::string Configuration(const TAVINetDhcpServer& server) {
 // A file that is no settings, or half of one, is passed over: it must not keep another bridge's
 // access point from being switched on or off.
 void WriteConfiguration(const std::string& settings) {
-    const TAVINetDhcpServer server = ReadServer(settings);
-    if (Guarded(-1, [&server] {
+    TAVINetDhcpServer server{};
+    if (Guarded(-1, [&] {
+            server = ReadServer(settings);
             Check(server);
             return 0;
         }) == 0) {
@@ -135,16 +135,11 @@ void WriteConfiguration(const std::string& settings) {
 }
 
 void WriteConfigurations() {
-    VEXACSzList* list = VEXACSzListAlloc(1024);
-    if (list == nullptr) {
-        throw Failure{VEXAC_ERR_OUT_OF_MEMORY};
-    }
-    VEXACFileEnumDir(kFolder, kFilePrefix, &list, VEXAC_ENUM_FILES);  // no folder, no names
-    const std::unique_ptr<VEXACSzList, decltype(&VEXACSzListFree)> names(list, VEXACSzListFree);
+    const StringList names = ListFiles(kFolder, kFilePrefix);
     // Settings in use come last, and so win over those put aside of the same bridge.
     for (const char* suffix : {kSuffixes[1], kSuffixes[0]}) {
         for (int i = 0; i < names->count; ++i) {
-            const std::string name = VEXACSzListGet(list, i);
+            const std::string name = VEXACSzListGet(names.get(), i);
             if (EndsWith(name, suffix)) {
                 WriteConfiguration(std::string(kFolder) + '/' + name);
             }
@@ -165,6 +160,9 @@ int TAVINetGetDhcpServerConf(const char* interface, const char* bridge, TAVINetD
             if (VEXACFileExist(file.c_str()) != 0) {
                 *server = ReadServer(file);
                 return 0;
+            }
+            if (VEXACErrGet() != VEXAC_ERR_NOT_FOUND) {
+                throw Failure{VEXACErrGet()};
             }
         }
         throw Failure{VEXAC_ERR_NOT_FOUND};

@@ -17,7 +17,7 @@ int TAVIMediaService(int action) {
             throw Failure{VEXAC_ERR_BAD_PARAMETER};
         }
         if (VEXACFileExist(kScript) == 0) {
-            throw Failure{VEXAC_ERR_NOT_FOUND};
+            throw Failure{VEXACErrGet()};
         }
         if (VEXACExec(kScript, "restart", nullptr) != 0) {
             throw Failure{VEXAC_ERR_IO};
