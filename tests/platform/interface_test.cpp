@@ -77,7 +77,6 @@ TEST(Card, HasNoOtherAddressThanItsOwnAndKeepsThatWhereverItStood) {
         {{"eth7", 1, "10.9.0.5", "255.255.255.128"}, "10.9.0.5/25 brd 10.9.0.127\n"},
         {{"eth7", 1, "10.9.0.5", "255.255.255.255"}, "10.9.0.5/32\n"},
         {{"eth7", 0, "10.9.0.6", "255.255.255.0"}, "10.9.0.6/24 brd 10.9.0.255\n"},
-        {{"eth7", 0, "", ""}, ""},
     };
     for (const auto& row : kRows) {
         EXPECT_EQ(TAVINetSetCard1(&row.card, 0), 0);
@@ -103,6 +102,7 @@ TEST(Card, ThatIsWrongChangesNothing) {
         {{"eth7", 1, "10.9.0.5", "24"}, 0, VEXAC_ERR_BAD_PARAMETER},
         {{"eth7", 1, "10.9.0.5", "255.255.255.0"}, 1, VEXAC_ERR_BAD_PARAMETER},
         {{"none7", 1, "10.9.0.5", "255.255.255.0"}, 0, VEXAC_ERR_NOT_FOUND},
+        {{"eth7", 0, "", ""}, 0, VEXAC_ERR_NOT_FOUND},  // no lease
     };
     for (const auto& row : kRows) {
         EXPECT_EQ(TAVINetSetCard1(&row.card, row.flags), -1);

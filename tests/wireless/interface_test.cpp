@@ -64,9 +64,11 @@ TEST(IfconfigSet, SetsAStaticAddressOrThatOfALease) {
     Station station;
     WirelessConf conf = MakeConf();
     station.tools.Add("/usr/sbin/udhcpc", "exit 1");
-    EXPECT_EQ(TAVIWirelessIfconfigSet("wlan0", &conf), 0);
+    EXPECT_EQ(TAVIWirelessIfconfigSet("wlan0", &conf), -1);
     EXPECT_TRUE(station.log.Has("Failed to get IP from DHCP"));
+    EXPECT_TRUE(station.log.Has("Failed to set network interface"));
     EXPECT_EQ(Addresses(), "");
+    station.log.Clear();
     station.tools.Add("/usr/sbin/udhcpc",
                       "{ sleep 60; :; } &\necho $! > /etc/dhcpc/dhcpcd-wlan0.pid\n"
                       "printf 'IPADDR=10.1.1.2\\nNETMASK=255.0.0.0\\n'"

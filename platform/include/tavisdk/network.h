@@ -85,9 +85,10 @@ typedef struct TAVINetCard {
 } TAVINetCard;
 
 /*
- * Makes the card's address the only IPv4 address of the interface. A static card has one, and ends
- * the interface's DHCP client; one by DHCP may have none, then the interface has none either.
- * flags is 0. Returns 0, or -1 on error, with a bad address or netmask before anything is changed.
+ * Makes the card's address the only IPv4 address of the interface. A static card ends the
+ * interface's DHCP client. flags is 0. Returns 0, or -1 on error, before anything is changed with a
+ * bad address or netmask, and for a card by DHCP that has no address because there is no lease
+ * (VEXAC_ERR_NOT_FOUND).
  */
 TAVI_SDK_API int TAVINetSetCard1(const TAVINetCard* card, int flags);
 
@@ -97,7 +98,8 @@ TAVI_SDK_API int TAVINetSetCard1(const TAVINetCard* card, int flags);
  * one. Returns 0, or -1 with empty texts when there is no lease after 12 seconds
  * (VEXAC_ERR_NOT_FOUND).
  *
- * The client's process id is in "/etc/dhcpc/dhcpcd-INTERFACE.pid". Its lease is in
+ * The client's process id is in "/etc/dhcpc/dhcpcd-INTERFACE.pid", with its start time
+ * as <tavicore/process.h> describes. Its lease is in
  * "/etc/dhcpc/dhcpcd-INTERFACE.info", a key/value file of IPADDR, NETMASK and, when the network
  * has one, GATEWAY. The host edition runs udhcpc with the script "/usr/tavi/bin/dhcp-lease", which
  * sets the address and the name servers, but no route.

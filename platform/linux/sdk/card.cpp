@@ -67,10 +67,9 @@ bool IsSame(rtnl_addr* a, rtnl_addr* b) {
            nl_addr_cmp(rtnl_addr_get_local(a), rtnl_addr_get_local(b)) == 0;
 }
 
-// wanted may be null.
 void RemoveOthers(nl_sock* socket, int index, rtnl_addr* wanted) {
     for (const OwnAddress& address : AddressesOf(socket, index)) {
-        if (wanted == nullptr || !IsSame(address.get(), wanted)) {
+        if (!IsSame(address.get(), wanted)) {
             const int result = rtnl_addr_delete(socket, address.get(), 0);
             // With the first address of a network, the kernel removes the further ones.
             Require(result == -NLE_NOADDR ? 0 : result);
@@ -87,18 +86,16 @@ int TAVINetSetCard1(const TAVINetCard* card, int flags) {
             throw Failure{VEXAC_ERR_BAD_PARAMETER};
         }
         const int index = FindInterface(card->interface);
-        OwnAddress wanted;
-        if (card->isStatic != 0 || card->address[0] != '\0') {
-            wanted = MakeOwnAddress(index, *card);
+        if (card->isStatic == 0 && card->address[0] == '\0') {
+            throw Failure{VEXAC_ERR_NOT_FOUND};  // no lease
         }
+        const OwnAddress wanted = MakeOwnAddress(index, *card);
         if (card->isStatic != 0) {
             StopDhcpClient(card->interface);  // or it would set its own address again
         }
         const Socket socket = OpenRouteSocket();
         RemoveOthers(socket.get(), index, wanted.get());
-        if (wanted) {
-            Require(rtnl_addr_add(socket.get(), wanted.get(), NLM_F_CREATE | NLM_F_REPLACE));
-        }
+        Require(rtnl_addr_add(socket.get(), wanted.get(), NLM_F_CREATE | NLM_F_REPLACE));
         return 0;
     });
 }
