@@ -20,8 +20,9 @@ class SzHash {
     VEXACSzHash** Address() { return &hash_; }
     // Null when the key is not there.
     const char* operator[](const char* key) const { return VEXACSzHashGetValue(hash_, key); }
-    void Set(const char* key, const std::string& value) {
-        VEXACSzHashSetValue(&hash_, key, value.c_str());
+    // False when there is no memory for it: the hash is as it was, and not what is to be saved.
+    bool Set(const char* key, const std::string& value) {
+        return VEXACSzHashSetValue(&hash_, key, value.c_str()) == 0;
     }
 
   private:
