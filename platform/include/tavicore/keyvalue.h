@@ -11,8 +11,8 @@
  * a crash sees the old or the new content, never a mixture. Mode and owner of the file are kept, a
  * symbolic link keeps pointing to it, every line that is not concerned survives as it stands, and
  * writers in different processes wait for each other. The lock is on a file ".NAME.lock" beside it
- * that nobody else can open and that is there only meanwhile; a writer that has not got it after 2 s
- * fails with VEXAC_ERR_LOCKED and names the holder in the system log.
+ * that nobody else can open and that is there only meanwhile; a writer that has not got it after 2
+ * s fails with VEXAC_ERR_LOCKED and names the holder in the system log.
  */
 #ifndef TAVICORE_KEYVALUE_H
 #define TAVICORE_KEYVALUE_H
@@ -43,7 +43,8 @@ TAVI_SDK_API int VEXACFileGetKeyValue(const char* file, const char* key, char* v
  * created with mode 0644, less the process's umask.
  *
  * Returns 1 on success. Returns -1 and leaves the file as it was when it cannot be read or replaced
- * (VEXAC_ERR_IO, VEXAC_ERR_LOCKED), or an argument is null, the format is another one, the key is empty or holds "=",
+ * (VEXAC_ERR_IO, VEXAC_ERR_LOCKED), or an argument is null, the format is another one, the key is
+ * empty or holds "=",
  * "#" at its start, a blank or a line break, or the value holds a line break
  * (VEXAC_ERR_BAD_PARAMETER).
  */
