@@ -8,18 +8,16 @@
 
 #include "tests/support/descriptors.h"
 #include "tests/support/files.h"
+#include "tests/support/wait.h"
 
 namespace taviwireless::test {
 namespace {
 
 constexpr char kPidFile[] = "/tmp/pid";
 
-// Waits, up to five seconds, until the process named in the pid file has the wanted state.
+// Waits until the process named in the pid file has the wanted state.
 bool WaitUntilAlive(int alive) {
-    for (int i = 0; i < 500 && VEXACProcAliveByPidFile(kPidFile) != alive; ++i) {
-        usleep(10000);
-    }
-    return VEXACProcAliveByPidFile(kPidFile) == alive;
+    return Eventually([alive] { return VEXACProcAliveByPidFile(kPidFile) == alive; });
 }
 
 TEST(Process, AChildThatNobodyWaitsForIsKnownByItsPidFile) {

@@ -7,6 +7,7 @@
 
 #include "tests/sim/client.h"
 #include "tests/support/modem_simulator.h"
+#include "tests/support/wait.h"
 
 namespace taviwireless::test {
 namespace {
@@ -63,9 +64,7 @@ TEST(Line, OutlivesItsClientsAndKeepsNothingForTheNext) {
     for (int round = 0; round < 50; ++round) {
         Client(1).Write("AT+CGMM\r");  // leaves before the reply
         std::vector<std::string> received;
-        for (int i = 0; i < 1000 && received.empty(); ++i) {
-            received = simulator.Received("0");
-        }
+        Eventually([&] { return !(received = simulator.Received("0")).empty(); });
         ASSERT_THAT(received, ElementsAre("AT+CGMM"));
         Client client(1);
         ASSERT_EQ(client.Ask("AT+CSQ"), "AT+CSQ\r\r\n+CSQ: 17,99\r\n\r\nOK\r\n");

@@ -8,6 +8,7 @@
 #include "tests/sim/client.h"
 #include "tests/support/files.h"
 #include "tests/support/modem_simulator.h"
+#include "tests/support/wait.h"
 
 namespace taviwireless::test {
 namespace {
@@ -82,11 +83,10 @@ TEST(Plug, AGivenTtyAnswersWithoutLinkAndInfoFileAndIsReopenedAfterAHangUp) {
     EXPECT_TRUE(fs::is_empty("/tmp/near"));
     for (int round = 0; round < 2; ++round) {
         std::vector<std::string> received;
-        for (int i = 0; i < 100 && received.empty(); ++i) {
+        Eventually([&] {
             far.Send("0.1", "AT+CSQ\r");
-            std::this_thread::sleep_for(std::chrono::milliseconds(20));
-            received = near.Received("0");
-        }
+            return !(received = near.Received("0")).empty();
+        });
         EXPECT_THAT(received, testing::Contains("AT+CSQ"));
         EXPECT_THAT(far.Received("0.1"), testing::Contains("AT+CSQ"));  // the echo
         far.Unplug("0");
@@ -101,11 +101,11 @@ TEST(Plug, AModemLosesPowerWhenItsGivenTtysHangUp) {
     ModemSimulator near("/tmp/near", {"--modem", "generic,pin=1234", "--tty", "/dev/ttyUSB1"});
     const auto answers = [&far](const char* command) {
         std::vector<std::string> lines;
-        for (int i = 0; i < 100 && lines.size() < 2; ++i) {  // the echo, and what it says
+        Eventually([&] {  // the echo, and what it says
             far.Send("0.1", command);
             std::this_thread::sleep_for(std::chrono::milliseconds(20));
-            lines = far.Received("0.1");
-        }
+            return (lines = far.Received("0.1")).size() >= 2;
+        });
         return lines;
     };
     answers("AT+CPIN=1234\r");

@@ -15,6 +15,7 @@
 
 #include "tests/support/files.h"
 #include "tests/support/log_capture.h"
+#include "tests/support/wait.h"
 #include "tests/usbmodem/lock_waits.h"
 
 namespace taviwireless::test {
@@ -44,13 +45,9 @@ int ExitStatus(pid_t pid) {
     return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
 }
 
-// Whether a number of the semaphore (GETVAL, GETNCNT) becomes `value` within 5 s.
+// Whether a number of the semaphore (GETVAL, GETNCNT) ever becomes `value`.
 bool Becomes(int number, int value) {
-    const auto isSo = [=] { return semctl(semget(kKey, 1, 0), 0, number) == value; };
-    for (int i = 0; i < 1000 && !isSo(); ++i) {
-        Pause();
-    }
-    return isSo();
+    return Eventually([=] { return semctl(semget(kKey, 1, 0), 0, number) == value; });
 }
 
 TEST(Semaphore, IsOneSetOfOneSemaphoreWithValueOneForEverybody) {

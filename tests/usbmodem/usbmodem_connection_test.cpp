@@ -19,6 +19,7 @@
 #include "tests/support/files.h"
 #include "tests/support/log_capture.h"
 #include "tests/support/modem_simulator.h"
+#include "tests/support/wait.h"
 
 namespace taviwireless::test {
 namespace {
@@ -55,17 +56,14 @@ struct DialledModem {
         EXPECT_FALSE(err);
         return status;
     }
-    // Looks at the link until it has this state, for 15 s at most.
+    // Looks at the link until it has this state.
     bool BecomesStatus(const std::string& status) {
-        for (int i = 0; i < 300; ++i) {
+        const bool becomes = Eventually([&] {
             record.UpdateNetStatus();
-            if (Status() == status) {
-                record.UpdateNetStatus();  // the look that found it does not count as settled
-                return true;
-            }
-            std::this_thread::sleep_for(std::chrono::milliseconds(50));
-        }
-        return false;
+            return Status() == status;
+        });
+        record.UpdateNetStatus();  // the look that found it does not count as settled
+        return becomes;
     }
     std::string Interface() {
         bool err = false;
@@ -82,8 +80,8 @@ struct DialledModem {
 };
 
 void UseRealDialler() {
-    Shell("cp " TAVI_SOURCE_DIR "/platform/root/wvdial /usr/tavi/bin/wvdial");
-    Shell("cp " TAVI_SOURCE_DIR "/sim/pppd /usr/sbin/pppd");
+    Shell("cp '" TAVI_SOURCE_DIR "/platform/root/wvdial' /usr/tavi/bin/wvdial");
+    Shell("cp '" TAVI_SOURCE_DIR "/sim/pppd' /usr/sbin/pppd");
 }
 
 TEST(Connection, LivesItsLifeWithTheRealDialler) {
@@ -137,10 +135,10 @@ TEST(Dialling, GivesTheDiallerItsSettingsInOrder) {
     ASSERT_EQ(modem.record.SetProfileAPN(""), 0);
     ASSERT_EQ(modem.record.SetProfilePhone(""), 0);
     EXPECT_EQ(modem.record.NetConnect(), 1);
-    for (int i = 0; i < 100 && !Exists("/tmp/arguments"); ++i) {
-        std::this_thread::sleep_for(std::chrono::milliseconds(10));
-    }
-    std::this_thread::sleep_for(std::chrono::milliseconds(50));
+    EXPECT_TRUE(Eventually([] {
+        return Exists("/tmp/arguments") &&
+               ReadFile("/tmp/arguments").find("Stupid Mode") != std::string::npos;
+    }));
     EXPECT_EQ(ReadFile("/tmp/arguments"),
               "Init1=ATZ\nInit2=AT+CGDCONT=1,\"ip\",\"internet\"\nBaud=460800\nPhone=*99#\n"
               "Modem=/dev/ttyUSB0\nUsername=$(touch /tmp/ran) a\nPassword=Unknown\n"
@@ -159,9 +157,7 @@ TEST(Dialling, TheDiallerHasNothingOfItsCallersAndLeavesNoZombie) {
     EXPECT_EQ(OpenDescriptors(), before);
     // The child writes its pid file first; that it runs, and with what, shows in the file it
     // writes.
-    for (int i = 0; i < 1000 && (!Exists("/tmp/fds") || ReadFile("/tmp/fds").empty()); ++i) {
-        std::this_thread::sleep_for(std::chrono::milliseconds(10));
-    }
+    EXPECT_TRUE(Eventually([] { return Exists("/tmp/fds") && !ReadFile("/tmp/fds").empty(); }));
     EXPECT_NE(getsid(VEXACReadPidFile(kPidFile)), getsid(0));
     const std::string descriptors = ReadFile("/tmp/fds");
     EXPECT_THAT(descriptors, HasSubstr("2 -> " + std::string(kLog)));
@@ -315,9 +311,7 @@ TEST(Link, ThatCannotBeLookedAtIsNotLost) {
 TEST(Link, WithoutTheWordForTheInterfaceCharacterFourteenIsWhereItIsRead) {
     DialledModem modem("echo '01234567890123wlan7 secondary DNS address' >&2; exec sleep 1000");
     EXPECT_EQ(modem.record.NetConnect(), 1);
-    for (int i = 0; i < 100 && ReadFile(kLog).empty(); ++i) {
-        std::this_thread::sleep_for(std::chrono::milliseconds(10));
-    }
+    EXPECT_TRUE(Eventually([] { return !ReadFile(kLog).empty(); }));
     EXPECT_EQ(modem.record.UpdateNetStatus(), 2);
     EXPECT_EQ(modem.record.UpdateNetStatus(), 2);  // an interface without an address is no link yet
     EXPECT_TRUE(modem.record.IsUSBModemBusy());

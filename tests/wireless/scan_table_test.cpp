@@ -153,7 +153,7 @@ TEST(ScanTable, SurvivesBrokenElements) {
 TEST(HostIwlist, FailsPlainlyWithoutAnAdapter) {
     for (const char* form : {"scanning tavi", "active_channel"}) {
         const RunResult result =
-            RunProgram({"sh", "-c", std::string(HOST_IWLIST " wlan9 ") + form});
+            RunProgram({"sh", "-c", "'" HOST_IWLIST "' wlan9 " + std::string(form)});
         EXPECT_EQ(result.status, 1);
         EXPECT_EQ(result.out, "");
         EXPECT_THAT(result.err, testing::AnyOf(testing::HasSubstr("no nl80211"),
@@ -163,7 +163,7 @@ TEST(HostIwlist, FailsPlainlyWithoutAnAdapter) {
 
 TEST(HostIwlist, HandsOtherFormsToTheStockTool) {
     const std::string path = "/usr/sbin/iwlist";
-    Shell("cp " HOST_IWLIST " " + path);
+    Shell("cp '" HOST_IWLIST "' " + path);
     Shell("rm -f " + path + ".distrib");
     EXPECT_THAT(RunProgram({path, "wlan0", "scanning"}).err,
                 testing::HasSubstr("install wireless-tools"));
