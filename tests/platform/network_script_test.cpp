@@ -1,12 +1,16 @@
-// The network script: real bridges and the real DHCP server and client; hostapd, which needs a
+// The network program: real bridges and the real DHCP server and client; hostapd, which needs a
 // radio, is a stand-in that stays until it is told to end.
 #include <gmock/gmock.h>
+#include <sys/file.h>
 #include <tavicore/file.h>
 #include <tavicore/process.h>
 #include <tavisdk/bridge.h>
+#include <unistd.h>
 
+#include "base/unique_fd.h"
 #include "tests/platform/root_scripts.h"
 #include "tests/platform/veth.h"
+#include "tests/wireless/wifi_fixture.h"
 
 namespace taviwireless::test {
 namespace {
@@ -16,16 +20,21 @@ using testing::Not;
 
 const std::string kInterfaceFile = "/etc/sysconfig/network-scripts/ifcfg-";  // and its name
 constexpr char kGuestInfo[] = "/etc/hostapd/hostapd-wlan0-guest.info";
+constexpr char kModelInfo[] = "/etc.defaults/taviinfo.conf";
 constexpr char kJoined[] = "/var/run/hostapd-wlan0.conf";
+constexpr char kGuestService[] = "/etc/dhcpd/dhcpd-gbr-gbr.info";
+constexpr char kGuestConf[] = "/etc/dhcpd/dhcpd-gbr-gbr.conf";
+constexpr char kLock[] = "/var/run/rc.network.lock";
 constexpr char kServerPid[] = "/var/run/udhcpd-lbr0.pid";
 
-struct NetworkScript : testing::Test {
+struct NetworkProgram : testing::Test {
     void SetUp() override {
         InstallRootScripts();
         InstallScript(TAVI_SOURCE_DIR "/sim/hostapd", "/usr/sbin/hostapd");
         MakeInterface("wlan0", "192.168.9.9/24");
         WriteFile("/etc/hostapd/hostapd-wlan0-host.conf", "ssid=main\n");
-        WriteFile("/etc/hostapd/hostapd-wlan0-guest.conf", "bss=gwlan\n");
+        WriteFile("/etc/hostapd/hostapd-wlan0-guest.conf", "bss=gwlan\nbssid=\n");
+        WriteFile(kModelInfo, "support_pci_wifi=yes\n");
     }
     void TearDown() override { SwitchAccessPoint("no"); }
 
@@ -53,6 +62,11 @@ struct NetworkScript : testing::Test {
     }
 };
 
+// How many programs of this name run.
+int Running(const std::string& name) {
+    return std::stoi(RunProgram({"pgrep", "--count", "--exact", name}).out);
+}
+
 // The lease that a station, at the far end of wlan0, gets: "ADDRESS ROUTER DNS LEASETIME".
 std::string LeaseOfStation() {
     WriteFile("/tmp/station", "#!/bin/sh\n[ $1 != bound ] || echo $ip $router $dns $lease\n");
@@ -70,7 +84,7 @@ void HurryServer() {
                 "chmod 755 /usr/sbin/udhcpd"});
 }
 
-TEST_F(NetworkScript, StationOfALocalBridgeGetsALease) {
+TEST_F(NetworkProgram, StationOfALocalBridgeGetsALease) {
     HurryServer();
     SaveLocalBridge();
     for (int i = 0; i < 2; ++i) {  // again: whatever ran before
@@ -82,7 +96,7 @@ TEST_F(NetworkScript, StationOfALocalBridgeGetsALease) {
     }
 }
 
-TEST_F(NetworkScript, AccessPointHasItsGuestsWhileThatIsSwitchedOn) {
+TEST_F(NetworkProgram, AccessPointHasItsGuestsWhileThatIsSwitchedOn) {
     SaveLocalBridge();
     ASSERT_EQ(Restart("lbr0"), "");
     EXPECT_EQ(ReadFile(kJoined), "ssid=main\n");
@@ -93,12 +107,38 @@ TEST_F(NetworkScript, AccessPointHasItsGuestsWhileThatIsSwitchedOn) {
     EXPECT_NE(kill(first, 0), 0);
     EXPECT_EQ(ReadFile(kJoined), "ssid=main\nbss=gwlan\n");
     EXPECT_THAT(Ip("link show gbr"), HasSubstr("UP"));
-    WriteFile(kGuestInfo, "enable=no\n");
-    ASSERT_EQ(Restart("lbr0"), "");
-    EXPECT_FALSE(Exists("/sys/class/net/gbr"));
+    for (const auto& [file, text] : {std::pair(kGuestInfo, "enable=no\n"), {kModelInfo, "\n"}}) {
+        const std::string before = ReadFile(file);
+        WriteFile(file, text);
+        ASSERT_EQ(Restart("lbr0"), "");
+        EXPECT_FALSE(Exists("/sys/class/net/gbr")) << file;
+        EXPECT_EQ(ReadFile(kJoined), "ssid=main\n") << file;
+        WriteFile(file, before);
+        ASSERT_EQ(Restart("lbr0"), "");
+        EXPECT_TRUE(Exists("/sys/class/net/gbr"));
+    }
 }
 
-TEST_F(NetworkScript, SwitchedOffLeavesNothingRunning) {
+// The server's own files are made of these when it starts, whatever lay there.
+TEST_F(NetworkProgram, GuestsHaveTheAddressesThatWereWrittenByHand) {
+    SaveLocalBridge();
+    WriteFile(kGuestInfo, "enable=yes\n");
+    ASSERT_EQ(Restart("lbr0"), "");
+    WriteFile(kInterfaceFile + "gbr", "IPADDR=10.1.15.1\nNETMASK=255.255.255.0\n");
+    const std::string service =
+        "enable=yes\nlease=3600\ninterface=gbr\nbridge=gbr\nnetmask=255.255.255.0\n";
+    WriteFile(kGuestService, service + "start=10.1.15.50\nend=10.1.15.59\n");
+    WriteFile(kGuestConf, "nonsense\n");
+    ASSERT_EQ(Restart("lbr0"), "");
+    EXPECT_EQ(VEXACProcAliveByPidFile("/var/run/udhcpd-gbr.pid"), 1);
+    EXPECT_THAT(ReadFile(kGuestConf), HasSubstr("start 10.1.15.50\n"));
+    WriteFile(kGuestService, service + "start=10.1.15.60\nend=10.1.15.59\n");
+    EXPECT_EQ(Restart("lbr0"),
+              "rc.network: the DHCP server on gbr cannot be run with the settings in " +
+                  std::string(kGuestService) + "\n");
+}
+
+TEST_F(NetworkProgram, SwitchedOffLeavesNothingRunning) {
     SaveLocalBridge();
     ASSERT_EQ(Restart("lbr0"), "");
     EXPECT_EQ(VEXACProcAliveByPidFile(kServerPid), 1);
@@ -116,7 +156,7 @@ TEST_F(NetworkScript, SwitchedOffLeavesNothingRunning) {
     EXPECT_THAT(Ip("address show wlan0"), Not(HasSubstr("inet ")));
 }
 
-TEST_F(NetworkScript, InterfaceLeavesABridgeThatOthersKeep) {
+TEST_F(NetworkProgram, InterfaceLeavesABridgeThatOthersKeep) {
     SaveLocalBridge();
     MakeInterface("eth1", "10.9.0.1/24");
     WriteFile(kInterfaceFile + "eth1", "BRIDGE=lbr0\n");
@@ -130,7 +170,7 @@ TEST_F(NetworkScript, InterfaceLeavesABridgeThatOthersKeep) {
     EXPECT_THAT(Ip("link show master lbr0"), Not(HasSubstr("wlan0")));
 }
 
-TEST_F(NetworkScript, WiredBridgeBorrowsTheAddressOfItsInterface) {
+TEST_F(NetworkProgram, WiredBridgeBorrowsTheAddressOfItsInterface) {
     MakeInterface("eth0", "10.9.0.5/16");
     WriteFile(kInterfaceFile + "eth0",
               "ONBOOT=yes\nIPADDR=10.9.0.5\nNETMASK=255.255.0.0\nGATEWAY=10.9.0.1\n");
@@ -143,21 +183,245 @@ TEST_F(NetworkScript, WiredBridgeBorrowsTheAddressOfItsInterface) {
     }
 }
 
-TEST_F(NetworkScript, FailureIsTold) {
+// What another tool gave eth0: addresses and routes of which no file of ours knows.
+constexpr char kForeign[] =
+    "ip address add 10.9.0.6/16 dev eth0; ip address add fd00::5/64 dev eth0 nodad;"
+    "ip route add default via 10.9.0.1 dev eth0 metric 100;"
+    "ip route add 10.99.0.0/24 via 10.9.0.2 dev eth0; ip route add 10.98.0.0/24 dev eth0";
+std::string WhatItHas(const std::string& interface) {
+    const std::string dev = " dev " + interface;
+    return Ip("-oneline address show scope global" + dev +
+              " | sed 's/.*inet/inet/;s/ brd.*//;s/ scope.*//'") +
+           Ip("route show scope global" + dev) + Ip("route show 10.98.0.0/24" + dev);
+}
+
+TEST_F(NetworkProgram, AddressesAndRoutesOfAnotherToolMoveAndComeBack) {
+    const struct {
+        const char *bridge, *eth0;
+    } kRows[] = {
+        {"PRIMARY=eth0\n", nullptr},
+        {"TYPE=Bridge\n", "BRIDGE=br0\n"},
+        {"PRIMARY=eth0\nIPADDR=10.8.0.1\nNETMASK=255.255.255.0\n", nullptr},
+    };
+    SwitchAccessPoint("yes");
+    for (const auto& row : kRows) {
+        SCOPED_TRACE(row.bridge);
+        MakeInterface("eth0", "10.9.0.5/16");
+        Shell(kForeign);
+        const std::string all = WhatItHas("eth0");
+        if (row.eth0 != nullptr) {
+            WriteFile(kInterfaceFile + "eth0", row.eth0);
+        }
+        WriteFile(kInterfaceFile + "wlan0", "BRIDGE=br0\n");
+        WriteFile(kInterfaceFile + "br0", std::string("ONBOOT=yes\n") + row.bridge);
+        for (int i = 0; i < 2; ++i) {
+            ASSERT_EQ(Restart("br0"), "");
+            EXPECT_EQ(WhatItHas("eth0"), "");
+            for (const char* part : {"10.9.0.5/16", "10.9.0.6/16", "fd00::5/64",
+                                     "default via 10.9.0.1 metric 100", "10.99.0.0/24", "10.98"}) {
+                EXPECT_THAT(WhatItHas("br0"), HasSubstr(part));
+            }
+            EXPECT_THAT(Ip("link show master br0"), HasSubstr("wlan0"));
+            EXPECT_EQ(ReadFile("/sys/class/net/br0/address"),
+                      ReadFile("/sys/class/net/eth0/address"));
+        }
+        WriteFile(kInterfaceFile + "wlan0", "");
+        WriteFile(kInterfaceFile + "br0", std::string("ONBOOT=no\n") + row.bridge);
+        ASSERT_EQ(Restart("br0"), "");
+        EXPECT_EQ(WhatItHas("eth0"), all);
+        EXPECT_FALSE(Exists("/sys/class/net/br0"));
+        Ip("link delete eth0");
+    }
+}
+
+TEST_F(NetworkProgram, PortsGetTheirOwnBackWhileOthersStay) {
+    MakeInterface("eth0", "10.9.0.5/16");
+    MakeInterface("eth1", "10.8.0.5/16");
+    Ip("route add default via 10.8.0.1");
+    Ip("link add br0 type bridge");
+    MakeInterface("eth2", "10.7.0.5/16");
+    Ip("link set eth2 master br0");  // by somebody else
+    WriteFile(kInterfaceFile + "br0", "ONBOOT=yes\nPRIMARY=eth0\n");
+    WriteFile(kInterfaceFile + "eth1", "BRIDGE=br0\n");
+    ASSERT_EQ(Restart("br0"), "");
+    EXPECT_THAT(WhatItHas("br0"), HasSubstr("default via 10.8.0.1"));
+    remove((kInterfaceFile + "eth1").c_str());
+    ASSERT_EQ(Restart("br0"), "");
+    EXPECT_EQ(WhatItHas("eth1"), "inet 10.8.0.5/16\ndefault via 10.8.0.1 \n");
+    EXPECT_THAT(WhatItHas("br0"), HasSubstr("10.9.0.5/16"));
+    EXPECT_THAT(Ip("link show master br0"), HasSubstr("eth2"));
+}
+
+TEST_F(NetworkProgram, ConfiguredGatewayIsUsedWhereverItStands) {
+    MakeInterface("eth0", "10.9.0.5/16");
+    WriteFile("/etc/sysconfig/network", "GATEWAY=10.9.0.1\n");
+    WriteFile(kInterfaceFile + "eth0", "ONBOOT=yes\nIPADDR=10.9.0.5\nNETMASK=255.255.0.0\n");
+    WriteFile(kInterfaceFile + "br0", "PRIMARY=eth0\nONBOOT=yes\n");
+    for (const char* gateway : {"10.9.0.1", "10.9.0.2"}) {
+        WriteFile("/etc/sysconfig/network", "GATEWAY=" + std::string(gateway) + "\n");
+        ASSERT_EQ(Restart("br0"), "");
+        EXPECT_EQ(Ip("route show default"), "default via " + std::string(gateway) + " dev br0 \n");
+    }
+    // One that another connection has set meanwhile is left in force.
+    Ip("route delete default");
+    MakeInterface("ppp0", "10.64.0.5/24");
+    Ip("route add default via 10.64.0.1");
+    ASSERT_EQ(Restart("br0"), "");
+    EXPECT_EQ(Ip("route show default"), "default via 10.64.0.1 dev ppp0 \n");
+}
+
+// By a real client and a real server, at the far end of the cable.
+TEST_F(NetworkProgram, LeaseOfTheWiredInterfaceBecomesTheBridges) {
+    HurryServer();
+    MakeInterface("eth0", "10.9.0.5/16");
+    Ip("address add 10.9.0.1/16 dev eth0-far");
+    Ip("route add default via 10.9.0.7 dev eth0 metric 100");
+    WriteFile("/etc/far.conf",
+              "interface eth0-far\nstart 10.9.0.20\nend 10.9.0.20\noption subnet 255.255.0.0\n"
+              "option router 10.9.0.1\npidfile /var/run/far.pid\nlease_file /var/run/far.leases\n");
+    Process server({"udhcpd", "-f", "/etc/far.conf"});
+    WriteFile(kInterfaceFile + "eth0", "BOOTPROTO=dhcp\nONBOOT=yes\n");
+    WriteFile(kInterfaceFile + "br0", "PRIMARY=eth0\nONBOOT=yes\n");
+    ASSERT_EQ(Restart("br0"), "");
+    EXPECT_EQ(WhatItHas("br0"), "inet 10.9.0.20/16\ndefault via 10.9.0.1 metric 100 \n");
+    const pid_t client = VEXACReadPidFile("/etc/dhcpc/dhcpcd-br0.pid");
+    ASSERT_EQ(Restart("br0"), "");
+    EXPECT_EQ(kill(client, 0), 0);  // with its lease
+    EXPECT_THAT(WhatItHas("br0"), HasSubstr("10.9.0.20/16"));
+}
+
+// Whatever step fails: addresses, routes, members and what ran are as they were.
+TEST_F(NetworkProgram, FailurePutsBackWhatWas) {
+    const struct {
+        const char *fault, *repair, *sentence;
+    } kRows[] = {
+        {"echo bad >>/etc/hostapd/hostapd-wlan0-host.conf",
+         "echo ssid=main >/etc/hostapd/hostapd-wlan0-host.conf",
+         "no radio\nrc.network: cannot start hostapd on wlan0; its messages above say why\n"},
+        {"sed -i s/^start=.*/start=x/ /etc/dhcpd/dhcpd-br0-br0.info", "true",
+         "rc.network: the DHCP server on br0 cannot be run with the settings in "
+         "/etc/dhcpd/dhcpd-br0-br0.info\n"},
+        {"mkdir /var/run/rc.network-br0.origins", "rmdir /var/run/rc.network-br0.origins",
+         "rc.network: cannot write /var/run/rc.network-br0.origins\n"},
+    };
+    Shell("sed -i '2i grep -qs bad \"$4\" && { echo no radio; exit 1; }' /usr/sbin/hostapd");
     SaveLocalBridge();
-    WriteFile("/usr/sbin/hostapd", "#!/bin/sh\necho no radio; exit 1\n");
-    for (const char* bridge : {"lbr0", ""}) {
-        EXPECT_EQ(Restart(bridge),
-                  "no radio\nrc.network: cannot start hostapd on wlan0; its "
-                  "messages above say why\n");
+    ASSERT_EQ(Restart("lbr0"), "");
+    MakeInterface("eth0", "10.9.0.5/16");
+    Shell(kForeign);
+    Ip("address add 10.9.0.7/16 dev eth0 valid_lft 4000 preferred_lft 4000");
+    const TAVINetDhcpServer server = {1,     30,    600, "10.9.0.20", "10.9.0.30",
+                                      "br0", "br0", "",  "",          "255.255.0.0"};
+    WriteFile(kInterfaceFile + "br0", "ONBOOT=yes\nPRIMARY=eth0\n");
+    WriteFile(kInterfaceFile + "wlan0", "BRIDGE=br0\n");
+    const std::string all = WhatItHas("eth0");
+    const std::string local = WhatItHas("lbr0");
+    for (const auto& row : kRows) {
+        SCOPED_TRACE(row.sentence);
+        ASSERT_EQ(TAVINetSetDhcpServerConfigFiles(&server, 1), 1);
+        Shell(row.fault);
+        EXPECT_EQ(Restart("br0"), row.sentence);
+        Shell(row.repair);
+        EXPECT_EQ(WhatItHas("eth0"), all);
+        EXPECT_EQ(WhatItHas("lbr0"), local);
+        EXPECT_THAT(Ip("address show eth0"), HasSubstr("dynamic"));
+        EXPECT_THAT(Ip("link show master lbr0"), HasSubstr("wlan0"));
+        EXPECT_FALSE(Exists("/sys/class/net/br0"));
+        EXPECT_EQ(VEXACProcAliveByPidFile(kServerPid), 1);
+        EXPECT_EQ(Running("udhcpd"), 1);
+        EXPECT_EQ(ReadFile(kJoined), "ssid=main\n");
     }
-    for (const char* bridge : {"../lbr0", "-x", "a b", "a-name-that-is-too-long", "gbr"}) {
-        EXPECT_THAT(Restart(bridge), testing::StartsWith("rc.network: ")) << bridge;
+    EXPECT_EQ(Running("hostapd"), 1);
+    SwitchAccessPoint("no");
+    EXPECT_EQ(Restart(""), "");
+    EXPECT_EQ(Running("hostapd"), 0);
+}
+
+TEST_F(NetworkProgram, WhatIsNoBridgeOrWouldCutOffIsRefused) {
+    Ip("link add br9 type bridge; ip address add 10.9.0.5/16 dev br9; ip link set br9 up;"
+       "ip route add default via 10.9.0.1 metric 5");
+    WriteFile(kInterfaceFile + "br7", "ONBOOT=yes\nPRIMARY=br7\n");
+    const std::pair<const char*, const char*> kRows[] = {
+        {"../lbr0", "\"../lbr0\" is not a bridge's name"},
+        {"-x", "\"-x\" is not a bridge's name"},
+        {"a b", "\"a b\" is not a bridge's name"},
+        {"#", "\"#\" is not a bridge's name"},
+        {"a-name-that-is-too-long", "\"a-name-that-is-too-long\" is not a bridge's name"},
+        {"gbr", "gbr is the guests' bridge; give the main network another"},
+        {"lo", "lo is an interface of its own and not a bridge"},
+        {"wlan0", "wlan0 is an interface of its own and not a bridge"},
+        {"br7", "br7 cannot be a bridge around itself"},
+        {"br9",
+         "this would cut the machine off: no interface would be left for the route default "
+         "via 10.9.0.1 metric 5 on br9"},
+    };
+    SwitchAccessPoint("yes");
+    for (const auto& [bridge, sentence] : kRows) {
+        EXPECT_EQ(Restart(bridge), "rc.network: " + std::string(sentence) + "\n");
     }
+    EXPECT_EQ(Running("hostapd"), 0);
+    EXPECT_EQ(WhatItHas("br9"), "inet 10.9.0.5/16\ndefault via 10.9.0.1 metric 5 \n");
     EXPECT_EQ(RunProgram({"/etc/rc.network", "restart", "wlan0"}).status, 2);
 }
 
-TEST_F(NetworkScript, ValuesAreNeverRun) {
+TEST_F(NetworkProgram, DryRunPrintsThePlanAndChangesNothing) {
+    MakeInterface("eth0", "10.9.0.5/16");
+    Ip("route add default via 10.9.0.1 metric 100");
+    WriteFile(kInterfaceFile + "br0", "ONBOOT=yes\nPRIMARY=eth0\n");
+    WriteFile(kInterfaceFile + "wlan0", "BRIDGE=br0\n");
+    SwitchAccessPoint("yes");
+    const std::string before = Ip("address; ip route");
+    const RunResult plan = RunProgram({"/etc/rc.network", "--dry-run", "restart", "wlan0", "br0"});
+    EXPECT_EQ(plan.out,
+              "bridge     br0                              is made\n"
+              "interface  eth0                             joins br0\n"
+              "interface  wlan0                            joins br0\n"
+              "address    10.9.0.5/16                      moves from eth0 to br0\n"
+              "address    192.168.9.9/24                   is taken from wlan0\n"
+              "route      default via 10.9.0.1 metric 100  moves from eth0 to br0\n"
+              "program    hostapd                          is started anew on wlan0\n"
+              "program    udhcpd                           is not to run on br0\n"
+              "program    udhcpd                           is not to run on gbr\n")
+        << plan.err;
+    EXPECT_EQ(Ip("address; ip route"), before);
+    EXPECT_FALSE(Exists("/var/run/rc.network.lock"));
+}
+
+TEST_F(NetworkProgram, RestartsWaitForEachOtherAndNobodyElse) {
+    SaveLocalBridge();
+    const std::string three = "for n in 1 2 3; do /etc/rc.network restart wlan0 lbr0 & done; wait;";
+    EXPECT_EQ(RunProgram({"sh", "-c", three + three + three}).err, "");
+    EXPECT_EQ(Running("hostapd") + Running("udhcpd"), 2);
+    EXPECT_EQ(FileMode(kLock), 0600);
+    const UniqueFd lock(open(kLock, O_RDWR | O_CLOEXEC));
+    ASSERT_EQ(flock(lock.Get(), LOCK_EX | LOCK_NB), 0);  // no program that runs has it
+    WriteFile(kLock, "4711");
+    Process waiting({"sh", "-c", "exec /etc/rc.network restart wlan0 lbr0 2>&1"});
+    while (ReadFile("/proc/locks").find("->") == std::string::npos) {
+        usleep(1000);
+    }
+    waiting.Signal(SIGALRM);  // as after a minute
+    EXPECT_EQ(waiting.ReadLine(),
+              "rc.network: the network is being restarted by process 4711, which does not come to "
+              "an end; try again");
+    EXPECT_EQ(waiting.Wait(), 1);
+    chmod(kLock, 0644);
+    EXPECT_EQ(Restart("lbr0"),
+              "rc.network: others can open " + std::string(kLock) + "; remove it\n");
+}
+
+TEST_F(NetworkProgram, CallersHabitsDoNotMatter) {
+    SaveLocalBridge();
+    EXPECT_EQ(
+        RunProgram({"sh", "-c", "trap '' CHLD; exec env -i /etc/rc.network restart wlan0 lbr0"})
+            .err,
+        "");
+    EXPECT_EQ(
+        Shell("ls -l /proc/$(cat /var/run/hostapd-wlan0.pid)/fd | grep -c rc.network || true"),
+        "0\n");
+}
+
+TEST_F(NetworkProgram, ValuesAreNeverRun) {
     SaveLocalBridge();
     for (const char* odd : {"$(touch /tmp/run)", "`touch /tmp/run`", "'; touch /tmp/run; '", "*"}) {
         for (const char* key : {"IPADDR", "PRIMARY", "GATEWAY"}) {
@@ -170,7 +434,7 @@ TEST_F(NetworkScript, ValuesAreNeverRun) {
     }
 }
 
-TEST_F(NetworkScript, ProgramThatGotTheNumberOfAnotherIsSpared) {
+TEST_F(NetworkProgram, ProgramThatGotTheNumberOfAnotherIsSpared) {
     Process other({"sleep", "60"});
     WriteFile(kServerPid, std::to_string(other.Pid()) + "\n");
     WriteFile(kInterfaceFile + "lbr0", "ONBOOT=no\n");

@@ -7,8 +7,9 @@
 #include <string>
 
 #include "tests/support/files.h"
+#include "tests/support/process.h"
 
-// The scripts of the host root, at the places where they are called.
+// The scripts and the network program of the host root, at the places where they are called.
 namespace taviwireless::test {
 
 inline void InstallScript(const std::string& from, const std::string& path) {
@@ -17,9 +18,10 @@ inline void InstallScript(const std::string& from, const std::string& path) {
 }
 
 inline void InstallRootScripts() {
+    InstallScript(BuiltProgram("rc.network"), "/etc/rc.network");
     for (const char* path :
-         {"/etc/rc.network", "/usr/tavi/bin/dhcp-lease", "/usr/tavi/bin/stop-program",
-          "/usr/tavi/hotplug/usb.plug", "/usr/tavi/hotplug/usb.wireless.function"}) {
+         {"/usr/tavi/bin/dhcp-lease", "/usr/tavi/bin/stop-program", "/usr/tavi/hotplug/usb.plug",
+          "/usr/tavi/hotplug/usb.wireless.function"}) {
         InstallScript(TAVI_ROOT_FOLDER + std::string(strrchr(path, '/')), path);
     }
 }

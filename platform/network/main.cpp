@@ -1,0 +1,73 @@
+// The network program of the host root, at /etc/rc.network:
+//   rc.network [--dry-run] restart INTERFACE BRIDGE
+// Makes the bridge, the access point on the interface and the bridge's DHCP server what the saved
+// settings say, whatever they were before. An empty BRIDGE leaves bridges alone. --dry-run prints
+// what would be done.
+#include <core/failure.h>
+
+#include <csignal>
+#include <cstdio>
+#include <cstdlib>
+
+#include "platform/network/error.h"
+#include "platform/network/lock.h"
+#include "platform/network/restart.h"
+
+namespace taviwireless::network {
+
+namespace {
+
+constexpr int kFailure = 1;
+constexpr int kUsage = 2;
+
+// A restart that has begun is brought to its end: all its waits have one.
+void KeepFromBeingInterrupted() {
+    sigset_t signals;
+    sigemptyset(&signals);
+    for (const int number : {SIGHUP, SIGINT, SIGTERM}) {
+        sigaddset(&signals, number);
+    }
+    sigprocmask(SIG_BLOCK, &signals, nullptr);
+}
+
+void Restart(const std::string& interface, const std::string& bridge) {
+    const UniqueFd lock = TakeLock();
+    const Plan plan = MakePlan(ReadSettings(interface, bridge));
+    KeepFromBeingInterrupted();
+    BringAbout(plan);
+}
+
+int Main(std::vector<std::string> arguments) {
+    const bool isDryRun = !arguments.empty() && arguments[0] == "--dry-run";
+    if (isDryRun) {
+        arguments.erase(arguments.begin());
+    }
+    if (arguments.size() != 3 || arguments[0] != "restart") {
+        fputs("usage: rc.network [--dry-run] restart INTERFACE BRIDGE\n", stderr);
+        return kUsage;
+    }
+    try {
+        if (isDryRun) {
+            fputs(Rendered(MakePlan(ReadSettings(arguments[1], arguments[2]))).c_str(), stdout);
+        } else {
+            Restart(arguments[1], arguments[2]);
+        }
+        return 0;
+    } catch (const tavicore::Failure& failure) {
+        fprintf(stderr, "rc.network: the kernel cannot be asked (error 0x%04X)\n",
+                static_cast<unsigned int>(failure.code));
+    } catch (const std::exception& error) {
+        fprintf(stderr, "rc.network: %s\n", error.what());
+    }
+    return kFailure;
+}
+
+}  // namespace
+
+}  // namespace taviwireless::network
+
+int main(int argc, char** argv) {
+    signal(SIGCHLD, SIG_DFL);  // ignored by the caller, no child's end could be waited for
+    setenv("PATH", "/usr/local/sbin:/usr/local/bin:/usr/sbin:/usr/bin:/sbin:/bin", 1);
+    return taviwireless::network::Main({argv + 1, argv + argc});
+}
