@@ -13,6 +13,8 @@ namespace taviwireless::network {
 // program put into the bridge, (BRIDGE, "10.1.14.1/24") for what the settings gave.
 using Origins = std::set<std::pair<std::string, std::string>>;
 
+constexpr char kForAccessPoint[] = "access-point";
+
 // They are kept in "/var/run", which like the bridge is gone after a restart of the machine.
 Origins ReadOrigins(const std::string& bridge);
 void WriteOrigins(const std::string& bridge, const Origins& origins);

@@ -29,10 +29,14 @@ class Planner {
         for (const BridgeSettings& bridge : plan_.settings.bridges) {
             CheckBridge(bridge);
         }
-        for (const BridgeSettings& bridge : plan_.settings.bridges) {
+        for (BridgeSettings& bridge : plan_.settings.bridges) {
             plan_.origins[bridge.name] = ReadOrigins(bridge.name);
+            if (HasServedItsTurn(bridge)) {
+                bridge.isOn = bridge.servesLeases = false;
+            }
             bridge.isOn ? TakeUp(bridge) : TakeDown(bridge);
         }
+        ReleaseRadio();
         LookAtClients();
         CheckRoute();
         return plan_;
@@ -53,12 +57,35 @@ class Planner {
         }
     }
 
+    // A bridge around an interface that another tool configures was made for the access point
+    // alone. Switched off, that leaves the settings as they are, but the tool is to find its
+    // interface as it knows it.
+    bool HasServedItsTurn(const BridgeSettings& bridge) {
+        const Origins& origins = plan_.origins[bridge.name];
+        const Names ports = plan_.now.PortsOf(bridge.name);
+        return bridge.isOn && !plan_.settings.accessPoint &&
+               origins.count({bridge.name, kForAccessPoint}) != 0 && !HasFiles(bridge) &&
+               std::all_of(ports.begin(), ports.end(),
+                           [&](const std::string& port) { return IsOurs(bridge, port); });
+    }
+
+    bool HasFiles(const BridgeSettings& bridge) const {
+        return !OwnCard(bridge.name).IsEmpty() ||
+               std::any_of(bridge.members.begin(), bridge.members.end(),
+                           [this](const std::string& member) {
+                               return member != Radio() && HasFile(member);
+                           });
+    }
+
     void TakeUp(const BridgeSettings& bridge) {
         plan_.names.insert(bridge.name);
         Interface& wanted = Wanted().interfaces[bridge.name];
         if (plan_.now.Find(bridge.name) == nullptr) {
             wanted.isBridge = true;
             wanted.hardware = HardwareFor(bridge);
+            if (plan_.settings.accessPoint && !HasFiles(bridge)) {
+                plan_.origins[bridge.name].emplace(bridge.name, kForAccessPoint);
+            }
         }
         wanted.isUp = true;
         ForgetOldSettings(bridge);
@@ -104,6 +131,21 @@ class Planner {
         plan_.origins[bridge.name].clear();
     }
 
+    // Without an access point it is in none but those that the settings name.
+    void ReleaseRadio() {
+        const Interface* radio = Wanted().Find(Radio());
+        if (radio == nullptr || radio->master.empty() || plan_.settings.accessPoint) {
+            return;
+        }
+        for (const BridgeSettings& bridge : plan_.settings.bridges) {
+            if (IsMember(bridge, Radio())) {
+                return;
+            }
+        }
+        plan_.names.insert(Radio());
+        WantedOf(Radio()).master.clear();
+    }
+
     // A port that this program put there, or whose file says where it belongs. Others are somebody
     // else's.
     bool IsOurs(const BridgeSettings& bridge, const std::string& port) {
@@ -125,7 +167,8 @@ class Planner {
     void ForgetOldSettings(const BridgeSettings& bridge) {
         Origins& origins = plan_.origins[bridge.name];
         for (const auto& origin : Origins(origins)) {
-            if (origin.first == bridge.name && origin.second != bridge.card.address) {
+            if (origin.first == bridge.name && origin.second != bridge.card.address &&
+                origin.second != kForAccessPoint) {
                 Remove(bridge.name, origin.second);
                 origins.erase(origin);
             }

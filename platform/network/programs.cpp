@@ -160,6 +160,8 @@ Kept Keep(const Program& program) {
 void PutBack(const Kept& kept) {
     if (kept.conf) {
         WriteText(kept.program.conf, *kept.conf);
+    } else {
+        unlink(kept.program.conf.c_str());
     }
     if (kept.ran && !Runs(kept.program)) {
         Start(kept.program);

@@ -120,7 +120,12 @@ void StartDhcpServer(const std::string& bridge) {
 void Verify(const Plan& plan, const State& wanted) {
     std::string difference = FirstDifference(wanted, plan.names);
     if (plan.settings.accessPoint && !Runs(Hostapd(plan.settings.interface))) {
-        difference = "hostapd has ended again; the system log may say why";
+        difference = "hostapd has ended again";
+    }
+    for (const BridgeSettings& bridge : plan.settings.bridges) {
+        if (bridge.servesLeases && !Runs(DhcpServer(bridge.name))) {
+            difference = "the DHCP server on " + bridge.name + " has ended again";
+        }
     }
     if (!difference.empty()) {
         throw Error("the network is not as it should be: " + difference);

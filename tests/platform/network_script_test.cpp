@@ -197,15 +197,16 @@ std::string WhatItHas(const std::string& interface) {
 
 TEST_F(NetworkProgram, AddressesAndRoutesOfAnotherToolMoveAndComeBack) {
     const struct {
-        const char *bridge, *eth0;
+        const char *bridge, *eth0, *off;
     } kRows[] = {
-        {"PRIMARY=eth0\n", nullptr},
-        {"TYPE=Bridge\n", "BRIDGE=br0\n"},
-        {"PRIMARY=eth0\nIPADDR=10.8.0.1\nNETMASK=255.255.255.0\n", nullptr},
+        {"PRIMARY=eth0\n", nullptr, nullptr},  // nothing but the access point needs it
+        {"PRIMARY=eth0\n", nullptr, "ONBOOT=no\nPRIMARY=eth0\n"},
+        {"TYPE=Bridge\n", "BRIDGE=br0\n", "ONBOOT=no\n"},
+        {"PRIMARY=eth0\nIPADDR=10.8.0.1\nNETMASK=255.255.255.0\n", nullptr, "ONBOOT=no\n"},
     };
-    SwitchAccessPoint("yes");
     for (const auto& row : kRows) {
         SCOPED_TRACE(row.bridge);
+        SwitchAccessPoint("yes");
         MakeInterface("eth0", "10.9.0.5/16");
         Shell(kForeign);
         const std::string all = WhatItHas("eth0");
@@ -226,11 +227,16 @@ TEST_F(NetworkProgram, AddressesAndRoutesOfAnotherToolMoveAndComeBack) {
                       ReadFile("/sys/class/net/eth0/address"));
         }
         WriteFile(kInterfaceFile + "wlan0", "");
-        WriteFile(kInterfaceFile + "br0", std::string("ONBOOT=no\n") + row.bridge);
+        if (row.off != nullptr) {
+            WriteFile(kInterfaceFile + "br0", row.off);
+        }
+        SwitchAccessPoint(row.off == nullptr ? "no" : "yes");
         ASSERT_EQ(Restart("br0"), "");
         EXPECT_EQ(WhatItHas("eth0"), all);
         EXPECT_FALSE(Exists("/sys/class/net/br0"));
+        EXPECT_THAT(Ip("link show wlan0"), Not(HasSubstr("master")));
         Ip("link delete eth0");
+        Shell("rm -r /etc/sysconfig");
     }
 }
 
@@ -335,6 +341,7 @@ TEST_F(NetworkProgram, FailurePutsBackWhatWas) {
     SwitchAccessPoint("no");
     EXPECT_EQ(Restart(""), "");
     EXPECT_EQ(Running("hostapd"), 0);
+    EXPECT_THAT(Ip("link show wlan0"), Not(HasSubstr("master")));
 }
 
 TEST_F(NetworkProgram, WhatIsNoBridgeOrWouldCutOffIsRefused) {
