@@ -258,6 +258,27 @@ TEST_F(APCommands, AnInterruptedStartIsInTheWayOnce) {
     EXPECT_EQ(AP({"enable"}).status, 0);
 }
 
+// When the machine starts.
+TEST_F(APCommands, WhatWasSwitchedOnIsOnAgainAfterARestart) {
+    Shell("ln -sf " + BuiltProgram("taviwireless_with_wifi") + " /usr/local/bin/taviwireless");
+    tools.Add("/usr/tavi/hotplug/usb.plug");
+    const std::vector<std::string> boot = {"sh", TAVI_ROOT_FOLDER "/start-wireless"};
+    const std::string restart = "/etc/rc.network restart wlan0 lbr0";
+    for (const char* enabled : {"no", "yes"}) {
+        ASSERT_EQ(Set({"ssid=Home"}).status, 0);
+        Shell("sed -i s/enable=no/enable=" + std::string(enabled) + "/ " + kStored);
+        tools.ForgetCommands();
+        WriteFile(kFlag, "");  // the power failed in an attempt
+        const RunResult result = RunProgram(boot);
+        EXPECT_EQ(result.status, 0) << result.err;
+        EXPECT_EQ(tools.Commands().front(), "/usr/tavi/hotplug/usb.plug ");
+        EXPECT_EQ(testing::Matches(Contains(restart))(tools.Commands()),
+                  enabled == std::string("yes"));
+    }
+    WriteFile("/tmp/no-network", "");
+    EXPECT_EQ(RunProgram(boot).status, 1);
+}
+
 TEST_F(APCommands, WhatIsMissingIsSaidInOneLine) {
     const auto asNobody = [](const char* command) {
         return RunAsNobody({BuiltProgram("taviwireless_with_wifi"), "ap", command});
