@@ -260,7 +260,9 @@ TEST_F(APCommands, AnInterruptedStartIsInTheWayOnce) {
 
 // When the machine starts.
 TEST_F(APCommands, WhatWasSwitchedOnIsOnAgainAfterARestart) {
-    Shell("ln -sf " + BuiltProgram("taviwireless_with_wifi") + " /usr/local/bin/taviwireless");
+    const std::string program = "/usr/local/bin/taviwireless";
+    tools.Add(program, "[ \"$*\" = 'wifi auto' ] || exec " +
+                           BuiltProgram("taviwireless_with_wifi") + " \"$@\"");
     tools.Add("/usr/tavi/hotplug/usb.plug");
     const std::vector<std::string> boot = {"sh", TAVI_ROOT_FOLDER "/start-wireless"};
     const std::string restart = "/etc/rc.network restart wlan0 lbr0";
@@ -277,6 +279,12 @@ TEST_F(APCommands, WhatWasSwitchedOnIsOnAgainAfterARestart) {
     }
     WriteFile("/tmp/no-network", "");
     EXPECT_EQ(RunProgram(boot).status, 1);
+    WriteFile("/usr/tavi/etc/wireless.conf", "[Home_00:11:22:33:44:55]\n\tessid=Home\n");
+    EXPECT_EQ(RunProgram(boot).status, 1);
+    EXPECT_THAT(tools.Commands(), Not(Contains(program + " wifi auto")));
+    Shell("sed -i s/enable=yes/enable=no/ " + std::string(kStored));
+    EXPECT_EQ(RunProgram(boot).status, 0);
+    EXPECT_THAT(tools.Commands(), Contains(program + " wifi auto"));
 }
 
 TEST_F(APCommands, WhatIsMissingIsSaidInOneLine) {

@@ -51,10 +51,19 @@ TEST(DhcpServer, PutAsideKeepsItsSettingsUntilThereAreOthersInForce) {
 }
 
 TEST(DhcpServer, BadSettingsOfOneBridgeDoNotKeepAnotherFromService) {
-    WriteFile("/etc/dhcpd/dhcpd-abr0-abr0.info", "interface=abr0\nbridge=abr0\nstart=$(reboot)\n");
-    EXPECT_EQ(TAVINetSetDhcpServerConfigFiles(&kServer, 1), 1);
-    EXPECT_TRUE(Exists(kConf));
-    EXPECT_FALSE(Exists("/etc/dhcpd/dhcpd-abr0-abr0.conf"));
+    const std::string kRows[] = {"interface=abr0\nbridge=abr0\nstart=$(reboot)\n", "",
+                                 "interface=lbr0\nbridge=lbr0\n"};
+    for (const std::string& bad : kRows) {
+        WriteFile("/etc/dhcpd/dhcpd-abr0-abr0.info", bad);
+        WriteFile("/etc/dhcpd/dhcpd-abr0-abr0.conf", "of better settings\n");
+        EXPECT_EQ(TAVINetSetDhcpServerConfigFiles(&kServer, 1), 1);
+        EXPECT_THAT(ReadFile(kConf), testing::HasSubstr("interface lbr0\n"));
+        EXPECT_FALSE(Exists("/etc/dhcpd/dhcpd-abr0-abr0.conf")) << bad;
+    }
+    // Nor has a file a word in another bridge's service.
+    WriteFile("/etc/dhcpd/dhcpd-zbr0-zbr0.info", "end=10.1.14.3\n" + ReadFile(kInfo));
+    EXPECT_EQ(TAVINetSetDhcpServerConfigFiles(&kServer, 0), 1);
+    EXPECT_THAT(ReadFile(kConf), testing::HasSubstr("end 10.1.14.254\n"));
 }
 
 TEST(DhcpServer, RecordThatIsWrongIsNotWritten) {

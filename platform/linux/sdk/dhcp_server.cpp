@@ -120,17 +120,28 @@ std::string Configuration(const TAVINetDhcpServer& server) {
     return text;
 }
 
-// A file that is no settings, or half of one, is passed over: it must not keep another bridge's
-// access point from being switched on or off.
-void WriteConfiguration(const std::string& settings) {
+// "gbr-gbr" of "dhcpd-gbr-gbr.info": of which interface and bridge the file is.
+std::string NameOf(const std::string& file, const char* suffix) {
+    const size_t begin = strlen(kFilePrefix);
+    return file.substr(begin, file.size() - begin - strlen(suffix));
+}
+
+// A file that is no settings, half of one, or another bridge's, is passed over: it must not keep
+// another bridge's access point from being switched on or off. But nothing is served any more from
+// what it was.
+void WriteConfiguration(const std::string& file, const char* suffix) {
+    const std::string name = NameOf(file, suffix);
+    const std::string configuration = std::string(kFolder) + '/' + kFilePrefix + name + ".conf";
     TAVINetDhcpServer server{};
-    if (Guarded(-1, [&] {
-            server = ReadServer(settings);
-            Check(server);
-            return 0;
-        }) == 0) {
-        ReplaceFile(PathOf(server.interface, server.bridge, ".conf").c_str(),
-                    Configuration(server));
+    const bool isValid = Guarded(-1, [&] {
+                             server = ReadServer(std::string(kFolder) + '/' + file);
+                             Check(server);
+                             return 0;
+                         }) == 0;
+    if (isValid && name == std::string(server.interface) + '-' + server.bridge) {
+        ReplaceFile(configuration.c_str(), Configuration(server));
+    } else {
+        VEXACSysUnlink(configuration.c_str());
     }
 }
 
@@ -141,7 +152,7 @@ void WriteConfigurations() {
         for (int i = 0; i < names->count; ++i) {
             const std::string name = VEXACSzListGet(names.get(), i);
             if (EndsWith(name, suffix)) {
-                WriteConfiguration(std::string(kFolder) + '/' + name);
+                WriteConfiguration(name, suffix);
             }
         }
     }
