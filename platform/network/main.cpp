@@ -4,6 +4,7 @@
 // settings say, whatever they were before. An empty BRIDGE leaves bridges alone. --dry-run prints
 // what would be done.
 #include <core/failure.h>
+#include <sys/stat.h>
 
 #include <csignal>
 #include <cstdio>
@@ -28,6 +29,7 @@ void KeepFromBeingInterrupted() {
         sigaddset(&signals, number);
     }
     sigprocmask(SIG_BLOCK, &signals, nullptr);
+    signal(SIGPIPE, SIG_IGN);  // nobody may be left to read what is said
 }
 
 void Restart(const std::string& interface, const std::string& bridge) {
@@ -68,6 +70,7 @@ int Main(std::vector<std::string> arguments) {
 
 int main(int argc, char** argv) {
     signal(SIGCHLD, SIG_DFL);  // ignored by the caller, no child's end could be waited for
+    umask(022);
     setenv("PATH", "/usr/local/sbin:/usr/local/bin:/usr/sbin:/usr/bin:/sbin:/bin", 1);
     return taviwireless::network::Main({argv + 1, argv + argc});
 }

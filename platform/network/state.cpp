@@ -159,20 +159,20 @@ void RemoveAddresses(nl_sock* socket, const State& now, const State& wanted, con
     }
 }
 
-// An interface that is not there (unplugged, or hostapd's own) is passed over.
+// An interface that is not there (unplugged) is passed over. A radio is switched by who uses it.
 void SwitchAndAddress(nl_sock* socket, const State& now, const State& wanted, const Names& names) {
     for (const std::string& name : names) {
         const Interface* shall = wanted.Find(name);
         if (shall == nullptr || (now.Find(name) == nullptr && !shall->isBridge)) {
             continue;
         }
-        if (shall->isUp) {
+        if (shall->isUp && !shall->isRadio) {
             SetUp(name, true);
         }
         for (const Address& address : shall->addresses) {
             Add(socket, address, name);
         }
-        if (!shall->isUp) {
+        if (!shall->isUp && !shall->isRadio) {
             SetUp(name, false);
         }
     }

@@ -137,7 +137,6 @@ serves_guests() {
         >/etc/sysconfig/network-scripts/ifcfg-gbr
     printf '%s\n' enable=yes reserved=30 lease=3600 start=10.1.15.50 end=10.1.15.59 interface=gbr bridge=gbr \
         gateway=10.1.15.1 nameserver=10.1.15.1 netmask=255.255.255.0 >/etc/dhcpd/dhcpd-gbr-gbr.info
-    ap disable # which has the server's own file made of that
     ap set guest=yes guest-ssid=Visitors guest-security=wpa2 guest-passphrase <<<"welcome friend"
     ap enable
     join Visitors "welcome friend"
@@ -149,6 +148,77 @@ serves_guests() {
     ap disable
     must_fail ip link show gbr
     wait_for 3 ended hostapd
+}
+
+# All that is lost with the power is taken away; then comes what the unit does at boot.
+comes_back_after_restart() {
+    ap enable
+    pkill -9 -x hostapd
+    pkill -9 -x udhcpd
+    ip link delete lbr0
+    rm -rf /run/hostapd* /run/udhcpd* /run/rc.network* /tmp/wireless.info
+    touch /var/tmp/.wireless_ap_connecting # the power failed while it was being switched on once more
+    /usr/tavi/bin/start-wireless
+    same on "$(status_of State)"
+    join "My Castle" "correct horse"
+    lease
+    in_air ping -c 2 -i 0.2 -W 2 10.1.14.1
+}
+
+# One is done, the other is refused or done as well.
+enables_twice_at_once() {
+    ap enable &
+    ap enable || same 4 $?
+    wait $! || same 4 $?
+    same "1 1" "$(pgrep -cx hostapd) $(pgrep -cx udhcpd)"
+    ap disable
+    wait_for 3 ended hostapd
+    wait_for 3 ended udhcpd
+}
+
+# eth0 leads to a router; another tool than ours configured it.
+bridges_wired_network() {
+    ip link add eth0 type veth peer name router netns air
+    in_air ip addr add 10.9.0.1/16 dev router
+    in_air ip link set router up
+    ip addr add 10.9.0.5/16 dev eth0
+    ip link set eth0 up
+    ip route add default via 10.9.0.1 metric 100
+    ap set bridge=br0 guest=no
+    ap enable
+    same br0 "$(basename "$(readlink /sys/class/net/wlan0/master)")"
+    holds "$(ip -4 addr show br0)" "inet 10.9.0.5/16 "
+    holds "$(ip route show default)" "^default via 10.9.0.1 dev br0 metric 100 *$"
+    ping -c 2 -i 0.2 -W 2 10.9.0.1
+    join "My Castle" "correct horse"
+    leave
+    ap disable
+    holds "$(ip -4 addr show eth0)" "inet 10.9.0.5/16 "
+    holds "$(ip route show default)" "^default via 10.9.0.1 dev eth0 metric 100 *$"
+    must_fail ip link show br0
+    ping -c 2 -i 0.2 -W 2 10.9.0.1
+}
+
+# eth0 is ours, with a lease of the router.
+keeps_lease_of_bridge() {
+    printf '%s\n' interface router start 10.9.0.20 end 10.9.0.20 | paste -d ' ' - - >/run/router.conf
+    printf '%s\n' "option subnet 255.255.0.0" "option router 10.9.0.1" "pidfile /run/router.pid" \
+        "lease_file /run/router.leases" >>/run/router.conf
+    in_air udhcpd -S /run/router.conf
+    printf '%s\n' ONBOOT=yes BOOTPROTO=dhcp >/etc/sysconfig/network-scripts/ifcfg-eth0
+    ip addr flush dev eth0
+    ap enable
+    holds "$(ip -4 addr show br0)" "inet 10.9.0.20/16 "
+    holds "$(ip route show default)" "^default via 10.9.0.1 dev br0"
+    local client
+    client=$(head -n 1 /etc/dhcpc/dhcpcd-br0.pid)
+    ap enable
+    same "$client" "$(head -n 1 /etc/dhcpc/dhcpcd-br0.pid)"
+    kill -0 "$client"
+    holds "$(ip -4 addr show br0)" "inet 10.9.0.20/16 "
+    ap disable
+    ap set bridge=lbr0
+    kill "$(cat /run/router.pid)"
 }
 
 is_station_again() {
@@ -170,4 +240,8 @@ scenario "switches off, and leaves nothing" disables
 scenario "keeps the DHCP settings from one time to the next" restores_dhcp
 scenario "takes new settings while it is on" changes_settings
 scenario "serves guests on a network of their own" serves_guests
+scenario "is on again after a restart" comes_back_after_restart
+scenario "two enable it at once" enables_twice_at_once
+scenario "takes the wired network into its bridge, and gives it back" bridges_wired_network
+scenario "keeps the lease of its bridge" keeps_lease_of_bridge
 scenario "the adapter is a station again" is_station_again
