@@ -182,6 +182,9 @@ class Planner {
         }
         plan_.names.insert(member);
         Interface& interface = WantedOf(member);
+        if (member != Radio() && !interface.master.empty() && interface.master != bridge.name) {
+            LeaveOther(interface.master, member);
+        }
         if (!interface.isRadio || plan_.settings.accessPoint) {
             interface.master = bridge.name;
         }
@@ -200,6 +203,18 @@ class Planner {
         if (HasClient(member)) {
             plan_.wantedClients.insert(bridge.name);
         }
+    }
+
+    // The bridge that was asked for before, with another name.
+    void LeaveOther(const std::string& other, const std::string& member) {
+        plan_.origins[other] = ReadOrigins(other);
+        if (plan_.origins[other].count({member, ""}) == 0) {
+            throw Error(member + " is a port of " + other + ", which would be cut off");
+        }
+        plan_.names.insert(other);
+        BridgeSettings left;
+        left.name = other;
+        Leave(left, member);
     }
 
     // It gets back what it brought, and what its file gives it.

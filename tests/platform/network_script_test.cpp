@@ -256,6 +256,12 @@ TEST_F(NetworkProgram, PortsGetTheirOwnBackWhileOthersStay) {
     EXPECT_EQ(WhatItHas("eth1"), "inet 10.8.0.5/16\ndefault via 10.8.0.1 \n");
     EXPECT_THAT(WhatItHas("br0"), HasSubstr("10.9.0.5/16"));
     EXPECT_THAT(Ip("link show master br0"), HasSubstr("eth2"));
+    WriteFile(kInterfaceFile + "br1", "ONBOOT=yes\nPRIMARY=eth0\n");
+    ASSERT_EQ(Restart("br1"), "");
+    EXPECT_EQ(WhatItHas("br1"), "inet 10.9.0.5/16\n");
+    WriteFile(kInterfaceFile + "br1", "ONBOOT=no\n");
+    ASSERT_EQ(Restart("br1"), "");
+    EXPECT_EQ(WhatItHas("eth0"), "inet 10.9.0.5/16\n");
 }
 
 TEST_F(NetworkProgram, ConfiguredGatewayIsUsedWhereverItStands) {
@@ -347,6 +353,9 @@ TEST_F(NetworkProgram, FailurePutsBackWhatWas) {
 TEST_F(NetworkProgram, WhatIsNoBridgeOrWouldCutOffIsRefused) {
     Ip("link add br9 type bridge; ip address add 10.9.0.5/16 dev br9; ip link set br9 up;"
        "ip route add default via 10.9.0.1 metric 5");
+    MakeInterface("eth3", "10.7.0.5/16");
+    Ip("link add br8 type bridge; ip link set eth3 master br8");
+    WriteFile(kInterfaceFile + "br6", "ONBOOT=yes\nPRIMARY=eth3\n");
     WriteFile(kInterfaceFile + "br7", "ONBOOT=yes\nPRIMARY=br7\n");
     const std::pair<const char*, const char*> kRows[] = {
         {"../lbr0", "\"../lbr0\" is not a bridge's name"},
@@ -357,6 +366,7 @@ TEST_F(NetworkProgram, WhatIsNoBridgeOrWouldCutOffIsRefused) {
         {"gbr", "gbr is the guests' bridge; give the main network another"},
         {"lo", "lo is an interface of its own and not a bridge"},
         {"wlan0", "wlan0 is an interface of its own and not a bridge"},
+        {"br6", "eth3 is a port of br8, which would be cut off"},
         {"br7", "br7 cannot be a bridge around itself"},
         {"br9",
          "this would cut the machine off: no interface would be left for the route default "
