@@ -46,6 +46,9 @@ struct Options {
     bool noWait = false;                // connect: return as soon as the dialler runs
     std::vector<std::string> settings;  // profile set, ap set: KEY=VALUE or KEY
 
+    // ap
+    bool dryRun = false;  // enable: show what would be done
+
     // wifi
     std::string network;        // ESSID, or BSSID of a saved network
     std::string user;           // EAP identity

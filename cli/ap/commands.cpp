@@ -6,6 +6,7 @@
 #include <CLI/CLI.hpp>
 
 #include "cli/ap/access.h"
+#include "cli/ap/dry_run.h"
 #include "cli/ap/output.h"
 #include "cli/ap/settings.h"
 #include "cli/ap/words.h"
@@ -53,8 +54,21 @@ std::string WhoCanJoin(WirelessAPConf conf) {
                                                 : "security " + SecurityWord(network);
 }
 
+void ShowPlan(const Options& options) {
+    Json::Value document;
+    Table table;
+    for (const std::string& line : PlanOfEnabling(ReadAPSettings().ap)) {
+        document["plan"].append(line);
+        table.push_back({Printable(line)});
+    }
+    options.json ? Print(document) : Print(table);
+}
+
 void Enable(const Options& options) {
     RequireAPSupport();
+    if (options.dryRun) {
+        return ShowPlan(options);
+    }
     ShowProgress("Switching the access point on ...");
     SwitchAPOn();
     const WirelessAPConf conf = ReadAPSettings().ap;
@@ -95,7 +109,8 @@ void AddAPCommands(CLI::App& app, Options& options) {
     set->footer("Settings: " + APSettingNames());
 
     AddAPCheckCommand(*ap, options);
-    add("enable", "Switch it on, now and after a restart", Enable);
+    add("enable", "Switch it on, now and after a restart", Enable)
+        ->add_flag("--dry-run", options.dryRun, "Only show what that would change in the network");
     add("disable", "Switch it off, now and after a restart", Disable);
 }
 

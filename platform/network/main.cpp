@@ -1,5 +1,7 @@
 // The network program of the host root, at /etc/rc.network:
-//   rc.network [--dry-run] restart INTERFACE BRIDGE
+//   rc.network restart INTERFACE BRIDGE
+//   rc.network --dry-run restart INTERFACE BRIDGE
+//   rc.network --dry-run enable INTERFACE BRIDGE GUESTS MEMBER ADDRESS LEASES
 // Makes the bridge, the access point on the interface and the bridge's DHCP server what the saved
 // settings say, whatever they were before. An empty BRIDGE leaves bridges alone. --dry-run prints
 // what would be done.
@@ -39,22 +41,40 @@ void Restart(const std::string& interface, const std::string& bridge) {
     BringAbout(plan);
 }
 
-int Main(std::vector<std::string> arguments) {
-    const bool isDryRun = !arguments.empty() && arguments[0] == "--dry-run";
-    if (isDryRun) {
-        arguments.erase(arguments.begin());
+int Usage() {
+    fputs(
+        "usage: rc.network restart INTERFACE BRIDGE\n"
+        "       rc.network --dry-run restart INTERFACE BRIDGE\n"
+        "       rc.network --dry-run enable INTERFACE BRIDGE GUESTS MEMBER ADDRESS LEASES\n",
+        stderr);
+    return kUsage;
+}
+
+int Main(const std::vector<std::string>& words) {
+    const bool isDryRun = !words.empty() && words[0] == "--dry-run";
+    const size_t first = isDryRun ? 1 : 0;
+    const std::string what = words.size() > first ? words[first] : "";
+    const bool isRestart = what == "restart" && words.size() == first + 3;
+    const bool isEnable = isDryRun && what == "enable" && words.size() == 8;
+    if (!isRestart && !isEnable) {
+        return Usage();
     }
-    if (arguments.size() != 3 || arguments[0] != "restart") {
-        fputs("usage: rc.network [--dry-run] restart INTERFACE BRIDGE\n", stderr);
-        return kUsage;
-    }
-    try {
-        if (isDryRun) {
-            fputs(Rendered(MakePlan(ReadSettings(arguments[1], arguments[2]))).c_str(), stdout);
-        } else {
-            Restart(arguments[1], arguments[2]);
-        }
+    if (!isDryRun) {
+        Restart(words[1], words[2]);
         return 0;
+    }
+    std::optional<Enabled> enabled;
+    if (isEnable) {
+        enabled = Enabled{words[4] == "yes", words[5], words[6], words[7] == "yes"};
+    }
+    const Plan plan = MakePlan(ReadSettings(words[2], words[3], enabled));
+    fputs(Rendered(plan).c_str(), stdout);
+    return 0;
+}
+
+int Guarded(const std::vector<std::string>& words) {
+    try {
+        return Main(words);
     } catch (const tavicore::Failure& failure) {
         fprintf(stderr, "rc.network: the kernel cannot be asked (error 0x%04X)\n",
                 static_cast<unsigned int>(failure.code));
@@ -72,5 +92,5 @@ int main(int argc, char** argv) {
     signal(SIGCHLD, SIG_DFL);  // ignored by the caller, no child's end could be waited for
     umask(022);
     setenv("PATH", "/usr/local/sbin:/usr/local/bin:/usr/sbin:/usr/bin:/sbin:/bin", 1);
-    return taviwireless::network::Main({argv + 1, argv + argc});
+    return taviwireless::network::Guarded({argv + 1, argv + argc});
 }

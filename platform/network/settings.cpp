@@ -124,6 +124,19 @@ BridgeSettings ReadBridge(const std::string& name, bool isOn, const std::string&
     return bridge;
 }
 
+void Add(const Enabled& enabled, const std::string& interface, BridgeSettings& bridge) {
+    for (const std::string& member : {enabled.member, interface}) {
+        if (IsName(member)) {
+            bridge.members.push_back(member);
+        }
+    }
+    if (bridge.card.IsEmpty()) {
+        bridge.card = enabled.address.empty() ? CardOfBridge(bridge, interface)
+                                              : Card{false, enabled.address};
+    }
+    bridge.servesLeases = bridge.servesLeases || enabled.leases;
+}
+
 void CheckNames(const std::string& interface, const std::string& bridge) {
     if (!IsName(interface)) {
         throw Error('"' + interface + "\" is not an interface's name");
@@ -138,20 +151,24 @@ void CheckNames(const std::string& interface, const std::string& bridge) {
 
 }  // namespace
 
-Settings ReadSettings(const std::string& interface, const std::string& bridge) {
+Settings ReadSettings(const std::string& interface, const std::string& bridge,
+                      const std::optional<Enabled>& enabled) {
     CheckNames(interface, bridge);
     const std::string hostapd = "/etc/hostapd/hostapd-" + interface;
     Settings settings;
     settings.interface = interface;
-    settings.accessPoint = Says(hostapd + ".info", "enable", "yes");
+    settings.accessPoint = enabled || Says(hostapd + ".info", "enable", "yes");
     // A model that has no guests any more keeps the file that says it has some.
-    settings.guests = settings.accessPoint && Says(hostapd + "-guest.info", "enable", "yes") &&
-                      Says(kModelInfo, "support_pci_wifi", "yes");
+    settings.guests = settings.accessPoint && Says(kModelInfo, "support_pci_wifi", "yes") &&
+                      (enabled ? enabled->guests : Says(hostapd + "-guest.info", "enable", "yes"));
     if (!bridge.empty()) {
-        const bool isOn = Says(FileOf(bridge), "ONBOOT", "yes");
+        const bool isOn = enabled || Says(FileOf(bridge), "ONBOOT", "yes");
         settings.bridges.push_back(ReadBridge(bridge, isOn, interface));
     }
     settings.bridges.push_back(ReadBridge(kGuestBridge, settings.guests, interface));
+    if (enabled) {
+        Add(*enabled, interface, settings.bridges.front());
+    }
     char gateway[TAVI_NET_ADDRESS_SIZE];
     in_addr address;
     if (TAVINetDefaultGatewayGetConf(gateway, sizeof gateway) == 0 &&

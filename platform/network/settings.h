@@ -1,6 +1,7 @@
 #ifndef TAVIWIRELESS_PLATFORM_NETWORK_SETTINGS_H
 #define TAVIWIRELESS_PLATFORM_NETWORK_SETTINGS_H
 
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -34,9 +35,18 @@ struct Settings {
     std::string gateway;  // empty where none is configured
 };
 
+// What switching the access point on will have added to the settings.
+struct Enabled {
+    bool guests = false;
+    std::string member;   // of a bridge without settings
+    std::string address;  // "10.1.14.1/24", likewise
+    bool leases = false;  // the bridge has a DHCP server
+};
+
 // Throws Error when the names are none, or the settings cannot be made sense of. An empty bridge
 // asks for none.
-Settings ReadSettings(const std::string& interface, const std::string& bridge);
+Settings ReadSettings(const std::string& interface, const std::string& bridge,
+                      const std::optional<Enabled>& enabled = std::nullopt);
 
 // What an interface has when it is on its own: the card of its file when that says ONBOOT=yes, else
 // an empty one. HasFile tells whether there is one at all.

@@ -258,6 +258,35 @@ TEST_F(APCommands, AnInterruptedStartIsInTheWayOnce) {
     EXPECT_EQ(AP({"enable"}).status, 0);
 }
 
+TEST_F(APCommands, ADryRunShowsThePlanAndSwitchesNothing) {
+    const struct {
+        const char *arrange, *words;
+    } kRows[] = {
+        {"true", "wlan0 lbr0 no  10.1.14.1/24 yes"},
+        {"echo LOCAL_LAN=yes IPADDR=10.1.14.1 | tr ' ' '\\n' >"
+         "/etc/sysconfig/network-scripts/ifcfg-lbr0; echo enable=no "
+         ">/etc/dhcpd/dhcpd-lbr0-lbr0.info",
+         "wlan0 lbr0 no   no"},
+        {"sed -i 's/bridge=lbr0/bridge=br0/' "
+         "/usr/tavi/etc/wireless_ap.conf",
+         "wlan0 br0 no eth0  no"},
+    };
+    ASSERT_EQ(Set({"ssid=Home"}).status, 0);
+    tools.Add("/etc/rc.network", "echo 'bridge  is made'");
+    for (const auto& row : kRows) {
+        Shell(row.arrange);
+        tools.ForgetCommands();
+        EXPECT_EQ(AP({"enable", "--dry-run"}).out, "bridge  is made\n");
+        EXPECT_THAT(tools.Commands(), testing::ElementsAre("/etc/rc.network --dry-run enable " +
+                                                           std::string(row.words)));
+    }
+    EXPECT_EQ(Parse(AP({"enable", "--dry-run", "--json"}).out)["plan"][0], "bridge  is made");
+    tools.Add("/etc/rc.network", "echo 'rc.network: lo is none' >&2; exit 1");
+    EXPECT_EQ(AP({"enable", "--dry-run"}).err,
+              "taviwireless: the access point cannot be switched on: rc.network: lo is none\n");
+    EXPECT_FALSE(Exists("/etc/hostapd/hostapd-wlan0.info"));
+}
+
 // When the machine starts.
 TEST_F(APCommands, WhatWasSwitchedOnIsOnAgainAfterARestart) {
     const std::string program = "/usr/local/bin/taviwireless";

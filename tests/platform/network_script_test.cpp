@@ -400,6 +400,18 @@ TEST_F(NetworkProgram, DryRunPrintsThePlanAndChangesNothing) {
               "program    udhcpd                           is not to run on br0\n"
               "program    udhcpd                           is not to run on gbr\n")
         << plan.err;
+    // Before the settings say so.
+    SwitchAccessPoint("no");
+    Shell("rm -r /etc/sysconfig");
+    const auto enable = [](const char* bridge, const char* member, const char* address) {
+        return RunProgram({"/etc/rc.network", "--dry-run", "enable", "wlan0", bridge, "no", member,
+                           address, *address != '\0' ? "yes" : "no"});
+    };
+    EXPECT_EQ(enable("br0", "eth0", "").out, plan.out);
+    EXPECT_THAT(enable("lbr0", "", "10.1.14.1/24").out,
+                testing::AllOf(HasSubstr("10.1.14.1/24    is given to lbr0\n"),
+                               HasSubstr("udhcpd          is started anew on lbr0\n")));
+    EXPECT_EQ(enable("eth0", "eth0", "").status, 1);
     EXPECT_EQ(Ip("address; ip route"), before);
     EXPECT_FALSE(Exists("/var/run/rc.network.lock"));
 }
