@@ -42,37 +42,45 @@ void StopPrograms(const Plan& plan) {
     unlink(Hostapd(plan.settings.interface).conf.c_str());  // it holds keys
 }
 
-std::string LeasedGateway(const std::string& interface) {
-    char gateway[TAVI_NET_ADDRESS_SIZE];
+// What the client's script wrote down; empty while there is no lease.
+std::string Leased(const std::string& interface, const char* key) {
+    char value[TAVI_NET_ADDRESS_SIZE];
     const std::string lease = "/etc/dhcpc/dhcpcd-" + interface + ".info";
-    return VEXACFileGetKeyValue(lease.c_str(), "GATEWAY", gateway, sizeof gateway) > 0 ? gateway
-                                                                                       : "";
+    return VEXACFileGetKeyValue(lease.c_str(), key, value, sizeof value) > 0 ? value : "";
 }
 
-// A lease takes the place of the addresses and default routes that were meant for the interface;
-// without one, those hold until there is one.
+bool IsReached(const Interface& interface, const Route& route) {
+    return rtnl_route_get_pref_src(route.kernel.get()) == nullptr &&
+           (route.gateway.empty() ||
+            std::any_of(interface.addresses.begin(), interface.addresses.end(),
+                        [&](const Address& address) { return IsIn(address, route.gateway); }));
+}
+
+// A lease takes the place of the IPv4 addresses and default routes that were meant for the
+// interface; without one, those hold until there is one.
 void UseLease(const std::string& name, State& wanted) {
     const State now = ReadState();
     const Interface* interface = now.Find(name);
-    if (interface == nullptr || interface->addresses.empty()) {
+    if (interface == nullptr || Leased(name, "IPADDR").empty()) {
         return;
     }
     wanted.interfaces.at(name).addresses = interface->addresses;
-    std::vector<Route>& routes = wanted.routes;
-    const std::string gateway = LeasedGateway(name);
     unsigned int metric = 0;
-    routes.erase(std::remove_if(routes.begin(), routes.end(),
-                                [&](const Route& route) {
-                                    const bool isOld = route.device == name;
-                                    if (isOld && route.isDefault) {
-                                        metric = rtnl_route_get_priority(route.kernel.get());
-                                    }
-                                    return isOld;
-                                }),
-                 routes.end());
+    std::vector<Route> routes;
+    for (const Route& route : wanted.routes) {
+        const bool isReplaced = route.device == name && route.isDefault &&
+                                rtnl_route_get_family(route.kernel.get()) == AF_INET;
+        if (isReplaced) {
+            metric = rtnl_route_get_priority(route.kernel.get());
+        } else if (route.device != name || IsReached(*interface, route)) {
+            routes.push_back(route);
+        }
+    }
+    const std::string gateway = Leased(name, "GATEWAY");
     if (!gateway.empty()) {
         routes.push_back(NewDefaultRoute(gateway, metric, name));
     }
+    wanted.routes = std::move(routes);
 }
 
 // The client begins by taking all addresses from the interface.

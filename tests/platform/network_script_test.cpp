@@ -300,6 +300,31 @@ TEST_F(NetworkProgram, LeaseOfTheWiredInterfaceBecomesTheBridges) {
     ASSERT_EQ(Restart("br0"), "");
     EXPECT_EQ(kill(client, 0), 0);  // with its lease
     EXPECT_THAT(WhatItHas("br0"), HasSubstr("10.9.0.20/16"));
+    WriteFile(kInterfaceFile + "br0", "PRIMARY=eth0\nONBOOT=no\n");
+    ASSERT_EQ(Restart("br0"), "");
+    EXPECT_NE(kill(client, 0), 0);
+    EXPECT_EQ(WhatItHas("eth0"), "inet 10.9.0.20/16\ndefault via 10.9.0.1 metric 100 \n");
+    EXPECT_EQ(Running("udhcpc"), 1);
+}
+
+// A client takes all addresses away before it asks. Here nobody answers.
+TEST_F(NetworkProgram, BridgeWithoutALeaseKeepsWhatItsInterfaceHad) {
+    WriteFile("/usr/sbin/udhcpc",
+              "#!/bin/sh\nif [ \"$1\" = stay ]; then while :; do sleep 0.1; done; fi\n"
+              "ip -4 address flush dev br0; \"$0\" stay >/dev/null 2>&1 &\n"
+              "echo $! >/etc/dhcpc/dhcpcd-br0.pid\n");
+    chmod("/usr/sbin/udhcpc", 0755);
+    MakeInterface("eth0", "10.9.0.5/16");
+    Shell(kForeign);
+    const std::string all = WhatItHas("eth0");
+    WriteFile(kInterfaceFile + "br0", "PRIMARY=eth0\nONBOOT=yes\nBOOTPROTO=dhcp\n");
+    ASSERT_EQ(Restart("br0"), "");
+    EXPECT_EQ(WhatItHas("br0"), all);
+    EXPECT_EQ(Running("udhcpc"), 1);
+    WriteFile(kInterfaceFile + "br0", "PRIMARY=eth0\nONBOOT=no\n");
+    ASSERT_EQ(Restart("br0"), "");
+    EXPECT_EQ(WhatItHas("eth0"), all);
+    EXPECT_EQ(Running("udhcpc"), 0);
 }
 
 // Whatever step fails: addresses, routes, members and what ran are as they were.
