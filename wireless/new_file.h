@@ -2,9 +2,11 @@
 #define TAVIWIRELESS_WIRELESS_NEW_FILE_H
 
 #include <fcntl.h>
+#include <sys/stat.h>
 #include <unistd.h>
 
 #include <cstdio>
+#include <filesystem>
 #include <memory>
 
 namespace taviwireless::wireless {
@@ -23,6 +25,17 @@ inline File CreateAnew(const char* path, mode_t mode) {
 inline bool MakeSureOf(const char* path, mode_t mode) {
     const int handle = open(path, O_WRONLY | O_CREAT | O_CLOEXEC, mode);
     return handle >= 0 && close(handle) == 0;
+}
+
+// Of root or of the own user.
+inline bool IsTrusted(const struct stat& status) {
+    return status.st_uid == 0 || status.st_uid == geteuid();
+}
+
+// Removes what stands at path, with all that is in it when it is a folder; follows no link.
+inline void RemoveAll(const char* path) {
+    std::error_code ignored;
+    std::filesystem::remove_all(path, ignored);
 }
 
 }  // namespace taviwireless::wireless

@@ -1,8 +1,9 @@
-#include <tavicore/file.h>
 #include <taviwireless/wireless.h>
 
 #include "wireless/ap_files.h"
+#include "wireless/flag_file.h"
 
 int TAVIWirelessAPIsConnecting() {
-    return VEXACFileExist(taviwireless::wireless::kAPFlag) != 0 ? 1 : 0;
+    using namespace taviwireless::wireless;
+    return FlagFile::IsRaised(kAPFlag) ? 1 : 0;
 }

@@ -3,10 +3,12 @@
 #include <taviwireless/wireless.h>
 
 #include <cstdio>
-#include <memory>
 #include <optional>
+#include <string>
 
+#include "base/trusted_file.h"
 #include "common/log.h"
+#include "wireless/guarded.h"
 #include "wireless/link_quality.h"
 #include "wireless/paths.h"
 
@@ -21,14 +23,14 @@ struct ConnectionRecord {
 };
 
 std::optional<ConnectionRecord> ReadConnectionRecord() {
-    const std::unique_ptr<FILE, int (*)(FILE*)> file(fopen(kCurrentConnection, "re"), fclose);
-    if (!file) {
+    const std::optional<std::string> text = taviwireless::ReadTrusted(kCurrentConnection);
+    if (!text) {
         return std::nullopt;
     }
     constexpr int kItems = 5;
     ConnectionRecord record;
     WirelessNetwork& network = record.network;
-    if (fscanf(file.get(), "%32[^\n]\n%d\n%d\n%d\n%31[^\n]", network.essid, &network.protocol,
+    if (sscanf(text->c_str(), "%32[^\n]\n%d\n%d\n%d\n%31[^\n]", network.essid, &network.protocol,
                &network.auth, &network.encrypt, record.bssid) < kItems) {
         return std::nullopt;
     }
@@ -73,7 +75,8 @@ WirelessStatus* TAVIWirelessStatusGet(WirelessStatus* out) {
     WirelessInfo status{};
     TAVIWirelessCurInfoGet(WIRELESS_INFO_CONN_STATUS, &status);
     out->status = status.value;
-    if (out->status == WIRELESS_STATUS_CONNECTED && !FillConnectedNetwork(out->network)) {
+    if (out->status == WIRELESS_STATUS_CONNECTED &&
+        !TAVI_GUARDED(false, [out] { return FillConnectedNetwork(out->network); })) {
         TAVI_LOG_ERROR("Failed to get wireless network info");
     }
     if (out->status == WIRELESS_STATUS_ADHOC && TAVIWirelessAdhocNetworkGet(&out->network) < 0) {

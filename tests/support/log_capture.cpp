@@ -4,6 +4,7 @@
 #include <cerrno>
 #include <cstdarg>
 #include <cstdio>
+#include <new>
 
 namespace taviwireless::test {
 namespace {
@@ -69,7 +70,11 @@ TAKEN_OVER void vsyslog(int priority, const char* format, va_list arguments) {
     const int savedErrno = errno;
     char line[kMaxLine];
     vsnprintf(line, sizeof line, format, arguments);
-    taviwireless::test::LogCapture::Record(priority, line);
+    try {
+        taviwireless::test::LogCapture::Record(priority, line);
+    } catch (const std::bad_alloc&) {
+        // The C library's throws nothing either: a line more or less.
+    }
     errno = savedErrno;
 }
 

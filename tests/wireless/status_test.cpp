@@ -170,7 +170,16 @@ TEST_F(Connected, IsToTheNetworkThatWasWrittenDown) {
         EXPECT_STREQ(Network(record).essid, essid);
         EXPECT_TRUE(Logged("Failed to get wireless network info"));
     }
-    std::filesystem::remove("/var/tmp/.wireless_current_connection");
+    for (const std::string arrange :
+         {"rm $1; mkfifo $1", "rm $1; ln -s /tmp/r $1", "chown 65534 $1"}) {
+        Network(kRecord);
+        log.Clear();
+        WriteFile("/tmp/r", kRecord);
+        Shell("set -- /var/tmp/.wireless_current_connection; " + arrange);
+        EXPECT_STREQ(Status().network.essid, "") << arrange;
+        EXPECT_TRUE(Logged("Failed to get wireless network info"));
+        Shell("rm /var/tmp/.wireless_current_connection");
+    }
     EXPECT_EQ(Status().status, WIRELESS_STATUS_CONNECTED);
     EXPECT_TRUE(Logged("Failed to get wireless network info"));
 }
