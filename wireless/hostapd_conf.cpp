@@ -2,6 +2,8 @@
 
 #include <cstring>
 
+#include "wireless/line_break.h"
+
 namespace taviwireless::wireless {
 
 namespace {
@@ -149,7 +151,7 @@ void AddSecurity(HostapdConf& lines, const WirelessAPConf& conf) {
 }  // namespace
 
 void HostapdConf::Add(const char* key, const std::string& value) {
-    holdsLineBreak_ = holdsLineBreak_ || value.find('\n') != value.npos;
+    holdsLineBreak_ = holdsLineBreak_ || wireless::HoldsLineBreak(value);
     text_ += key + ("=" + value) + "\n";
 }
 

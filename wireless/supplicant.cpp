@@ -3,6 +3,8 @@
 #include <algorithm>
 #include <cstring>
 
+#include "wireless/line_break.h"
+
 namespace taviwireless::wireless {
 
 namespace {
@@ -13,59 +15,60 @@ std::string Quoted(const char* text) {
     return std::string("\"") + text + "\"";
 }
 
-std::string Line(const char* key, const std::string& value) {
-    return std::string("\t") + key + "=" + value + "\n";
+void Add(SupplicantConf& rendered, const char* key, const std::string& value) {
+    rendered.holdsLineBreak = rendered.holdsLineBreak || HoldsLineBreak(value);
+    rendered.text += std::string("\t") + key + "=" + value + "\n";
 }
 
-std::string BssidLine(const WirelessConf& conf) {
+void AddBssid(SupplicantConf& rendered, const WirelessConf& conf) {
     const unsigned char* bssid = conf.network.bssid;
     const bool isKnown = std::any_of(bssid, bssid + sizeof conf.network.bssid,
                                      [](unsigned char byte) { return byte != 0; });
-    if (!isKnown || conf.anyBssid != 0) {
-        return "";
+    if (isKnown && conf.anyBssid == 0) {
+        char text[18];
+        Add(rendered, "bssid", TAVIWirelessBssidStringGet(bssid, text, sizeof text));
     }
-    char text[18];
-    return Line("bssid", TAVIWirelessBssidStringGet(bssid, text, sizeof text));
 }
 
-std::string PairwiseLine(int encrypt) {
-    if ((encrypt & WIRELESS_ENCRYPT_TKIP_AES) == 0) {
-        return "";
+void AddPairwise(SupplicantConf& rendered, int encrypt) {
+    if ((encrypt & WIRELESS_ENCRYPT_TKIP_AES) != 0) {
+        Add(rendered, "pairwise", TAVIWirelessEncryptStringGet(encrypt, 1));
     }
-    return Line("pairwise", TAVIWirelessEncryptStringGet(encrypt, 1));
 }
 
-std::string EnterpriseLines(const WirelessConf& conf) {
-    return Line("key_mgmt", "WPA-EAP") + Line("eap", "TTLS PEAP") +
-           PairwiseLine(conf.network.encrypt) + Line("identity", Quoted(conf.user)) +
-           Line("password", Quoted(conf.key));
+void AddEnterprise(SupplicantConf& rendered, const WirelessConf& conf) {
+    Add(rendered, "key_mgmt", "WPA-EAP");
+    Add(rendered, "eap", "TTLS PEAP");
+    AddPairwise(rendered, conf.network.encrypt);
+    Add(rendered, "identity", Quoted(conf.user));
+    Add(rendered, "password", Quoted(conf.key));
 }
 
-std::string PersonalLines(const WirelessConf& conf) {
-    return Line("key_mgmt", "WPA-PSK") + PairwiseLine(conf.network.encrypt) +
-           Line("psk", Quoted(conf.key));
+void AddPersonal(SupplicantConf& rendered, const WirelessConf& conf) {
+    Add(rendered, "key_mgmt", "WPA-PSK");
+    AddPairwise(rendered, conf.network.encrypt);
+    Add(rendered, "psk", Quoted(conf.key));
 }
 
-// Empty when the key is none.
-std::string WepKeyLine(const char* key) {
+void AddWepKey(SupplicantConf& rendered, const char* key) {
     switch (strlen(key)) {
         case 5:
         case 13:
-            return Line("wep_key0", Quoted(key));
+            return Add(rendered, "wep_key0", Quoted(key));
         case 10:
         case 26:  // hexadecimal
-            return Line("wep_key0", key);
+            return Add(rendered, "wep_key0", key);
         default:
-            return "";
+            rendered.isWepKeyLeftOut = true;
     }
 }
 
-void AppendOpenOrWepLines(const WirelessConf& conf, SupplicantConf& rendered) {
-    rendered.text += Line("key_mgmt", "NONE");
+void AddOpenOrWep(SupplicantConf& rendered, const WirelessConf& conf) {
+    Add(rendered, "key_mgmt", "NONE");
     if (conf.network.encrypt == WIRELESS_ENCRYPT_WEP) {
-        const std::string key = WepKeyLine(conf.key);
-        rendered.isWepKeyLeftOut = key.empty();
-        rendered.text += key + Line("wep_tx_keyidx", "0") + Line("auth_alg", "OPEN SHARED");
+        AddWepKey(rendered, conf.key);
+        Add(rendered, "wep_tx_keyidx", "0");
+        Add(rendered, "auth_alg", "OPEN SHARED");
     }
 }
 
@@ -73,22 +76,23 @@ void AppendOpenOrWepLines(const WirelessConf& conf, SupplicantConf& rendered) {
 
 SupplicantConf RenderSupplicantConf(const WirelessConf& conf) {
     SupplicantConf rendered;
-    rendered.text = "ctrl_interface=/var/run/wpa_supplicant\nnetwork={\n" +
-                    Line("ssid", Quoted(conf.network.essid)) + BssidLine(conf) +
-                    Line("scan_ssid", "1");  // hidden networks are found, too
+    rendered.text = "ctrl_interface=/var/run/wpa_supplicant\nnetwork={\n";
+    Add(rendered, "ssid", Quoted(conf.network.essid));
+    AddBssid(rendered, conf);
+    Add(rendered, "scan_ssid", "1");  // hidden networks are found, too
     switch (conf.network.auth) {
         case WIRELESS_AUTH_WPA_EAP:
         case WIRELESS_AUTH_WPA2_EAP:
-            rendered.text += EnterpriseLines(conf);
+            AddEnterprise(rendered, conf);
             break;
         case WIRELESS_AUTH_WPA_PSK:
         case WIRELESS_AUTH_WPA2_PSK:
-            rendered.text += PersonalLines(conf);
+            AddPersonal(rendered, conf);
             break;
         case WIRELESS_AUTH_OPEN:
         case WIRELESS_AUTH_SHARED:
         case WIRELESS_AUTH_WEP_AUTO:
-            AppendOpenOrWepLines(conf, rendered);
+            AddOpenOrWep(rendered, conf);
             break;
         default:
             rendered.isAuthUnknown = true;
