@@ -20,7 +20,7 @@ class SzHash {
     VEXACSzHash** Address() { return &hash_; }
     // Null when the key is not there.
     const char* operator[](const char* key) const { return VEXACSzHashGetValue(hash_, key); }
-    // False when there is no memory for it: the hash is as it was, and not what is to be saved.
+    // False, with the hash as it was, when there is no memory for it.
     bool Set(const char* key, const std::string& value) {
         return VEXACSzHashSetValue(&hash_, key, value.c_str()) == 0;
     }

@@ -2,19 +2,22 @@
 
 #include <sys/ioctl.h>
 #include <sys/socket.h>
-#include <tavisdk/wireless.h>
 #include <unistd.h>
 
-#include <cstring>
+#include "wireless/interface.h"
 
 namespace taviwireless::wireless {
 
 DriverResult RequestDriver(unsigned long request, iwreq& argument) {
+    const std::string interface = WirelessInterface();
+    if (interface.empty()) {
+        return DriverResult::kRefused;
+    }
     const int handle = socket(AF_INET, SOCK_DGRAM, 0);
     if (handle < 0) {
         return DriverResult::kNoSocket;
     }
-    strncpy(argument.ifr_name, TAVIWirelessInterfaceGet(), sizeof argument.ifr_name - 1);
+    interface.copy(argument.ifr_name, sizeof argument.ifr_name - 1);
     const bool isDone = ioctl(handle, request, &argument) >= 0;
     // Descriptor 0 is left open: a caller without standard input would get another file in its
     // place, and read that.

@@ -1,15 +1,18 @@
 #include "wireless/link_quality.h"
 
-#include <tavisdk/wireless.h>
-
+#include "wireless/interface.h"
 #include "wireless/shell.h"
 
 namespace taviwireless::wireless {
 
 std::optional<LinkQuality> ReadLinkQuality() {
     constexpr size_t kCommandSize = 128;
-    const Pipe pipe = OpenPipe(Command(
-        kCommandSize, {"/sbin/iwconfig ", TAVIWirelessInterfaceGet(), " | grep 'Link Quality'"}));
+    const std::string interface = WirelessInterface();
+    if (interface.empty()) {
+        return std::nullopt;
+    }
+    const Pipe pipe(
+        Command(kCommandSize, {"/sbin/iwconfig ", interface.c_str(), " | grep 'Link Quality'"}));
     if (!pipe) {
         return std::nullopt;
     }

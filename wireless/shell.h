@@ -1,10 +1,11 @@
 #ifndef TAVIWIRELESS_WIRELESS_SHELL_H
 #define TAVIWIRELESS_WIRELESS_SHELL_H
 
+#include <sys/types.h>
+
 #include <cstddef>
 #include <cstdio>
 #include <initializer_list>
-#include <memory>
 #include <string>
 
 namespace taviwireless::wireless {
@@ -16,7 +17,12 @@ struct Argument {
     bool isSecret = false;  // stars stand for it in log lines
 };
 
-// A shell command, made of parts that stand as they are and arguments.
+// What becomes of what a command prints.
+enum class Output { kShown, kDropped };
+
+// A shell command, made of parts that stand as they are and arguments. It runs with no input, no
+// signal blocked or ignored, in the root folder, and with no descriptor of the caller but where its
+// output goes: programs that it leaves in the background live longer than the caller.
 class Command {
   public:
     struct Part {
@@ -28,34 +34,52 @@ class Command {
         bool isSecret = false;
     };
 
-    // size is that of the buffer that the command, as it is described, must fit in; what does not
-    // is cut off.
+    // size is that of the buffer that the command, as it is described, must fit in; one that does
+    // not is never run.
     Command(size_t size, std::initializer_list<Part> parts);
 
     // The command with its arguments as they are, secret ones hidden, for log lines.
     const std::string& Described() const { return described_; }
-    // What the shell is given.
-    const std::string& Text() const { return text_; }
 
-    // Runs it and waits. False, with a line in the log, when no shell could be run; what the
-    // command itself returned is not looked at. file and line are those of the log line.
-    bool Run(const char* file, int line) const;
-    // The same with all of its output dropped, even where the shell does not know a redirection.
-    bool RunSilently(const char* file, int line) const;
+    // Runs it and waits. False, with a line in the log, when it could not be run; what the command
+    // itself returned is not looked at. file and line are those of the log line.
+    bool Run(Output output, const char* file, int line) const;
 
   private:
+    friend class Pipe;
+    // The process that runs it, which writes into the pipe if there is one; negative, with errno,
+    // when there is none.
+    pid_t Start(Output output, int pipe) const;
+
+    bool fits_ = true;
     std::string described_;
     std::string text_;
 };
 
-// A command that is read from, closed with the object.
-using Pipe = std::unique_ptr<FILE, int (*)(FILE*)>;
-Pipe OpenPipe(const Command& command);
+// A command that is read from.
+class Pipe {
+  public:
+    explicit Pipe(const Command& command);
+    ~Pipe() { Close(); }
+    Pipe(const Pipe&) = delete;
+    Pipe& operator=(const Pipe&) = delete;
+
+    // Without one, errno tells why.
+    explicit operator bool() const { return file_ != nullptr; }
+    FILE* get() const { return file_; }
+
+    // Waits for the command's end. Its exit status; -1 when it has none or that cannot be told.
+    int Close();
+
+  private:
+    FILE* file_ = nullptr;
+    pid_t process_ = -1;
+};
 
 }  // namespace taviwireless::wireless
 
 // Runs a command; a failure is logged under the name of the calling file.
-#define TAVI_RUN(command) (command).Run(__FILE_NAME__, __LINE__)
-#define TAVI_RUN_SILENTLY(command) (command).RunSilently(__FILE_NAME__, __LINE__)
+#define TAVI_RUN(command) (command).Run(Output::kShown, __FILE_NAME__, __LINE__)
+#define TAVI_RUN_SILENTLY(command) (command).Run(Output::kDropped, __FILE_NAME__, __LINE__)
 
 #endif

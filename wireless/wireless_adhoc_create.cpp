@@ -1,12 +1,13 @@
 // Makes the adapter create, or join, an ad-hoc network.
 #include <tavisdk/network.h>
-#include <tavisdk/wireless.h>
 #include <taviwireless/wireless.h>
 
 #include <cstring>
 #include <string>
 
 #include "common/log.h"
+#include "wireless/guarded.h"
+#include "wireless/interface.h"
 #include "wireless/shell.h"
 
 namespace {
@@ -68,9 +69,7 @@ bool SetKey(const char* interface, const WirelessConf& conf) {
     return TAVI_RUN(command);
 }
 
-}  // namespace
-
-int TAVIWirelessAdhocCreate(const WirelessConf* conf) {
+int Create(const WirelessConf* conf) {
     if (conf == nullptr) {
         TAVI_LOG_ERROR("Bad parameters");
         return -1;
@@ -79,7 +78,12 @@ int TAVIWirelessAdhocCreate(const WirelessConf* conf) {
         TAVI_LOG_ERROR("There is no wireless USB adapter plugged");
         return -1;
     }
-    const char* interface = TAVIWirelessInterfaceGet();
+    const std::string name = WirelessInterface();
+    if (name.empty()) {
+        TAVI_LOG_ERROR("Bad parameters");
+        return -1;
+    }
+    const char* interface = name.c_str();
     if (!IsSuitable(*conf, interface) || !EnterAdhocMode(interface) ||
         !SetEssid(interface, conf->network) || !SetKey(interface, *conf)) {
         return -1;
@@ -89,4 +93,10 @@ int TAVIWirelessAdhocCreate(const WirelessConf* conf) {
         return -1;
     }
     return 0;
+}
+
+}  // namespace
+
+int TAVIWirelessAdhocCreate(const WirelessConf* conf) {
+    return TAVI_GUARDED(-1, [conf] { return Create(conf); });
 }

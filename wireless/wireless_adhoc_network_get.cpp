@@ -1,12 +1,15 @@
-#include <tavisdk/wireless.h>
 #include <taviwireless/wireless.h>
 
 #include <cstring>
 
 #include "common/log.h"
+#include "wireless/guarded.h"
+#include "wireless/interface.h"
 #include "wireless/link_quality.h"
 
 namespace {
+
+using Quality = std::optional<taviwireless::wireless::LinkQuality>;
 
 constexpr int kSupposedSignal = 70;  // many drivers measure none in ad-hoc mode
 
@@ -31,7 +34,8 @@ int TAVIWirelessAdhocNetworkGet(WirelessNetwork* out) {
     *out = {};
     out->opmode = TAVIWirelessOpmodeGet();
     if (out->opmode != WIRELESS_OPMODE_ADHOC) {
-        TAVI_LOG_ERROR("%s is not Ad-Hoc mode.", TAVIWirelessInterfaceGet());
+        TAVI_LOG_ERROR("%s is not Ad-Hoc mode.",
+                       taviwireless::wireless::WirelessInterface().c_str());
         return -1;
     }
     // What the driver refuses to tell stays zero.
@@ -45,7 +49,7 @@ int TAVIWirelessAdhocNetworkGet(WirelessNetwork* out) {
     out->protocol = protocol.value;
     out->auth = keyState.value;  // open without a key, shared with one
     out->encrypt = out->auth == WIRELESS_AUTH_SHARED ? WIRELESS_ENCRYPT_WEP : WIRELESS_ENCRYPT_NONE;
-    const auto quality = taviwireless::wireless::ReadLinkQuality();
+    const auto quality = TAVI_GUARDED(Quality(), taviwireless::wireless::ReadLinkQuality);
     out->signal = quality ? quality->value : kSupposedSignal;
     return 0;
 }

@@ -1,5 +1,4 @@
 // Reading the stored settings of the access point.
-#include <tavicore/file.h>
 #include <tavicore/section.h>
 #include <taviwireless/wireless.h>
 
@@ -10,7 +9,9 @@
 #include "common/log.h"
 #include "common/sz_hash.h"
 #include "wireless/ap_settings.h"
+#include "wireless/guarded.h"
 #include "wireless/paths.h"
+#include "wireless/presence.h"
 
 namespace taviwireless::wireless {
 
@@ -43,26 +44,21 @@ class Reader {
     const SzHash& values_;
 };
 
-}  // namespace
-
-}  // namespace taviwireless::wireless
-
-int TAVIWirelessGetAPConfig(const char* section, WirelessAPSettings* settings) {
-    using namespace taviwireless::wireless;
+int Read(const char* section, WirelessAPSettings* settings) {
     if (section == nullptr || settings == nullptr) {
         TAVI_LOG_ERROR("Bad parameters");
         return -1;
     }
     *settings = {};
     snprintf(settings->name, sizeof settings->name, "%s", section);
-    taviwireless::SzHash values(1024);
+    SzHash values(1024);
     if (!values) {
         return -1;
     }
     // No key is there yet. What concerns guests stays empty until there is a section.
     Reader reader(values);
     VisitMainNetwork(reader, *settings);
-    if (!VEXACFileExist(kAPSettings)) {
+    if (Look(kAPSettings) == Presence::kMissing) {
         return 0;
     }
     const int result = VEXACFileGetSection(kAPSettings, section, values.Address());
@@ -75,4 +71,12 @@ int TAVIWirelessGetAPConfig(const char* section, WirelessAPSettings* settings) {
         TAVI_LOG_ERROR("Guest Network does not have EAP encryption");
     }
     return result;
+}
+
+}  // namespace
+
+}  // namespace taviwireless::wireless
+
+int TAVIWirelessGetAPConfig(const char* section, WirelessAPSettings* settings) {
+    return TAVI_GUARDED(-1, [=] { return taviwireless::wireless::Read(section, settings); });
 }

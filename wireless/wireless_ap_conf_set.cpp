@@ -1,6 +1,5 @@
 // Storing the settings of the access point.
 #include <tavicore/error.h>
-#include <tavicore/file.h>
 #include <tavicore/section.h>
 #include <taviwireless/wireless.h>
 
@@ -8,8 +7,10 @@
 #include "common/sz_hash.h"
 #include "wireless/ap_settings.h"
 #include "wireless/grep_pattern.h"
+#include "wireless/guarded.h"
 #include "wireless/new_file.h"
 #include "wireless/paths.h"
+#include "wireless/presence.h"
 #include "wireless/shell.h"
 
 namespace taviwireless::wireless {
@@ -22,22 +23,26 @@ constexpr size_t kCommandSize = 1024;
 
 enum class Found { kFailed, kNew, kExisting };
 
-// Puts the fields that it visits into a hash.
+// Puts the fields that it visits into a hash. Settings of which one is missing are not to be
+// stored: without its kind of security an encrypted network would be an open one.
 class Writer {
   public:
     explicit Writer(SzHash& values) : values_(values) {}
 
-    void Flag(const char* key, int32_t value, int32_t) { values_.Set(key, value ? "yes" : "no"); }
-    void Number(const std::string& key, int32_t value, int32_t) {
-        values_.Set(key.c_str(), std::to_string(value));
-    }
-    void Text(const std::string& key, const char* value, const std::string&) {
-        values_.Set(key.c_str(), value);
-    }
-    void WriteOnly(const char* key, const char* value) { values_.Set(key, value); }
+    void Flag(const char* key, int32_t value, int32_t) { Set(key, value ? "yes" : "no"); }
+    void Number(const std::string& key, int32_t value, int32_t) { Set(key, std::to_string(value)); }
+    void Text(const std::string& key, const char* value, const std::string&) { Set(key, value); }
+    void WriteOnly(const char* key, const char* value) { Set(key, value); }
+
+    bool IsComplete() const { return isComplete_; }
 
   private:
+    void Set(const std::string& key, const std::string& value) {
+        isComplete_ = values_.Set(key.c_str(), value) && isComplete_;
+    }
+
     SzHash& values_;
+    bool isComplete_ = true;
 };
 
 // For use between double quotes.
@@ -62,16 +67,15 @@ bool IsReadable(const char* section) {
 // Whether "[section]" stands anywhere in the file, in any case; a value that holds it counts as
 // well, and then there is no section to replace.
 Found FindSection(const char* section) {
-    if (!VEXACFileExist(kAPSettings)) {
+    if (Look(kAPSettings) == Presence::kMissing) {
         if (!MakeSureOf(kAPSettings, kMode)) {
             TAVI_LOG_ERROR("Failed to touch %s", kAPSettings);
             return Found::kFailed;
         }
         return Found::kNew;
     }
-    const Pipe lines =
-        OpenPipe(Command(kCommandSize, {"grep -i \"\\[", ForShell(GrepPattern(section)).c_str(),
-                                        "\\]\" ", kAPSettings}));
+    const Pipe lines(Command(kCommandSize, {"grep -i \"\\[", ForShell(GrepPattern(section)).c_str(),
+                                            "\\]\" ", kAPSettings}));
     if (!lines) {
         TAVI_LOG_ERROR("Failed to execute command");
         return Found::kFailed;
@@ -121,17 +125,12 @@ int Save(Found found, const char* section, const SzHash& values) {
     return 1;
 }
 
-}  // namespace
-
-}  // namespace taviwireless::wireless
-
-int TAVIWirelessSetAPConfig(const WirelessAPSettings* settings) {
-    using namespace taviwireless::wireless;
+int Store(const WirelessAPSettings* settings) {
     if (settings == nullptr) {
         TAVI_LOG_ERROR("Bad parameters");
         return 0;
     }
-    taviwireless::SzHash values(1024);
+    SzHash values(1024);
     if (!values) {
         TAVI_LOG_ERROR("Failed to alloc memory");
         return 0;
@@ -149,5 +148,17 @@ int TAVIWirelessSetAPConfig(const WirelessAPSettings* settings) {
     Writer writer(values);
     VisitMainNetwork(writer, *settings);
     VisitGuestNetwork(writer, *settings);
+    if (!writer.IsComplete()) {
+        TAVI_LOG_ERROR("Failed to alloc memory");
+        return 0;
+    }
     return Save(found, settings->name, values);
+}
+
+}  // namespace
+
+}  // namespace taviwireless::wireless
+
+int TAVIWirelessSetAPConfig(const WirelessAPSettings* settings) {
+    return TAVI_GUARDED(0, [settings] { return taviwireless::wireless::Store(settings); });
 }

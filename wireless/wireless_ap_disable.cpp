@@ -9,9 +9,11 @@
 #include <algorithm>
 #include <vector>
 
+#include "base/interface_name.h"
 #include "common/log.h"
 #include "common/sz_list.h"
 #include "wireless/ap_files.h"
+#include "wireless/guarded.h"
 
 namespace taviwireless::wireless {
 
@@ -69,7 +71,8 @@ bool PutDhcpServerAside(const char* bridge) {
            TAVINetSetDhcpServerConfigFiles(&server, 0) != 0;
 }
 
-// bridge gets the name of the bridge that the interface was in, or the empty text.
+// bridge gets the name of the bridge that the interface was in, or the empty text when it was in
+// none or its file has no name there.
 template <size_t kSize>
 bool TakeDown(const char* interface, char (&bridge)[kSize]) {
     bridge[0] = '\0';
@@ -83,21 +86,21 @@ bool TakeDown(const char* interface, char (&bridge)[kSize]) {
         return false;
     }
     if (VEXACFileGetKeyValue(file.c_str(), "BRIDGE", bridge, kSize) > 0) {
-        LeaveBridge(interface, bridge);
+        if (IsInterfaceName(bridge)) {
+            LeaveBridge(interface, bridge);
+        } else {
+            TAVI_LOG_ERROR("Failed to get number of slave for bridge [%s].", bridge);
+            bridge[0] = '\0';
+        }
         if (!RemoveKey(file, "BRIDGE")) {
             TAVI_LOG_ERROR("Failed to remove key %s in [%s].", "BRIDGE", file.c_str());
         }
     }
     RemoveKey(file, "LOCAL_LAN");
-    return PutDhcpServerAside(bridge);
+    return bridge[0] == '\0' || PutDhcpServerAside(bridge);
 }
 
-}  // namespace
-
-}  // namespace taviwireless::wireless
-
-int TAVIWirelessAPDisable() {
-    using namespace taviwireless::wireless;
+int Disable() {
     const char* interface = TAVIWirelessAPInterfaceGet();
     char bridge[TAVI_NET_IF_NAME_SIZE];
     if (!TakeDown(interface, bridge)) {
@@ -109,4 +112,12 @@ int TAVIWirelessAPDisable() {
         return 0;
     }
     return 1;
+}
+
+}  // namespace
+
+}  // namespace taviwireless::wireless
+
+int TAVIWirelessAPDisable() {
+    return TAVI_GUARDED(0, taviwireless::wireless::Disable);
 }

@@ -14,8 +14,10 @@
 
 #include "common/log.h"
 #include "wireless/ap_files.h"
+#include "wireless/bridge_name.h"
 #include "wireless/dhcp_range.h"
 #include "wireless/flag_file.h"
+#include "wireless/guarded.h"
 #include "wireless/shell.h"
 
 namespace taviwireless::wireless {
@@ -173,10 +175,20 @@ bool WriteInterfaceFile(const char* interface, const char* bridge) {
     return true;
 }
 
+// An empty name is found out later, as it always was.
+bool CanJoin(const std::string& bridge) {
+    const std::string reason = bridge.empty() ? "" : WhyNoBridge(bridge);
+    if (!reason.empty()) {
+        TAVI_LOG_ERROR("The bridge %s", reason.c_str());
+        TAVI_LOG_ERROR("Failed to set bridge[%s] config.", bridge.c_str());
+    }
+    return reason.empty();
+}
+
 // Returns the bridge; nothing on failure.
 std::optional<std::string> BringUp(const char* interface) {
     const std::optional<WirelessAPConf> conf = ReadSettings(interface);
-    if (!conf) {
+    if (!conf || !CanJoin(conf->bridge)) {
         return std::nullopt;
     }
     if (TAVIWirelessSetHostAPConf(interface, &*conf) == 0) {
@@ -200,7 +212,7 @@ std::optional<std::string> BringUp(const char* interface) {
 bool WaitForChannels(const char* interface) {
     const Command command(128, {"iwlist ", interface, " active_channel|wc -l"});
     for (int i = 0; i < kChannelTries; ++i) {
-        const Pipe pipe = OpenPipe(command);
+        const Pipe pipe(command);
         int count = 0;
         if (!pipe || fscanf(pipe.get(), " %d", &count) != 1) {
             TAVI_LOG_ERROR("Failed to execute [%s]", command.Described().c_str());
@@ -215,12 +227,7 @@ bool WaitForChannels(const char* interface) {
     return false;
 }
 
-}  // namespace
-
-}  // namespace taviwireless::wireless
-
-int TAVIWirelessAPEnable() {
-    using namespace taviwireless::wireless;
+int Enable() {
     const FlagFile flag(kAPFlag);
     if (!flag.Raise()) {
         TAVI_LOG_ERROR("Another ap construction is going");
@@ -241,4 +248,12 @@ int TAVIWirelessAPEnable() {
         return 0;
     }
     return 1;
+}
+
+}  // namespace
+
+}  // namespace taviwireless::wireless
+
+int TAVIWirelessAPEnable() {
+    return TAVI_GUARDED(0, taviwireless::wireless::Enable);
 }

@@ -5,13 +5,13 @@
 #include <string>
 
 #include "common/log.h"
+#include "wireless/guarded.h"
+#include "wireless/interface.h"
 #include "wireless/queue.h"
 
 namespace taviwireless::wireless {
 
 namespace {
-
-constexpr size_t kInterfaceSize = 16;
 
 // Whether it is worth trying to join the network. One in range gets its settings from the scan. One
 // that is not may be hidden or silent: its saved settings are tried, if there are any, once a
@@ -48,7 +48,12 @@ const WirelessConf* ConnectFirst(OwnedList<WirelessConf>& confs) {
     return nullptr;
 }
 
-bool ConnectSavedNetwork(const std::string& interface) {
+bool ConnectSavedNetwork() {
+    const std::string interface = WirelessInterface();
+    if (interface.empty()) {
+        TAVI_LOG_ERROR("Bad parameters");
+        return false;
+    }
     OwnedList<WirelessConf> confs;
     const WirelessConf* joined = ConnectFirst(confs);
     if (joined == nullptr) {
@@ -68,12 +73,10 @@ bool ConnectSavedNetwork(const std::string& interface) {
 
 int TAVIWirelessAutoConnect() {
     using namespace taviwireless::wireless;
-    WirelessInfo info{};
-    TAVIWirelessCurInfoGet(WIRELESS_INFO_CONN_STATUS, &info);
-    if (info.value == WIRELESS_STATUS_CONNECTED || info.value == WIRELESS_STATUS_ADHOC) {
+    const int status = TAVIWirelessConnStatusGet();
+    if (status == WIRELESS_STATUS_CONNECTED || status == WIRELESS_STATUS_ADHOC) {
         TAVI_LOG_ERROR("Connection exists");
-    } else if (ConnectSavedNetwork(
-                   std::string(TAVIWirelessInterfaceGet()).substr(0, kInterfaceSize))) {
+    } else if (TAVI_GUARDED(false, ConnectSavedNetwork)) {
         return 0;
     }
     TAVIWirelessNetworkDisconnect();

@@ -1,6 +1,5 @@
 // Whether the user lets the radio be used.
 #include <tavicore/error.h>
-#include <tavicore/file.h>
 #include <tavicore/keyvalue.h>
 #include <tavicore/section.h>
 #include <taviwireless/wireless.h>
@@ -9,10 +8,11 @@
 
 #include "common/sz_hash.h"
 #include "wireless/paths.h"
+#include "wireless/presence.h"
 
 int TAVIWirelessCheckBlock() {
     using namespace taviwireless::wireless;
-    if (!VEXACFileExist(kAPSettings)) {
+    if (Look(kAPSettings) == Presence::kMissing) {
         return 1;
     }
     char product[1024];
@@ -24,8 +24,9 @@ int TAVIWirelessCheckBlock() {
     if (!settings) {
         return -1;
     }
-    if (VEXACFileGetSection(kAPSettings, product, settings.Address()) < 1) {
-        return 1;
+    const int result = VEXACFileGetSection(kAPSettings, product, settings.Address());
+    if (result < 1) {
+        return result == 0 ? 1 : -1;
     }
     const char* unblock = settings["unblock"];
     if (unblock == nullptr) {

@@ -2,6 +2,7 @@
 #include <vector>
 
 #include "common/log.h"
+#include "wireless/guarded.h"
 #include "wireless/queue.h"
 #include "wireless/saved_networks.h"
 
@@ -9,8 +10,9 @@ namespace taviwireless::wireless {
 
 namespace {
 
-// The last used first; those of the same time stay in the order of the file.
-void SortByTime(WirelessLink& head) {
+// The last used first; those of the same time stay in the order of the file. False, with the list
+// as it was, when there is no memory for that.
+bool SortByTime(WirelessLink& head) {
     std::vector<WirelessConf*> confs;
     for (WirelessLink* member = head.next; member != &head; member = member->next) {
         confs.push_back(WIRELESS_RECORD(member, WirelessConf));
@@ -22,6 +24,7 @@ void SortByTime(WirelessLink& head) {
     for (WirelessConf* conf : confs) {
         InsertBefore(head, conf->link);
     }
+    return true;
 }
 
 }  // namespace
@@ -31,8 +34,8 @@ void SortByTime(WirelessLink& head) {
 int TAVIWirelessConfEnumByAtime(WirelessLink* confs) {
     using namespace taviwireless::wireless;
     const int result = ListSavedNetworks(confs, __FILE_NAME__, __LINE__);
-    if (confs != nullptr) {
-        SortByTime(*confs);
+    if (confs == nullptr) {
+        return result;
     }
-    return result;
+    return TAVI_GUARDED(false, [confs] { return SortByTime(*confs); }) ? result : -1;
 }

@@ -8,8 +8,10 @@
 
 #include "common/log.h"
 #include "common/sz_hash.h"
+#include "wireless/guarded.h"
 #include "wireless/new_file.h"
 #include "wireless/paths.h"
+#include "wireless/presence.h"
 
 namespace taviwireless::wireless {
 
@@ -31,7 +33,7 @@ bool CreateFile() {
 
 // Loads what was saved of the network earlier.
 Found LoadSection(const char* section, SzHash& values) {
-    if (!VEXACFileExist(kSavedNetworks)) {
+    if (Look(kSavedNetworks) == Presence::kMissing) {
         return CreateFile() ? Found::kNew : Found::kFailed;
     }
     const int result = VEXACFileGetSection(kSavedNetworks, section, values.Address());
@@ -44,21 +46,19 @@ Found LoadSection(const char* section, SzHash& values) {
     return result == 0 ? Found::kNew : Found::kExisting;
 }
 
-void SetValues(const WirelessConf& conf, const char* bssid, SzHash& values) {
+// All of them, or false.
+bool SetValues(const WirelessConf& conf, const char* bssid, SzHash& values) {
     const WirelessNetwork& network = conf.network;
-    values.Set("KEY", conf.key);
-    values.Set("IPADDR", conf.ipAddr);
-    values.Set("NETMASK", conf.netmask);
-    values.Set("GATEWAY", conf.gateway);
-    values.Set("ESSID", network.essid);
-    values.Set("BSSID", bssid);
-    values.Set("MODE", TAVIWirelessOpmodeStringGet(network.opmode));
-    values.Set("ACCESS_TIME", std::to_string(static_cast<long long>(time(nullptr))));
-    values.Set("AUTH", TAVIWirelessAuthStringGet(network.auth));
-    values.Set("ENCRYPT", TAVIWirelessEncryptStringGet(network.encrypt, 0));
-    if (network.auth == WIRELESS_AUTH_WPA_EAP || network.auth == WIRELESS_AUTH_WPA2_EAP) {
-        values.Set("USER", conf.user);
-    }
+    const bool isEnterprise =
+        network.auth == WIRELESS_AUTH_WPA_EAP || network.auth == WIRELESS_AUTH_WPA2_EAP;
+    return values.Set("KEY", conf.key) && values.Set("IPADDR", conf.ipAddr) &&
+           values.Set("NETMASK", conf.netmask) && values.Set("GATEWAY", conf.gateway) &&
+           values.Set("ESSID", network.essid) && values.Set("BSSID", bssid) &&
+           values.Set("MODE", TAVIWirelessOpmodeStringGet(network.opmode)) &&
+           values.Set("ACCESS_TIME", std::to_string(static_cast<long long>(time(nullptr)))) &&
+           values.Set("AUTH", TAVIWirelessAuthStringGet(network.auth)) &&
+           values.Set("ENCRYPT", TAVIWirelessEncryptStringGet(network.encrypt, 0)) &&
+           (!isEnterprise || values.Set("USER", conf.user));
 }
 
 bool SaveSection(Found found, const char* section, const SzHash& values) {
@@ -78,17 +78,12 @@ bool SaveSection(Found found, const char* section, const SzHash& values) {
     return true;
 }
 
-}  // namespace
-
-}  // namespace taviwireless::wireless
-
-int TAVIWirelessConfSet(const WirelessConf* conf) {
-    using namespace taviwireless::wireless;
+int SaveNetwork(const WirelessConf* conf) {
     if (conf == nullptr) {
         TAVI_LOG_ERROR("Bad parameters");
         return -1;
     }
-    taviwireless::SzHash values(1024);
+    SzHash values(1024);
     if (!values) {
         TAVI_LOG_ERROR("Failed to alloc memory");
         return -1;
@@ -99,6 +94,17 @@ int TAVIWirelessConfSet(const WirelessConf* conf) {
     if (found == Found::kFailed) {
         return -1;
     }
-    SetValues(*conf, section, values);
+    if (!SetValues(*conf, section, values)) {
+        TAVI_LOG_ERROR("Failed to alloc memory");
+        return -1;
+    }
     return SaveSection(found, section, values) ? 0 : -1;
+}
+
+}  // namespace
+
+}  // namespace taviwireless::wireless
+
+int TAVIWirelessConfSet(const WirelessConf* conf) {
+    return TAVI_GUARDED(-1, [conf] { return taviwireless::wireless::SaveNetwork(conf); });
 }

@@ -1,6 +1,5 @@
 // What the driver says of the wireless interface, one thing at a time.
 #include <tavisdk/network.h>
-#include <tavisdk/wireless.h>
 #include <taviwireless/wireless.h>
 
 #include <algorithm>
@@ -10,6 +9,8 @@
 
 #include "common/log.h"
 #include "wireless/driver_request.h"
+#include "wireless/guarded.h"
+#include "wireless/interface.h"
 
 namespace {
 
@@ -74,11 +75,15 @@ bool IsAssociated() {
     return std::any_of(address, address + 6, [](char byte) { return byte != 0; });
 }
 
-int ConnectionStatus() {
+std::optional<int> ConnectionStatus() {
     if (TAVIWirelessAdapterNum() <= 0) {
         return WIRELESS_STATUS_NO_ADAPTER;
     }
-    if (TAVINetIsIFUp(TAVIWirelessInterfaceGet()) == 0) {
+    const std::string interface = WirelessInterface();
+    if (interface.empty()) {
+        return std::nullopt;
+    }
+    if (TAVINetIsIFUp(interface.c_str()) == 0) {
         return WIRELESS_STATUS_INTERFACE_DOWN;
     }
     switch (TAVIWirelessOpmodeGet()) {
@@ -103,9 +108,7 @@ int Give(const std::optional<int>& value, void* out) {
     return 0;
 }
 
-}  // namespace
-
-int TAVIWirelessCurInfoGet(int what, void* out) {
+int Get(int what, void* out) {
     if (out == nullptr) {
         TAVI_LOG_ERROR("Bad parameters");
         return -1;
@@ -125,4 +128,10 @@ int TAVIWirelessCurInfoGet(int what, void* out) {
             TAVI_LOG_ERROR("This request is not supported.");
             return -1;
     }
+}
+
+}  // namespace
+
+int TAVIWirelessCurInfoGet(int what, void* out) {
+    return TAVI_GUARDED(-1, [=] { return Get(what, out); });
 }

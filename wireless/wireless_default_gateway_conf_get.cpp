@@ -1,24 +1,28 @@
 // The gateway that the Wi-Fi connection should use.
 #include <tavicore/keyvalue.h>
 #include <tavisdk/network.h>
-#include <tavisdk/wireless.h>
 #include <taviwireless/wireless.h>
 
 #include <cstdio>
 #include <string>
 
 #include "common/log.h"
+#include "wireless/guarded.h"
+#include "wireless/interface.h"
 #include "wireless/paths.h"
 
-int TAVIWirelessDefaultGatewayConfGet_core(char* buf, size_t size) {
-    using namespace taviwireless::wireless;
-    if (buf == nullptr || size == 0) {
+namespace {
+
+using namespace taviwireless::wireless;
+
+int Get(char* buf, size_t size) {
+    const std::string interface = WirelessInterface();
+    if (buf == nullptr || size == 0 || interface.empty()) {
         TAVI_LOG_ERROR("Bad parameters");
         return -1;
     }
     *buf = '\0';
-    const char* interface = TAVIWirelessInterfaceGet();
-    if (BlTAVILnxIsDHCP(interface)) {
+    if (BlTAVILnxIsDHCP(interface.c_str())) {
         // A lease without a gateway is an answer, too.
         const std::string lease = std::string(kDhcpClientPrefix) + interface + ".info";
         VEXACFileGetKeyValue(lease.c_str(), "GATEWAY", buf, size);
@@ -34,4 +38,10 @@ int TAVIWirelessDefaultGatewayConfGet_core(char* buf, size_t size) {
     }
     snprintf(buf, size, "%s", conf.gateway);
     return 0;
+}
+
+}  // namespace
+
+int TAVIWirelessDefaultGatewayConfGet_core(char* buf, size_t size) {
+    return TAVI_GUARDED(-1, [=] { return Get(buf, size); });
 }

@@ -1,16 +1,27 @@
-#include <tavisdk/wireless.h>
 #include <taviwireless/wireless.h>
 
 #include "common/log.h"
+#include "wireless/guarded.h"
+#include "wireless/interface.h"
 #include "wireless/shell.h"
 
-int TAVIWirelessDefaultGatewaySet(const char* gateway) {
-    using namespace taviwireless::wireless;
-    if (gateway == nullptr || *gateway == '\0') {
+namespace {
+
+using namespace taviwireless::wireless;
+
+int Set(const char* gateway) {
+    const std::string interface = WirelessInterface();
+    if (gateway == nullptr || *gateway == '\0' || interface.empty()) {
         TAVI_LOG_ERROR("Bad parameters");
         return -1;
     }
     const Command addRoute(256, {"/sbin/route add default gw ", Argument{gateway}, " metric 0 dev ",
-                                 Argument{TAVIWirelessInterfaceGet()}, " > /dev/null 2>&1"});
+                                 Argument{interface}, " > /dev/null 2>&1"});
     return TAVI_RUN(addRoute) ? 0 : -1;
+}
+
+}  // namespace
+
+int TAVIWirelessDefaultGatewaySet(const char* gateway) {
+    return TAVI_GUARDED(-1, [gateway] { return Set(gateway); });
 }

@@ -5,9 +5,11 @@
 #include <tavisdk/network.h>
 #include <taviwireless/wireless.h>
 
+#include "base/interface_name.h"
 #include "common/log.h"
 #include "wireless/ap_files.h"
 #include "wireless/grep_pattern.h"
+#include "wireless/guarded.h"
 #include "wireless/hostapd_conf.h"
 #include "wireless/new_file.h"
 #include "wireless/shell.h"
@@ -22,9 +24,9 @@ constexpr size_t kCommandSize = 1024;
 // The first process that has both names in its arguments. Where ps lists arguments that is the
 // shell of this very command when no hostapd runs; its end is of no interest then.
 void StopHostapd(const std::string& interface) {
-    const Pipe pids =
-        OpenPipe(Command(kCommandSize, {"ps | grep hostapd | grep ",
-                                        Argument{GrepPattern(interface)}, " | awk {'print $1'}"}));
+    const Pipe pids(Command(
+        kCommandSize,
+        {"ps | grep hostapd | grep ", Argument{GrepPattern(interface)}, " | awk {'print $1'}"}));
     int pid = 0;
     const bool isRunning = pids && fscanf(pids.get(), " %d", &pid) == 1 && pid > 0;
     if (!pids || (isRunning && kill(pid, SIGTERM) != 0)) {
@@ -75,13 +77,8 @@ HostapdConf RenderGuestInfo(const WirelessAPConf& conf) {
     return info;
 }
 
-}  // namespace
-
-}  // namespace taviwireless::wireless
-
-int TAVIWirelessSetHostAPConf(const char* interface, const WirelessAPConf* conf) {
-    using namespace taviwireless::wireless;
-    if (interface == nullptr || conf == nullptr) {
+int WriteAll(const char* interface, const WirelessAPConf* conf) {
+    if (interface == nullptr || conf == nullptr || !IsInterfaceName(interface)) {
         TAVI_LOG_ERROR("Bad parameter.");
         return 0;
     }
@@ -104,4 +101,12 @@ int TAVIWirelessSetHostAPConf(const char* interface, const WirelessAPConf* conf)
         return 0;
     }
     return 1;
+}
+
+}  // namespace
+
+}  // namespace taviwireless::wireless
+
+int TAVIWirelessSetHostAPConf(const char* interface, const WirelessAPConf* conf) {
+    return TAVI_GUARDED(0, [=] { return taviwireless::wireless::WriteAll(interface, conf); });
 }

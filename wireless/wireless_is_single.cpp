@@ -1,10 +1,8 @@
 #include <tavisdk/network.h>
-#include <tavisdk/wireless.h>
 #include <taviwireless/wireless.h>
 
-#include <cstring>
-
 #include "common/log.h"
+#include "wireless/interface.h"
 
 int TAVIWirelessIsSingle_core() {
     constexpr int kMost = 32;
@@ -19,7 +17,7 @@ int TAVIWirelessIsSingle_core() {
     }
     for (int i = 0; i < count; ++i) {
         if (interfaces[i].linkState == VEXA_NET_LINK_CONNECTED &&
-            strcmp(interfaces[i].name, TAVIWirelessInterfaceGet()) != 0) {
+            interfaces[i].name != taviwireless::wireless::WirelessInterface()) {
             return 0;
         }
     }

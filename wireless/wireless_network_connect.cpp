@@ -2,14 +2,16 @@
 #include <tavicore/file.h>
 #include <tavicore/keyvalue.h>
 #include <tavisdk/service.h>
-#include <tavisdk/wireless.h>
 #include <taviwireless/wireless.h>
 #include <unistd.h>
 
 #include <cstring>
+#include <string>
 
 #include "common/log.h"
 #include "wireless/flag_file.h"
+#include "wireless/guarded.h"
+#include "wireless/interface.h"
 #include "wireless/new_file.h"
 #include "wireless/paths.h"
 #include "wireless/shell.h"
@@ -24,19 +26,10 @@ constexpr mode_t kSupplicantMode = 0600;  // it holds the key
 constexpr mode_t kRecordMode = 0644;
 constexpr int kPolls = 15;  // a second each
 
-bool HoldsLineBreak(const WirelessConf& conf) {
-    for (const char* text : {conf.network.essid, conf.key, conf.user}) {
-        if (strchr(text, '\n') != nullptr) {
-            return true;
-        }
-    }
-    return false;
-}
-
 // Logs why not.
 bool WriteSupplicantConf(const WirelessConf& conf) {
-    // What stands behind a line break would be a setting of its own to the supplicant.
-    if (HoldsLineBreak(conf)) {
+    const SupplicantConf rendered = RenderSupplicantConf(conf);
+    if (rendered.holdsLineBreak) {
         TAVI_LOG_ERROR("The ESSID, key or user name holds a line break");
         return false;
     }
@@ -45,7 +38,6 @@ bool WriteSupplicantConf(const WirelessConf& conf) {
         TAVI_LOG_ERROR("Failed to open file[%s].", kSupplicantConf);
         return false;
     }
-    const SupplicantConf rendered = RenderSupplicantConf(conf);
     if (rendered.isWepKeyLeftOut) {
         TAVI_LOG_ERROR("Wrong WEP Format.");
     }
@@ -61,14 +53,14 @@ bool StopSupplicant() {
 }
 
 // The supplicant quotes a pass phrase that it rejects, and not every shell knows "&>".
-bool StartSupplicant(const char* interface) {
+bool StartSupplicant(const std::string& interface) {
     const Command start(1024, {"/usr/sbin/wpa_supplicant -Dwext -i", Argument{interface}, " -c",
                                kSupplicantConf, " -B -P", kSupplicantPidFile, " &> /dev/null"});
     return TAVI_RUN_SILENTLY(start);
 }
 
 bool IsAssociated() {
-    const Pipe status = OpenPipe(Command(128, {"/usr/sbin/wpa_cli status | grep wpa_state"}));
+    const Pipe status(Command(128, {"/usr/sbin/wpa_cli status | grep wpa_state"}));
     char state[32];
     return status && fscanf(status.get(), " wpa_state=%31s", state) == 1 &&
            strcmp(state, "COMPLETED") == 0;
@@ -86,8 +78,12 @@ bool WaitForAssociation() {
     return false;
 }
 
-// For TAVIWirelessStatusGet.
+// For TAVIWirelessStatusGet. What strangers put in its place, a folder for example, is removed.
 bool RecordConnection(const WirelessNetwork& network) {
+    struct stat status {};
+    if (lstat(kCurrentConnection, &status) == 0 && !IsTrusted(status)) {
+        RemoveAll(kCurrentConnection);
+    }
     const File file = CreateAnew(kCurrentConnection, kRecordMode);
     char bssid[18];
     return file &&
@@ -97,8 +93,8 @@ bool RecordConnection(const WirelessNetwork& network) {
            fflush(file.get()) == 0;
 }
 
-int Connect(const char* interface, const WirelessConf* conf) {
-    if (interface == nullptr || conf == nullptr) {
+int Connect(const std::string& interface, const WirelessConf* conf) {
+    if (interface.empty() || conf == nullptr) {
         TAVI_LOG_ERROR("Bad parameters");
         return -1;
     }
@@ -122,19 +118,22 @@ int Connect(const char* interface, const WirelessConf* conf) {
     return 0;
 }
 
-void RestartMediaService(const char* interface) {
+void RestartMediaService(const std::string& interface) {
     if (VEXACFileCheckKeyValue(kSystemInfo, "runmediaservice", "yes", 0) &&
-        VEXACFileCheckKeyValue(kSystemInfo, "network_mediaservice", interface, 0)) {
+        VEXACFileCheckKeyValue(kSystemInfo, "network_mediaservice", interface.c_str(), 0)) {
         TAVIMediaService(TAVI_MEDIA_SERVICE_RESTART);
     }
 }
 
-}  // namespace
+// A copy, also where the resolver's file is a link to one that another program keeps; disconnecting
+// then puts the copy in the place of the link. Kept.
+void KeepResolver() {
+    if (VEXACFileExist(kResolver)) {
+        TAVI_RUN(Command(128, {"/bin/cp ", kResolver, " ", kResolverBackup}));
+    }
+}
 
-}  // namespace taviwireless::wireless
-
-int TAVIWirelessNetworkConnect(WirelessConf* conf) {
-    using namespace taviwireless::wireless;
+int ConnectOnce(const WirelessConf* conf) {
     const FlagFile flag(kConnectingFlag);
     if (TAVIWirelessAdapterNum() < 1) {
         TAVI_LOG_ERROR("There is no wireless USB adapter plugged");
@@ -148,14 +147,20 @@ int TAVIWirelessNetworkConnect(WirelessConf* conf) {
         TAVI_LOG_ERROR("Another connection construction is going");
         return -1;
     }
-    const char* interface = TAVIWirelessInterfaceGet();
+    const std::string interface = WirelessInterface();
     if (Connect(interface, conf) != 0) {
         TAVI_LOG_ERROR("Failed to connect network.");
         return -1;
     }
     RestartMediaService(interface);
-    if (VEXACFileExist(kResolver)) {
-        TAVI_RUN(Command(128, {"/bin/cp ", kResolver, " ", kResolverBackup}));
-    }
+    KeepResolver();
     return 0;
+}
+
+}  // namespace
+
+}  // namespace taviwireless::wireless
+
+int TAVIWirelessNetworkConnect(WirelessConf* conf) {
+    return TAVI_GUARDED(-1, [conf] { return taviwireless::wireless::ConnectOnce(conf); });
 }

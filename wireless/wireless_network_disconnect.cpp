@@ -3,7 +3,6 @@
 #include <tavicore/file.h>
 #include <tavicore/process.h>
 #include <tavisdk/network.h>
-#include <tavisdk/wireless.h>
 #include <taviwireless/wireless.h>
 #include <unistd.h>
 
@@ -11,6 +10,8 @@
 #include <string>
 
 #include "common/log.h"
+#include "wireless/guarded.h"
+#include "wireless/interface.h"
 #include "wireless/paths.h"
 #include "wireless/shell.h"
 #include "wireless/supplicant.h"
@@ -20,7 +21,6 @@ namespace taviwireless::wireless {
 namespace {
 
 constexpr size_t kCommandSize = 128;
-constexpr size_t kInterfaceSize = 16;
 
 bool ReleaseAddress(const std::string& interface) {
     return TAVI_RUN(
@@ -46,6 +46,8 @@ bool StopSupplicant() {
     return true;
 }
 
+// Whoever has the recorded number is killed; that it is still the client is for the SDK to see. And
+// one that can never be killed is waited for without end. Kept.
 void StopDhcpClient(const std::string& interface) {
     const std::string pidFile = kDhcpClientPrefix + interface + ".pid";
     pid_t pid;
@@ -61,6 +63,7 @@ void StopDhcpClient(const std::string& interface) {
     }
 }
 
+// Where the resolver's file was a link, the copy takes the place of the link. Kept.
 bool RestoreResolver() {
     if (VEXACFileExist(kResolverBackup) && VEXACSysRename(kResolverBackup, kResolver) < 0) {
         TAVI_LOG_ERROR("Failed to rename '%s'", kResolverBackup);
@@ -69,12 +72,7 @@ bool RestoreResolver() {
     return true;
 }
 
-}  // namespace
-
-}  // namespace taviwireless::wireless
-
-int TAVIWirelessNetworkDisconnect_core() {
-    using namespace taviwireless::wireless;
+int Disconnect() {
     VEXACSysUnlink(kConnectingFlag);
     WirelessInfo info{};
     if (TAVIWirelessCurInfoGet(WIRELESS_INFO_CONN_STATUS, &info) != 0) {
@@ -87,7 +85,11 @@ int TAVIWirelessNetworkDisconnect_core() {
         return 0;
     }
     VEXACSysUnlink(kCurrentConnection);
-    const std::string interface = std::string(TAVIWirelessInterfaceGet()).substr(0, kInterfaceSize);
+    const std::string interface = WirelessInterface();
+    if (interface.empty()) {
+        TAVI_LOG_ERROR("Bad parameters");
+        return -1;
+    }
     if (status != WIRELESS_STATUS_NO_ADAPTER && !ReleaseAddress(interface)) {
         return -1;
     }
@@ -99,4 +101,12 @@ int TAVIWirelessNetworkDisconnect_core() {
     }
     StopDhcpClient(interface);
     return RestoreResolver() ? 0 : -1;
+}
+
+}  // namespace
+
+}  // namespace taviwireless::wireless
+
+int TAVIWirelessNetworkDisconnect_core() {
+    return TAVI_GUARDED(-1, taviwireless::wireless::Disconnect);
 }

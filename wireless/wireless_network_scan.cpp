@@ -1,6 +1,5 @@
 // The networks in range, as this system's "iwlist" lists them: a table with one network per line.
 #include <tavisdk/network.h>
-#include <tavisdk/wireless.h>
 #include <taviwireless/wireless.h>
 #include <unistd.h>
 
@@ -10,9 +9,12 @@
 #include <cstdio>
 #include <cstring>
 #include <optional>
+#include <string>
 #include <string_view>
 
 #include "common/log.h"
+#include "wireless/guarded.h"
+#include "wireless/interface.h"
 #include "wireless/queue.h"
 #include "wireless/shell.h"
 
@@ -49,6 +51,12 @@ bool WaitForAdapter() {
 
 std::string_view ColumnsFrom(std::string_view line, size_t column) {
     return line.substr(std::min(column, line.size()));
+}
+
+// A channel of five digits leaves no blank before the ESSID, which may begin with one.
+std::string ChannelColumns(std::string_view line) {
+    const bool isFull = isdigit(static_cast<unsigned char>(line[kEssidColumn - 1])) != 0;
+    return std::string(isFull ? line.substr(0, kEssidColumn) : line);
 }
 
 // False when nothing is left: a network that hides its name.
@@ -106,7 +114,7 @@ std::optional<WirelessNetwork> ParseLine(const char* text) {
         return std::nullopt;
     }
     WirelessNetwork network{};
-    if (sscanf(text, " %d", &network.channel) < 1) {
+    if (sscanf(ChannelColumns(line).c_str(), " %d", &network.channel) < 1) {
         TAVI_LOG_ERROR("Failed to parse channel(%s)", text);
         return std::nullopt;
     }
@@ -135,7 +143,7 @@ bool Append(WirelessLink& networks, const WirelessNetwork& network) {
 // too the list holds what was read.
 int ListNetworks(const char* interface, WirelessLink& networks) {
     const Command command(kCommandSize, {"/sbin/iwlist ", interface, " scanning tavi"});
-    const Pipe pipe = OpenPipe(command);
+    const Pipe pipe(command);
     if (!pipe) {
         TAVI_LOG_ERROR("Failed to popen '%s', errno=%s", command.Described().c_str(),
                        strerror(errno));
@@ -193,17 +201,13 @@ int ListUntilStable(const char* interface, WirelessLink& networks) {
     }
 }
 
-}  // namespace
-
-int TAVIWirelessNetworkScan(int trigger, WirelessLink* networks) {
-    if (networks != nullptr) {
-        MakeEmpty(*networks);
-    }
+int Scan(int trigger, WirelessLink* networks) {
     if (!WaitForAdapter()) {
         return -1;
     }
-    const char* interface = TAVIWirelessInterfaceGet();
-    if (interface == nullptr || networks == nullptr) {
+    const std::string name = WirelessInterface();
+    const char* interface = name.c_str();
+    if (name.empty() || networks == nullptr) {
         TAVI_LOG_ERROR("Bad parameters");
         return -1;
     }
@@ -220,4 +224,17 @@ int TAVIWirelessNetworkScan(int trigger, WirelessLink* networks) {
         }
     }
     return ListUntilStable(interface, *networks);
+}
+
+}  // namespace
+
+int TAVIWirelessNetworkScan(int trigger, WirelessLink* networks) {
+    if (networks != nullptr) {
+        MakeEmpty(*networks);
+    }
+    const int result = TAVI_GUARDED(-1, [=] { return Scan(trigger, networks); });
+    if (result < 0 && networks != nullptr) {
+        FreeMembers<WirelessNetwork>(*networks);
+    }
+    return result;
 }

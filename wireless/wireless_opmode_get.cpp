@@ -1,8 +1,8 @@
-#include <tavisdk/wireless.h>
 #include <taviwireless/wireless.h>
 
 #include "common/log.h"
 #include "wireless/driver_request.h"
+#include "wireless/interface.h"
 
 using taviwireless::wireless::DriverResult;
 
@@ -17,7 +17,7 @@ int TAVIWirelessOpmodeGet(void) {
             return WIRELESS_OPMODE_UNKNOWN;
         case DriverResult::kRefused:
             TAVI_LOG_ERROR("Failed to get information from ioctl with ifname[%s].",
-                           TAVIWirelessInterfaceGet());
+                           taviwireless::wireless::WirelessInterface().c_str());
             return WIRELESS_OPMODE_UNKNOWN;
         case DriverResult::kDone:
             break;

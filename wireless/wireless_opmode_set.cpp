@@ -1,8 +1,8 @@
-#include <tavisdk/wireless.h>
 #include <taviwireless/wireless.h>
 
 #include "common/log.h"
 #include "wireless/driver_request.h"
+#include "wireless/interface.h"
 
 using taviwireless::wireless::DriverResult;
 
@@ -23,7 +23,8 @@ int TAVIWirelessOpmodeSet(int mode) {
             TAVI_LOG_ERROR("Cannot get socket.");
             return -1;
         case DriverResult::kRefused:
-            TAVI_LOG_ERROR("Failed to set opmode[%s] of %s.", name, TAVIWirelessInterfaceGet());
+            TAVI_LOG_ERROR("Failed to set opmode[%s] of %s.", name,
+                           taviwireless::wireless::WirelessInterface().c_str());
             return -1;
         case DriverResult::kDone:
             break;

@@ -6,6 +6,7 @@
 #include <random>
 
 #include "tests/support/log_capture.h"
+#include "tests/wireless/failing_stat.h"
 #include "tests/wireless/wifi_fixture.h"
 
 namespace taviwireless::test {
@@ -179,6 +180,34 @@ TEST(SetAPConfig, RefusesWhatCannotBeStoredAndLeavesTheFile) {
     const WirelessAPSettings settings = Defaults();
     EXPECT_EQ(TAVIWirelessSetAPConfig(&settings) + TAVIWirelessSetAPConfig(nullptr), 0);
     EXPECT_TRUE(here.log.Has("Failed to touch " + kFile) && here.log.Has(" Bad parameters"));
+}
+
+TEST(Settings, OfAStoreThatCannotBeLookedAtAreNotTheDefaults) {
+    const Settings here;
+    WirelessAPSettings settings = Defaults();
+    settings.enabled = 1;
+    settings.ap.security = WIRELESS_AP_WPA;
+    SetField(settings.ap.secret.wpa.passphrase, "pass phrase");
+    ASSERT_EQ(TAVIWirelessSetAPConfig(&settings), 1);
+    const std::string stored = ReadFile(kFile);
+    WriteFile("/tmp/wireless.info", "PRODUCT=Stick 2000\n");
+    for (int n = 1; n <= 2; ++n) {
+        gFailingStat = n;
+        WirelessAPSettings read;
+        EXPECT_TRUE(TAVIWirelessGetAPConfig("Stick 2000", &read) < 0 ||
+                    read.ap.security == WIRELESS_AP_WPA);
+        gFailingStat = n;
+        EXPECT_NE(TAVIWirelessCheckBlock(), 0);
+        gFailingStat = n;
+        TAVIWirelessSetAPConfig(&settings);
+        EXPECT_EQ(ReadFile(kFile), stored);
+    }
+    gFailingStat = 0;
+    Shell("rm " + kFile + "; ln -s " + kFile + ' ' + kFile);  // no look at it succeeds
+    WirelessAPSettings read;
+    EXPECT_EQ(TAVIWirelessGetAPConfig("Stick 2000", &read), -1);
+    EXPECT_EQ(TAVIWirelessCheckBlock(), -1);
+    EXPECT_EQ(TAVIWirelessSetAPConfig(&settings), 0);
 }
 
 TEST(SetAPConfig, AProductNameFindsItsOwnSectionAndRunsNothing) {

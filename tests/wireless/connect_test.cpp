@@ -1,4 +1,6 @@
 // Joining a network: what the supplicant is given, and what happens around it.
+#include <fcntl.h>
+#include <signal.h>
 #include <tavicore/error.h>
 
 #include <regex>
@@ -44,12 +46,13 @@ TEST(SupplicantFile, SaysHowToJoinAndIsUnderstood) {
         {5, 0, key63, wpa + "\tpsk=\"" + key63 + "\"\n}\n"},
         {7, 4, kKey, eap + "\tpairwise=TKIP\n" + user},
         {8, 1, kKey, eap + user},
-        {1, 1, "", open + "}\n"},
+        {1, 1, "never\nwritten", open + "}\n"},
         {1, 2, "abcde", open + "\twep_key0=\"abcde\"\n" + wep},
         {2, 2, "a\"b\\ efghijkl", open + "\twep_key0=\"a\"b\\ efghijkl\"\n" + wep},
         {3, 2, "0123456789", open + "\twep_key0=0123456789\n" + wep},
         {3, 2, std::string(26, 'F'), open + "\twep_key0=" + std::string(26, 'F') + "\n" + wep},
         {2, 2, kKey, open + wep},  // of 8 characters
+        {2, 2, "8 bytes\r", open + wep},
     };
     for (const auto& c : kCases) {
         SCOPED_TRACE(c.lines);
@@ -157,6 +160,7 @@ TEST(Connect, FailsCleanlyAndNeverLeavesTheFlag) {
          "Another connection construction is going\n"},
         {"", MakeConf("a\n\tpsk=b"), kLineBreak},
         {"", MakeConf("a", "b\nc"), kLineBreak},
+        {"", MakeConf("a", "b\r"), kLineBreak},
         {"", MakeConf("a", kKey, WIRELESS_AUTH_WPA_NONE),
          "Failed to detect authentication/encryption type\n" + kNotSet},
         {"rm -r /usr/tavi/etc", MakeConf(),
@@ -172,6 +176,57 @@ TEST(Connect, FailsCleanlyAndNeverLeavesTheFlag) {
         const std::regex place("wireless_network_connect.cpp:[0-9]+ ");
         EXPECT_EQ(std::regex_replace(station.log.Text(), place, ""), c.log);
         EXPECT_FALSE(Exists(kFlag));
+    }
+}
+
+// The stand-in notes what it was started with. The caller ignores SIGCHLD, which made each command
+// look like one that could not be run.
+TEST(Connect, GivesTheSupplicantNothingOfItsCaller) {
+    Station station;
+    station.tools.Add("/usr/sbin/wpa_supplicant",
+                      "{ ls -l /proc/$$/fd; grep -E '^Sig(Blk|Ign)' /proc/$$/status; pwd; } "
+                      "> /tmp/inherited; touch /tmp/started");
+    WriteFile("/tmp/callers", "");
+    const int descriptor = open("/tmp/callers", O_RDONLY);
+    const auto folder = std::filesystem::current_path();
+    std::filesystem::current_path("/tmp");
+    sigset_t blocked, before;
+    sigfillset(&blocked);
+    sigprocmask(SIG_SETMASK, &blocked, &before);
+    signal(SIGCHLD, SIG_IGN);
+    WirelessConf conf = MakeConf();
+    EXPECT_EQ(TAVIWirelessNetworkConnect(&conf), 0) << station.log.Text();
+    TAVIWirelessNetworkDisconnect_core();
+    signal(SIGCHLD, SIG_DFL);
+    sigprocmask(SIG_SETMASK, &before, nullptr);
+    std::filesystem::current_path(folder);
+    close(descriptor);
+    const std::string inherited = ReadFile("/tmp/inherited");
+    EXPECT_THAT(inherited, Not(HasSubstr("callers")));
+    EXPECT_THAT(inherited, HasSubstr("SigBlk:\t0000000000000000\n"));
+    // The shell, which starts it in the background, has it ignore SIGINT and SIGQUIT; the C library
+    // two signals of its own (32 and 33).
+    EXPECT_THAT(inherited, testing::ContainsRegex("SigIgn:\t0000000[01][08]0000006\n/\n"));
+    EXPECT_EQ(station.log.Text(), "");
+}
+
+// What strangers put into the folder of the flag and of the record.
+TEST(Connect, IsKeptFromNothingByWhatStandsInAFolderOfEverybody) {
+    for (const std::string arrange :
+         {"ln -s /etc/nologin $1", "mkdir -p $1/full", "mkfifo $1", "touch $1; chown 65534 $1"}) {
+        for (const char* place : {kFlag, kRecord}) {
+            SCOPED_TRACE(arrange + ' ' + place);
+            Station station;
+            Shell("set -- " + std::string(place) + "; " + arrange + "; chown -h 65534 $1");
+            WirelessConf conf = MakeConf();
+            const SleepCapture sleeps([](unsigned) {
+                EXPECT_TRUE(
+                    std::filesystem::is_regular_file(std::filesystem::symlink_status(kFlag)));
+            });
+            EXPECT_EQ(TAVIWirelessNetworkConnect(&conf), 0) << station.log.Text();
+            EXPECT_THAT(ReadFile(kRecord), HasSubstr("My Net\n"));
+            EXPECT_FALSE(Exists(kFlag) || Exists("/etc/nologin"));
+        }
     }
 }
 
@@ -192,6 +247,12 @@ TEST(CheckBlock, TellsWhetherTheUserBlockedTheRadio) {
         EXPECT_EQ(TAVIWirelessCheckBlock(), c.result) << c.settings;
     }
     EXPECT_EQ(VEXACErrGet(), VEXAC_ERR_NOT_FOUND);
+    // A setting that cannot be read is not one that lets the radio be used.
+    Shell("cd /usr/tavi/etc; mv wireless_ap.conf a; mkdir wireless_ap.conf");
+    EXPECT_EQ(TAVIWirelessCheckBlock(), -1);
+    Shell("cd /usr/tavi/etc; rmdir wireless_ap.conf; ln -s wireless_ap.conf wireless_ap.conf");
+    EXPECT_EQ(TAVIWirelessCheckBlock(), -1);
+    Shell("cd /usr/tavi/etc; rm wireless_ap.conf; mv a wireless_ap.conf");
     WriteFile(kFlag, "");
     EXPECT_EQ(TAVIWirelessNetworkConnect(nullptr), 0);  // nothing to do
     EXPECT_FALSE(Exists(kFlag) || Exists(kSupplicantFile));

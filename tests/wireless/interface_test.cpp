@@ -2,6 +2,18 @@
 #include <tavisdk/wireless.h>
 
 #include "tests/wireless/station_fixture.h"
+#include "wireless/queue.h"
+
+namespace {
+
+const char* gInterface = "wlan0";
+
+}  // namespace
+
+// In the place of the SDK's.
+extern "C" __attribute__((visibility("default"))) const char* TAVIWirelessInterfaceGet() {
+    return gInterface;
+}
 
 namespace taviwireless::test {
 namespace {
@@ -50,9 +62,46 @@ TEST(DefaultGatewaySet, RunsOneCommandWhateverTheTextHolds) {
                   "/sbin/route add default gw " + gateway + " metric 0 dev wlan0\n");
         EXPECT_FALSE(Exists("/tmp/x"));
     }
+    // Cut short, it would run without its interface.
+    station.tools.ForgetCommands();
+    EXPECT_EQ(TAVIWirelessDefaultGatewaySet(std::string(200, '1').c_str()), -1);
+    EXPECT_EQ(station.tools.Commands().size(), 0u);
+    EXPECT_TRUE(station.log.Has("Failed to execute '/sbin/route add default gw 1"));
     EXPECT_EQ(TAVIWirelessDefaultGatewaySet(nullptr), -1);
     EXPECT_EQ(TAVIWirelessDefaultGatewaySet(""), -1);
     EXPECT_EQ(station.log.Count("Bad parameters"), 2);
+}
+
+TEST(InterfaceGet, ThatNamesNoneIsAFailureOfEveryFunction) {
+    Station station;
+    SetSupport("yes");
+    for (const char* none : {static_cast<const char*>(nullptr), "--help"}) {
+        gInterface = none;
+        WirelessConf conf = MakeConf();
+        WirelessInfo info;
+        WirelessNetwork network;
+        WirelessStatus status;
+        wireless::OwnedList<WirelessNetwork> networks;
+        char gateway[WIRELESS_ADDRESS_SIZE];
+        EXPECT_EQ(TAVIWirelessNetworkScan(1, networks.Head()), -1);
+        EXPECT_EQ(TAVIWirelessNetworkGet("a", WIRELESS_KEY_ESSID, &network), -1);
+        EXPECT_EQ(TAVIWirelessNetworkConnect(&conf), -1);
+        EXPECT_EQ(TAVIWirelessNetworkDisconnect_core(), -1);
+        for (int what : {0, 1, 2, 4}) {
+            EXPECT_EQ(TAVIWirelessCurInfoGet(what, &info), -1) << what;
+        }
+        EXPECT_EQ(TAVIWirelessConnStatusGet() + TAVIWirelessStatusGet(&status)->status, 0);
+        EXPECT_EQ(TAVIWirelessOpmodeGet(), WIRELESS_OPMODE_UNKNOWN);
+        EXPECT_EQ(TAVIWirelessOpmodeSet(WIRELESS_OPMODE_MANAGED), -1);
+        EXPECT_EQ(TAVIWirelessAdhocCreate(&conf), -1);
+        EXPECT_EQ(TAVIWirelessAdhocNetworkGet(&network), -1);
+        EXPECT_EQ(TAVIWirelessAutoConnect(), -1);
+        EXPECT_EQ(TAVIWirelessDefaultGatewaySet("10.0.0.1"), -1);
+        EXPECT_EQ(TAVIWirelessDefaultGatewayConfGet_core(gateway, sizeof gateway), -1);
+        EXPECT_EQ(TAVIWirelessIsSingle_core(), 0);
+        EXPECT_EQ(station.tools.Commands().size(), 0u);
+    }
+    gInterface = "wlan0";
 }
 
 std::string Addresses() {

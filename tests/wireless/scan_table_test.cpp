@@ -75,6 +75,8 @@ TEST(ScanTable, IsReadByTheScanAsWhatTheBeaconsSay) {
          "2    " + std::string(32, 'w'), "50 11b/g NONE", 1, 1, 1},
         {Beacon(2417, -75, false, Ssid(" a\nb\xc3\xbc") + kRates), "2     a?b\xc3\xbc",
          "50 11b/g NONE", 1, 1, 1},
+        {Beacon(58320, -75, false, Ssid("5 digits") + kRates), "104745 digits", "50 unknown NONE",
+         0, 1, 1},
     };
     const struct {
         std::string protection, text;
@@ -116,9 +118,10 @@ TEST(ScanTable, IsReadByTheScanAsWhatTheBeaconsSay) {
         SCOPED_TRACE(row->channelAndEssid + ' ' + row->rest);
         EXPECT_EQ(n.essid, row->channelAndEssid.substr(5));
         EXPECT_EQ(n.bssid[5], 0x55);
-        EXPECT_THAT((std::vector{n.channel, n.signal, n.protocol, n.auth, n.encrypt}),
-                    testing::ElementsAre(std::stoi(row->channelAndEssid), std::stoi(row->rest),
-                                         row->protocol, row->auth, row->encrypt));
+        EXPECT_THAT(
+            (std::vector{n.channel, n.signal, n.protocol, n.auth, n.encrypt}),
+            testing::ElementsAre(std::stoi(row->channelAndEssid.substr(0, 5)), std::stoi(row->rest),
+                                 row->protocol, row->auth, row->encrypt));
         ++row;
     }
     EXPECT_EQ(row, rows.end());

@@ -1,6 +1,7 @@
 #include "tests/wireless/scripted_driver.h"
 
 #include <dlfcn.h>
+#include <spawn.h>
 #include <sys/socket.h>
 
 #include <algorithm>
@@ -27,8 +28,11 @@ int Answer(ScriptedDriver& driver, unsigned long request, iwreq& argument) {
     if (driver.atEachRequest) {
         driver.atEachRequest();
     }
-    driver.interfacesAskedFor.emplace(argument.ifr_name,
-                                      strnlen(argument.ifr_name, sizeof argument.ifr_name));
+    const std::string interface(argument.ifr_name,
+                                strnlen(argument.ifr_name, sizeof argument.ifr_name));
+    if (driver.interfacesAskedFor.count(interface) == 0) {  // insert() takes memory at once
+        driver.interfacesAskedFor.insert(interface);
+    }
     if (driver.refused.count(request) > 0) {
         return Fail(EOPNOTSUPP);
     }
@@ -108,11 +112,15 @@ extern "C" __attribute__((visibility("default"))) int socket(int domain, int typ
     return next(domain, type, protocol);
 }
 
-extern "C" __attribute__((visibility("default"))) int system(const char* command) {
+extern "C" __attribute__((visibility("default"))) int posix_spawn(
+    pid_t* process, const char* path, const posix_spawn_file_actions_t* actions,
+    const posix_spawnattr_t* attributes, char* const arguments[], char* const environment[]) {
+    constexpr int kCommand = 2;  // behind "sh -c"
     if (living != nullptr && !living->unrunnable.empty() &&
-        strstr(command, living->unrunnable.c_str()) != nullptr) {
-        return -1;
+        strstr(arguments[kCommand], living->unrunnable.c_str()) != nullptr) {
+        return EAGAIN;
     }
-    static const auto next = reinterpret_cast<decltype(&system)>(dlsym(RTLD_NEXT, "system"));
-    return next(command);
+    static const auto next =
+        reinterpret_cast<decltype(&posix_spawn)>(dlsym(RTLD_NEXT, "posix_spawn"));
+    return next(process, path, actions, attributes, arguments, environment);
 }

@@ -96,7 +96,7 @@ std::string BssidText(const std::array<unsigned char, 6>& bssid) {
 // channel and essid stand in their columns, whatever their length.
 std::string Line(const std::string& channel, const std::string& essid, const std::string& rest) {
     char line[128];
-    snprintf(line, sizeof line, "%-4.4s %-32.32s ", channel.c_str(), essid.c_str());
+    snprintf(line, sizeof line, "%-5.5s%-32.32s ", channel.c_str(), essid.c_str());
     return line + rest + '\n';
 }
 
