@@ -1,4 +1,5 @@
 // taviwireless: the library's functions for a person or a script.
+#include <signal.h>
 #include <syslog.h>
 
 #include <CLI/CLI.hpp>
@@ -25,6 +26,7 @@ int Fail(const Options& options, ExitStatus status, const std::string& sentence)
 }  // namespace
 
 int main(int argc, char** argv) {
+    signal(SIGCHLD, SIG_DFL);  // what started this may ignore it, and then no program has a result
     CLI::App app("Wireless connectivity of the appliance: USB modems and Wi-Fi", "taviwireless");
     Options options;
     app.set_version_flag("--version", "taviwireless " TAVI_VERSION);

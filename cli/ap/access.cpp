@@ -7,14 +7,18 @@
 
 #include <cerrno>
 #include <cstdio>
-#include <cstdlib>
 #include <cstring>
-#include <memory>
 
+#include "cli/ap/dry_run.h"
+#include "cli/ap/words.h"
 #include "cli/commands.h"
+#include "cli/output.h"
 #include "cli/wifi/access.h"
+#include "wireless/ap_files.h"
 #include "wireless/ap_settings.h"
+#include "wireless/bridge_name.h"
 #include "wireless/paths.h"
+#include "wireless/shell.h"
 
 namespace taviwireless::cli {
 
@@ -36,15 +40,21 @@ struct Defaults {
     void WriteOnly(const char*, const char (&)[Size]) const {}
 };
 
+// Nothing where no adapter is named, or where the user may not read the store. One that cannot be
+// read for another reason is a failure: what it holds may be what protects a network.
 std::optional<WirelessAPSettings> FindSettings() {
     char section[sizeof WirelessAPSettings::name];
-    const bool mayRead = access(kAPSettings, R_OK) == 0 || errno == ENOENT;
+    const bool mayRead = access(kAPSettings, R_OK) == 0 || errno != EACCES;
     if (!mayRead || access(wireless::kAdapterInfo, R_OK) != 0 ||
-        TAVIWirelessApConfigSecNameGet(section, sizeof section) != 1) {
+        TAVIWirelessApConfigSecNameGet(section, sizeof section) != 1 || section[0] == '\0') {
         return std::nullopt;
     }
     WirelessAPSettings settings{};
-    if (TAVIWirelessGetAPConfig(section, &settings) <= 0) {
+    const int found = TAVIWirelessGetAPConfig(section, &settings);
+    if (found < 0) {
+        throw CommandError(kFailure, std::string("cannot read the settings in ") + kAPSettings);
+    }
+    if (found == 0) {
         // Without a section the guests' part is empty; stored like that, it would take down the
         // barriers that are up by default.
         const Defaults defaults;
@@ -53,18 +63,57 @@ std::optional<WirelessAPSettings> FindSettings() {
     return settings;
 }
 
-void Store(const WirelessAPSettings& settings) {
-    if (TAVIWirelessSetAPConfig(&settings) != 1) {
+// Whether the section says how the network is protected, be it not at all.
+bool IsStored(const WirelessAPSettings& settings) {
+    char kind[16];
+    return VEXACFileGetSectionValue(kAPSettings, settings.name, "encryption", kind, sizeof kind) ==
+           0;
+}
+
+void RequireStored(bool isDone) {
+    if (!isDone) {
         throw CommandError(kFailure, std::string("cannot store the settings in ") + kAPSettings +
                                          "; the system log tells why");
     }
 }
 
+void Store(const WirelessAPSettings& settings) {
+    RequireStored(TAVIWirelessSetAPConfig(&settings) == 1);
+}
+
+// Nothing else in the file changes.
+void StoreEnabled(const WirelessAPSettings& settings, const char* yesOrNo) {
+    RequireStored(
+        VEXACFileSetSectionValue(kAPSettings, settings.name, "enable", yesOrNo, "\t%s=%s\n") == 0);
+}
+
+// Settings with which an access point may be served; throws when there are none.
+WirelessAPSettings SettingsToServe() {
+    WirelessAPSettings settings = ReadAPSettings();
+    if (!IsStored(settings)) {
+        throw CommandError(kFailure, "no settings are stored for the adapter " +
+                                         Printable(settings.name) +
+                                         "; taviwireless ap set stores them");
+    }
+    if (SecurityWord(MainNetwork(settings.ap)).empty()) {
+        throw CommandError(kFailure,
+                           "the stored security is none that is known here; set security");
+    }
+    if (const std::string reason = wireless::WhyNoBridge(settings.ap.bridge); !reason.empty()) {
+        throw CommandError(kFailure, "bridge " + reason);
+    }
+    return settings;
+}
+
 bool HasChannels() {
-    const std::string command =
-        std::string("iwlist ") + TAVIWirelessAPInterfaceGet() + " active_channel";
-    const std::unique_ptr<FILE, decltype(&pclose)> lines(popen(command.c_str(), "r"), pclose);
+    const wireless::Pipe lines(
+        wireless::Command(128, {"iwlist ", TAVIWirelessAPInterfaceGet(), " active_channel"}));
     return lines && fgetc(lines.get()) != EOF;
+}
+
+bool HasProgram(const char* name) {
+    return wireless::Pipe(wireless::Command(128, {"command -v ", name, " > /dev/null"})).Close() ==
+           0;
 }
 
 // The library says only that it failed; these are what commonly stands behind that.
@@ -76,7 +125,7 @@ std::string CauseOfFailure() {
     if (statvfs("/etc", &disk) == 0 && disk.f_bavail == 0) {
         return "there is no space left for files in /etc";
     }
-    if (system("command -v iwlist >/dev/null") != 0) {
+    if (!HasProgram("iwlist")) {
         return "there is no program iwlist to ask for channels; install it";
     }
     if (!HasChannels()) {
@@ -135,20 +184,28 @@ void SwitchAPOn() {
                            "an access point is being switched on already; if that was interrupted, "
                            "try again");
     }
-    WirelessAPSettings settings = ReadAPSettings();
+    const WirelessAPSettings settings = SettingsToServe();
     const bool wasOff = settings.enabled == 0;
     if (wasOff) {
-        settings.enabled = 1;
-        StoreAPSettings(settings);
+        StoreEnabled(settings, "yes");
     }
     if (TAVIWirelessAPEnable() != 1) {
+        const std::string cause = CauseOfFailure();
         if (wasOff) {
-            settings.enabled = 0;
-            Store(settings);
+            TAVIWirelessAPDisable();  // of the last step, much may run already
+            StoreEnabled(settings, "no");
         }
-        throw CommandError(kFailure,
-                           "the access point could not be switched on: " + CauseOfFailure());
+        throw CommandError(kFailure, "the access point could not be switched on: " + cause);
     }
+}
+
+std::vector<std::string> PlanAP() {
+    const WirelessAPSettings settings = SettingsToServe();
+    if (access(wireless::kNetworkScript, X_OK) != 0) {
+        throw CommandError(kFailure,
+                           std::string("there is no program ") + wireless::kNetworkScript);
+    }
+    return PlanOfEnabling(settings.ap);
 }
 
 void SwitchAPOff() {
@@ -157,9 +214,8 @@ void SwitchAPOff() {
                            "the access point could not be switched off; the system log tells why");
     }
     // Those of an adapter that was pulled out cannot be found; its network goes all the same.
-    if (auto settings = FindSettings()) {
-        settings->enabled = 0;
-        Store(*settings);
+    if (const auto settings = FindSettings(); settings && settings->enabled != 0) {
+        StoreEnabled(*settings, "no");
     }
 }
 

@@ -5,6 +5,7 @@
 
 #include <optional>
 #include <string>
+#include <vector>
 
 namespace taviwireless::cli {
 
@@ -20,14 +21,17 @@ struct APStatus {
 };
 APStatus LookAtAP();
 
-// The settings of the adapter that is plugged in: those stored, or the defaults.
+// The settings of the adapter that is plugged in: those stored, or the defaults where none are.
 WirelessAPSettings ReadAPSettings();
 // Stores them whether they say that the access point is on or off.
 void StoreAPSettings(WirelessAPSettings settings);
 
-// Stores that the access point is on, and switches it on. When that fails, what was stored before
-// counts again.
+// Stores that the access point is on, and switches it on: with stored settings only, never with
+// defaults, which are those of an open network. When that fails and it was stored as off, it is
+// switched off and stored as off again.
 void SwitchAPOn();
+// What switching it on would do to the network of the machine, in lines; does none of it.
+std::vector<std::string> PlanAP();
 // Switches it off, and stores that.
 void SwitchAPOff();
 

@@ -7,7 +7,6 @@
 #include <cstdio>
 #include <cstring>
 #include <iostream>
-#include <memory>
 #include <sstream>
 
 #include "cli/ap/access.h"
@@ -17,6 +16,7 @@
 #include "cli/wifi/access.h"
 #include "wireless/ap_files.h"
 #include "wireless/hostapd_conf.h"
+#include "wireless/shell.h"
 
 namespace taviwireless::cli {
 
@@ -60,7 +60,7 @@ std::string HideSecrets(const std::string& text) {
 // A file of no folder, which nobody else can read and which is gone when the program ends.
 class MemoryFile {
   public:
-    explicit MemoryFile(const std::string& text) : handle_(memfd_create("hostapd", 0)) {
+    explicit MemoryFile(const std::string& text) : handle_(memfd_create("hostapd", MFD_CLOEXEC)) {
         if (handle_ < 0 || write(handle_, text.data(), text.size()) != ssize_t(text.size())) {
             throw CommandError(kFailure, "there is no memory for hostapd's settings");
         }
@@ -69,8 +69,10 @@ class MemoryFile {
     MemoryFile(const MemoryFile&) = delete;
     MemoryFile& operator=(const MemoryFile&) = delete;
 
-    // For programs that are started.
-    std::string Path() const { return "/proc/self/fd/" + std::to_string(handle_); }
+    // For programs that are started, while this lives.
+    std::string Path() const {
+        return "/proc/" + std::to_string(getpid()) + "/fd/" + std::to_string(handle_);
+    }
 
   private:
     int handle_;
@@ -84,8 +86,8 @@ struct Verdict {
 // "Line 7: ..." counts through both files.
 Verdict AskHostapd(const std::string& text) {
     const MemoryFile file(text + kStopper + "=1\n");
-    const std::string command = "hostapd " + file.Path() + " 2>&1";
-    const std::unique_ptr<FILE, decltype(&pclose)> output(popen(command.c_str(), "r"), pclose);
+    const wireless::Pipe output(
+        wireless::Command(128, {"hostapd ", wireless::Argument{file.Path()}, " 2>&1"}));
     Verdict verdict;
     char line[1024];
     while (output && fgets(line, sizeof line, output.get()) != nullptr) {

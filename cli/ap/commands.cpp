@@ -6,7 +6,6 @@
 #include <CLI/CLI.hpp>
 
 #include "cli/ap/access.h"
-#include "cli/ap/dry_run.h"
 #include "cli/ap/output.h"
 #include "cli/ap/settings.h"
 #include "cli/ap/words.h"
@@ -57,7 +56,7 @@ std::string WhoCanJoin(WirelessAPConf conf) {
 void ShowPlan(const Options& options) {
     Json::Value document;
     Table table;
-    for (const std::string& line : PlanOfEnabling(ReadAPSettings().ap)) {
+    for (const std::string& line : PlanAP()) {
         document["plan"].append(line);
         table.push_back({Printable(line)});
     }

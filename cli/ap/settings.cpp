@@ -12,6 +12,7 @@
 #include "cli/secret.h"
 #include "cli/wifi/access.h"
 #include "cli/wifi/settings.h"
+#include "wireless/bridge_name.h"
 
 namespace taviwireless::cli {
 
@@ -42,11 +43,14 @@ int ParseNumber(const std::string& value, int last, const char* what) {
     return number;
 }
 
-void SetBridge(WirelessAPConf& conf, APNetwork&, const std::string& value) {
-    const bool fits = !value.empty() && value.size() < sizeof conf.bridge;
-    if (!fits || value.find_first_of("/: \t") != std::string::npos || !IsPrintable(value)) {
-        throw CommandError(kUsage, "bridge is the name of an interface, 1 to 15 characters");
+void CheckBridge(const std::string& bridge) {
+    if (const std::string reason = wireless::WhyNoBridge(bridge); !reason.empty()) {
+        throw CommandError(kUsage, "bridge " + reason);
     }
+}
+
+void SetBridge(WirelessAPConf& conf, APNetwork&, const std::string& value) {
+    CheckBridge(value);
     SetField(conf.bridge, value);
 }
 
@@ -293,6 +297,7 @@ void ApplyAPChanges(const std::vector<APChange>& changes, WirelessAPConf& conf) 
 }
 
 void CheckAPConf(WirelessAPConf conf) {
+    CheckBridge(conf.bridge);
     const APNetwork network = MainNetwork(conf);
     CheckNetwork(network);
     CheckRadio(conf);

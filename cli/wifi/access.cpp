@@ -9,12 +9,14 @@
 #include <memory>
 
 #include "wireless/driver_request.h"
+#include "wireless/interface.h"
+#include "wireless/line_break.h"
+#include "wireless/paths.h"
+#include "wireless/presence.h"
 
 namespace taviwireless::cli {
 
 namespace {
-
-constexpr char kSavedNetworks[] = "/usr/tavi/etc/wireless.conf";
 
 // The members of a list that the library made, which are freed.
 template <typename Record>
@@ -40,8 +42,7 @@ void UpdateBssid(unsigned char (&bssid)[6]) {
 }  // namespace
 
 std::string WifiInterface() {
-    const char* interface = TAVIWirelessInterfaceGet();
-    return interface == nullptr ? "" : interface;
+    return wireless::WirelessInterface();
 }
 
 void RequireWifiSupport() {
@@ -85,7 +86,7 @@ void CheckEssid(const std::string& essid) {
     if (essid.empty() || essid.size() >= WIRELESS_ESSID_SIZE) {
         throw CommandError(kUsage, "the name of a network has 1 to 32 bytes");
     }
-    if (essid.find('\n') != std::string::npos) {
+    if (wireless::HoldsLineBreak(essid)) {
         throw CommandError(kUsage, "the name of a network may not hold a line break");
     }
 }
@@ -107,13 +108,13 @@ std::vector<WirelessNetwork> Scan() {
 }
 
 std::vector<WirelessConf> SavedNetworks() {
-    if (access(kSavedNetworks, F_OK) != 0) {
+    if (wireless::Look(wireless::kSavedNetworks) == wireless::Presence::kMissing) {
         return {};  // none was ever saved
     }
     WirelessLink confs{&confs, &confs};
     if (TAVIWirelessConfEnumByAtime(&confs) != 0) {
         throw CommandError(kFailure, std::string("cannot read the saved networks in ") +
-                                         kSavedNetworks + "; the system log tells why");
+                                         wireless::kSavedNetworks + "; the system log tells why");
     }
     return Take<WirelessConf>(confs);
 }

@@ -9,6 +9,7 @@
 #include "cli/output.h"
 #include "cli/secret.h"
 #include "cli/wifi/access.h"
+#include "wireless/line_break.h"
 
 namespace taviwireless::cli {
 
@@ -141,7 +142,7 @@ void CheckKey(Security security, const std::string& key) {
 }
 
 void CheckUser(const std::string& user) {
-    if (user.size() >= WIRELESS_KEY_SIZE || user.find('\n') != std::string::npos) {
+    if (user.size() >= WIRELESS_KEY_SIZE || wireless::HoldsLineBreak(user)) {
         throw CommandError(kUsage, "a user name has at most 256 bytes and no line break");
     }
 }

@@ -32,7 +32,13 @@ struct APCommands : testing::Test {
         WriteFile("/etc.defaults/taviinfo.conf", "support_wireless=yes\nsupport_pci_wifi=yes\n");
         WriteFile("/tmp/wireless.info", "PRODUCT=stick\nAP_SUPPORT=yes\n");
         tools.Add("/sbin/iwlist", "echo '11 channels'");
-        tools.Add("/etc/rc.network", "[ ! -e /tmp/no-network ] && touch /tmp/master");
+        tools.Add("/etc/rc.network",
+                  "case $* in '--dry-run restart wlan0 lbr0')\n"
+                  "    [ ! -e /tmp/no-network ] || { echo no route left >&2; exit 1; }\n"
+                  "    printf 'make bridge lbr0\\nstart hostapd\\n'; exit;;\n"
+                  "esac\n"
+                  "[ -e /etc/hostapd/hostapd-wlan0.info ] || { rm -f /tmp/master; exit 0; }\n"
+                  "touch /tmp/master; [ ! -e /tmp/no-network ]");
     }
     ~APCommands() override { Shell("rm -f /tmp/no-network /tmp/master /tmp/wireless.info"); }
     ToolStandIns tools;
@@ -107,6 +113,13 @@ TEST_F(APCommands, AWrongSettingChangesNothing) {
         {{"max-stations=0"}, "", "max-stations is a number from 1 to 2007"},
         {{"max-stations=2008"}, "", "max-stations is a number from 1 to 2007"},
         {{"bridge=0123456789abcdef"}, "", "bridge is the name of an interface"},
+        {{"bridge=--help"}, "", "bridge is the name of an interface"},
+        {{"bridge= "}, "", "bridge is the name of an interface"},
+        {{"bridge=#"}, "", "bridge is the name of an interface"},
+        {{"bridge=gbr"}, "", "bridge cannot be gbr, an interface that is no bridge of the main"},
+        {{"bridge=wlan0"}, "", "bridge cannot be wlan0, "},
+        {{"bridge=lo"}, "", "bridge cannot be lo, "},
+        {{"ssid=a\rb"}, "", "the name of a network may not hold a line break"},
         {{"passphrase=geheim77"}, "", "passphrase is read from standard input, where nobody"},
         {{"security=wpa3"}, "", "security cannot be wpa3; it is one of open, wep, wpa, wpa2, "},
         {{"guest-security=wpa-eap"}, "", "security cannot be wpa-eap; it is one of open, wep"},
@@ -199,6 +212,7 @@ TEST_F(APCommands, ACheckNamesWhatHostapdRefusesAndIncludesTheGuestsWhereTheMode
 }
 
 TEST_F(APCommands, ItIsSwitchedOnAndOff) {
+    ASSERT_EQ(Set({"security=open"}).status, 0);
     EXPECT_EQ(AP({"enable"}).out,
               "wlan0: access point Merilond switched on, open: everybody can join\n");
     EXPECT_THAT(tools.Commands(), Contains("/etc/rc.network restart wlan0 lbr0"));
@@ -218,6 +232,44 @@ TEST_F(APCommands, ItIsSwitchedOnAndOff) {
     Shell("rm /tmp/wireless.info");  // the adapter is unplugged
     EXPECT_EQ(AP({"disable"}).status, 0);
     EXPECT_FALSE(Exists("/etc/hostapd/hostapd-wlan0.info"));
+}
+
+TEST_F(APCommands, WithoutStoredSettingsOfItsOwnItIsNotSwitchedOn) {
+    const std::string stub = "[stick]\n\tenable=no\n";
+    for (const std::string& stored :
+         {std::string(), std::string("[other]\n\tenable=yes\n"), stub}) {
+        Shell("rm -f " + std::string(kStored));
+        stored.empty() ? void() : WriteFile(kStored, stored);
+        for (const char* command : {"--verbose", "--dry-run"}) {
+            EXPECT_THAT(AP({"enable", command}).err,
+                        HasSubstr("taviwireless: no settings are stored for the adapter stick; "
+                                  "taviwireless ap set stores them\n"));
+        }
+        EXPECT_EQ(AP({"disable"}).status, kFailure);  // it was never on
+        EXPECT_EQ(stored, stored.empty() ? "" : ReadFile(kStored));
+    }
+    for (const char* line : {"bridge=eth0", "bridge=", "encryption=9"}) {
+        WriteFile(kStored, "[stick]\n\tenable=no\n\t" + std::string(line) + "\n\tencryption=0\n");
+        EXPECT_EQ(AP({"enable"}).status, kFailure) << line;
+    }
+    EXPECT_THAT(tools.Commands(), testing::IsEmpty());
+    EXPECT_EQ(Shell("ls -A /etc/hostapd"), "");
+}
+
+TEST_F(APCommands, AFailingLookAtTheStoreServesNoOpenNetworkAndLosesNoPassphrase) {
+    ASSERT_EQ(Set({"security=wpa2", "passphrase"}, "the phrase\n").status, 0);
+    const std::string stored = ReadFile(kStored);
+    for (int n = 1; n <= 6; ++n) {
+        RunProgram({"env", "FAILING_STAT=" + std::to_string(n),
+                    BuiltProgram("taviwireless_with_wifi"), "ap", "enable"});
+        RunProgram({"env", "FAILING_STAT=" + std::to_string(n),
+                    BuiltProgram("taviwireless_with_wifi"), "ap", "set", "ssid=Merilond"});
+        EXPECT_EQ(Shell("grep -L '^wpa_passphrase=the phrase$' "
+                        "/etc/hostapd/hostapd-wlan0-host.conf 2> /dev/null; true"),
+                  "");
+        AP({"disable"});
+        EXPECT_EQ(ReadFile(kStored), stored) << n;
+    }
 }
 
 TEST_F(APCommands, AFailedStartSaysWhyAndLeavesItOff) {
@@ -245,6 +297,7 @@ TEST_F(APCommands, AFailedStartSaysWhyAndLeavesItOff) {
             enable.err,
             testing::EndsWith("could not be switched on: " + std::string(failure.cause) + "\n"));
         EXPECT_EQ(ReadFile(kStored), stored);
+        EXPECT_FALSE(Exists("/tmp/master") || Exists("/etc/hostapd/hostapd-wlan0.info"));
         EXPECT_EQ(AP({"enable"}).status, 0);
         EXPECT_EQ(AP({"disable"}).status, 0);
     }
@@ -255,6 +308,7 @@ TEST_F(APCommands, AnInterruptedStartIsInTheWayOnce) {
     EXPECT_THAT(AP({"status"}).out, HasSubstr("State             being switched on\n"));
     EXPECT_EQ(AP({"enable"}).status, kBusy);
     EXPECT_FALSE(Exists(kStored));
+    ASSERT_EQ(Set({"security=open"}).status, 0);
     EXPECT_EQ(AP({"enable"}).status, 0);
 }
 

@@ -150,6 +150,7 @@ TEST_F(WifiCommands, FailuresAreOneSentenceAndAnExitStatus) {
         {{"connect", "Old"}, "123456\n", kUsage, "a WEP key has 5 or 13 characters, or 10"},
         {{"connect", "Old"}, "123456789x\n", kUsage, "a WEP key has 5 or 13 characters, or 10"},
         {{"connect", "Work"}, "", kUsage, "Work wants a user name; add --user NAME"},
+        {{"connect", "a\rb"}, "", kUsage, "the name of a network may not hold a line break"},
         {{"connect", std::string(33, 'n')}, "", kUsage, "the name of a network has 1 to 32 bytes"},
         {{"connect", "X", "--static", "192.168.9.2"}, "", kUsage, "192.168.9.2 is no address"},
         {{"connect", "X", "--static", "1.2.3.4/33"}, "", kUsage, "1.2.3.4/33 is no address"},
