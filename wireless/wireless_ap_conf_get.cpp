@@ -10,8 +10,8 @@
 #include "common/sz_hash.h"
 #include "wireless/ap_settings.h"
 #include "wireless/guarded.h"
+#include "wireless/is_missing.h"
 #include "wireless/paths.h"
-#include "wireless/presence.h"
 
 namespace taviwireless::wireless {
 
@@ -58,7 +58,7 @@ int Read(const char* section, WirelessAPSettings* settings) {
     // No key is there yet. What concerns guests stays empty until there is a section.
     Reader reader(values);
     VisitMainNetwork(reader, *settings);
-    if (Look(kAPSettings) == Presence::kMissing) {
+    if (IsMissing(kAPSettings)) {
         return 0;
     }
     const int result = VEXACFileGetSection(kAPSettings, section, values.Address());

@@ -8,9 +8,9 @@
 #include "wireless/ap_settings.h"
 #include "wireless/grep_pattern.h"
 #include "wireless/guarded.h"
+#include "wireless/is_missing.h"
 #include "wireless/new_file.h"
 #include "wireless/paths.h"
-#include "wireless/presence.h"
 #include "wireless/shell.h"
 
 namespace taviwireless::wireless {
@@ -67,7 +67,7 @@ bool IsReadable(const char* section) {
 // Whether "[section]" stands anywhere in the file, in any case; a value that holds it counts as
 // well, and then there is no section to replace.
 Found FindSection(const char* section) {
-    if (Look(kAPSettings) == Presence::kMissing) {
+    if (IsMissing(kAPSettings)) {
         if (!MakeSureOf(kAPSettings, kMode)) {
             TAVI_LOG_ERROR("Failed to touch %s", kAPSettings);
             return Found::kFailed;

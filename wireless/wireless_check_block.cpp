@@ -7,12 +7,12 @@
 #include <cstring>
 
 #include "common/sz_hash.h"
+#include "wireless/is_missing.h"
 #include "wireless/paths.h"
-#include "wireless/presence.h"
 
 int TAVIWirelessCheckBlock() {
     using namespace taviwireless::wireless;
-    if (Look(kAPSettings) == Presence::kMissing) {
+    if (IsMissing(kAPSettings)) {
         return 1;
     }
     char product[1024];

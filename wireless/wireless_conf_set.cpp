@@ -9,9 +9,9 @@
 #include "common/log.h"
 #include "common/sz_hash.h"
 #include "wireless/guarded.h"
+#include "wireless/is_missing.h"
 #include "wireless/new_file.h"
 #include "wireless/paths.h"
-#include "wireless/presence.h"
 
 namespace taviwireless::wireless {
 
@@ -33,7 +33,7 @@ bool CreateFile() {
 
 // Loads what was saved of the network earlier.
 Found LoadSection(const char* section, SzHash& values) {
-    if (Look(kSavedNetworks) == Presence::kMissing) {
+    if (IsMissing(kSavedNetworks)) {
         return CreateFile() ? Found::kNew : Found::kFailed;
     }
     const int result = VEXACFileGetSection(kSavedNetworks, section, values.Address());

@@ -5,10 +5,11 @@
 #include <cstdio>
 #include <cstring>
 
+#include "base/interface_name.h"
 #include "common/log.h"
 
 int TAVIWirelessIfconfigSet(const char* interface, const WirelessConf* conf) {
-    if (interface == nullptr || conf == nullptr) {
+    if (interface == nullptr || conf == nullptr || !taviwireless::IsInterfaceName(interface)) {
         TAVI_LOG_ERROR("Bad parameters");
         return -1;
     }

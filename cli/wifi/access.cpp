@@ -10,9 +10,9 @@
 
 #include "wireless/driver_request.h"
 #include "wireless/interface.h"
+#include "wireless/is_missing.h"
 #include "wireless/line_break.h"
 #include "wireless/paths.h"
-#include "wireless/presence.h"
 
 namespace taviwireless::cli {
 
@@ -108,7 +108,7 @@ std::vector<WirelessNetwork> Scan() {
 }
 
 std::vector<WirelessConf> SavedNetworks() {
-    if (wireless::Look(wireless::kSavedNetworks) == wireless::Presence::kMissing) {
+    if (wireless::IsMissing(wireless::kSavedNetworks)) {
         return {};  // none was ever saved
     }
     WirelessLink confs{&confs, &confs};

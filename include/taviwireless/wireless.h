@@ -7,6 +7,9 @@
  * - An int result is 0 for success and -1 for failure where nothing else is said; the functions of
  *   the access point return 1 and 0. A failure is a line in the system log; a null argument fails
  *   with "Bad parameters".
+ * - The name of an interface has 1 to 15 letters, digits, "_", "." and "-", of which the first is a
+ *   letter or a digit; another text is a bad parameter. So is a null that the SDK gives for the
+ *   wireless interface.
  * - Records are plain and may be zeroed with memset. Texts in them end in a zero byte.
  * - Lists are circular queues of links, as insque() knows them. The caller owns the head, which the
  *   functions make empty first, and the members: unlink each and free() it. Members are records of
@@ -218,14 +221,16 @@ TAVIWIRELESS_API int TAVIWirelessNetworkGet(const void* key, int keyKind, Wirele
 
 /*
  * 1 when the radio may be used, 0 when the user's setting "unblock=no" of the plugged adapter's
- * section in "/usr/tavi/etc/wireless_ap.conf" forbids it, -1 when that cannot be told.
+ * section in "/usr/tavi/etc/wireless_ap.conf" forbids it, -1 when that cannot be told, also because
+ * the file cannot be read.
  */
 TAVIWIRELESS_API int TAVIWirelessCheckBlock(void);
 /*
  * Joins conf->network: writes "/usr/tavi/etc/wpa_supplicant.conf", starts wpa_supplicant and waits
  * up to 15 seconds until it is associated. Addresses are set by TAVIWirelessIfconfigSet. An opmode
  * of ad-hoc creates that network instead. Returns 0 also when the radio is blocked: there is
- * nothing to do then. While it runs, a second caller fails.
+ * nothing to do then. While it runs, a second caller fails. A line break, which a carriage return
+ * is, too, in a text that the supplicant would be given fails before it is stopped.
  */
 TAVIWIRELESS_API int TAVIWirelessNetworkConnect(WirelessConf* conf);
 /*
@@ -398,12 +403,13 @@ TAVIWIRELESS_API int TAVIWirelessApConfigSecNameGet(char* buf, size_t size);
 /*
  * Fills *settings with what is stored under the section name, and with defaults for the rest.
  * Returns a positive number when the section was read; 0 with the defaults when there is no file;
- * what the SDK says, 0 or below, when there is no such section; -1 for bad arguments.
+ * what the SDK says, 0 or below, when there is no such section; -1 for bad arguments, and when the
+ * file cannot be looked at.
  */
 TAVIWIRELESS_API int TAVIWirelessGetAPConfig(const char* section, WirelessAPSettings* settings);
 /*
  * Stores the settings under settings->name. With enabled 0 only that is stored, and everything else
- * stays as it is in the file. Returns 1, or 0 on failure, with the file as it was.
+ * stays as it is in the file. Returns 1, or 0 on failure, also of memory, with the file as it was.
  */
 TAVIWIRELESS_API int TAVIWirelessSetAPConfig(const WirelessAPSettings* settings);
 
@@ -414,7 +420,9 @@ TAVIWIRELESS_API int TAVIWirelessSetAPConfig(const WirelessAPSettings* settings)
  * address and DHCP service, the interface's file, and "/etc/rc.network restart" with the interface
  * and the bridge. Waits up to five seconds for the adapter's channels. Returns 1; 0 on failure,
  * when the settings say that it is off, and while another caller does the same. What was written
- * before a failure stays.
+ * before a failure stays; but a bridge that can be none (no name of an interface, the adapter
+ * itself, "eth0", the guests' "gbr" and "gwlan", or an interface that is there and no bridge) is
+ * refused before anything is written.
  */
 TAVIWIRELESS_API int TAVIWirelessAPEnable(void);
 /*
@@ -424,9 +432,12 @@ TAVIWIRELESS_API int TAVIWirelessAPEnable(void);
 TAVIWIRELESS_API int TAVIWirelessAPDisable(void);
 /* "wlan0", a constant. */
 TAVIWIRELESS_API const char* TAVIWirelessAPInterfaceGet(void);
-/* Whether an access point is being switched on, here or by another process: 1 or 0. */
+/*
+ * Whether an access point is being switched on, here or by another process: 1 or 0. What others
+ * than root and the own user put in the flag's place does not count.
+ */
 TAVIWIRELESS_API int TAVIWirelessAPIsConnecting(void);
-/* The same as the SDK tells it: non-zero or 0. */
+/* Whether there is a file of the flag's name, as the SDK tells it: non-zero or 0. */
 TAVIWIRELESS_API int TAVIWirelessTestAPMode(void);
 /* 1 when an adapter is present and "/tmp/wireless.info" says AP_SUPPORT=yes, else 0. */
 TAVIWIRELESS_API int TAVIWirelessAPIsSupported(void);

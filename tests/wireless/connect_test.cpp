@@ -184,8 +184,9 @@ TEST(Connect, FailsCleanlyAndNeverLeavesTheFlag) {
 TEST(Connect, GivesTheSupplicantNothingOfItsCaller) {
     Station station;
     station.tools.Add("/usr/sbin/wpa_supplicant",
-                      "{ ls -l /proc/$$/fd; grep -E '^Sig(Blk|Ign)' /proc/$$/status; pwd; } "
-                      "> /tmp/inherited; touch /tmp/started");
+                      "{ while read l; do case $l in Sig[BI]*) echo \"$l\"; esac; done\n"
+                      "pwd; ls -l /proc/$$/fd; } < /proc/$$/status > /tmp/inherited\n"
+                      "touch /tmp/started");
     WriteFile("/tmp/callers", "");
     const int descriptor = open("/tmp/callers", O_RDONLY);
     const auto folder = std::filesystem::current_path();

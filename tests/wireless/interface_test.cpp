@@ -135,7 +135,8 @@ TEST(IfconfigSet, SetsAStaticAddressOrThatOfALease) {
     EXPECT_TRUE(station.log.Has("Failed to set network interface"));
     EXPECT_EQ(TAVIWirelessIfconfigSet(nullptr, &conf), -1);
     EXPECT_EQ(TAVIWirelessIfconfigSet("wlan0", nullptr), -1);
-    EXPECT_EQ(station.log.Count("Bad parameters"), 2);
+    EXPECT_EQ(TAVIWirelessIfconfigSet("--help", &conf), -1);
+    EXPECT_EQ(station.log.Count("Bad parameters"), 3);
 }
 
 TEST(IsSingle, WhenNoOtherInterfaceIsConnected) {
