@@ -16,8 +16,13 @@ int gFailingAllocation = 0;  // counted from 1
 }  // namespace
 
 // In the place of the C++ library's, for the libraries as well.
+__attribute__((visibility("default"))) void* operator new(size_t size,
+                                                          const std::nothrow_t&) noexcept {
+    return --gFailingAllocation == 0 ? nullptr : malloc(size);
+}
+
 __attribute__((visibility("default"))) void* operator new(size_t size) {
-    void* memory = --gFailingAllocation == 0 ? nullptr : malloc(size);
+    void* memory = operator new(size, std::nothrow);
     if (memory == nullptr) {
         throw std::bad_alloc();
     }
@@ -104,8 +109,6 @@ TEST(Memory, NoExceptionLeavesAFunction) {
     WirelessConf conf = MakeConf();
     ASSERT_EQ(TAVIWirelessConfSet(&conf), 0);
     const SleepCapture sleeps;
-    wireless::OwnedList<WirelessNetwork> networks;
-    wireless::OwnedList<WirelessConf> confs;
     WirelessNetwork found;
     WirelessStatus status;
     WirelessInfo info;
@@ -114,8 +117,10 @@ TEST(Memory, NoExceptionLeavesAFunction) {
     adhoc.network.opmode = WIRELESS_OPMODE_ADHOC;
     char text[32];
     const std::function<void()> kCalls[] = {
-        [&] { TAVIWirelessNetworkScan(1, networks.Head()); },
-        [&] { wireless::FreeMembers<WirelessNetwork>(*networks.Head()); },
+        [&] {
+            wireless::OwnedList<WirelessNetwork> networks;
+            TAVIWirelessNetworkScan(1, networks.Head());
+        },
         [&] { TAVIWirelessNetworkGet("net", WIRELESS_KEY_ESSID, &found); },
         [&] { TAVIWirelessNetworkConnect(&conf); },
         [&] { TAVIWirelessNetworkDisconnect_core(); },
@@ -123,8 +128,10 @@ TEST(Memory, NoExceptionLeavesAFunction) {
         [&] { TAVIWirelessCurInfoGet(WIRELESS_INFO_PROTOCOL, &info); },
         [&] { TAVIWirelessAdhocCreate(&adhoc); },
         [&] { TAVIWirelessAdhocNetworkGet(&found); },
-        [&] { TAVIWirelessConfEnumByAtime(confs.Head()); },
-        [&] { wireless::FreeMembers<WirelessConf>(*confs.Head()); },
+        [&] {
+            wireless::OwnedList<WirelessConf> confs;
+            TAVIWirelessConfEnumByAtime(confs.Head());
+        },
         [&] { TAVIWirelessAutoConnect(); },
         [&] { TAVIWirelessDefaultGatewaySet("10.0.0.1"); },
         [&] { TAVIWirelessDefaultGatewayConfGet_core(text, sizeof text); },
