@@ -59,9 +59,6 @@ struct Options {
     std::string security;       // of a hidden network
     bool wep = false;           // adhoc: with a WEP key
     std::string mode;           // "ap" or "client"
-
-    // ap
-    bool dryRun = false;  // enable: only show what would be done
 };
 
 // Each adds a group of commands. A command runs while the arguments are parsed and throws
