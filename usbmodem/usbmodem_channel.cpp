@@ -178,6 +178,9 @@ int USBModem::Exchange(const std::string& cmd, std::string& reply) {
     }
     if (DrainDeviceBuffer() != 0) {
         TAVI_LOG_ERROR("failed on drain buffer");
+        while (!IsError()) {  // nothing can be asked of a modem that never stops talking
+            IncreaseErrorCounter();
+        }
         return -1;
     }
     const std::string line = cmd + '\r';

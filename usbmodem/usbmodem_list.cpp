@@ -2,6 +2,7 @@
 #include <tavicore/file.h>
 #include <taviwireless/usbmodem_list.h>
 
+#include <algorithm>
 #include <cerrno>
 #include <climits>
 #include <cstdlib>
@@ -83,6 +84,13 @@ void USBModemList::DropUnplugged() {
             records_.erase(records_.begin() + static_cast<std::ptrdiff_t>(i));
         }
     }
+}
+
+void USBModemList::Drop(int interfaceId) {
+    const auto has = [interfaceId](const USBModem& modem) {
+        return modem.GetIfid() == static_cast<unsigned int>(interfaceId);
+    };
+    records_.erase(std::remove_if(records_.begin(), records_.end(), has), records_.end());
 }
 
 int USBModemList::Update() {

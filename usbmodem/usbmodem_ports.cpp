@@ -124,7 +124,11 @@ int USBModem::AssignConnectInfo() {
 }
 
 int USBModem::InitInfo() {
-    if (!FindPortsAndPrepare()) {
+    return CompleteInit(FindPortsAndPrepare());
+}
+
+int USBModem::CompleteInit(bool isPrepared) {
+    if (!isPrepared) {
         initState_ = kInitFailed;
         CloseFileDevice();
         UnsetATInterface();
@@ -160,6 +164,10 @@ bool USBModem::FindPortsAndPrepare() {
         TAVI_LOG_ERROR("failed on parsing quary device node");
         return false;
     }
+    return Prepare();
+}
+
+bool USBModem::Prepare() {
     if (SetHardwareFuncLvl("1") != 0) {
         TAVI_LOG_ERROR("failed on setting hardware function lvl");
         return false;

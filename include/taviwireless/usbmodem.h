@@ -90,6 +90,15 @@ class TAVIWIRELESS_API USBModem {
     // the record may be initialised again.
     int InitInfo();
 
+    // The same when another process has found out that queryNode answers, as GetQueryNode told it:
+    // no port is searched and nothing is tried twice, so that the caller is not kept waiting.
+    int InitInfo(const std::string& queryNode);
+    // The query port's device path; empty while none was found.
+    std::string GetQueryNode() const;
+    // Whether the query port is open and still the one that its path names: false once it hung up,
+    // as it does when the modem is unplugged or reset. Sends nothing.
+    bool IsPortAlive() const;
+
     // Chooses the command set by USB_ID_VENDOR, the generic one if that is unknown or missing.
     void SetATInterface();
     void UnsetATInterface();
@@ -247,6 +256,16 @@ class TAVIWIRELESS_API USBModem {
     // Ends the dialler (SIGTERM), and gives the default route back if the profile says that the
     // link took it. Returns -1 when there is no dialler, or the route could not be given back.
     int NetDisconnect();
+    // Learns from files alone which connection this modem has, for a record that did not dial it:
+    // the SIM by the name of the running dialler's log, and with it profile and interface. Returns
+    // 1 when that is known, 0 when there is no dialler, -1 when the SIM cannot be told.
+    int RecallConnection();
+    // Ends what is left of the connection of a modem that was unplugged or reset, from files alone:
+    // the dialler, its pid file, and the default route that the link took. The route is given back
+    // also when the dialler has ended by itself. Closes the channel; the record is of no use
+    // afterwards. Returns 0, also when there was no connection; -1 when there is no default route
+    // to give back.
+    int EndConnection();
     // Looks at the link. Returns 1 when it is settled (up, down or lost: the modem is not busy any
     // more), 2 while it comes up, -1 on error. A dialler that gives up while it connects is ended.
     int UpdateNetStatus();
@@ -292,6 +311,8 @@ class TAVIWIRELESS_API USBModem {
 
     USBModem_ATIF& CommandSet() const;
     bool FindPortsAndPrepare();
+    bool Prepare();
+    int CompleteInit(bool isPrepared);
     bool Open(const std::string& node, std::string& error);
     int Exchange(const std::string& cmd, std::string& reply);
     int QuerySIMStatus(std::string& reply);

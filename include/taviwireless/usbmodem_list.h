@@ -12,7 +12,7 @@ namespace taviwireless::usbmodem_lib {
 // The modems that are plugged in, in the order in which they were found. Owns their records.
 //
 // A list has no lock: it belongs to the thread that owns it. References to records stay valid until
-// the next SearchInfoPath, DropUnplugged or Update.
+// the next SearchInfoPath, DropUnplugged, Drop or Update.
 class TAVIWIRELESS_API USBModemList {
   public:
     USBModemList();
@@ -26,6 +26,9 @@ class TAVIWIRELESS_API USBModemList {
     // Drops the modems whose info file is gone, or is not one that counts any more. Of two modems
     // unplugged at once whose records are neighbours, the second is dropped by the next call.
     void DropUnplugged();
+
+    // Drops this modem, whatever its info file.
+    void Drop(int interfaceId);
 
     // Brings the list up to date: SearchInfoPath, DropUnplugged, and InitInfo for each modem that
     // is not initialised. Returns 0, or -1 as soon as one modem cannot be initialised (up to six

@@ -179,5 +179,43 @@ TEST(Update, DropsOneOfTwoNeighboursThatAreGoneAndTheOtherTheNextTime) {
     EXPECT_THAT(DevIds(modems.list), IsEmpty());
 }
 
+// Whoever is on the machine may write in "/tmp/".
+TEST(Search, TakesNoFilesOfStrangers) {
+    const struct {
+        const char* what;
+        const char* made;  // by a command
+    } kFiles[] = {
+        {"a link", "ln -s /tmp/usbmodem.info0"},
+        {"a pipe", "mkfifo"},
+        {"a folder", "mkdir"},
+        {"a large file", "truncate -s 3G"},
+        {"somebody else's", "install -o 65534 /tmp/usbmodem.info0"},
+    };
+    WriteFile("/tmp/usbmodem.info0", "USB_ID_VENDOR=12d1\n");
+    USBModemList list;
+    for (const auto& file : kFiles) {
+        SCOPED_TRACE(file.what);
+        RunProgram({"sh", "-c", std::string(file.made) + " /tmp/usbmodem.info7"});
+        ASSERT_TRUE(std::filesystem::is_symlink("/tmp/usbmodem.info7") ||
+                    Exists("/tmp/usbmodem.info7"));
+        EXPECT_EQ(list.SearchInfoPath(), 0);
+        EXPECT_THAT(DevIds(list), ElementsAre("usbmodem0"));
+        USBModem record(7, "/tmp/usbmodem.info7");
+        EXPECT_EQ(record.AssignConnectNode(), -1);
+        std::filesystem::remove("/tmp/usbmodem.info7");
+    }
+}
+
+TEST(List, DropsTheOneModemThatItIsTold) {
+    for (const std::string id : {"0", "1", "2"}) {
+        WriteFile("/tmp/usbmodem.info" + id, "");
+    }
+    USBModemList list;
+    ASSERT_EQ(list.SearchInfoPath(), 0);
+    list.Drop(1);
+    list.Drop(9);
+    EXPECT_THAT(DevIds(list), ElementsAre("usbmodem0", "usbmodem2"));
+}
+
 }  // namespace
 }  // namespace taviwireless::test
