@@ -1,5 +1,7 @@
 #include "dbus/usbmodem_documents.h"
 
+#include <chrono>
+#include <functional>
 #include <sstream>
 
 namespace taviwireless::dbus {
@@ -8,11 +10,17 @@ namespace {
 
 using usbmodem_lib::USBModem;
 
+// A modem that answers has begun to do so long before; one that does not takes longer than this.
+constexpr std::chrono::milliseconds kPatience{1000};
+
 // Values stand in a document as they come, without escapes, and what could not be read is empty:
 // front ends read these layouts line by line and know no others.
+//
+// Once a modem does not answer any more, the rest of the document is what is known of it: others
+// are waiting, and every question to it costs a second or more.
 class Document {
   public:
-    explicit Document(USBModem& modem) : modem_(modem) {}
+    explicit Document(USBModem& modem) : modem_(&modem) {}
 
     void Quoted(const char* indent, const char* key, const std::string& value) {
         text_ << indent << '"' << key << "\": \"" << value << "\",\n";
@@ -23,15 +31,36 @@ class Document {
     }
     void Line(const char* line) { text_ << line << '\n'; }
 
-    using Query = std::string (USBModem::*)(bool& err);
-    std::string Ask(Query query) {
-        bool ignored = false;
-        return (modem_.*query)(ignored);
+    // query(modem, err) returns what is asked for.
+    template <typename Query>
+    auto Ask(Query query) {
+        bool err = false;
+        const auto begin = std::chrono::steady_clock::now();
+        const auto answer = std::invoke(query, *modem_, err);
+        if (err && std::chrono::steady_clock::now() - begin > kPatience && IsMute()) {
+            modem_->IncreaseErrorCounter();
+            known_ = *modem_;
+            known_.CloseFileDevice();  // the copy's; nothing can be asked of it any more
+            modem_ = &known_;
+        }
+        return answer;
+    }
+    // The same for a number that is negative when it could not be read.
+    int AskNumber(int (USBModem::*query)()) {
+        return Ask([query](USBModem& modem, bool& err) {
+            const int number = (modem.*query)();
+            err = number < 0;
+            return number;
+        });
     }
     std::string Text() const { return text_.str(); }
 
   private:
-    USBModem& modem_;
+    // Some modems leave a command that they do not know unanswered, but every one answers this.
+    bool IsMute() { return modem_->IsError() || modem_->UpdateSIMStatus() < 0; }
+
+    USBModem* modem_;
+    USBModem known_{0, ""};
     std::ostringstream text_;
 };
 
@@ -61,19 +90,19 @@ std::string ProfileDocument(USBModem& modem) {
 std::string ModemDocument(USBModem& modem) {
     modem.UpdateNetStatus();
     Document document(modem);
-    bool ignored = false;
     document.Line("{");
     document.Quoted("\t", "id", modem.GetDevId());
     document.Quoted("\t", "product", document.Ask(&USBModem::GetProductName));
     document.Quoted("\t", "vendor", document.Ask(&USBModem::GetVendorName));
-    document.Bare("\t", "signal", modem.GetSignalQuality(ignored));
+    document.Bare("\t", "signal", document.Ask(&USBModem::GetSignalQuality));
     document.Quoted("\t", "ip", document.Ask(&USBModem::GetNetLocalIP));
     document.Quoted("\t", "carrier", document.Ask(&USBModem::GetDefaultISP));
     document.Quoted("\t", "net_status", document.Ask(&USBModem::GetNetStatus));
     document.Quoted("\t", "sim_status", document.Ask(&USBModem::GetPINStatus));
-    document.Bare("\t", "pin_protected", modem.PINGetEnableProtection() != 0 ? "true" : "false");
-    document.Bare("\t", "pin_remains", modem.PINGetAttemptRemain());
-    document.Bare("\t", "puk_remains", modem.PUKGetAttemptRemain());
+    const bool isProtected = document.AskNumber(&USBModem::PINGetEnableProtection) != 0;
+    document.Bare("\t", "pin_protected", isProtected ? "true" : "false");
+    document.Bare("\t", "pin_remains", document.AskNumber(&USBModem::PINGetAttemptRemain));
+    document.Bare("\t", "puk_remains", document.AskNumber(&USBModem::PUKGetAttemptRemain));
     document.Line("\t\"profile\": ");
     document.Line("\t{");
     AddProfile(document, "\t\t");

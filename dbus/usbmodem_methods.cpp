@@ -68,6 +68,11 @@ gboolean Finish(int result, const char* failure, const char* devid, GError** err
                        : Fail(error, -result, std::string(failure) + " [" + devid + "]", line);
 }
 
+// D-Bus carries UTF-8 only; a modem may send anything, and an interface may have any name.
+char* ToUTF8(const std::string& text) {
+    return g_utf8_make_valid(text.c_str(), static_cast<gssize>(text.size()));
+}
+
 // One line per modem that is ready for use.
 template <typename Describe>
 gboolean ListModems(USBModemObject* object, char** list, GError** error, Describe describe,
@@ -81,13 +86,17 @@ gboolean ListModems(USBModemObject* object, char** list, GError** error, Describ
             text += describe(modem) + '\n';
         }
     }
-    *list = g_strdup(text.c_str());
+    *list = ToUTF8(text);
     return TRUE;
 }
 
-// D-Bus carries UTF-8 only, and a modem may send anything.
-char* ToUTF8(const std::string& text) {
-    return g_utf8_make_valid(text.c_str(), static_cast<gssize>(text.size()));
+// Sleeps, through signals. Returns whether there were any.
+bool SleepOut(unsigned int seconds) {
+    const unsigned int left = sleep(seconds);
+    for (unsigned int rest = left; rest > 0;) {
+        rest = sleep(rest);
+    }
+    return left > 0;
 }
 
 constexpr const char* kProfileKeys[] = {"apn",  "number",   "user", "pass",
@@ -228,10 +237,15 @@ gboolean usbmodem_set_profile(USBModemObject* object, char* devid, char* profile
         }
     }
     if (wasConnected) {
-        sleep(kReconnectPause);
+        // A signal that is to end the service does not cut the pause: the change is completed
+        // first.
+        const bool wasInterrupted = SleepOut(kReconnectPause);
         const int result = modem->NetConnect();
         if (result < 0) {
             return Fail(error, -result, "Failed to Connect " + id);
+        }
+        if (wasInterrupted) {
+            syslog(LOG_INFO, "%s was connected again with its changed profile", devid);
         }
     }
     return TRUE;

@@ -3,6 +3,7 @@
 
 #include <gmock/gmock.h>
 #include <sys/stat.h>
+#include <unistd.h>
 
 #include <memory>
 #include <set>
@@ -134,6 +135,48 @@ TEST(Methods, AnswerTheDocumentsByteForByte) {
     ASSERT_EQ(service.Do(usbmodem_set_profile, "usbmodem1", "user=\xFF").isDone, true);
     const std::string document = service.Ask(usbmodem_get_profile, "usbmodem1").text;
     EXPECT_TRUE(g_utf8_validate(document.c_str(), -1, nullptr)) << document;
+}
+
+// Others wait meanwhile, so a modem is given up for this time.
+TEST(Methods, AskAModemNothingMoreOnceItIsSilent) {
+    Service service({"--modem", "12d1"});
+    ASSERT_EQ(service.object->list.Update(), 0);
+    ASSERT_TRUE(service.Ask(usbmodem_get_usbmodem, "usbmodem0").isDone);
+    service.simulator.Fault("0", "silent");
+    service.simulator.Received("0");
+    const std::string document = service.Ask(usbmodem_get_usbmodem, "usbmodem0").text;
+    EXPECT_THAT(service.simulator.Received("0"), testing::ElementsAre("AT+CGMM", "AT+CPIN?"));
+    for (const char* const known : {"\"product\": \"E1752\"", "\"vendor\": \"huawei\"",
+                                    "\"signal\": 0", "\"sim_status\": \"no_sim\""}) {
+        EXPECT_THAT(document, HasSubstr(known));
+    }
+    EXPECT_FALSE(service.object->list.FindUSBModem(0).IsError());
+    // One that leaves a single command unanswered is asked on.
+    service.simulator.Fault("0", "off");
+    service.simulator.Fault("0", "noecho");
+    service.simulator.Reply("0", "AT+CGMM", "");
+    const std::string next = service.Ask(usbmodem_get_usbmodem, "usbmodem0").text;
+    EXPECT_THAT(next, HasSubstr("\"product\": \"E1752\""));
+    EXPECT_THAT(next, HasSubstr("\"signal\": 54"));
+}
+
+TEST(Methods, ReplaceWhatIsNoUTF8InTheNamesOfInterfaces) {
+    InstallDialler(
+        "printf -- '--> Using interface ppp\\377\\n secondary DNS address' >&2;"
+        "exec sleep 1000");
+    RunProgram({"sh", "-c",
+                "name=$(printf 'ppp\\377'); ip link add \"$name\" type veth peer name far;"
+                "ip address add 10.64.64.64/32 dev \"$name\""});
+    Service service({"--modem", "12d1"});
+    ASSERT_EQ(service.object->list.Update(), 0);
+    ASSERT_TRUE(service.Do(usbmodem_connect, "usbmodem0").isDone);
+    std::string list = "\n";
+    for (int i = 0; i < 1000 && list == "\n"; ++i) {
+        usleep(20000);  // for the dialler to say it
+        service.Ask(usbmodem_get_usbmodem, "usbmodem0");
+        list = service.Ask(usbmodem_get_usbmodem_if_list).text;
+    }
+    EXPECT_EQ(list, "ppp\xEF\xBF\xBD\n");
 }
 
 TEST(Methods, ListTheModemsThatAreReady) {
@@ -278,8 +321,10 @@ TEST(SetProfile, ReconnectsAModemThatWasConnected) {
     bool err = false;
     EXPECT_NE(modem.GetProfileISP(err), "new");
     EXPECT_TRUE(sleeps.Calls().empty());
+    sleeps.InterruptNext(2);  // by the signal that is to end the service
     ASSERT_TRUE(service.Do(usbmodem_set_profile, "usbmodem0", "apn=other").isDone);
-    EXPECT_THAT(sleeps.Calls(), testing::ElementsAre(3));
+    EXPECT_THAT(sleeps.Calls(), testing::ElementsAre(3, 2));
+    EXPECT_TRUE(service.log.Has("usbmodem0 was connected again with its changed profile"));
     ASSERT_TRUE(becomesConnected());
     EXPECT_TRUE(service.Do(usbmodem_disconnect, "usbmodem0").isDone);
     EXPECT_EQ(service.Do(usbmodem_disconnect, "usbmodem0").text,

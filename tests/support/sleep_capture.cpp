@@ -3,6 +3,7 @@
 #include <cstdlib>
 #include <mutex>
 #include <numeric>
+#include <utility>
 
 namespace taviwireless::test {
 namespace {
@@ -12,22 +13,27 @@ struct Record {
     bool alive = false;
     std::vector<unsigned> calls;
     SleepCapture::Hook atEachSleep;
+    unsigned leftByNext = 0;  // seconds
 };
 
 Record record;
 
-void RecordSleep(unsigned seconds) {
+// Returns what the sleep returns.
+unsigned RecordSleep(unsigned seconds) {
     SleepCapture::Hook hook;
+    unsigned left = 0;
     {
         const std::lock_guard<std::mutex> lock(record.mutex);
         if (record.alive) {
             record.calls.push_back(seconds);
             hook = record.atEachSleep;
+            left = std::exchange(record.leftByNext, 0);
         }
     }
     if (hook) {  // without the lock: it may ask for Calls()
         hook(seconds);
     }
+    return left;
 }
 
 }  // namespace
@@ -39,6 +45,7 @@ SleepCapture::SleepCapture(Hook atEachSleep) {
     }
     record.alive = true;
     record.calls.clear();
+    record.leftByNext = 0;
     record.atEachSleep = std::move(atEachSleep);
 }
 
@@ -46,6 +53,11 @@ SleepCapture::~SleepCapture() {
     const std::lock_guard<std::mutex> lock(record.mutex);
     record.alive = false;
     record.atEachSleep = nullptr;
+}
+
+void SleepCapture::InterruptNext(unsigned secondsLeft) {
+    const std::lock_guard<std::mutex> lock(record.mutex);
+    record.leftByNext = secondsLeft;
 }
 
 std::vector<unsigned> SleepCapture::Calls() const {
@@ -61,6 +73,5 @@ unsigned SleepCapture::Total() const {
 }  // namespace taviwireless::test
 
 extern "C" __attribute__((visibility("default"))) unsigned sleep(unsigned seconds) {
-    taviwireless::test::RecordSleep(seconds);
-    return 0;
+    return taviwireless::test::RecordSleep(seconds);
 }

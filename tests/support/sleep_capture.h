@@ -9,8 +9,8 @@ namespace taviwireless::test {
 // Records the calls of sleep() while it lives; at most one may live at a time.
 //
 // A program linked with tavi_test_support defines sleep() itself, for the shared libraries it loads
-// as well: it always returns 0 at once, with or without a SleepCapture. usleep(), nanosleep() and
-// waiting in poll() or select() stay as they are.
+// as well: it returns 0 at once, with or without a SleepCapture, unless told otherwise. usleep(),
+// nanosleep() and waiting in poll() or select() stay as they are.
 class SleepCapture {
   public:
     // Called with the seconds at each sleep, after it was recorded and in the thread that sleeps:
@@ -21,6 +21,9 @@ class SleepCapture {
     ~SleepCapture();
     SleepCapture(const SleepCapture&) = delete;
     SleepCapture& operator=(const SleepCapture&) = delete;
+
+    // The next sleep returns this, as one that a signal ends so many seconds early.
+    void InterruptNext(unsigned secondsLeft);
 
     std::vector<unsigned> Calls() const;  // the seconds of each call, in order
     unsigned Total() const;               // their sum
