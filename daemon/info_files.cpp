@@ -1,6 +1,11 @@
 #include "daemon/info_files.h"
 
-#include <sys/stat.h>
+#include <syslog.h>
+
+#include <cerrno>
+#include <cstring>
+
+#include "base/trusted_file.h"
 
 namespace taviwireless::daemon {
 
@@ -8,12 +13,19 @@ std::string InfoPath(int interfaceId) {
     return "/tmp/usbmodem.info" + std::to_string(interfaceId);
 }
 
-std::optional<FileStamp> Stamp(const std::string& path) {
-    struct stat file {};
-    if (stat(path.c_str(), &file) != 0) {
-        return std::nullopt;
+std::optional<std::string> ReadInfoFile(int interfaceId) {
+    auto text = ReadTrusted(InfoPath(interfaceId));
+    const bool isNone = errno == ENOENT || errno == EPERM || errno == ELOOP || errno == EFBIG;
+    if (!text && !isNone) {
+        syslog(LOG_ERR, "cannot read %s: %s", InfoPath(interfaceId).c_str(), strerror(errno));
+        return "";
     }
-    return FileStamp(file.st_ino, file.st_mtim.tv_sec, file.st_mtim.tv_nsec);
+    return text;
+}
+
+bool NamesPorts(const std::string& info) {
+    return info.find("CONNECTNODE=") != std::string::npos &&
+           info.find("DEVICENODE=") != std::string::npos;
 }
 
 }  // namespace taviwireless::daemon

@@ -3,17 +3,18 @@
 
 #include <optional>
 #include <string>
-#include <tuple>
 
 namespace taviwireless::daemon {
 
 // The info file of a modem, which hot-plug writes.
 std::string InfoPath(int interfaceId);
 
-// Tells two writings of a file apart: inode, seconds and nanoseconds of the last change.
-using FileStamp = std::tuple<unsigned long, long, long>;
-// Nothing when there is no such file.
-std::optional<FileStamp> Stamp(const std::string& path);
+// What the info file says; nothing when the modem is not plugged in: there is no such file, or only
+// one of somebody who has no say here. An empty text when it cannot be read now.
+std::optional<std::string> ReadInfoFile(int interfaceId);
+
+// Whether the text names the ports. A file that is still being written may not.
+bool NamesPorts(const std::string& info);
 
 }  // namespace taviwireless::daemon
 

@@ -5,19 +5,47 @@
 
 #include <algorithm>
 
+#include "daemon/info_files.h"
 #include "daemon/semaphore_sets.h"
 
 namespace taviwireless::daemon {
 
 namespace {
 
+using usbmodem_lib::USBModem;
+
 constexpr guint kFirstPause = 2;     // seconds
 constexpr guint kLongestPause = 60;  // seconds
+
+// Whether the SIM is known, without which the next look at a connection that runs would take its
+// log for missing and end it. One that waits for its PIN, or is not there, has nothing to tell.
+bool KnowsItsSIM(USBModem& modem) {
+    const int connection = modem.RecallConnection();
+    if (connection > 0) {
+        return true;
+    }
+    constexpr int kReady = 1;
+    constexpr int kUnknown = -1;
+    const int sim = modem.UpdateSIMStatus();
+    if (sim != kReady) {
+        return connection == 0 && sim != kUnknown;
+    }
+    bool failed = false;
+    modem.GetIMSI(failed);
+    return !failed;
+}
+
+USBModem NewRecord(int interfaceId) {
+    USBModem modem(static_cast<unsigned int>(interfaceId), InfoPath(interfaceId));
+    modem.RecallConnection();
+    return modem;
+}
 
 }  // namespace
 
 Initialisation::Initialisation(usbmodem_lib::USBModemList& list, int interfaceId)
     : list_(list), interfaceId_(interfaceId), pause_(kFirstPause) {
+    list_.FindUSBModem(interfaceId_) = NewRecord(interfaceId_);
     Try();
 }
 
@@ -28,20 +56,20 @@ Initialisation::~Initialisation() {
 }
 
 void Initialisation::Try() {
-    probe_.emplace(interfaceId_, [this](bool answers) { Probed(answers); });
+    probe_.emplace(interfaceId_, [this](const std::string& queryNode) { Probed(queryNode); });
 }
 
-void Initialisation::Probed(bool answers) {
+void Initialisation::Probed(const std::string& queryNode) {
     probe_.reset();
-    usbmodem_lib::USBModem& modem = list_.FindUSBModem(interfaceId_);
-    if (answers && modem.InitInfo() == 0) {
-        // A connection that was dialled before this process started is found by the IMSI, and taken
-        // for a failed one without it.
-        bool ignored = false;
-        modem.GetIMSI(ignored);
+    USBModem& modem = list_.FindUSBModem(interfaceId_);
+    if (!queryNode.empty() && modem.InitInfo(queryNode) == 0) {
+        const bool isReady = KnowsItsSIM(modem);
         RemovePrivateSemaphoreSets(getpid());
-        syslog(LOG_INFO, "usbmodem%d is ready", interfaceId_);
-        return;
+        if (isReady) {
+            syslog(LOG_INFO, "usbmodem%d is ready", interfaceId_);
+            return;
+        }
+        modem = NewRecord(interfaceId_);
     }
     syslog(LOG_WARNING, "usbmodem%d does not answer; next try in %u s", interfaceId_, pause_);
     retry_ = g_timeout_add_seconds(

@@ -5,14 +5,15 @@
 #include <taviwireless/usbmodem_list.h>
 
 #include <optional>
+#include <string>
 
-#include "daemon/info_files.h"
 #include "daemon/probe.h"
 
 namespace taviwireless::daemon {
 
 // Makes one modem of the list ready for use, and tries again with growing pauses while it does not
-// answer.
+// answer, or does not tell its SIM. Until then it has a record of which nothing can be asked, but
+// which knows the connection that another process may have dialled.
 class Initialisation {
   public:
     // Starts. The modem is looked up in list whenever something is done with it.
@@ -23,7 +24,7 @@ class Initialisation {
 
   private:
     void Try();
-    void Probed(bool answers);
+    void Probed(const std::string& queryNode);
 
     usbmodem_lib::USBModemList& list_;
     int interfaceId_;

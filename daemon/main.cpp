@@ -1,4 +1,5 @@
 // usbmodemd: serves the USB modems that are plugged in on the session bus.
+#include <fcntl.h>
 #include <glib-unix.h>
 #include <syslog.h>
 #include <taviwireless/usbmodem_server.h>
@@ -17,6 +18,7 @@
 #include "daemon/probe.h"
 #include "daemon/semaphore_sets.h"
 #include "daemon/session_bus.h"
+#include "daemon/watchdog.h"
 
 using namespace taviwireless::daemon;
 using taviwireless::dbus::USBModemServer;
@@ -26,6 +28,7 @@ namespace {
 constexpr char kName[] = "usbmodemd";
 constexpr char kService[] = "com.merilond.usbmodem";
 constexpr int kUsageError = 2;
+constexpr guint kLookPause = 5;  // seconds between looks at the modems
 
 constexpr char kDescription[] =
     "Serves the USB modems that are plugged in as com.merilond.usbmodem on the session bus.\n"
@@ -75,6 +78,16 @@ bool ParseOptions(int argc, char** argv) {
     return isRight;
 }
 
+// Whoever started the program may have closed these. A socket that got one of their numbers would
+// be overwritten by what is meant for a standard one.
+void FillStandardDescriptors() {
+    int descriptor = 0;
+    while (descriptor >= 0 && descriptor <= STDERR_FILENO) {
+        descriptor = open("/dev/null", O_RDWR);
+    }
+    close(descriptor);
+}
+
 // What GLib and dbus-glib have to say goes where everything else goes.
 void LogToSystem(const gchar* domain, GLogLevelFlags, const gchar* message, gpointer) {
     syslog(LOG_WARNING, "%s: %s", domain != nullptr ? domain : "GLib", message);
@@ -92,33 +105,47 @@ void TakeName(USBModemServer& server, const SessionBus& bus) {
     }
 }
 
+gboolean End(gpointer server) {
+    syslog(LOG_INFO, "told to end; connections stay up");
+    static_cast<USBModemServer*>(server)->QuitLoop();
+    return G_SOURCE_CONTINUE;
+}
+
+gboolean LookAfterModems(gpointer keeper) {
+    static_cast<ModemKeeper*>(keeper)->LookAfterModems();
+    return G_SOURCE_CONTINUE;
+}
+
 // Serves until a signal or the end of the bus. Returns the exit status.
 int Serve(std::optional<Background>& background) {
     int status = EXIT_SUCCESS;
     USBModemServer* running = nullptr;
-    SessionBus bus([] { RemovePrivateSemaphoreSets(getpid()); },
-                   [&] {
-                       syslog(LOG_ERR, "the session bus has gone away; ending");
-                       status = EXIT_FAILURE;
-                       running->QuitLoop();
-                   });
+    ModemKeeper* modems = nullptr;
+    SessionBus bus(
+        [&] {
+            RemovePrivateSemaphoreSets(getpid());
+            modems->LookAfterModems();
+        },
+        [&] {
+            syslog(LOG_ERR, "the session bus has gone away; ending");
+            status = EXIT_FAILURE;
+            running->QuitLoop();
+        });
     USBModemServer server;
     running = &server;
     TakeName(server, bus);
     ModemKeeper keeper(*server.GetList());
+    modems = &keeper;
     InfoFileWatch watch([&keeper] { keeper.Rescan(); });
     for (const int number : {SIGTERM, SIGINT}) {
-        g_unix_signal_add(
-            number,
-            [](gpointer ended) -> gboolean {
-                static_cast<USBModemServer*>(ended)->QuitLoop();
-                return G_SOURCE_CONTINUE;
-            },
-            &server);
+        g_unix_signal_add(number, End, &server);
     }
+    g_timeout_add_seconds(kLookPause, LookAfterModems, &keeper);
+    FeedWatchdog();
     if (background) {
         background->Ready();
     }
+    ModemKeeper::EndOrphanedConnections();
     keeper.Rescan();
     server.StartLoop();
     return status;
@@ -127,6 +154,7 @@ int Serve(std::optional<Background>& background) {
 }  // namespace
 
 int main(int argc, char** argv) {
+    FillStandardDescriptors();
     if (!ParseOptions(argc, argv)) {
         return kUsageError;
     }

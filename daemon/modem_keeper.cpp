@@ -1,10 +1,14 @@
 #include "daemon/modem_keeper.h"
 
 #include <syslog.h>
+#include <tavicore/file.h>
 
-#include <algorithm>
+#include <cstdlib>
+#include <vector>
 
+#include "common/sz_list.h"
 #include "daemon/info_files.h"
+#include "usbmodem/state_files.h"
 
 namespace taviwireless::daemon {
 
@@ -12,58 +16,84 @@ namespace {
 
 using usbmodem_lib::USBModem;
 
-// Ends the connection of a modem that is gone, so that the machine gets its default route back. The
-// dialler may have noticed before us and ended by itself; then the route is still to be set.
-void HangUp(USBModem& modem) {
-    bool err = false;
-    const bool hadLink = !modem.GetNetIFName(err).empty() || !modem.IsNetDisconnected(err);
-    if (hadLink && modem.NetDisconnect() != 0 && modem.GetProfileDefaultGW(err) == "true") {
-        modem.RestoreDefaultRoute();
+std::vector<int> InterfaceIds(usbmodem_lib::USBModemList& list) {
+    std::vector<int> ids;
+    for (const USBModem& modem : list) {
+        ids.push_back(static_cast<int>(modem.GetIfid()));
     }
-}
-
-bool IsUnplugged(const USBModem& modem) {
-    return !modem.IsInfoExist();
+    return ids;
 }
 
 }  // namespace
 
+void ModemKeeper::EndOrphanedConnections() {
+    const std::string prefix = usbmodem_lib::kPidFilePrefix;
+    const std::string name = prefix.substr(prefix.rfind('/') + 1);
+    SzList files(64);
+    VEXACFileEnumDir(usbmodem_lib::kStateDirectory, name.c_str(), files.Address(),
+                     VEXAC_ENUM_FILES);
+    for (int i = 0; i < files.Count(); ++i) {
+        const int id = std::atoi(files[i] + name.size());
+        if (files[i] == name + std::to_string(id) && !ReadInfoFile(id)) {
+            syslog(LOG_INFO, "usbmodem%d was unplugged while nobody looked", id);
+            USBModem(static_cast<unsigned int>(id), InfoPath(id)).EndConnection();
+        }
+    }
+}
+
 void ModemKeeper::Rescan() {
     list_.SearchInfoPath();
-    Drop();
-    Take();
-}
-
-void ModemKeeper::Drop() {
-    for (USBModem& modem : list_) {
-        if (IsUnplugged(modem)) {
-            syslog(LOG_INFO, "%s was unplugged", modem.GetDevId().c_str());
-            HangUp(modem);
-        }
-    }
-    while (std::any_of(list_.begin(), list_.end(), IsUnplugged)) {
-        list_.DropUnplugged();
-    }
-    for (auto modem = modems_.begin(); modem != modems_.end();) {
-        modem = list_.FindUSBModem(modem->first).IsNull() ? modems_.erase(modem) : ++modem;
+    for (const int id : InterfaceIds(list_)) {
+        Look(id);
     }
 }
 
-void ModemKeeper::Take() {
-    for (USBModem& record : list_) {
-        const int id = static_cast<int>(record.GetIfid());
-        const auto stamp = Stamp(InfoPath(id));
-        const auto known = modems_.find(id);
-        if (!stamp || (known != modems_.end() && known->second.stamp == *stamp)) {
+void ModemKeeper::LookAfterModems() {
+    for (const int id : InterfaceIds(list_)) {
+        USBModem& modem = list_.FindUSBModem(id);
+        if (!modem.IsInited()) {
             continue;
         }
-        syslog(LOG_INFO, "%s was plugged in", record.GetDevId().c_str());
-        if (known != modems_.end()) {
-            HangUp(record);
-            record = USBModem(record.GetIfid(), InfoPath(id));
+        if (modem.IsError()) {
+            syslog(LOG_WARNING, "usbmodem%d does not answer; out of service", id);
+            modems_[id].initialisation = std::make_unique<Initialisation>(list_, id);
+        } else if (!modem.IsPortAlive()) {
+            Look(id);
         }
-        modems_[id] = {*stamp, std::make_unique<Initialisation>(list_, id)};
     }
+}
+
+void ModemKeeper::Look(int interfaceId) {
+    const auto info = ReadInfoFile(interfaceId);
+    if (!info) {
+        Drop(interfaceId);
+        return;
+    }
+    const auto known = modems_.find(interfaceId);
+    const bool isNew = known == modems_.end();
+    if (!isNew && IsSame(known->second, *info, interfaceId)) {
+        return;
+    }
+    syslog(LOG_INFO, "usbmodem%d was plugged in%s", interfaceId, isNew ? "" : " anew");
+    if (!isNew) {
+        list_.FindUSBModem(interfaceId).EndConnection();
+        modems_.erase(known);
+    }
+    modems_[interfaceId] = {*info, std::make_unique<Initialisation>(list_, interfaceId)};
+}
+
+// Writing the same text again, or touching the file, changes nothing. What counts are the ports: a
+// modem that was unplugged and plugged in faster than anybody looks has others of the same names.
+bool ModemKeeper::IsSame(const Modem& known, const std::string& info, int interfaceId) {
+    const USBModem& modem = list_.FindUSBModem(interfaceId);
+    return (known.info == info || !NamesPorts(info)) && (!modem.IsInited() || modem.IsPortAlive());
+}
+
+void ModemKeeper::Drop(int interfaceId) {
+    syslog(LOG_INFO, "usbmodem%d was unplugged", interfaceId);
+    list_.FindUSBModem(interfaceId).EndConnection();
+    modems_.erase(interfaceId);
+    list_.Drop(interfaceId);
 }
 
 }  // namespace taviwireless::daemon

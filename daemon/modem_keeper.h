@@ -5,6 +5,7 @@
 
 #include <map>
 #include <memory>
+#include <string>
 
 #include "daemon/initialisation.h"
 
@@ -17,18 +18,28 @@ class ModemKeeper {
     // list is borrowed, and touched from the main loop only.
     explicit ModemKeeper(usbmodem_lib::USBModemList& list) : list_(list) {}
 
+    // Ends the connections of modems that were unplugged while no service ran.
+    static void EndOrphanedConnections();
+
     // Compares the list with the info files: modems that are new are made ready, those that are
-    // gone are dropped, and one whose file was written anew was plugged in anew.
+    // gone are hung up and dropped, and one whose file says something else, or whose port is not
+    // the same any more, was plugged in anew.
     void Rescan();
 
-  private:
-    void Drop();
-    void Take();
+    // Takes modems of which nothing can be asked out of service, and those that were reset: they
+    // are made ready again as new ones are.
+    void LookAfterModems();
 
+  private:
     struct Modem {
-        FileStamp stamp;
+        std::string info;  // what its file said when it was plugged in
         std::unique_ptr<Initialisation> initialisation;
     };
+
+    void Look(int interfaceId);
+    bool IsSame(const Modem& known, const std::string& info, int interfaceId);
+    void Drop(int interfaceId);
+
     usbmodem_lib::USBModemList& list_;
     std::map<int, Modem> modems_;
 };

@@ -4,28 +4,39 @@
 #include <glib.h>
 
 #include <functional>
+#include <string>
 
 namespace taviwireless::daemon {
 
-// Whether a modem answers, found out by a process of its own: a port that is silent or talks
-// without end takes seconds or minutes, in which the service could answer nobody.
+// On which port a modem answers, found out by a process of its own: a port that is silent or talks
+// without end takes seconds or minutes, in which the service could answer nobody. Few processes run
+// at a time; the others wait for their turn.
 class Probe {
   public:
-    // Starts. Calls back from the main loop with the answer, which comes within 15 seconds.
-    Probe(int interfaceId, std::function<void(bool answers)> onEnd);
+    // Gets the query port that answers, or an empty text.
+    using OnEnd = std::function<void(const std::string& queryNode)>;
+
+    // Starts, or waits for its turn. Calls back from the main loop.
+    Probe(int interfaceId, OnEnd onEnd);
     // Does not call back any more.
     ~Probe();
     Probe(const Probe&) = delete;
     Probe& operator=(const Probe&) = delete;
 
-    // What the process does: finds both ports of the modem. Returns its exit status.
+    // What the process does: finds both ports of the modem and prints the query port. Returns its
+    // exit status.
     static int Run(int interfaceId);
 
   private:
+    static void StartWaiting();
+    static void Reap(GPid process, gint status, gpointer probe);
+    void Start();
     void Ended(bool answers);
 
-    std::function<void(bool answers)> onEnd_;
+    int interfaceId_;
+    OnEnd onEnd_;
     GPid process_ = 0;
+    int output_ = -1;  // of the process
     guint watch_ = 0;
     guint failure_ = 0;
 };

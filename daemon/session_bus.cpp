@@ -1,6 +1,7 @@
 #include "daemon/session_bus.h"
 
 #include <glib.h>
+#include <syslog.h>
 #include <taviwireless/dbus_client.h>
 
 #include <stdexcept>
@@ -25,10 +26,13 @@ SessionBus::SessionBus(std::function<void()> onServed, std::function<void()> onL
 }
 
 SessionBus::~SessionBus() {
-    if (served_ != 0) {
-        g_source_remove(served_);
+    for (const unsigned int source : {served_, idle_}) {
+        if (source != 0) {
+            g_source_remove(source);
+        }
     }
     dbus_connection_remove_filter(connection_, Look, this);
+    dbus_connection_flush(connection_);  // the reply to a call that was served last
     dbus_connection_unref(connection_);
 }
 
@@ -43,23 +47,59 @@ std::string SessionBus::OwnerOf(const char* name) const {
     return owner;
 }
 
+// Asked of the bus itself: its signal about the caller still waits behind the calls.
+bool SessionBus::HasLeft(const char* caller) {
+    if (caller == gone_) {
+        return true;
+    }
+    if (!OwnerOf(caller).empty()) {
+        return false;
+    }
+    syslog(LOG_INFO, "the calls of %s are dropped: it has left the bus", caller);
+    gone_ = caller;
+    return true;
+}
+
+// The first source runs before the next call, of which there may always be one; the second once no
+// call is waiting.
+void SessionBus::Serve() {
+    if (served_ == 0) {
+        served_ = g_idle_add_full(
+            G_PRIORITY_HIGH,
+            [](gpointer self) -> gboolean {
+                static_cast<SessionBus*>(self)->served_ = 0;
+                static_cast<SessionBus*>(self)->onServed_();
+                return G_SOURCE_REMOVE;
+            },
+            this, nullptr);
+    }
+    if (idle_ == 0) {
+        idle_ = g_idle_add(
+            [](gpointer self) -> gboolean {
+                static_cast<SessionBus*>(self)->idle_ = 0;
+                return G_SOURCE_REMOVE;
+            },
+            this);
+    }
+}
+
 DBusHandlerResult SessionBus::Look(DBusConnection* /*connection*/, DBusMessage* message,
                                    void* data) {
     auto* self = static_cast<SessionBus*>(data);
     if (dbus_message_is_signal(message, DBUS_INTERFACE_LOCAL, "Disconnected")) {
         self->onLost_();
     }
-    if (dbus_message_get_type(message) == DBUS_MESSAGE_TYPE_METHOD_CALL && self->served_ == 0) {
-        // Before the next call, of which there may always be one.
-        self->served_ = g_idle_add_full(
-            G_PRIORITY_HIGH,
-            [](gpointer idle) -> gboolean {
-                static_cast<SessionBus*>(idle)->served_ = 0;
-                static_cast<SessionBus*>(idle)->onServed_();
-                return G_SOURCE_REMOVE;
-            },
-            self, nullptr);
+    if (dbus_message_get_type(message) != DBUS_MESSAGE_TYPE_METHOD_CALL) {
+        return DBUS_HANDLER_RESULT_NOT_YET_HANDLED;
     }
+    const bool hasWaited = self->idle_ != 0;
+    const char* caller = dbus_message_get_sender(message);
+    // Who wants no reply may leave.
+    if (hasWaited && caller != nullptr && dbus_message_get_no_reply(message) == FALSE &&
+        self->HasLeft(caller)) {
+        return DBUS_HANDLER_RESULT_HANDLED;
+    }
+    self->Serve();
     return DBUS_HANDLER_RESULT_NOT_YET_HANDLED;
 }
 

@@ -13,7 +13,8 @@ namespace taviwireless::daemon {
 class SessionBus {
   public:
     // Throws std::runtime_error when there is no bus. The first function is called after each call
-    // of a method was served, the second when the bus goes away.
+    // of a method was served, the second when the bus goes away. A call that had to wait behind
+    // others and whose caller has left meanwhile is dropped unserved.
     SessionBus(std::function<void()> onServed, std::function<void()> onLost);
     ~SessionBus();
     SessionBus(const SessionBus&) = delete;
@@ -24,11 +25,15 @@ class SessionBus {
 
   private:
     static DBusHandlerResult Look(DBusConnection* connection, DBusMessage* message, void* self);
+    bool HasLeft(const char* caller);
+    void Serve();
 
     std::function<void()> onServed_;
     std::function<void()> onLost_;
     DBusConnection* connection_;
     unsigned int served_ = 0;  // GLib source, while one is waiting
+    unsigned int idle_ = 0;    // likewise; until then calls have been waiting
+    std::string gone_;         // the last caller that had left; names are never used again
 };
 
 }  // namespace taviwireless::daemon

@@ -82,15 +82,55 @@ TEST(Survival, AModemThatBabblesFromTheStartKeepsNobodyWaiting) {
     }
 }
 
-TEST(Survival, ACallerThatDoesNotWaitForItsReply) {
-    RunningService running;
+TEST(Survival, AModemThatBeginsToBabbleIsOutOfServiceUntilItIsQuiet) {
+    PrivateBus bus;
+    ModemSimulator simulator(
+        {"--modem", "generic,id=0,ports=dial/at", "--modem", "12d1,id=1,ports=dial/at"});
+    ModemService service;
+    ASSERT_TRUE(service.Lists({"usbmodem0", "usbmodem1"}));
+    simulator.Fault("0.1", "babble");
+    // Of these only the first is asked of the modem.
+    std::vector<std::future<RunResult>> calls;
     for (int i = 0; i < 3; ++i) {
-        Process caller({"gdbus", "call", "--session", "-d", "com.merilond.usbmodem", "-o", "/",
-                        "-m", "com.merilond.usbmodem.GetUSBModem", "usbmodem0"});
-        std::this_thread::sleep_for(std::chrono::milliseconds(200));
-        caller.Signal(SIGKILL);
+        calls.push_back(std::async(std::launch::async, [] {
+            return CallService({"GetUSBModem", "usbmodem0"});
+        }));
     }
-    EXPECT_TRUE(running.service.Lists({"usbmodem0"}));
+    int refused = 0;
+    for (auto& call : calls) {
+        refused += call.get().err.find("not inited") != std::string::npos;
+    }
+    EXPECT_EQ(refused, 2);
+    EXPECT_TRUE(service.Lists({"usbmodem1"}));
+    EXPECT_THAT(CallService({"GetUSBModem", "usbmodem1"}).out, HasSubstr("E1752"));
+    simulator.Fault("0.1", "off");
+    EXPECT_TRUE(service.Lists({"usbmodem0", "usbmodem1"}));
+}
+
+// Calls that wait behind another are dropped when their caller has left, unless it wants no reply.
+TEST(Survival, CallersThatDoNotWaitForTheirReply) {
+    for (const bool wantsReply : {true, false}) {
+        SCOPED_TRACE(wantsReply);
+        RunningService running;
+        running.simulator.Received("0");
+        DBusConnection* bus = dbus_bus_get_private(DBUS_BUS_SESSION, nullptr);
+        dbus_connection_set_exit_on_disconnect(bus, FALSE);
+        for (int i = 0; i < 4; ++i) {
+            DBusMessage* call = dbus_message_new_method_call(
+                "com.merilond.usbmodem", "/", "com.merilond.usbmodem", "GetUSBModem");
+            const char* devid = "usbmodem0";
+            dbus_message_append_args(call, DBUS_TYPE_STRING, &devid, DBUS_TYPE_INVALID);
+            dbus_message_set_no_reply(call, wantsReply ? FALSE : TRUE);
+            dbus_connection_send(bus, call, nullptr);
+            dbus_message_unref(call);
+        }
+        dbus_connection_flush(bus);
+        dbus_connection_close(bus);
+        dbus_connection_unref(bus);
+        EXPECT_TRUE(running.service.Lists({"usbmodem0"}));  // once all others are through
+        const auto received = running.simulator.Received("0");
+        EXPECT_EQ(std::count(received.begin(), received.end(), "AT+CSQ"), wantsReply ? 1 : 4);
+    }
 }
 
 TEST(Survival, FiftyClientsAtOnce) {

@@ -1,6 +1,5 @@
 // usbmodemd on a real bus: starting, the modems it serves, ending.
 #include <gmock/gmock.h>
-#include <sys/stat.h>
 #include <sys/wait.h>
 #include <taviwireless/usbmodem_client.h>
 
@@ -160,37 +159,50 @@ TEST(Usbmodemd, IsStartedByTheFirstCall) {
     RunProgram({"pkill", "-x", "usbmodemd"});
 }
 
-// A connection is not the daemon's: it stays up over a restart, and the new daemon knows it.
-TEST(Usbmodemd, RestartedKnowsTheConnectionThatRuns) {
-    WriteFile("/etc/ppp/peers/wvdial", "noauth\n");
-    WriteFile("/usr/tavi/bin/wvdial",
-              "#!/bin/sh\nexec 2>>/var/lib/usbmodem/wvdial.log.001010123456789\n"
-              "echo '--> Using interface lo secondary DNS address' >&2\nexec sleep 1000\n");
-    chmod("/usr/tavi/bin/wvdial", 0755);
+TEST(Usbmodemd, LivesWithoutStandardDescriptors) {
     PrivateBus bus;
-    ModemSimulator simulator({"--modem", "12d1,ports=dial/at"});
-    {
-        ModemService service;
-        ASSERT_TRUE(service.Lists({"usbmodem0"}));
-        EXPECT_EQ(CallService({"Connect", "usbmodem0"}).status, 0);
-        service.Daemon().Signal(SIGTERM);
-        EXPECT_EQ(service.Daemon().Wait(), 0);
+    for (const char* const closed : {"<&-", "<&- >&- 2>&-"}) {
+        SCOPED_TRACE(closed);
+        const std::string command = BuiltProgram("usbmodemd") + " " + closed;
+        EXPECT_EQ(RunProgram({"sh", "-c", command}).status, 0);
+        EXPECT_EQ(CallService({"GetUSBModemList"}).out, "('',)\n");
+        RunProgram({"pkill", "-x", "usbmodemd"});
+        while (RunProgram({"pgrep", "-x", "usbmodemd"}).status == 0) {
+        }
     }
-    ModemService service;
-    ASSERT_TRUE(service.Lists({"usbmodem0"}));
-    CallService({"GetUSBModem", "usbmodem0"});  // finds the interface; the next one its address
-    const std::string document = CallService({"GetUSBModem", "usbmodem0"}).out;
-    EXPECT_THAT(document, HasSubstr("\"net_status\": \"connected\""));
-    EXPECT_THAT(document, HasSubstr("\"ip\": \"127.0.0.1\""));
-    EXPECT_EQ(CallService({"GetUSBModemIfList"}).out, "('lo\\n',)\n");
-    // Unplugged while connected: the dialler is ended.
-    simulator.Unplug("0");
-    EXPECT_TRUE(service.Lists({}));
-    const auto isDialling = [] { return RunProgram({"pgrep", "-x", "sleep"}).status == 0; };
-    for (int i = 0; i < 200 && isDialling(); ++i) {
-        std::this_thread::sleep_for(std::chrono::milliseconds(50));
+}
+
+// The most processes that look for a modem's ports at the same time, until all have looked once.
+TEST(Usbmodemd, LooksForFewModemsAtATime) {
+    constexpr int kModems = 8;
+    std::vector<std::string> modems;
+    for (int i = 0; i < kModems; ++i) {
+        modems.insert(modems.end(), {"--modem", "generic,ports=dial/mute,fault=silent"});
     }
-    EXPECT_FALSE(isDialling());
+    PrivateBus bus;
+    ModemSimulator simulator(modems);
+    ModemService service({"sh", "-c", "exec " + BuiltProgram("usbmodemd") + " -f 2>&1"});
+    int most = 0;
+    for (int left = kModems; left > 0;) {
+        const auto line = service.Daemon().ReadLine(std::chrono::milliseconds(50));
+        ASSERT_FALSE(service.Daemon().AtEnd());
+        left -= line && line->find("does not answer; next try in 2 s") != std::string::npos;
+        most = std::max(most, std::stoi(RunProgram({"pgrep", "-cf", "exe --probe "}).out));
+    }
+    EXPECT_GT(most, 1);
+    EXPECT_LE(most, 4);
+}
+
+TEST(Usbmodemd, FindsAQueryPortBehindFourteenSilentOnes) {
+    std::string ports = "dial";
+    for (int i = 0; i < 14; ++i) {
+        ports += "/mute";
+    }
+    ModemSimulator simulator({"--modem", "generic,ports=" + ports + "/at"});
+    const RunResult probe = Usbmodemd({"--probe", "0"});
+    EXPECT_EQ(probe.status, 0);
+    EXPECT_EQ(probe.out, "/dev/ttyUSB15");
+    EXPECT_TRUE(std::filesystem::is_empty("/var/lock"));
 }
 
 }  // namespace

@@ -1,0 +1,199 @@
+// A connection that runs while the service, its modem or the files around it change.
+#include <gmock/gmock.h>
+#include <sys/stat.h>
+
+#include <chrono>
+#include <filesystem>
+#include <functional>
+#include <optional>
+#include <thread>
+
+#include "tests/support/bus.h"
+#include "tests/support/files.h"
+#include "tests/support/modem_simulator.h"
+
+namespace taviwireless::test {
+namespace {
+
+using testing::HasSubstr;
+using testing::StartsWith;
+
+constexpr char kInfo[] = "/tmp/usbmodem.info0";
+
+std::string Shell(const std::string& script) {
+    return RunProgram({"sh", "-c", script}).out;
+}
+
+bool Becomes(const std::function<bool()>& condition) {
+    for (int i = 0; i < 400 && !condition(); ++i) {
+        std::this_thread::sleep_for(std::chrono::milliseconds(25));
+    }
+    return condition();
+}
+
+bool IsDialling() {
+    return RunProgram({"pgrep", "-x", "sleep"}).status == 0;
+}
+
+std::string DefaultRoute() {
+    return RunProgram({"ip", "route", "show", "default"}).out;
+}
+
+// A service whose log can be read.
+class LoggedService {
+  public:
+    LoggedService() : service_({"sh", "-c", "exec " + BuiltProgram("usbmodemd") + " -f 2>&1"}) {}
+
+    // Reads on until a line holds this; false when there is none.
+    bool Says(const std::string& text) {
+        while (const auto line = service_.Daemon().ReadLine()) {
+            log_ += *line + '\n';
+            if (line->find(text) != std::string::npos) {
+                return true;
+            }
+        }
+        return false;
+    }
+    void End() {
+        service_.Daemon().Signal(SIGTERM);
+        EXPECT_EQ(service_.Daemon().Wait(), 0);
+    }
+    const std::string& Log() const { return log_; }
+
+  private:
+    ModemService service_;
+    std::string log_;
+};
+
+// A machine with a default route, and a modem whose connection has taken it away.
+class Connected {
+  public:
+    Connected() : simulator({"--modem", "12d1,ports=dial/at"}) {
+        Shell(
+            "ip link add eth7 type veth peer name far7; ip address add 10.7.0.2/24 dev eth7;"
+            "ip link set eth7 up; ip link set far7 up; ip route add default via 10.7.0.1;"
+            "ip link add ppp0 type veth peer name far0; ip address add 10.64.64.64/32 dev ppp0");
+        WriteFile("/etc/ppp/peers/wvdial", "noauth\n");
+        WriteFile("/usr/tavi/bin/wvdial",
+                  "#!/bin/sh\nip route delete default\necho '--> Using interface ppp0' >&2\n"
+                  "echo '--> secondary DNS address 10.64.64.3' >&2\nexec sleep 1000\n");
+        chmod("/usr/tavi/bin/wvdial", 0755);
+        service.emplace();
+        EXPECT_TRUE(service->Says("usbmodem0 is ready"));
+        EXPECT_EQ(CallService({"SetProfile", "usbmodem0", "default_gw=true"}).err, "");
+        if (const std::string failure = CallService({"Connect", "usbmodem0"}).err; failure != "") {
+            service->Says("Failed to connect");
+            ADD_FAILURE() << failure << service->Log();
+        }
+        EXPECT_TRUE(Becomes([] { return IsDialling() && DefaultRoute().empty(); }));
+    }
+    void Restart() {
+        service->End();
+        service.reset();
+        service.emplace();
+    }
+    static void ExpectHungUp() {
+        EXPECT_TRUE(Becomes([] { return !IsDialling(); }));
+        EXPECT_TRUE(Becomes([] { return !DefaultRoute().empty(); }));
+        EXPECT_THAT(DefaultRoute(), StartsWith("default via 10.7.0.1 dev eth7"));
+        EXPECT_FALSE(Exists("/var/lib/usbmodem/usbmodem.pid.0"));
+    }
+    // Nothing that the service knows or asks ends the connection.
+    static void ExpectConnected() {
+        std::string document;
+        for (int i = 0; i < 2; ++i) {  // finds the interface; then its address
+            document = CallService({"GetUSBModem", "usbmodem0"}).out;
+        }
+        EXPECT_THAT(document, HasSubstr("\"net_status\": \"connected\""));
+        EXPECT_THAT(document, HasSubstr("\"ip\": \"10.64.64.64\""));
+        EXPECT_TRUE(IsDialling());
+    }
+
+    PrivateBus bus;
+    ModemSimulator simulator;
+    std::optional<LoggedService> service;
+};
+
+struct Unplugging {
+    const char* name;
+    const char* whileNobodyLooks;  // a control line of the simulator
+    const char* said;              // by the new service, before
+    const char* happens;           // a command, then the modem is unplugged
+};
+
+class UnpluggedAfterARestart : public testing::TestWithParam<Unplugging> {};
+
+TEST_P(UnpluggedAfterARestart, IsHungUpAndTheRouteIsGivenBack) {
+    Connected connected;
+    connected.service->End();
+    connected.simulator.Command(GetParam().whileNobodyLooks);
+    connected.service.emplace();
+    EXPECT_TRUE(connected.service->Says(GetParam().said));
+    Shell(GetParam().happens);
+    if (Exists(kInfo)) {
+        connected.simulator.Unplug("0");
+        EXPECT_TRUE(connected.service->Says("usbmodem0 was unplugged"));
+    }
+    Connected::ExpectHungUp();
+}
+
+INSTANTIATE_TEST_SUITE_P(
+    Connection, UnpluggedAfterARestart,
+    testing::Values(Unplugging{"NothingWasAsked", "received 0", "usbmodem0 is ready", "true"},
+                    Unplugging{"TheModemIsDead", "fault 0 silent", "does not answer", "true"},
+                    Unplugging{"TheDiallerNoticedFirst", "received 0", "usbmodem0 is ready",
+                               "pkill -KILL -x sleep"},
+                    Unplugging{"NobodyLooked", "unplug 0", "usbmodem0 was unplugged", "true"}),
+    [](const auto& row) { return row.param.name; });
+
+TEST(Connection, StaysWhenTheModemDoesNotTellItsSIMAfterARestart) {
+    Connected connected;
+    for (const std::string command : {"AT+CIMI", "AT+CPIN?"}) {
+        SCOPED_TRACE(command);
+        connected.simulator.Reply("0", command, "\r\nwhat\r\n\r\nERROR?\r\n");
+        connected.Restart();
+        EXPECT_TRUE(connected.service->Says("usbmodem0 is ready"));
+        Connected::ExpectConnected();
+    }
+}
+
+TEST(Connection, AModemIsReadyOnceItTellsItsSIM) {
+    PrivateBus bus;
+    ModemSimulator simulator({"--modem", "12d1,ports=dial/at"});
+    simulator.ReplyOnce("0", "AT+CIMI", "\r\nERROR\r\n");
+    LoggedService service;
+    EXPECT_TRUE(service.Says("usbmodem0 is ready"));
+    EXPECT_THAT(service.Log(), HasSubstr("usbmodem0 does not answer"));
+}
+
+TEST(Connection, StaysWhenAFileIsTouchedOrWrittenAgain) {
+    Connected connected;
+    for (const std::string change : {"touch ", "cp --preserve=mode /tmp/copy "}) {
+        SCOPED_TRACE(change);
+        Shell(std::string("cp ") + kInfo + " /tmp/copy; " + change + kInfo);
+        // Seen later, in the same look or another.
+        WriteFile("/tmp/usbmodem.info9", "CONNECTNODE=99\nDEVICENODE=99\n");
+        EXPECT_TRUE(connected.service->Says("usbmodem9 was plugged in"));
+        Connected::ExpectConnected();
+        std::filesystem::remove("/tmp/usbmodem.info9");
+        EXPECT_TRUE(connected.service->Says("usbmodem9 was unplugged"));
+    }
+    for (const char* const said : {"usbmodem0 was plugged in anew", "usbmodem0 was unplugged"}) {
+        EXPECT_THAT(connected.service->Log(), testing::Not(HasSubstr(said)));
+    }
+}
+
+TEST(Connection, EndsWithAResetOfTheModem) {
+    Connected connected;
+    const std::string info = ReadFile(kInfo);
+    connected.simulator.Unplug("0.1");
+    connected.simulator.Plug("0.1");
+    EXPECT_TRUE(connected.service->Says("usbmodem0 was plugged in anew"));
+    Connected::ExpectHungUp();
+    EXPECT_TRUE(connected.service->Says("usbmodem0 is ready"));
+    EXPECT_THAT(CallService({"GetUSBModem", "usbmodem0"}).out, HasSubstr("E1752"));
+    EXPECT_EQ(ReadFile(kInfo), info);
+}
+
+}  // namespace
+}  // namespace taviwireless::test
