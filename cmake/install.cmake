@@ -37,3 +37,7 @@ endfunction()
 tavi_install_configured(taviwireless.pc ${CMAKE_INSTALL_LIBDIR}/pkgconfig)
 tavi_install_configured(com.merilond.usbmodem.service share/dbus-1/services)
 tavi_install_configured(usbmodemd.service lib/systemd/user)
+install(FILES packaging/taviwireless.tmpfiles.conf DESTINATION lib/tmpfiles.d
+        RENAME taviwireless.conf)
+install(FILES packaging/taviwireless.modules-load.conf DESTINATION lib/modules-load.d
+        RENAME taviwireless.conf)
