@@ -1,10 +1,12 @@
-// A library that takes the place of the C library's select(), for a program linked with it or
-// started with it in LD_PRELOAD: the waits for silence, before an AT command and behind its reply,
-// are cut to 10 ms, and the clock by which they are told to be over is put forward by the rest.
-// What is checked stays as it was: the simulated modem sends a reply in one piece, so no wait
-// decides where a reply ends, and the wait for its beginning (1 s) is not cut.
+// A library that shortens waits, for a program linked with it or started with it in LD_PRELOAD. It
+// takes the place of sleep() and g_timeout_add_seconds(), whose seconds last 50 ms, and of
+// select(): the waits for silence, before an AT command and behind its reply, are cut to 10 ms, and
+// the clock by which they are told to be over is put forward by the rest. What is checked stays as
+// it was: the simulated modem sends a reply in one piece, so no wait decides where a reply ends,
+// and the wait for its beginning (1 s) is not cut.
 #include <dlfcn.h>
 #include <sys/select.h>
+#include <unistd.h>
 
 #include <atomic>
 #include <ctime>
@@ -15,6 +17,7 @@ namespace {
 
 constexpr suseconds_t kLongestQuietWait = 200000;  // µs
 constexpr suseconds_t kShortWait = 10000;          // µs
+constexpr unsigned kShortSecond = 50;              // ms
 
 std::atomic<long long> notWaited{0};  // µs
 
@@ -51,4 +54,14 @@ TAKEN_OVER int clock_gettime(clockid_t clock, timespec* time) {
         time->tv_nsec = static_cast<long>(skew % kSecond);
     }
     return result;
+}
+
+TAKEN_OVER unsigned sleep(unsigned seconds) {
+    usleep(seconds * kShortSecond * 1000);
+    return 0;
+}
+
+TAKEN_OVER unsigned g_timeout_add_seconds(unsigned seconds, int (*function)(void*), void* data) {
+    static const auto add = Next<unsigned(unsigned, int (*)(void*), void*)>("g_timeout_add");
+    return add(seconds * kShortSecond, function, data);
 }
