@@ -70,7 +70,8 @@ class TAVIWIRELESS_API USBModem {
     virtual bool IsInfoExist() const;
 
     unsigned int GetIfid() const;
-    // True from the sixth counted error on.
+    // True from the sixth counted error on. A modem that does not stop talking when it is to be
+    // asked something is one at once.
     bool IsError();
     // Counts one error and returns the new count.
     int IncreaseErrorCounter();

@@ -1,11 +1,14 @@
 // usbmodemd on a real bus: starting, the modems it serves, ending.
 #include <gmock/gmock.h>
+#include <sys/socket.h>
+#include <sys/un.h>
 #include <sys/wait.h>
 #include <taviwireless/usbmodem_client.h>
 
 #include <filesystem>
 #include <thread>
 
+#include "base/unique_fd.h"
 #include "tests/support/bus.h"
 #include "tests/support/files.h"
 #include "tests/support/modem_simulator.h"
@@ -169,6 +172,21 @@ TEST(Usbmodemd, LivesWithoutStandardDescriptors) {
         RunProgram({"pkill", "-x", "usbmodemd"});
         while (RunProgram({"pgrep", "-x", "usbmodemd"}).status == 0) {
         }
+    }
+}
+
+TEST(Usbmodemd, FeedsTheWatchdogOfTheServiceManager) {
+    PrivateBus bus;
+    sockaddr_un address{AF_UNIX, "/tmp/notify"};
+    const UniqueFd manager(socket(AF_UNIX, SOCK_DGRAM, 0));
+    ASSERT_EQ(bind(manager.Get(), reinterpret_cast<sockaddr*>(&address), sizeof address), 0);
+    ModemService service({"env", std::string("NOTIFY_SOCKET=") + address.sun_path,
+                          "WATCHDOG_USEC=100000", BuiltProgram("usbmodemd"), "-f"});
+    for (int i = 0; i < 3; ++i) {
+        char text[32];
+        const ssize_t length = recv(manager.Get(), text, sizeof text, 0);
+        ASSERT_GT(length, 0);
+        EXPECT_EQ(std::string(text, static_cast<size_t>(length)), "WATCHDOG=1");
     }
 }
 
