@@ -161,9 +161,8 @@ class Life {
         }
         Call({modem.isDialled ? "Disconnect" : "Connect", DevId(id)});
         modem.isDialled = !modem.isDialled;
-        if (modem.isDialled) {
-            Until([&] { return IsConnected(id); }, "the link does not come up");
-        }
+        // Also after hanging up: it is this look that makes the modem ready to dial again.
+        Until([&] { return IsConnected(id) == modem.isDialled; }, "the link does not change");
         return modem.isDialled ? "dials" : "hang-ups";
     }
     std::string Toggle(Modem& modem, const std::string& target) {
@@ -282,7 +281,7 @@ int main(int argc, char** argv) {
             life.PrintState(i);
         }
     } catch (const std::exception& error) {
-        std::printf("seed %u, %s: %s\n", seed, life.LastStep().c_str(), error.what());
+        std::printf("seed %u, after %s: %s\n", seed, life.LastStep().c_str(), error.what());
         return EXIT_FAILURE;
     }
 }
