@@ -6,10 +6,6 @@
 #include <string>
 #include <vector>
 
-namespace CLI {
-class App;
-}
-
 namespace taviwireless::cli {
 
 // What the program ends with.
@@ -61,14 +57,8 @@ struct Options {
     std::string mode;           // "ap" or "client"
 };
 
-// Each adds a group of commands. A command runs while the arguments are parsed and throws
-// CommandError when it fails.
-void AddModemCommands(CLI::App& app, Options& options);
-void AddWifiCommands(CLI::App& app, Options& options);
-void AddWifiConnectCommand(CLI::App& wifi, Options& options);
-void AddWifiSavedCommands(CLI::App& wifi, Options& options);
-void AddAPCommands(CLI::App& app, Options& options);
-void AddAPCheckCommand(CLI::App& ap, Options& options);
+// Reads the command line and runs the command that it names. Returns what the program ends with.
+int RunCommandLine(int argc, char** argv);
 
 }  // namespace taviwireless::cli
 

@@ -13,6 +13,13 @@ target_link_libraries(tavi_test_headers PRIVATE GTest::gmock)
 target_precompile_headers(tavi_test_headers PRIVATE
   <gmock/gmock.h> <chrono> <filesystem> <fstream> <functional> <optional> <string> <thread> <vector>)
 
+# Lets the library's waits for silence on a serial line be short in this test program: see
+# tests/support/short_waits.cpp.
+function(tavi_shorten_waits test)
+  target_link_options(${test} PRIVATE LINKER:--no-as-needed $<TARGET_FILE:tavi_short_waits>)
+  add_dependencies(${test} tavi_short_waits)
+endfunction()
+
 function(tavi_add_test)
   cmake_parse_arguments(TEST "" "NAME" "SOURCES;LIBS" ${ARGN})
   add_executable(${TEST_NAME} ${TEST_SOURCES})

@@ -3,15 +3,14 @@
 #include <sys/mman.h>
 #include <unistd.h>
 
-#include <CLI/CLI.hpp>
 #include <cstdio>
 #include <cstring>
 #include <iostream>
 #include <sstream>
 
 #include "cli/ap/access.h"
+#include "cli/ap/commands.h"
 #include "cli/ap/settings.h"
-#include "cli/commands.h"
 #include "cli/output.h"
 #include "cli/wifi/access.h"
 #include "wireless/ap_files.h"
@@ -147,7 +146,9 @@ Json::Value ToJson(const std::vector<ConfFile>& files, const Verdict& verdict) {
     return document;
 }
 
-void Check(const Options& options) {
+}  // namespace
+
+void CheckAP(const Options& options) {
     RequireWifiSettings();
     const WirelessAPSettings settings = ReadAPSettings();
     const std::vector<ConfFile> files = Render(settings.ap);
@@ -175,15 +176,6 @@ void Check(const Options& options) {
         std::cout << "hostapd: " << remark << '\n';
     }
     std::cout << "hostapd understands all of it.\n";
-}
-
-}  // namespace
-
-void AddAPCheckCommand(CLI::App& ap, Options& options) {
-    CLI::App* check = ap.add_subcommand(
-        "check", "Show what hostapd would be started with, and whether it understands that");
-    check->add_flag("--show-secrets", options.showSecrets, "Show the secrets as well");
-    check->callback([&options] { Check(options); });
 }
 
 }  // namespace taviwireless::cli

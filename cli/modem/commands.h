@@ -3,8 +3,7 @@
 
 #include "cli/commands.h"
 
-// What the commands about modems do; what they are called and take is in commands.cpp. Each throws
-// CommandError when it fails.
+// What the commands about modems do. Each throws CommandError when it fails.
 namespace taviwireless::cli {
 
 void ListModems(const Options& options);

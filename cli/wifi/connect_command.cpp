@@ -1,12 +1,11 @@
 // taviwireless wifi connect: joins a network, and remembers it.
 #include <tavisdk/wireless.h>
 
-#include <CLI/CLI.hpp>
 #include <algorithm>
 #include <optional>
 
-#include "cli/commands.h"
 #include "cli/wifi/access.h"
+#include "cli/wifi/commands.h"
 #include "cli/wifi/output.h"
 #include "cli/wifi/settings.h"
 
@@ -175,7 +174,9 @@ class Joining {
     bool isSavedKey_ = false;
 };
 
-void Connect(const Options& options) {
+}  // namespace
+
+void ConnectWifi(const Options& options) {
     CheckEssid(options.network);
     if (!options.staticAddress.empty()) {
         WirelessConf ignored{};
@@ -186,29 +187,6 @@ void Connect(const Options& options) {
     RequireRadio();
     Joining(options).Run();
     ReportWifi(options);
-}
-
-}  // namespace
-
-void AddWifiConnectCommand(CLI::App& wifi, Options& options) {
-    CLI::App* connect = wifi.add_subcommand(
-        "connect", "Join a network, and save it; its key is read from standard input unless saved");
-    connect->add_option("SSID", options.network, "Name of the network")->required();
-    connect->add_option("--user", options.user, "User, where a network wants one");
-    connect->add_flag("--new-key", options.newKey, "Ask for the key although one is saved");
-    CLI::Option* isStatic =
-        connect
-            ->add_option("--static", options.staticAddress,
-                         "This address instead of one by DHCP, and the default gateway")
-            ->type_name("ADDRESS/PREFIX[,GATEWAY]");
-    connect->add_flag("--dhcp", options.dhcp, "DHCP although a static address is saved")
-        ->excludes(isStatic);
-    CLI::Option* isHidden =
-        connect->add_flag("--hidden", options.hidden, "The network does not show in a scan");
-    connect->add_option("--security", options.security, "What a hidden network wants")
-        ->needs(isHidden)
-        ->check(CLI::IsMember(SecurityWords()));
-    connect->callback([&options] { Connect(options); });
 }
 
 }  // namespace taviwireless::cli

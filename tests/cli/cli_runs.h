@@ -18,7 +18,7 @@ constexpr int kNoService = 5;
 // taviwireless modem ...
 inline RunResult Modem(std::vector<std::string> arguments, const std::string& input = "") {
     arguments.insert(arguments.begin(), {BuiltProgram("taviwireless"), "modem"});
-    return RunProgram(arguments, input);
+    return RunProgram(WithShortWaits(arguments), input);
 }
 
 inline RunResult DirectModem(std::vector<std::string> arguments, const std::string& input = "") {

@@ -74,8 +74,9 @@ TEST(ServiceCommands, FailuresAreOneSentenceAndAnExitStatus) {
         {"profile reset usbmodem0", "", kUsage, "the modem service cannot reset a profile; "},
         {"puk usbmodem0", "", kFailure, "the SIM of usbmodem0 does not want its PUK"},
         {"disconnect usbmodem0", "", kFailure, "usbmodem0 is not connected"},
-        {"show usbmodem0 --timeout 1", "", kFailure, "not done within 1 s; "},
     });
+    situation.simulator.Fault("0", "slow=900");
+    Take({{"show usbmodem0 --timeout 1", "", kFailure, "not done within 1 s; "}});
 }
 
 TEST(ServiceCommands, WithoutTheServiceTheyNameWhatStartsIt) {

@@ -2,15 +2,13 @@
 #include <gmock/gmock.h>
 #include <sys/stat.h>
 
-#include <chrono>
 #include <filesystem>
-#include <functional>
 #include <optional>
-#include <thread>
 
 #include "tests/support/bus.h"
 #include "tests/support/files.h"
 #include "tests/support/modem_simulator.h"
+#include "tests/support/wait.h"
 
 namespace taviwireless::test {
 namespace {
@@ -24,13 +22,6 @@ std::string Shell(const std::string& script) {
     return RunProgram({"sh", "-c", script}).out;
 }
 
-bool Becomes(const std::function<bool()>& condition) {
-    for (int i = 0; i < 400 && !condition(); ++i) {
-        std::this_thread::sleep_for(std::chrono::milliseconds(25));
-    }
-    return condition();
-}
-
 bool IsDialling() {
     return RunProgram({"pgrep", "-x", "sleep"}).status == 0;
 }
@@ -42,7 +33,7 @@ std::string DefaultRoute() {
 // A service whose log can be read.
 class LoggedService {
   public:
-    LoggedService() : service_({"sh", "-c", "exec " + BuiltProgram("usbmodemd") + " -f 2>&1"}) {}
+    LoggedService() : service_(LoggingCommand()) {}
 
     // Reads on until a line holds this; false when there is none.
     bool Says(const std::string& text) {
@@ -85,7 +76,7 @@ class Connected {
             service->Says("Failed to connect");
             ADD_FAILURE() << failure << service->Log();
         }
-        EXPECT_TRUE(Becomes([] { return IsDialling() && DefaultRoute().empty(); }));
+        EXPECT_TRUE(Eventually([] { return IsDialling() && DefaultRoute().empty(); }));
     }
     void Restart() {
         service->End();
@@ -93,8 +84,8 @@ class Connected {
         service.emplace();
     }
     static void ExpectHungUp() {
-        EXPECT_TRUE(Becomes([] { return !IsDialling(); }));
-        EXPECT_TRUE(Becomes([] { return !DefaultRoute().empty(); }));
+        EXPECT_TRUE(Eventually([] { return !IsDialling(); }));
+        EXPECT_TRUE(Eventually([] { return !DefaultRoute().empty(); }));
         EXPECT_THAT(DefaultRoute(), StartsWith("default via 10.7.0.1 dev eth7"));
         EXPECT_FALSE(Exists("/var/lib/usbmodem/usbmodem.pid.0"));
     }

@@ -129,7 +129,7 @@ TEST(Usbmodemd, EndsOnASignalAndReleasesEverything) {
     PrivateBus bus;
     ModemSimulator simulator({"--modem", "12d1,ports=dial/at"});
     for (const int number : {SIGTERM, SIGINT}) {
-        ModemService service({"sh", "-c", "exec " + BuiltProgram("usbmodemd") + " -f 2>&1"});
+        ModemService service(LoggingCommand());
         ASSERT_TRUE(service.Lists({"usbmodem0"}));
         service.Daemon().Signal(number);
         EXPECT_EQ(service.Daemon().Wait(), 0);
@@ -155,8 +155,8 @@ TEST(Usbmodemd, WithoutForegroundGoesToTheBackgroundOnceItServes) {
 
 TEST(Usbmodemd, IsStartedByTheFirstCall) {
     WriteFile("/tmp/services/usbmodem.service",
-              "[D-BUS Service]\nName=com.merilond.usbmodem\nExec=" + BuiltProgram("usbmodemd") +
-                  " --foreground\n");
+              "[D-BUS Service]\nName=com.merilond.usbmodem\nExec='" + BuiltProgram("usbmodemd") +
+                  "' --foreground\n");
     PrivateBus bus("<servicedir>/tmp/services</servicedir>");
     EXPECT_EQ(CallService({"GetUSBModemList"}).out, "('',)\n");
     RunProgram({"pkill", "-x", "usbmodemd"});
@@ -199,7 +199,7 @@ TEST(Usbmodemd, LooksForFewModemsAtATime) {
     }
     PrivateBus bus;
     ModemSimulator simulator(modems);
-    ModemService service({"sh", "-c", "exec " + BuiltProgram("usbmodemd") + " -f 2>&1"});
+    ModemService service(LoggingCommand());
     int most = 0;
     for (int left = kModems; left > 0;) {
         const auto line = service.Daemon().ReadLine(std::chrono::milliseconds(50));

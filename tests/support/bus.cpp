@@ -16,14 +16,15 @@ namespace {
 constexpr char kConfigFile[] = "/tmp/session-bus.conf";
 constexpr char kAddress[] = "unix:path=/tmp/session-bus";
 
-std::vector<std::string> DaemonCommand(std::vector<std::string> command) {
-    if (command.empty()) {
-        command = {BuiltProgram("usbmodemd"), "--foreground"};
-    }
-    return command;
+std::vector<std::string> DaemonCommand(const std::vector<std::string>& command) {
+    return command.empty() ? WithShortWaits({BuiltProgram("usbmodemd"), "--foreground"}) : command;
 }
 
 }  // namespace
+
+std::vector<std::string> LoggingCommand() {
+    return WithShortWaits({"sh", "-c", "exec \"$0\" --foreground 2>&1", BuiltProgram("usbmodemd")});
+}
 
 PrivateBus::PrivateBus(const std::string& config) {
     WriteFile(kConfigFile,

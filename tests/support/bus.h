@@ -27,10 +27,14 @@ class PrivateBus {
     std::optional<Process> daemon_;
 };
 
+// The command of usbmodemd with short waits, and with its log on its standard output.
+std::vector<std::string> LoggingCommand();
+
 // usbmodemd beside the test, on the bus there is.
 class ModemService {
   public:
-    // Returns once the service owns its name.
+    // Returns once the service owns its name. The command is usbmodemd with short waits, if none is
+    // given.
     explicit ModemService(const std::vector<std::string>& command = {});
 
     // Waits until the service lists exactly these modems, and returns whether it ever does.

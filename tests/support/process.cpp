@@ -21,9 +21,11 @@
 namespace taviwireless::test {
 namespace {
 
-// Found before main(): in an appliance root the path of the test itself may be none.
-const std::filesystem::path kBuiltPrograms =
-    std::filesystem::canonical(reinterpret_cast<const char*>(getauxval(AT_EXECFN))).parent_path();
+// Without /proc, which in an appliance root may know the test by another path.
+std::filesystem::path BuiltPrograms() {
+    const auto* test = reinterpret_cast<const char*>(getauxval(AT_EXECFN));
+    return std::filesystem::canonical(test).parent_path();
+}
 
 using Clock = std::chrono::steady_clock;
 using Milliseconds = Process::Milliseconds;
@@ -139,7 +141,15 @@ std::optional<int> WaitUntil(Clock::time_point deadline, pid_t pid) {
 }  // namespace
 
 std::string BuiltProgram(const std::string& name) {
-    return kBuiltPrograms / name;
+    return BuiltPrograms() / name;
+}
+
+std::vector<std::string> WithShortWaits(std::vector<std::string> argv) {
+#ifndef __SANITIZE_ADDRESS__  // which has to be loaded before everything else
+    const std::string library = BuiltPrograms().parent_path() / "lib/libtavi_short_waits.so";
+    argv.insert(argv.begin(), {"env", "LD_PRELOAD=" + library});
+#endif
+    return argv;
 }
 
 RunResult RunAsNobody(std::vector<std::string> argv) {

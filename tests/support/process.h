@@ -13,6 +13,9 @@ namespace taviwireless::test {
 // The path of a program of this project, built into the same directory as the running test.
 std::string BuiltProgram(const std::string& name);
 
+// The command, started with waits cut that nothing depends on: see short_waits.cpp.
+std::vector<std::string> WithShortWaits(std::vector<std::string> argv);
+
 // A program that runs beside the test, with its standard input and output connected to it; its
 // standard error is the test's own. The destructor kills it and waits for it.
 class Process {

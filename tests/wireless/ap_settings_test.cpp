@@ -310,7 +310,7 @@ class Shaker {
 TEST(SetAPConfig, StoresAnySettingsSoThatTheyReadBackTheSame) {
     Settings here;
     Shaker shaker;
-    for (int i = 0; i < 2000; ++i) {
+    for (int i = 0; i < 400; ++i) {
         if (i % 20 == 0) {
             Shell("rm -f " + kFile);
         }

@@ -1,13 +1,11 @@
-// taviwireless wifi: the Wi-Fi adapter.
-#include "cli/commands.h"
-
+// taviwireless wifi: the adapter and its connection.
 #include <json/json.h>
 #include <taviwireless/wireless.h>
 
-#include <CLI/CLI.hpp>
 #include <iostream>
 
 #include "cli/wifi/access.h"
+#include "cli/wifi/commands.h"
 #include "cli/wifi/output.h"
 #include "cli/wifi/settings.h"
 
@@ -15,14 +13,24 @@ namespace taviwireless::cli {
 
 namespace {
 
+// The tool that creates an ad-hoc network is given one word each.
+void CheckOneWord(const std::string& text, const char* what) {
+    if (text.find_first_of(" \t") != std::string::npos) {
+        throw CommandError(kUsage,
+                           std::string(what) + " of an ad-hoc network may not hold a blank");
+    }
+}
+
+}  // namespace
+
 // For everybody: that there is no adapter is an answer here.
-void Status(const Options& options) {
+void ShowWifi(const Options& options) {
     const WirelessStatus status = LookAtWifi();
     const std::string address = WifiAddress();
     options.json ? Print(ToJson(status, address)) : Print(StatusTable(status, address));
 }
 
-void ShowScan(const Options& options) {
+void ListNetworks(const Options& options) {
     RequireAdapter();
     ShowProgress("Looking for networks ...");
     const auto networks = Scan();
@@ -35,7 +43,7 @@ void ShowScan(const Options& options) {
 }
 
 // With the adapter unplugged, the connection has left its address and its resolver file behind.
-void Disconnect(const Options& options) {
+void DisconnectWifi(const Options& options) {
     RequireWifiSettings();
     const WirelessStatus status = LookAtWifi();
     if (!IsInNetwork(status.status) && status.status != WIRELESS_STATUS_NO_ADAPTER) {
@@ -71,14 +79,6 @@ void ConnectAutomatically(const Options& options) {
     ReportWifi(options);
 }
 
-// The tool that creates an ad-hoc network is given one word each.
-void CheckOneWord(const std::string& text, const char* what) {
-    if (text.find_first_of(" \t") != std::string::npos) {
-        throw CommandError(kUsage,
-                           std::string(what) + " of an ad-hoc network may not hold a blank");
-    }
-}
-
 void CreateAdhoc(const Options& options) {
     CheckEssid(options.network);
     CheckOneWord(options.network, "the name");
@@ -102,7 +102,7 @@ void CreateAdhoc(const Options& options) {
     ReportWifi(options);
 }
 
-void ChangeMode(const Options& options) {
+void ChangeWifiMode(const Options& options) {
     constexpr int kAccessPoint = 0;
     constexpr int kClient = 1;
     RequireWifiSettings();
@@ -115,7 +115,7 @@ void ChangeMode(const Options& options) {
     ReportWifi(options);
 }
 
-void ShowGateway(const Options& options) {
+void ShowWifiGateway(const Options& options) {
     RequireWifiSettings();
     const std::string gateway = ConnectionGateway();
     if (gateway.empty()) {
@@ -125,36 +125,6 @@ void ShowGateway(const Options& options) {
     Json::Value document;
     document["gateway"] = gateway;
     options.json ? Print(document) : Print(Table{{Printable(gateway)}});
-}
-
-}  // namespace
-
-void AddWifiCommands(CLI::App& app, Options& options) {
-    CLI::App* wifi = app.add_subcommand("wifi", "The Wi-Fi adapter");
-    wifi->require_subcommand(1);
-    wifi->fallthrough();
-    const auto add = [&](const char* name, const char* description, void (*run)(const Options&)) {
-        CLI::App* command = wifi->add_subcommand(name, description);
-        command->callback([&options, run] { run(options); });
-        return command;
-    };
-
-    add("status", "Show the state of the adapter and its connection", Status);
-    add("scan", "List the networks in range", ShowScan);
-    AddWifiConnectCommand(*wifi, options);
-    add("disconnect", "End the connection", Disconnect);
-    add("auto", "Join the saved network that was used last and is in range", ConnectAutomatically);
-    AddWifiSavedCommands(*wifi, options);
-
-    CLI::App* adhoc = add("adhoc", "Create or join an ad-hoc network", CreateAdhoc);
-    adhoc->add_option("SSID", options.network, "Name of the network")->required();
-    adhoc->add_flag("--wep", options.wep, "With a WEP key, which is read from standard input");
-
-    add("mode", "Make the adapter an access point or a client", ChangeMode)
-        ->add_option("MODE", options.mode, "ap or client")
-        ->required()
-        ->check(CLI::IsMember({"ap", "client"}));
-    add("gateway", "Show the gateway that the connection should use", ShowGateway);
 }
 
 }  // namespace taviwireless::cli

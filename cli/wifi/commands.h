@@ -1,0 +1,22 @@
+#ifndef TAVIWIRELESS_CLI_WIFI_COMMANDS_H
+#define TAVIWIRELESS_CLI_WIFI_COMMANDS_H
+
+#include "cli/commands.h"
+
+// What the commands about the Wi-Fi adapter do. Each throws CommandError when it fails.
+namespace taviwireless::cli {
+
+void ShowWifi(const Options& options);
+void ListNetworks(const Options& options);
+void ConnectWifi(const Options& options);
+void DisconnectWifi(const Options& options);
+void ConnectAutomatically(const Options& options);
+void ListSavedNetworks(const Options& options);
+void ShowSavedNetwork(const Options& options);
+void CreateAdhoc(const Options& options);
+void ChangeWifiMode(const Options& options);
+void ShowWifiGateway(const Options& options);
+
+}  // namespace taviwireless::cli
+
+#endif
