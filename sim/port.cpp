@@ -14,8 +14,8 @@ constexpr char kGarbage[] = "\xff\xfe\x80\x01\x1b\xc3\x28\x7f";
 constexpr char kFiller[] = "^FILL: 0123456789abcdefghijklmnopqrstuvwxyz0123456789";
 // What a client sent before it closed the line may arrive so much later, without waking anybody.
 constexpr Milliseconds kSettling{10};
-// Bytes still unread are lost when a line is hung up, so the client gets this long to take them: less
-// than the 200 ms of silence after which it takes a reply for whole.
+// Bytes still unread are lost when a line is hung up, so the client gets this long to take them:
+// less than the 200 ms of silence after which it takes a reply for whole.
 constexpr Milliseconds kVanishPause{120};
 
 }  // namespace

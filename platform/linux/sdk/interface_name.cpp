@@ -5,15 +5,13 @@
 
 #include <cstring>
 
+#include "base/interface_name.h"
 #include "core/failure.h"
 
 namespace tavisdk {
 
 bool IsInterfaceName(const char* name) {
-    const size_t length = strnlen(name, TAVI_NET_IF_NAME_SIZE);
-    return length > 0 && length < TAVI_NET_IF_NAME_SIZE &&
-           strpbrk(name, "/ \t\r\n\v\f") == nullptr && strcmp(name, ".") != 0 &&
-           strcmp(name, "..") != 0;
+    return taviwireless::IsInterfaceName({name, strnlen(name, TAVI_NET_IF_NAME_SIZE)});
 }
 
 void RequireInterfaceName(const char* name) {

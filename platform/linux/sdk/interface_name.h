@@ -4,7 +4,7 @@
 // Names of interfaces that become parts of paths and of other programs' configurations.
 namespace tavisdk {
 
-// As the kernel would take it: 1 to 15 characters, no "/", no blank, neither "." nor "..".
+// The rule of base/interface_name.h; the text need not end within the size of a name.
 bool IsInterfaceName(const char* name);
 
 // Throws tavicore::Failure when it is none.
