@@ -2,7 +2,6 @@
 
 #include <fcntl.h>
 #include <poll.h>
-#include <spawn.h>
 #include <sys/mman.h>
 #include <sys/stat.h>
 #include <sys/wait.h>
@@ -19,6 +18,7 @@ extern "C" {  // its declarations forget that
 #include <fstream>
 #include <iterator>
 
+#include "base/spawn_settings.h"
 #include "base/unique_fd.h"
 #include "platform/network/error.h"
 
@@ -30,36 +30,20 @@ constexpr char kStopProgram[] = "/usr/tavi/bin/stop-program";
 constexpr int kStopLimit = 20;   // s; it ends by itself after half of that
 constexpr int kStartLimit = 30;  // s; the DHCP client asks for 12
 
-// A process group of its own, so that what it started can be killed with it.
 pid_t Spawn(const std::vector<std::string>& argv, int output) {
-    std::vector<char*> words;
+    std::vector<const char*> words;
     for (const std::string& word : argv) {
-        words.push_back(const_cast<char*>(word.c_str()));
+        words.push_back(word.c_str());
     }
     words.push_back(nullptr);
-    posix_spawn_file_actions_t actions;
-    posix_spawn_file_actions_init(&actions);
-    posix_spawn_file_actions_addopen(&actions, STDIN_FILENO, "/dev/null", O_RDONLY, 0);
-    posix_spawn_file_actions_adddup2(&actions, output, STDOUT_FILENO);
-    posix_spawn_file_actions_adddup2(&actions, output, STDERR_FILENO);
-    posix_spawn_file_actions_addclosefrom_np(&actions, STDERR_FILENO + 1);
-    posix_spawn_file_actions_addchdir_np(&actions, "/");
-    posix_spawnattr_t attributes;
-    posix_spawnattr_init(&attributes);
-    sigset_t none;
-    sigemptyset(&none);
-    posix_spawnattr_setsigmask(&attributes, &none);
-    sigset_t all;
-    sigfillset(&all);
-    posix_spawnattr_setsigdefault(&attributes, &all);
-    posix_spawnattr_setflags(
-        &attributes, POSIX_SPAWN_SETPGROUP | POSIX_SPAWN_SETSIGMASK | POSIX_SPAWN_SETSIGDEF);
-    pid_t pid = -1;
-    const int result = posix_spawnp(&pid, words[0], &actions, &attributes, words.data(), environ);
-    posix_spawn_file_actions_destroy(&actions);
-    posix_spawnattr_destroy(&attributes);
-    errno = result;
-    return result == 0 ? pid : -1;
+    SpawnSettings settings;
+    settings.GiveGroupOfItsOwn();
+    settings.OpenNothing(STDIN_FILENO);
+    settings.Duplicate(output, STDOUT_FILENO);
+    settings.Duplicate(output, STDERR_FILENO);
+    settings.StartInRootFolder();
+    settings.InheritNothingElse();
+    return settings.Spawn(words[0], words.data());
 }
 
 // Whether it ends in time, with exit status 0.

@@ -242,6 +242,38 @@ void BringLoopbackUp() {
     }
 }
 
+// Later mounts are not seen by the machine then. False when the root is a plain folder, as in a
+// chroot.
+bool DetachMounts() {
+    const bool isDone = mount("none", "/", "none", MS_REC | MS_PRIVATE, nullptr) == 0;
+    if (!isDone && errno != EINVAL) {
+        FailTo("detach the mounts from the machine's");
+    }
+    return isDone;
+}
+
+// Makes a chroot the real root of our own mounts. A process whose current directory lies outside
+// its root can go up to the top.
+void LeaveChroot() {
+    const UniqueFd folder(open("/", O_PATH | O_CLOEXEC));
+    if (chroot("/proc") != 0 || fchdir(folder.Get()) != 0) {
+        FailTo("leave the chroot");
+    }
+    constexpr int kDeepest = 1000;
+    for (int i = 0; i < kDeepest && chdir("..") == 0; ++i) {
+    }
+    if (chroot(".") != 0 || !DetachMounts()) {
+        FailTo("leave the chroot");
+    }
+    constexpr unsigned int kWhole = AT_EMPTY_PATH | AT_RECURSIVE;
+    const UniqueFd tree(
+        open_tree(folder.Get(), "", OPEN_TREE_CLONE | OPEN_TREE_CLOEXEC | kWhole));
+    if (!tree || move_mount(tree.Get(), "", AT_FDCWD, "/", MOVE_MOUNT_F_EMPTY_PATH) != 0 ||
+        fchdir(tree.Get()) != 0 || chroot(".") != 0) {
+        FailTo("make the chroot a root");
+    }
+}
+
 // Also for a caller who is root of a container that maps its users.
 bool IsInUserNamespace() {
     std::ifstream map("/proc/self/uid_map");
@@ -256,8 +288,8 @@ bool IsInUserNamespace() {
 }  // namespace
 
 void SetUpPrivateSystem(const Workplace& workplace) {
-    if (mount("none", "/", "none", MS_REC | MS_PRIVATE, nullptr) != 0) {
-        FailTo("detach the mounts from the machine's");
+    if (!DetachMounts()) {
+        LeaveChroot();
     }
     MountNew(kProc);
     MountNew(kSys);

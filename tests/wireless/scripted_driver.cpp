@@ -112,15 +112,16 @@ extern "C" __attribute__((visibility("default"))) int socket(int domain, int typ
     return next(domain, type, protocol);
 }
 
-extern "C" __attribute__((visibility("default"))) int posix_spawn(
+extern "C" __attribute__((visibility("default"))) int posix_spawnp(
     pid_t* process, const char* path, const posix_spawn_file_actions_t* actions,
     const posix_spawnattr_t* attributes, char* const arguments[], char* const environment[]) {
     constexpr int kCommand = 2;  // behind "sh -c"
-    if (living != nullptr && !living->unrunnable.empty() &&
+    const bool isCommand = arguments[1] != nullptr && strcmp(arguments[1], "-c") == 0;
+    if (isCommand && living != nullptr && !living->unrunnable.empty() &&
         strstr(arguments[kCommand], living->unrunnable.c_str()) != nullptr) {
         return EAGAIN;
     }
     static const auto next =
-        reinterpret_cast<decltype(&posix_spawn)>(dlsym(RTLD_NEXT, "posix_spawn"));
+        reinterpret_cast<decltype(&posix_spawnp)>(dlsym(RTLD_NEXT, "posix_spawnp"));
     return next(process, path, actions, attributes, arguments, environment);
 }

@@ -12,7 +12,7 @@
 namespace taviwireless::test {
 
 // What the driver of the wireless interface answers while this lives; at most one may live at a
-// time. A program that links tavi_scripted_driver defines ioctl(), socket() and posix_spawn()
+// time. A program that links tavi_scripted_driver defines ioctl(), socket() and posix_spawnp()
 // itself: requests of the wireless extensions go to the living ScriptedDriver, all else, and
 // everything when none lives, to the system.
 struct ScriptedDriver {
