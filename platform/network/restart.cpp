@@ -125,7 +125,29 @@ void StartDhcpServer(const std::string& bridge) {
     }
 }
 
+// hostapd goes into the background before it has made the guests' interface and joined the bridges:
+// it may look first which of its neighbours need 20 MHz.
+void AwaitRadios(const Plan& plan, const State& wanted) {
+    Names radios;
+    for (const std::string& name : plan.names) {
+        const Interface* interface = wanted.Find(name);
+        if (interface != nullptr && interface->isRadio) {
+            radios.insert(name);
+        }
+    }
+    constexpr int kMostLooks = 100;
+    constexpr useconds_t kPause = 100000;  // µs
+    for (int i = 0; i < kMostLooks && Runs(Hostapd(plan.settings.interface)) &&
+                    !FirstDifference(wanted, radios).empty();
+         ++i) {
+        usleep(kPause);
+    }
+}
+
 void Verify(const Plan& plan, const State& wanted) {
+    if (plan.settings.accessPoint) {
+        AwaitRadios(plan, wanted);
+    }
     std::string difference = FirstDifference(wanted, plan.names);
     if (plan.settings.accessPoint && !Runs(Hostapd(plan.settings.interface))) {
         difference = "hostapd has ended again";
