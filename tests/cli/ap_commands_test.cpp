@@ -340,8 +340,8 @@ TEST_F(APCommands, ADryRunShowsThePlanAndSwitchesNothing) {
 // When the machine starts.
 TEST_F(APCommands, WhatWasSwitchedOnIsOnAgainAfterARestart) {
     const std::string program = "/usr/local/bin/taviwireless";
-    tools.Add(program, "[ \"$*\" = 'wifi auto' ] || exec " +
-                           BuiltProgram("taviwireless_with_wifi") + " \"$@\"");
+    tools.Add(program, "[ \"$*\" = 'wifi auto' ] || exec '" +
+                           BuiltProgram("taviwireless_with_wifi") + "' \"$@\"");
     tools.Add("/usr/tavi/hotplug/usb.plug");
     const std::vector<std::string> boot = {"sh", TAVI_ROOT_FOLDER "/start-wireless"};
     const std::string restart = "/etc/rc.network restart wlan0 lbr0";

@@ -166,8 +166,8 @@ TEST(Usbmodemd, LivesWithoutStandardDescriptors) {
     PrivateBus bus;
     for (const char* const closed : {"<&-", "<&- >&- 2>&-"}) {
         SCOPED_TRACE(closed);
-        const std::string command = BuiltProgram("usbmodemd") + " " + closed;
-        EXPECT_EQ(RunProgram({"sh", "-c", command}).status, 0);
+        const std::string command = std::string("\"$0\" ") + closed;
+        EXPECT_EQ(RunProgram({"sh", "-c", command, BuiltProgram("usbmodemd")}).status, 0);
         EXPECT_EQ(CallService({"GetUSBModemList"}).out, "('',)\n");
         RunProgram({"pkill", "-x", "usbmodemd"});
         while (RunProgram({"pgrep", "-x", "usbmodemd"}).status == 0) {

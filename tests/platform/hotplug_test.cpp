@@ -71,7 +71,7 @@ TEST_F(Hotplug, ModemHasItsInfoFileWhileItIsPluggedIn) {
     Shell("rm -r /sys/class/tty/ttyUSB*");
     Plug();
     EXPECT_FALSE(Exists("/tmp/usbmodem.info1"));
-    EXPECT_EQ(Shell("find /tmp -name '*usb.plug*'"), "");
+    EXPECT_EQ(Shell("find /tmp -maxdepth 1 -name '*usb.plug*'"), "");
 }
 
 TEST_F(Hotplug, AdapterIsDescribedWhileItIsPluggedIn) {

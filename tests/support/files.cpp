@@ -65,4 +65,14 @@ bool Exists(const std::string& path) {
     return std::filesystem::exists(path);
 }
 
+bool HasStranger() {
+    std::ifstream map("/proc/self/uid_map");
+    unsigned long first = 0;
+    unsigned long outside = 0;
+    unsigned long count = 0;
+    map >> first >> outside >> count;
+    constexpr unsigned long kStranger = 65534;
+    return count > kStranger;
+}
+
 }  // namespace taviwireless::test

@@ -27,6 +27,15 @@ mode_t FileMode(const std::string& path);
 // True when `path` names something; a link that leads nowhere names nothing.
 bool Exists(const std::string& path);
 
+// Whether files can be given to user 65534: without root a machine has no second user.
+bool HasStranger();
+
 }  // namespace taviwireless::test
+
+// Ends the case, which CTest then lists as not run, where there is nobody to be kept out.
+#define TAVI_NEEDS_A_STRANGER()                                               \
+    if (!::taviwireless::test::HasStranger()) {                               \
+        GTEST_SKIP() << "run as root: an ordinary user is the only one here"; \
+    }
 
 #endif

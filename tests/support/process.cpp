@@ -146,8 +146,10 @@ std::string BuiltProgram(const std::string& name) {
 
 std::vector<std::string> WithShortWaits(std::vector<std::string> argv) {
 #ifndef __SANITIZE_ADDRESS__  // which has to be loaded before everything else
-    const std::string library = BuiltPrograms().parent_path() / "lib/libtavi_short_waits.so";
-    argv.insert(argv.begin(), {"env", "LD_PRELOAD=" + library});
+    // Named without its folder, whose path may hold blanks, at which LD_PRELOAD is split.
+    const std::string folder = BuiltPrograms().parent_path() / "lib";
+    argv.insert(argv.begin(),
+                {"env", "LD_LIBRARY_PATH=" + folder, "LD_PRELOAD=libtavi_short_waits.so"});
 #endif
     return argv;
 }
