@@ -115,8 +115,8 @@ TEST(ModemCommands, NoModemIsNoFailure) {
 }
 
 TEST(ModemCommands, AFullDiskBehindTheOutputIsAFailure) {
-    const RunResult result =
-        RunProgram({"sh", "-c", BuiltProgram("taviwireless") + " modem --direct list > /dev/full"});
+    const RunResult result = RunProgram(
+        {"sh", "-c", "\"$0\" modem --direct list > /dev/full", BuiltProgram("taviwireless")});
     EXPECT_EQ(result.status, kFailure);
     EXPECT_EQ(result.err, "taviwireless: cannot write the output\n");
 }

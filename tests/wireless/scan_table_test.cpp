@@ -166,7 +166,7 @@ TEST(HostIwlist, FailsPlainlyWithoutAnAdapter) {
 
 TEST(HostIwlist, HandsOtherFormsToTheStockTool) {
     const std::string path = "/usr/sbin/iwlist";
-    Shell("cp '" HOST_IWLIST "' " + path);
+    Shell("cp --remove-destination '" HOST_IWLIST "' " + path);
     Shell("rm -f " + path + ".distrib");
     EXPECT_THAT(RunProgram({path, "wlan0", "scanning"}).err,
                 testing::HasSubstr("install wireless-tools"));
