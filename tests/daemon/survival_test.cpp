@@ -135,7 +135,9 @@ TEST(Survival, CallersThatDoNotWaitForTheirReply) {
         dbus_connection_unref(bus);
         EXPECT_TRUE(running.service.Lists({"usbmodem0"}));  // once all others are through
         const auto received = running.simulator.Received("0");
-        EXPECT_EQ(std::count(received.begin(), received.end(), "AT+CSQ"), wantsReply ? 1 : 4);
+        const auto served = std::count(received.begin(), received.end(), "AT+CSQ");
+        // Of those that want a reply only the first may be served before the caller has left.
+        EXPECT_TRUE(wantsReply ? served <= 1 : served == 4) << served;
     }
 }
 

@@ -1,6 +1,6 @@
 // A library that shortens waits, for a program linked with it or started with it in LD_PRELOAD. It
 // takes the place of sleep() and g_timeout_add_seconds(), whose seconds last 50 ms, and of
-// select(): the waits for silence, before an AT command and behind its reply, are cut to 10 ms, and
+// select(): the waits for silence, before an AT command and behind its reply, are cut to 20 ms, and
 // the clock by which they are told to be over is put forward by the rest. What is checked stays as
 // it was: the simulated modem sends a reply in one piece, so no wait decides where a reply ends,
 // and the wait for its beginning (1 s) is not cut.
@@ -16,7 +16,7 @@
 namespace {
 
 constexpr suseconds_t kLongestQuietWait = 200000;  // µs
-constexpr suseconds_t kShortWait = 10000;          // µs
+constexpr suseconds_t kShortWait = 20000;          // µs
 constexpr unsigned kShortSecond = 50;              // ms
 
 std::atomic<long long> notWaited{0};  // µs
