@@ -266,8 +266,7 @@ void LeaveChroot() {
         FailTo("leave the chroot");
     }
     constexpr unsigned int kWhole = AT_EMPTY_PATH | AT_RECURSIVE;
-    const UniqueFd tree(
-        open_tree(folder.Get(), "", OPEN_TREE_CLONE | OPEN_TREE_CLOEXEC | kWhole));
+    const UniqueFd tree(open_tree(folder.Get(), "", OPEN_TREE_CLONE | OPEN_TREE_CLOEXEC | kWhole));
     if (!tree || move_mount(tree.Get(), "", AT_FDCWD, "/", MOVE_MOUNT_F_EMPTY_PATH) != 0 ||
         fchdir(tree.Get()) != 0 || chroot(".") != 0) {
         FailTo("make the chroot a root");
