@@ -27,6 +27,7 @@ namespace {
 
 constexpr char kName[] = "usbmodemd";
 constexpr char kService[] = "com.merilond.usbmodem";
+constexpr char kBusLost[] = "the session bus has gone away; ending";
 constexpr int kUsageError = 2;
 constexpr guint kLookPause = 5;  // seconds between looks at the modems
 
@@ -94,10 +95,14 @@ void LogToSystem(const gchar* domain, GLogLevelFlags, const gchar* message, gpoi
 }
 
 void TakeName(USBModemServer& server, const SessionBus& bus) {
-    if (!server.Initialize()) {
+    const bool isTaken = server.Initialize();
+    const std::string owner = bus.OwnerOf(kService);
+    if (bus.IsLost()) {
+        throw std::runtime_error(kBusLost);
+    }
+    if (!isTaken) {
         throw std::runtime_error(std::string("the session bus refuses the name ") + kService);
     }
-    const std::string owner = bus.OwnerOf(kService);
     const char* self = server.GetConnectionName();
     if (self == nullptr || owner != self) {
         throw std::runtime_error(std::string(kService) +
@@ -127,7 +132,7 @@ int Serve(std::optional<Background>& background) {
             modems->LookAfterModems();
         },
         [&] {
-            syslog(LOG_ERR, "the session bus has gone away; ending");
+            syslog(LOG_ERR, "%s", kBusLost);
             status = EXIT_FAILURE;
             running->QuitLoop();
         });

@@ -47,6 +47,10 @@ std::string SessionBus::OwnerOf(const char* name) const {
     return owner;
 }
 
+bool SessionBus::IsLost() const {
+    return dbus_connection_get_is_connected(connection_) == FALSE;
+}
+
 // Asked of the bus itself: its signal about the caller still waits behind the calls.
 bool SessionBus::HasLeft(const char* caller) {
     if (caller == gone_) {

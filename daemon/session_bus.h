@@ -23,6 +23,8 @@ class SessionBus {
     // The unique name of the owner; empty when there is none.
     std::string OwnerOf(const char* name) const;
 
+    bool IsLost() const;
+
   private:
     static DBusHandlerResult Look(DBusConnection* connection, DBusMessage* message, void* self);
     bool HasLeft(const char* caller);

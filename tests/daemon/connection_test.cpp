@@ -112,6 +112,11 @@ struct Unplugging {
     const char* happens;           // a command, then the modem is unplugged
 };
 
+// So that the name CTest shows is the same in every run.
+void PrintTo(const Unplugging& row, std::ostream* out) {
+    *out << row.name;
+}
+
 class UnpluggedAfterARestart : public testing::TestWithParam<Unplugging> {};
 
 TEST_P(UnpluggedAfterARestart, IsHungUpAndTheRouteIsGivenBack) {
