@@ -8,9 +8,9 @@
 #include <cstdlib>
 #include <string>
 
-#include "platform/root/appliance_root.h"
+#include "platform/appliance_root/appliance_root.h"
 #include "tests/support/files.h"
-#include "wireless/hostapd_conf.h"
+#include "wireless/rules/hostapd_conf.h"
 
 namespace {
 

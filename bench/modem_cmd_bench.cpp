@@ -13,7 +13,7 @@
 #include <stdexcept>
 #include <string>
 
-#include "platform/root/appliance_root.h"
+#include "platform/appliance_root/appliance_root.h"
 
 namespace {
 

@@ -9,10 +9,10 @@
 #include <cstdio>
 #include <string>
 
-#include "platform/root/appliance_root.h"
+#include "platform/appliance_root/appliance_root.h"
 #include "tests/support/files.h"
-#include "wireless/paths.h"
-#include "wireless/queue.h"
+#include "wireless/rules/paths.h"
+#include "wireless/system/queue.h"
 
 namespace {
 

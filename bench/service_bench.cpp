@@ -16,7 +16,7 @@
 #include <thread>
 #include <vector>
 
-#include "platform/root/appliance_root.h"
+#include "platform/appliance_root/appliance_root.h"
 #include "tests/support/bus.h"
 #include "tests/support/modem_simulator.h"
 

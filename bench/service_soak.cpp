@@ -21,7 +21,7 @@
 #include <stdexcept>
 #include <thread>
 
-#include "platform/root/appliance_root.h"
+#include "platform/appliance_root/appliance_root.h"
 #include "tests/support/bus.h"
 #include "tests/support/files.h"
 #include "tests/support/modem_simulator.h"

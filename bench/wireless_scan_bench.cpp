@@ -7,9 +7,9 @@
 #include <stdio.h>
 #include <taviwireless/wireless.h>
 
-#include "platform/root/appliance_root.h"
+#include "platform/appliance_root/appliance_root.h"
 #include "tests/wireless/wifi_fixture.h"
-#include "wireless/queue.h"
+#include "wireless/system/queue.h"
 
 namespace {
 

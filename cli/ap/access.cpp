@@ -14,11 +14,11 @@
 #include "cli/commands.h"
 #include "cli/output.h"
 #include "cli/wifi/access.h"
-#include "wireless/ap_files.h"
-#include "wireless/ap_settings.h"
-#include "wireless/bridge_name.h"
-#include "wireless/paths.h"
-#include "wireless/shell.h"
+#include "wireless/rules/ap_files.h"
+#include "wireless/rules/ap_settings.h"
+#include "wireless/rules/bridge_name.h"
+#include "wireless/rules/paths.h"
+#include "wireless/system/shell.h"
 
 namespace taviwireless::cli {
 

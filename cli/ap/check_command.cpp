@@ -13,9 +13,9 @@
 #include "cli/ap/settings.h"
 #include "cli/output.h"
 #include "cli/wifi/access.h"
-#include "wireless/ap_files.h"
-#include "wireless/hostapd_conf.h"
-#include "wireless/shell.h"
+#include "wireless/rules/ap_files.h"
+#include "wireless/rules/hostapd_conf.h"
+#include "wireless/system/shell.h"
 
 namespace taviwireless::cli {
 

@@ -12,7 +12,7 @@
 #include "cli/secret.h"
 #include "cli/wifi/access.h"
 #include "cli/wifi/settings.h"
-#include "wireless/bridge_name.h"
+#include "wireless/rules/bridge_name.h"
 
 namespace taviwireless::cli {
 

@@ -8,11 +8,11 @@
 #include <cstdlib>
 #include <memory>
 
-#include "wireless/driver_request.h"
-#include "wireless/interface.h"
-#include "wireless/is_missing.h"
-#include "wireless/line_break.h"
-#include "wireless/paths.h"
+#include "wireless/rules/line_break.h"
+#include "wireless/rules/paths.h"
+#include "wireless/system/driver_request.h"
+#include "wireless/system/interface.h"
+#include "wireless/system/is_missing.h"
 
 namespace taviwireless::cli {
 

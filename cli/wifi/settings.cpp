@@ -9,7 +9,7 @@
 #include "cli/output.h"
 #include "cli/secret.h"
 #include "cli/wifi/access.h"
-#include "wireless/line_break.h"
+#include "wireless/rules/line_break.h"
 
 namespace taviwireless::cli {
 

@@ -343,7 +343,8 @@ TEST_F(APCommands, WhatWasSwitchedOnIsOnAgainAfterARestart) {
     tools.Add(program, "[ \"$*\" = 'wifi auto' ] || exec '" +
                            BuiltProgram("taviwireless_with_wifi") + "' \"$@\"");
     tools.Add("/usr/tavi/hotplug/usb.plug");
-    const std::vector<std::string> boot = {"sh", TAVI_ROOT_FOLDER "/start-wireless"};
+    const std::vector<std::string> boot = {"sh",
+                                           TAVI_SOURCE_DIR "/platform/host_root/start-wireless"};
     const std::string restart = "/etc/rc.network restart wlan0 lbr0";
     for (const char* enabled : {"no", "yes"}) {
         ASSERT_EQ(Set({"ssid=Home"}).status, 0);

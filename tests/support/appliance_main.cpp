@@ -7,7 +7,7 @@
 #include <cstring>
 #include <exception>
 
-#include "platform/root/appliance_root.h"
+#include "platform/appliance_root/appliance_root.h"
 
 namespace {
 

@@ -80,8 +80,9 @@ struct DialledModem {
 };
 
 void UseRealDialler() {
-    Shell("cp '" TAVI_SOURCE_DIR "/platform/root/wvdial' /usr/tavi/bin/wvdial");
-    Shell("cp --remove-destination '" TAVI_SOURCE_DIR "/sim/pppd' /usr/sbin/pppd");
+    Shell("cp '" TAVI_SOURCE_DIR "/platform/host_root/dialler/wvdial' /usr/tavi/bin/wvdial");
+    Shell("cp --remove-destination '" TAVI_SOURCE_DIR
+          "/platform/appliance_root/pppd' /usr/sbin/pppd");
 }
 
 TEST(Connection, LivesItsLifeWithTheRealDialler) {

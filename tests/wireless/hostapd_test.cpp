@@ -4,7 +4,7 @@
 
 #include "tests/support/log_capture.h"
 #include "tests/wireless/wifi_fixture.h"
-#include "wireless/hostapd_conf.h"
+#include "wireless/rules/hostapd_conf.h"
 
 namespace taviwireless::test {
 namespace {

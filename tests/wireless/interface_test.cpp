@@ -2,7 +2,7 @@
 #include <tavisdk/wireless.h>
 
 #include "tests/wireless/station_fixture.h"
-#include "wireless/queue.h"
+#include "wireless/system/queue.h"
 
 namespace {
 

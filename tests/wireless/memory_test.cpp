@@ -7,7 +7,7 @@
 
 #include "tests/support/sleep_capture.h"
 #include "tests/wireless/station_fixture.h"
-#include "wireless/queue.h"
+#include "wireless/system/queue.h"
 
 namespace {
 

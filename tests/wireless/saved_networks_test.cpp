@@ -2,7 +2,7 @@
 #include <ctime>
 
 #include "tests/wireless/station_fixture.h"
-#include "wireless/queue.h"
+#include "wireless/system/queue.h"
 
 namespace taviwireless::test {
 namespace {

@@ -7,7 +7,7 @@
 #include "tests/support/log_capture.h"
 #include "tests/support/sleep_capture.h"
 #include "tests/wireless/wifi_fixture.h"
-#include "wireless/queue.h"
+#include "wireless/system/queue.h"
 
 namespace taviwireless::test {
 namespace {

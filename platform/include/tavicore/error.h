@@ -4,8 +4,8 @@
  * A call that fails sets the code; a call that succeeds leaves it alone, so it is only meaningful
  * right after a failure. Users of the SDK set it too, for failures of their own.
  */
-#ifndef TAVICORE_ERROR_H
-#define TAVICORE_ERROR_H
+#ifndef TAVIWIRELESS_PLATFORM_INCLUDE_TAVICORE_ERROR_H
+#define TAVIWIRELESS_PLATFORM_INCLUDE_TAVICORE_ERROR_H
 
 #include <tavicore/export.h>
 

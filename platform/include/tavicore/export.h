@@ -1,5 +1,5 @@
-#ifndef TAVICORE_EXPORT_H
-#define TAVICORE_EXPORT_H
+#ifndef TAVIWIRELESS_PLATFORM_INCLUDE_TAVICORE_EXPORT_H
+#define TAVIWIRELESS_PLATFORM_INCLUDE_TAVICORE_EXPORT_H
 
 /* Marks what the SDK libraries export; everything else in them is hidden. */
 #define TAVI_SDK_API __attribute__((visibility("default")))

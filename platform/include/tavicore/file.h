@@ -8,8 +8,8 @@
  * when it is a regular one of root or of the caller's own user and of 64 KB at most, and follows a
  * link there only when it is root's or the caller's own. Else it fails with VEXAC_ERR_IO.
  */
-#ifndef TAVICORE_FILE_H
-#define TAVICORE_FILE_H
+#ifndef TAVIWIRELESS_PLATFORM_INCLUDE_TAVICORE_FILE_H
+#define TAVIWIRELESS_PLATFORM_INCLUDE_TAVICORE_FILE_H
 
 #include <tavicore/export.h>
 #include <tavicore/szlist.h>

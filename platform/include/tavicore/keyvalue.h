@@ -14,8 +14,8 @@
  * that nobody else can open and that is there only meanwhile; a writer that has not got it after 2
  * s fails with VEXAC_ERR_LOCKED and names the holder in the system log.
  */
-#ifndef TAVICORE_KEYVALUE_H
-#define TAVICORE_KEYVALUE_H
+#ifndef TAVIWIRELESS_PLATFORM_INCLUDE_TAVICORE_KEYVALUE_H
+#define TAVIWIRELESS_PLATFORM_INCLUDE_TAVICORE_KEYVALUE_H
 
 #include <stddef.h>
 #include <tavicore/export.h>

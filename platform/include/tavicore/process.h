@@ -7,8 +7,8 @@
  * another start time, so a stale pid file of ours never makes that program be taken for ours; for
  * pid files of other writers the id alone counts.
  */
-#ifndef TAVICORE_PROCESS_H
-#define TAVICORE_PROCESS_H
+#ifndef TAVIWIRELESS_PLATFORM_INCLUDE_TAVICORE_PROCESS_H
+#define TAVIWIRELESS_PLATFORM_INCLUDE_TAVICORE_PROCESS_H
 
 #include <sys/types.h>
 #include <tavicore/export.h>

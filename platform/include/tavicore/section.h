@@ -25,8 +25,8 @@
  * when another writer keeps it for 2 s, VEXAC_ERR_OUT_OF_MEMORY when there is no memory, and
  * VEXAC_ERR_BAD_PARAMETER for a null argument; a failed write leaves the file as it was.
  */
-#ifndef TAVICORE_SECTION_H
-#define TAVICORE_SECTION_H
+#ifndef TAVIWIRELESS_PLATFORM_INCLUDE_TAVICORE_SECTION_H
+#define TAVIWIRELESS_PLATFORM_INCLUDE_TAVICORE_SECTION_H
 
 #include <stddef.h>
 #include <tavicore/export.h>

@@ -4,8 +4,8 @@
  * The hash owns copies of its keys and values; keys are compared exactly, case included. A hash is
  * passed by address where it may grow, because growing may move it.
  */
-#ifndef TAVICORE_SZHASH_H
-#define TAVICORE_SZHASH_H
+#ifndef TAVIWIRELESS_PLATFORM_INCLUDE_TAVICORE_SZHASH_H
+#define TAVIWIRELESS_PLATFORM_INCLUDE_TAVICORE_SZHASH_H
 
 #include <tavicore/export.h>
 

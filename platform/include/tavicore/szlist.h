@@ -4,8 +4,8 @@
  * The list owns copies of its strings. A list is passed by address where it may grow, because
  * growing may move it.
  */
-#ifndef TAVICORE_SZLIST_H
-#define TAVICORE_SZLIST_H
+#ifndef TAVIWIRELESS_PLATFORM_INCLUDE_TAVICORE_SZLIST_H
+#define TAVIWIRELESS_PLATFORM_INCLUDE_TAVICORE_SZLIST_H
 
 #include <tavicore/export.h>
 

@@ -4,8 +4,8 @@
  * A failure sets the error code of <tavicore/error.h>: VEXAC_ERR_NOT_FOUND alone says that there
  * are no such settings; with any other code, they may be there and could not be read or written.
  */
-#ifndef TAVISDK_BRIDGE_H
-#define TAVISDK_BRIDGE_H
+#ifndef TAVIWIRELESS_PLATFORM_INCLUDE_TAVISDK_BRIDGE_H
+#define TAVIWIRELESS_PLATFORM_INCLUDE_TAVISDK_BRIDGE_H
 
 #include <tavicore/export.h>
 #include <tavicore/szlist.h>

@@ -5,8 +5,8 @@
  * or text that is no address, VEXAC_ERR_NOT_FOUND when there is nothing to give, VEXAC_ERR_TOO_LONG
  * when it does not fit, otherwise VEXAC_ERR_IO.
  */
-#ifndef TAVISDK_NETWORK_H
-#define TAVISDK_NETWORK_H
+#ifndef TAVIWIRELESS_PLATFORM_INCLUDE_TAVISDK_NETWORK_H
+#define TAVIWIRELESS_PLATFORM_INCLUDE_TAVISDK_NETWORK_H
 
 #include <stddef.h>
 #include <tavicore/export.h>

@@ -1,6 +1,6 @@
 /* Services of the appliance that follow the network. */
-#ifndef TAVISDK_SERVICE_H
-#define TAVISDK_SERVICE_H
+#ifndef TAVIWIRELESS_PLATFORM_INCLUDE_TAVISDK_SERVICE_H
+#define TAVIWIRELESS_PLATFORM_INCLUDE_TAVISDK_SERVICE_H
 
 #include <tavicore/export.h>
 

@@ -2,8 +2,8 @@
  * The public names of Wi-Fi functions that libtaviwireless implements under the same name and
  * "_core". They reach the library that the process has loaded.
  */
-#ifndef TAVISDK_WIRELESS_H
-#define TAVISDK_WIRELESS_H
+#ifndef TAVIWIRELESS_PLATFORM_INCLUDE_TAVISDK_WIRELESS_H
+#define TAVIWIRELESS_PLATFORM_INCLUDE_TAVISDK_WIRELESS_H
 
 #include <tavicore/export.h>
 

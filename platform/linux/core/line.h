@@ -1,5 +1,5 @@
-#ifndef TAVICORE_LINE_H
-#define TAVICORE_LINE_H
+#ifndef TAVIWIRELESS_PLATFORM_LINUX_CORE_LINE_H
+#define TAVIWIRELESS_PLATFORM_LINUX_CORE_LINE_H
 
 #include <optional>
 #include <string>

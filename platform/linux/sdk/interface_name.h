@@ -1,5 +1,5 @@
-#ifndef TAVISDK_INTERFACE_NAME_H
-#define TAVISDK_INTERFACE_NAME_H
+#ifndef TAVIWIRELESS_PLATFORM_LINUX_SDK_INTERFACE_NAME_H
+#define TAVIWIRELESS_PLATFORM_LINUX_SDK_INTERFACE_NAME_H
 
 // Names of interfaces that become parts of paths and of other programs' configurations.
 namespace tavisdk {

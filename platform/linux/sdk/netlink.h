@@ -1,5 +1,5 @@
-#ifndef TAVISDK_NETLINK_H
-#define TAVISDK_NETLINK_H
+#ifndef TAVIWIRELESS_PLATFORM_LINUX_SDK_NETLINK_H
+#define TAVIWIRELESS_PLATFORM_LINUX_SDK_NETLINK_H
 
 #include <netlink/cache.h>
 #include <netlink/netlink.h>

@@ -1,0 +1,177 @@
+#include "platform/appliance_root/appliance_root.h"
+
+#include <linux/capability.h>
+#include <poll.h>
+#include <sched.h>
+#include <sys/auxv.h>
+#include <sys/prctl.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <cerrno>
+#include <csignal>
+#include <cstdio>
+#include <exception>
+#include <filesystem>
+#include <fstream>
+#include <string>
+#include <system_error>
+
+#include "platform/appliance_root/private_system.h"
+
+namespace taviwireless {
+namespace {
+
+namespace fs = std::filesystem;
+
+// What would change the machine itself rather than what is seen inside, such as its clock.
+constexpr unsigned long kPowersOverTheMachine[] = {CAP_SYS_MODULE, CAP_SYS_RAWIO, CAP_SYS_BOOT,
+                                                   CAP_SYS_TIME,   CAP_MKNOD,     CAP_SYSLOG};
+
+constexpr char kNamespacesRefused[] =
+    "new namespaces are refused: run as root, or let ordinary users make user namespaces (sysctl "
+    "user.max_user_namespaces, kernel.unprivileged_userns_clone, "
+    "kernel.apparmor_restrict_unprivileged_userns); a container has to be a privileged one, and "
+    "in a chroot only root can";
+
+[[noreturn]] void Fail(const std::string& sentence) {
+    throw std::system_error(errno, std::generic_category(), "appliance root: " + sentence);
+}
+
+void WriteMap(const char* path, const std::string& text) {
+    std::ofstream file(path);
+    if (!file.write(text.data(), text.size()).flush()) {
+        Fail(std::string("cannot write ") + path);
+    }
+}
+
+// Makes the namespaces, and a user namespace first when they are refused without.
+void LeaveNamespaces() {
+    constexpr int kNamespaces =
+        CLONE_NEWNS | CLONE_NEWNET | CLONE_NEWIPC | CLONE_NEWPID | CLONE_NEWUTS;
+    if (unshare(kNamespaces) == 0) {
+        return;
+    }
+    const std::string user = std::to_string(geteuid());
+    const std::string group = std::to_string(getegid());
+    if (errno != EPERM || unshare(kNamespaces | CLONE_NEWUSER) != 0) {
+        Fail(kNamespacesRefused);
+    }
+    WriteMap("/proc/self/setgroups", "deny");  // the kernel's condition for mapping the group
+    WriteMap("/proc/self/uid_map", "0 " + user + " 1");
+    WriteMap("/proc/self/gid_map", "0 " + group + " 1");
+}
+
+// Before anything is moved; the program's own path without /proc, which may not be there.
+Workplace FindWorkplace(const std::string& output) {
+    const auto* program = reinterpret_cast<const char*>(getauxval(AT_EXECFN));
+    Workplace workplace = {fs::canonical(program), fs::current_path(), ""};
+    if (!output.empty()) {
+        std::error_code error;
+        workplace.output = fs::canonical(output, error);
+        if (error || access(workplace.output.c_str(), W_OK) != 0) {
+            errno = error ? error.value() : errno;
+            Fail("cannot use the output folder " + output);
+        }
+    }
+    return workplace;
+}
+
+sigset_t HandledSignals() {
+    sigset_t signals;
+    sigemptyset(&signals);
+    for (const int number : {SIGTERM, SIGINT, SIGHUP, SIGCHLD}) {
+        sigaddset(&signals, number);
+    }
+    return signals;
+}
+
+pid_t ForkOrFail() {
+    const pid_t pid = fork();
+    if (pid < 0) {
+        Fail("cannot start a process");
+    }
+    return pid;
+}
+
+// Hands signals on to `child`, whose end ends this process with the same status; collects every
+// other child. The handled signals must be blocked.
+[[noreturn]] void Tend(pid_t child) {
+    const sigset_t signals = HandledSignals();
+    for (;;) {
+        int status = 0;
+        pid_t ended = 0;
+        while ((ended = waitpid(-1, &status, WNOHANG)) > 0) {
+            if (ended == child && WIFSIGNALED(status)) {
+                _exit(128 + WTERMSIG(status));
+            }
+            if (ended == child && WIFEXITED(status)) {
+                _exit(WEXITSTATUS(status));
+            }
+        }
+        siginfo_t info{};
+        const int number = sigwaitinfo(&signals, &info);
+        // What the kernel sent (the terminal's Ctrl-C) went to the whole process group already.
+        if (number > 0 && number != SIGCHLD && info.si_code != SI_KERNEL) {
+            kill(child, number);
+        }
+    }
+}
+
+// Lets this process die with the one outside, which holds the other end of `outside` open.
+void DieWithOutside(int outside) {
+    prctl(PR_SET_PDEATHSIG, SIGKILL);
+    pollfd end{outside, POLLIN, 0};
+    if (poll(&end, 1, 0) > 0) {  // it died before it could be noticed
+        _exit(128 + SIGKILL);
+    }
+    close(outside);
+}
+
+void SetUpOrExit(const Workplace& workplace) {
+    try {
+        SetUpPrivateSystem(workplace);
+    } catch (const std::exception& error) {
+        fprintf(stderr, "%s\n", error.what());
+        _exit(kApplianceRootFailed);
+    }
+    for (const unsigned long power : kPowersOverTheMachine) {
+        prctl(PR_CAPBSET_DROP, power);  // of every program that is run from now on
+    }
+}
+
+}  // namespace
+
+void EnterApplianceRoot(const std::string& output) {
+    const Workplace workplace = FindWorkplace(output);
+    LeaveNamespaces();
+    int life[2];  // holds no data: its writing end is open as long as the process outside lives
+    if (pipe(life) != 0) {
+        Fail("cannot make a pipe");
+    }
+    fflush(nullptr);  // or every process would print what is buffered
+
+    signal(SIGCHLD, SIG_DFL);  // ignored by some callers, which would keep the end from us
+    const sigset_t signals = HandledSignals();
+    sigset_t before;
+    sigprocmask(SIG_BLOCK, &signals, &before);
+    const pid_t init = ForkOrFail();
+    if (init > 0) {
+        close(life[0]);
+        Tend(init);
+    }
+    close(life[1]);
+    DieWithOutside(life[0]);
+    SetUpOrExit(workplace);
+    const pid_t inside = fork();
+    if (inside < 0) {
+        perror("appliance root: cannot start a process");
+        _exit(kApplianceRootFailed);
+    }
+    if (inside > 0) {
+        Tend(inside);
+    }
+    sigprocmask(SIG_SETMASK, &before, nullptr);
+}
+
+}  // namespace taviwireless

@@ -1,0 +1,48 @@
+#include "platform/host_root/network/origins.h"
+
+#include <unistd.h>
+
+#include <fstream>
+#include <sstream>
+
+#include "base/trusted_file.h"
+#include "platform/host_root/network/error.h"
+
+namespace taviwireless::network {
+
+namespace {
+
+std::string FileOf(const std::string& bridge) {
+    return "/var/run/rc.network-" + bridge + ".origins";
+}
+
+}  // namespace
+
+Origins ReadOrigins(const std::string& bridge) {
+    std::istringstream lines(ReadTrusted(FileOf(bridge)).value_or(""));
+    Origins origins;
+    for (std::string line; std::getline(lines, line);) {
+        std::istringstream words(line);
+        std::string interface, address;
+        words >> interface >> address;
+        origins.emplace(interface, address);
+    }
+    return origins;
+}
+
+void WriteOrigins(const std::string& bridge, const Origins& origins) {
+    const std::string file = FileOf(bridge);
+    unlink(file.c_str());
+    if (origins.empty()) {
+        return;
+    }
+    std::ofstream lines(file);
+    for (const auto& [interface, address] : origins) {
+        lines << interface << ' ' << address << '\n';
+    }
+    if (!lines.flush()) {
+        throw Error("cannot write " + file);
+    }
+}
+
+}  // namespace taviwireless::network

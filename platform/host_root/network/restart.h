@@ -1,0 +1,14 @@
+#ifndef TAVIWIRELESS_PLATFORM_HOST_ROOT_NETWORK_RESTART_H
+#define TAVIWIRELESS_PLATFORM_HOST_ROOT_NETWORK_RESTART_H
+
+#include "platform/host_root/network/plan.h"
+
+namespace taviwireless::network {
+
+// Brings the plan about and looks whether that worked. Throws Error when it did not; then what was
+// before is in force again: bridges, members, addresses, routes and the programs that ran.
+void BringAbout(const Plan& plan);
+
+}  // namespace taviwireless::network
+
+#endif

@@ -1,0 +1,148 @@
+// The appliance root as seen from outside: through the program appliance-root.
+#include "platform/appliance_root/appliance_root.h"
+
+#include <gmock/gmock.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <csignal>
+#include <cstdlib>
+#include <filesystem>
+
+#include "tests/support/files.h"
+#include "tests/support/process.h"
+
+namespace taviwireless::test {
+namespace {
+
+using testing::HasSubstr;
+using testing::StartsWith;
+
+RunResult RunInside(std::vector<std::string> command) {
+    command.insert(command.begin(), {BuiltProgram("appliance-root"), "--"});
+    return RunProgram(command);
+}
+
+class PrivateFolder : public testing::TestWithParam<const char*> {};
+
+TEST_P(PrivateFolder, TakesFilesThatAreNotSeenOutside) {
+    const std::string path =
+        std::string(GetParam()) + "/appliance-root-test-" + std::to_string(getpid());
+    const auto result = RunInside({"sh", "-c", "echo hello > \"$1\" && cat \"$1\"", "sh", path});
+    EXPECT_EQ(result.status, 0) << result.err;
+    EXPECT_EQ(result.out, "hello\n");
+    EXPECT_FALSE(std::filesystem::remove(path));
+}
+
+INSTANTIATE_TEST_SUITE_P(ApplianceRoot, PrivateFolder,
+                         testing::Values("/tmp", "/run", "/run/lock", "/var/run", "/var/lock",
+                                         "/var/tmp", "/var/lib", "/etc", "/etc/hostapd", "/usr",
+                                         "/usr/sbin", "/usr/tavi", "/sbin", "/bin", "/dev",
+                                         "/dev/shm", "/etc.defaults"));
+
+using CommandEnd = std::pair<std::string, int>;
+
+class EndOfTheCommand : public testing::TestWithParam<CommandEnd> {};
+
+TEST_P(EndOfTheCommand, BecomesTheStatus) {
+    EXPECT_EQ(RunInside({"sh", "-c", GetParam().first}).status, GetParam().second);
+}
+
+INSTANTIATE_TEST_SUITE_P(ApplianceRoot, EndOfTheCommand,
+                         testing::Values(CommandEnd("exit 0", 0), CommandEnd("exit 7", 7),
+                                         CommandEnd("exit 255", 255),
+                                         CommandEnd("kill -KILL $$", 128 + SIGKILL),
+                                         CommandEnd("kill -TERM $$", 128 + SIGTERM)));
+
+using NamedSignal = std::pair<int, std::string>;
+
+class SignalFromOutside : public testing::TestWithParam<NamedSignal> {};
+
+TEST_P(SignalFromOutside, ReachesTheCommand) {
+    const auto [number, name] = GetParam();
+    const std::string trap = "trap 'echo " + name + "; exit 9' " + name;
+    Process root({BuiltProgram("appliance-root"), "sh", "-c",
+                  trap + "; echo up; sleep 60 & while :; do wait; done"});
+    ASSERT_EQ(root.ReadLine(), "up");
+    root.Signal(number);
+    EXPECT_EQ(root.ReadLine(), name);
+    EXPECT_EQ(root.Wait(), 9);
+}
+
+INSTANTIATE_TEST_SUITE_P(ApplianceRoot, SignalFromOutside,
+                         testing::Values(NamedSignal(SIGTERM, "TERM"), NamedSignal(SIGINT, "INT"),
+                                         NamedSignal(SIGHUP, "HUP")));
+
+// Whatever is left holds the output open, which RunProgram() would wait for.
+TEST(ApplianceRoot, KillsWhatTheCommandLeftRunning) {
+    const auto start = std::chrono::steady_clock::now();
+    const auto result = RunInside({"sh", "-c", "sleep 60 & (setsid sleep 60 &) ; echo left"});
+    EXPECT_EQ(result.out, "left\n");
+    EXPECT_LT(std::chrono::steady_clock::now() - start, std::chrono::seconds(10));
+}
+
+TEST(ApplianceRoot, DiesWithTheProcessOutside) {
+    Process root({BuiltProgram("appliance-root"), "sh", "-c", "echo up; setsid sleep 60"});
+    ASSERT_EQ(root.ReadLine(), "up");
+    root.Signal(SIGKILL);
+    EXPECT_EQ(root.ReadLine(), std::nullopt);
+    EXPECT_TRUE(root.AtEnd());
+}
+
+// Runs it with mounts of its own. In a chroot only an appliance root gives it those.
+RunResult RunWithMounts(std::vector<std::string> command) {
+    std::vector<std::string> unshare = {"unshare", "--mount", "--ipc"};
+    if (geteuid() != 0) {
+        unshare.insert(unshare.end(), {"--user", "--map-root-user"});
+    } else if (RunProgram({"unshare", "--mount", "true"}).status != 0) {
+        unshare = {BuiltProgram("appliance-root")};
+    }
+    command.insert(command.begin(), unshare.begin(), unshare.end());
+    return RunProgram(command);
+}
+
+class UsedMachine : public testing::TestWithParam<const char*> {};
+
+TEST_P(UsedMachine, IsNotSeenAndNotChanged) {
+    const RunResult result =
+        RunWithMounts({TAVI_SOURCE_DIR "/tests/platform/appliance_root/used_machine",
+                       BuiltProgram("appliance-root"), GetParam()});
+    const bool isReadOnly = GetParam() == std::string("read-only");
+    const std::string place =
+        "/etc/hostapd:\n\n/run/lock:\nno /var/lib/usbmodem\n0 new\ndestroyed\n" +
+        std::string(isReadOnly ? "no output\n" : "");
+    EXPECT_EQ(result.out, place + place + place + place + place + "unchanged\n" +
+                              (isReadOnly ? "" : "kept\nkept\nkept\nkept\nkept\n"))
+        << result.err;
+    EXPECT_EQ(result.status, 0);
+}
+
+INSTANTIATE_TEST_SUITE_P(ApplianceRoot, UsedMachine,
+                         testing::Values("", "user", "read-only", "chroot"));
+
+void ExpectSentence(const std::string& script, const std::string& sentence) {
+    const auto result = RunProgram({"sh", "-c", script, BuiltProgram("appliance-root")});
+    EXPECT_EQ(result.status, kApplianceRootFailed);
+    EXPECT_THAT(result.err, StartsWith("appliance root: " + sentence));
+    EXPECT_EQ(std::count(result.err.begin(), result.err.end(), '\n'), 1);
+}
+
+TEST(KernelThatRefuses, IsNamedInOneSentence) {
+    const char* refused = "new namespaces are refused: run as root, or let ordinary users";
+    const std::string asNobodySpecial = "exec setpriv --bounding-set=-sys_admin \"$0\" true";
+    const std::string asUser = "exec unshare --mount --user --map-root-user ";
+    if (RunProgram({"sh", "-c", asUser + "true"}).status != 0) {  // as in a chroot
+        return ExpectSentence(asNobodySpecial, refused);
+    }
+    ExpectSentence(asUser + "sh -c 'echo 0 >/proc/sys/user/max_user_namespaces; " +
+                       asNobodySpecial + "' \"$0\"",
+                   refused);
+    ExpectSentence(asUser +
+                       "sh -c 'awk \"/ - proc / { print \\$5 }\" /proc/self/mountinfo |"
+                       "while read -r proc; do mount --bind /dev/null $proc/version; done;" +
+                       asUser + "\"$0\" true' \"$0\"",
+                   "cannot mount a private /proc (the kernel lets only root");
+}
+
+}  // namespace
+}  // namespace taviwireless::test

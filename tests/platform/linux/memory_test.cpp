@@ -1,0 +1,99 @@
+// No memory: every call fails as a C function does, and files are as they were.
+#include <gmock/gmock.h>
+#include <signal.h>
+#include <tavicore/error.h>
+#include <tavicore/file.h>
+#include <tavicore/keyvalue.h>
+#include <tavicore/process.h>
+#include <tavicore/section.h>
+
+#include <functional>
+#include <memory>
+#include <string>
+
+#include "common/sz_hash.h"
+#include "common/sz_list.h"
+#include "tests/platform/linux/failing_memory.h"
+#include "tests/support/files.h"
+
+namespace taviwireless::test {
+namespace {
+
+constexpr char kFile[] = "/tmp/state/file";
+constexpr char kPidFile[] = "/tmp/state/pid";
+// Too long for the room that a string has in itself.
+constexpr char kLong[] = "a-value-that-is-longer-than-any-small-string";
+
+struct Call {
+    const char* name;
+    int failed;
+    std::function<int()> run;
+};
+
+// Calls it with the first allocation failing, then the second, and so on, until none fails.
+// The caller sees each failure, and the file is as it was.
+void CallWithoutMemory(const Call& call, const std::function<void()>& prepare) {
+    SCOPED_TRACE(call.name);
+    constexpr int kMostAllocations = 200;
+    for (int count = 0; count < kMostAllocations; ++count) {
+        prepare();
+        VEXACErrSet(VEXAC_ERR_NONE);
+        FailAllocationAfter(count);
+        const int result = call.run();
+        if (!HasAllocationFailed()) {
+            EXPECT_NE(result, call.failed);
+            return;
+        }
+        EXPECT_EQ(result, call.failed) << count;
+        EXPECT_EQ(VEXACErrGet(), VEXAC_ERR_OUT_OF_MEMORY) << count;
+        EXPECT_EQ(ReadFile(kFile), "K=v\n[S]\nK=v\n") << count;
+        EXPECT_FALSE(Exists("/tmp/state/.file.lock"));
+        EXPECT_FALSE(Exists("/tmp/state/.file.new"));
+    }
+    ADD_FAILURE() << "never succeeds";
+}
+
+TEST(Memory, ThatIsMissingFailsEveryCallAndChangesNoFile) {
+    SzHash hash(0);
+    hash.Set("K", "v");
+    SzList list(0);
+    std::unique_ptr<SzHash> fresh;
+    const std::string value = kLong;
+    char buffer[64];
+    const Call kCalls[] = {
+        {"SzHashAlloc", 0, [] { return SzHash(0) ? 1 : 0; }},
+        {"SzHash::Set", 0, [&] { return fresh->Set(kLong, value) ? 1 : 0; }},
+        {"SzHash::Set, known", 0, [&] { return hash.Set("K", value) ? 1 : 0; }},
+        {"SzListPush", -1, [&] { return VEXACSzListPush(list.Address(), kLong); }},
+        {"Touch", -1, [] { return VEXACFileTouch(kFile); }},
+        {"EnumDir", -1,
+         [&] { return VEXACFileEnumDir("/tmp/state", "f", list.Address(), VEXAC_ENUM_FILES); }},
+        {"AddLine", -1, [] { return VEXACFileAddLine(kFile, nullptr, kLong, 0); }},
+        {"RemoveLine", -1, [] { return VEXACFileRemoveLine(kFile, "[S]"); }},
+        {"GetKeyValue", -1,
+         [&] { return VEXACFileGetKeyValue(kFile, "K", buffer, sizeof buffer); }},
+        {"SetKeyValue", -1, [] { return VEXACFileSetKeyValue(kFile, "K", kLong, nullptr); }},
+        {"EnumSection", -1, [&] { return VEXACFileEnumSection(kFile, list.Address()); }},
+        {"GetSection", -1, [&] { return VEXACFileGetSection(kFile, "S", hash.Address()); }},
+        {"AddSection", -1, [&] { return VEXACFileAddSection(kFile, "T", hash.Get(), "%s=%s\n"); }},
+        {"SetSection", -1,
+         [&] { return VEXACFileSetSection(kFile, "S", nullptr, hash.Get(), "%s=%s\n"); }},
+        {"SetSectionValue", -1,
+         [] { return VEXACFileSetSectionValue(kFile, "S", "K", kLong, "%s=%s\n"); }},
+        {"PidFileCreate", -1, [] { return VEXACProcPidFileCreate(kPidFile); }},
+        {"AliveByPidFile", 0, [] { return VEXACProcAliveByPidFile(kPidFile); }},
+        {"SignalByPidFile", -1, [] { return VEXACProcSignalByPidFile(kPidFile, 0); }},
+        {"ReadPidFile", -1, [] { return VEXACReadPidFile(kPidFile); }},
+        {"Exec", -1, [] { return VEXACExec("true", nullptr); }},
+    };
+    for (const Call& call : kCalls) {
+        CallWithoutMemory(call, [&] {
+            fresh = std::make_unique<SzHash>(0);
+            WriteFile(kFile, "K=v\n[S]\nK=v\n");
+            VEXACProcPidFileCreate(kPidFile);
+        });
+    }
+}
+
+}  // namespace
+}  // namespace taviwireless::test

@@ -1,0 +1,272 @@
+// Replacing a file: in one step, alike, and one writer after the other.
+#include <fcntl.h>
+#include <gmock/gmock.h>
+#include <signal.h>
+#include <sys/file.h>
+#include <sys/mount.h>
+#include <sys/stat.h>
+#include <sys/wait.h>
+#include <tavicore/error.h>
+#include <tavicore/keyvalue.h>
+#include <tavicore/section.h>
+#include <unistd.h>
+
+#include <memory>
+#include <random>
+#include <utility>
+
+#include "tests/platform/linux/skipped_waits.h"
+#include "tests/support/descriptors.h"
+#include "tests/support/files.h"
+#include "tests/support/log_capture.h"
+
+namespace taviwireless::test {
+namespace {
+
+constexpr char kFile[] = "/tmp/state/file";
+
+// Runs body in a child process.
+template <typename Body>
+pid_t Fork(Body body) {
+    const pid_t child = fork();
+    if (child == 0) {
+        body();
+        _exit(0);
+    }
+    return child;
+}
+
+TEST(Replacing, KeepsModeOwnerAndLinks) {
+    WriteFile(kFile, "A=1\n");
+    // Without root there is one user and one group alone.
+    const bool isGiven = chown(kFile, 1, 2) == 0;
+    ASSERT_EQ(chmod(kFile, 0640), 0);
+    ASSERT_EQ(symlink("state/file", "/tmp/link"), 0);
+    const auto before = OpenDescriptors();
+    EXPECT_EQ(VEXACFileSetKeyValue("/tmp/link", "A", "2", "%s=%s\n"), 1);
+    struct stat status {};
+    ASSERT_EQ(lstat(kFile, &status), 0);
+    EXPECT_EQ(status.st_mode, S_IFREG | 0640u);
+    EXPECT_EQ(status.st_uid, isGiven ? 1u : 0u);
+    EXPECT_EQ(status.st_gid, isGiven ? 2u : 0u);
+    ASSERT_EQ(lstat("/tmp/link", &status), 0);
+    EXPECT_TRUE(S_ISLNK(status.st_mode));
+    EXPECT_EQ(ReadFile(kFile), "A=2\n");
+    EXPECT_EQ(OpenDescriptors(), before);
+}
+
+TEST(Replacing, AFullDiskLeavesTheOldFile) {
+    MakeDirectories("/tmp/state");
+    ASSERT_EQ(mount("tiny", "/tmp/state", "tmpfs", 0, "size=8k"), 0);
+    WriteFile(kFile, "A=1\n");
+    const std::string big(16384, 'x');
+    EXPECT_EQ(VEXACFileSetKeyValue(kFile, "A", big.c_str(), nullptr), -1);
+    EXPECT_EQ(VEXACErrGet(), VEXAC_ERR_IO);
+    EXPECT_EQ(ReadFile(kFile), "A=1\n");
+    EXPECT_FALSE(Exists("/tmp/state/.file.new"));
+    EXPECT_EQ(VEXACFileSetKeyValue(kFile, "A", "2", "%s=%s\n"), 1);
+}
+
+TEST(Replacing, FourWritersLoseNothing) {
+    constexpr int kWriters = 4;
+    constexpr int kWrites = 500;
+    MakeDirectories("/tmp/state");
+    for (int writer = 0; writer < kWriters; ++writer) {
+        Fork([writer] {
+            for (int i = 0; i < kWrites; ++i) {
+                const std::string key = "K" + std::to_string(writer) + "_" + std::to_string(i);
+                if (VEXACFileSetSectionValue(kFile, "S", key.c_str(), "v", "%s=%s\n") != 0) {
+                    _exit(1);
+                }
+            }
+        });
+    }
+    for (int status = 0; wait(&status) > 0;) {
+        EXPECT_EQ(status, 0);
+    }
+    VEXACSzHash* hash = VEXACSzHashAlloc(1024);
+    ASSERT_EQ(VEXACFileGetSection(kFile, "S", &hash), 1);
+    int found = 0;
+    for (int i = 0; i < kWriters * kWrites; ++i) {
+        const std::string key =
+            "K" + std::to_string(i / kWrites) + "_" + std::to_string(i % kWrites);
+        found += VEXACSzHashGetValue(hash, key.c_str()) != nullptr ? 1 : 0;
+    }
+    EXPECT_EQ(found, kWriters * kWrites);
+    VEXACSzHashFree(hash);
+}
+
+// The file holds FIRST, a long value, and LAST, equal to FIRST, whenever it is looked at.
+TEST(Replacing, AKilledWriterNeverLeavesATornFile) {
+    constexpr int kKills = 200;
+    MakeDirectories("/tmp/state");
+    const std::string filler(20000, 'x');
+    WriteFile(kFile, "PAIR=0-0\nFILLER=" + filler + "\n");
+    std::mt19937 random(20);
+    std::uniform_int_distribution<int> microseconds(0, 3000);
+    for (int kill = 0; kill < kKills; ++kill) {
+        const pid_t writer = Fork([kill] {
+            for (int i = 0;; ++i) {
+                const std::string text = std::to_string(kill) + "." + std::to_string(i);
+                VEXACFileSetKeyValue(kFile, "PAIR", (text + "-" + text).c_str(), "%s=%s\n");
+            }
+        });
+        usleep(static_cast<useconds_t>(microseconds(random)));
+        ::kill(writer, SIGKILL);
+        waitpid(writer, nullptr, 0);
+        char pair[64];
+        ASSERT_GT(VEXACFileGetKeyValue(kFile, "PAIR", pair, sizeof pair), 0);
+        const std::string text = pair;
+        ASSERT_EQ(text.substr(0, text.find('-')), text.substr(text.find('-') + 1));
+        ASSERT_EQ(ReadFile(kFile), "PAIR=" + text + "\nFILLER=" + filler + "\n");
+    }
+    EXPECT_EQ(VEXACFileSetKeyValue(kFile, "PAIR", "1-1", "%s=%s\n"), 1);
+    EXPECT_FALSE(Exists("/tmp/state/.file.new"));  // what the last killed one left
+}
+
+constexpr char kLock[] = "/tmp/state/.file.lock";
+constexpr uid_t kStranger = 65534;
+
+int SetKey(const char* path, const char* value) {
+    return VEXACFileSetKeyValue(path, "A", value, "%s=%s\n");
+}
+
+// A writer that has the lock and goes no further: stopped until it is killed.
+class StoppedWriter {
+  public:
+    StoppedWriter()
+        : pid_(Fork([] {
+              AtEachSync([] { raise(SIGSTOP); });
+              SetKey(kFile, "stopped");
+          })) {
+        waitpid(pid_, nullptr, WUNTRACED);
+    }
+    ~StoppedWriter() { End(); }
+    StoppedWriter(const StoppedWriter&) = delete;
+    StoppedWriter& operator=(const StoppedWriter&) = delete;
+
+    pid_t Pid() const { return pid_; }
+    void End() {
+        if (pid_ > 0) {
+            kill(pid_, SIGKILL);
+            waitpid(std::exchange(pid_, -1), nullptr, 0);
+        }
+    }
+
+  private:
+    pid_t pid_;
+};
+
+struct Locking : testing::Test {
+    Locking() { WriteFile(kFile, "A=1\n"); }
+
+    LogCapture log_;
+    SkippedWaits waits_;
+};
+
+TEST_F(Locking, AWriterThatDoesNotGoOnIsWaitedForTwoSecondsAndNamed) {
+    ASSERT_EQ(symlink("/tmp/state/file", "/tmp/other-name"), 0);
+    const auto before = OpenDescriptors();
+    const StoppedWriter holder;
+    for (const char* path : {kFile, "/tmp/state/../state/file", "/tmp/other-name"}) {
+        const double begin = waits_.Seconds();
+        log_.Clear();
+        EXPECT_EQ(SetKey(path, "2"), -1);
+        EXPECT_EQ(VEXACErrGet(), VEXAC_ERR_LOCKED);
+        EXPECT_LE(waits_.Seconds() - begin, 2.001);
+        EXPECT_THAT(log_.Text(),
+                    testing::HasSubstr("Cannot write " + std::string(path) + ": process " +
+                                       std::to_string(holder.Pid()) + " (tavicore_test) holds"));
+    }
+    EXPECT_EQ(SetKey("/tmp/state/another", "2"), 1);  // locks are of single files
+    EXPECT_EQ(ReadFile(kFile), "A=1\n");
+    EXPECT_EQ(OpenDescriptors(), before);
+}
+
+TEST_F(Locking, AKilledWritersLockIsTakenOver) {
+    StoppedWriter().End();
+    EXPECT_TRUE(Exists(kLock));
+    EXPECT_EQ(SetKey(kFile, "2"), 1);
+    EXPECT_EQ(waits_.Seconds(), 0);
+    EXPECT_FALSE(Exists(kLock));
+    EXPECT_EQ(ReadFile(kFile), "A=2\n");
+}
+
+// Locks whatever this user can open in the folder, and the folder, for as long as it lives.
+void LockAll(const std::string& folder) {
+    for (const char* name : {"", "file", ".file.new", ".file.lock"}) {
+        const int file = open((folder + name).c_str(), O_RDONLY);
+        if (file >= 0) {
+            flock(file, LOCK_EX);
+        }
+    }
+}
+
+TEST_F(Locking, AStrangerLocksNothingThatAWriterNeeds) {
+    StoppedWriter holder;  // while it writes, all its files are there
+    int ready[2];
+    ASSERT_EQ(pipe(ready), 0);
+    const pid_t stranger = Fork([&ready] {
+        if (setuid(kStranger) == 0) {
+            LockAll("/tmp/state/");
+            close(ready[0]);
+            close(ready[1]);
+            pause();
+        }
+    });
+    close(ready[1]);
+    char none = 0;
+    ASSERT_EQ(read(ready[0], &none, 1), 0);
+    close(ready[0]);
+    holder.End();
+    EXPECT_EQ(SetKey(kFile, "2"), 1);
+    EXPECT_EQ(waits_.Seconds(), 0);
+    kill(stranger, SIGKILL);
+    waitpid(stranger, nullptr, 0);
+}
+
+// What he puts at the lock's place in a folder where he may, is in nobody's way.
+TEST_F(Locking, AStrangersFileOrLinkIsNoLock) {
+    TAVI_NEEDS_A_STRANGER()
+    constexpr char kSharedFile[] = "/tmp/file";
+    constexpr char kSharedLock[] = "/tmp/.file.lock";
+    WriteFile(kSharedLock, "");
+    for (const bool isLink : {false, true}) {
+        ASSERT_EQ(lchown(kSharedLock, kStranger, kStranger), 0);
+        EXPECT_EQ(SetKey(kSharedFile, "2"), 1) << isLink;
+        EXPECT_LT(waits_.Seconds(), 0.1);
+        ASSERT_EQ(symlink("/etc/passwd", kSharedLock), 0);
+    }
+}
+
+// An ordinary user in a folder of his own meets root's lock, and takes over a killed root's.
+TEST_F(Locking, AnOrdinaryUserLocksToo) {
+    TAVI_NEEDS_A_STRANGER()
+    ASSERT_EQ(chown("/tmp/state", kStranger, kStranger), 0);
+    ASSERT_EQ(chown(kFile, kStranger, kStranger), 0);
+    StoppedWriter root;
+    for (const int expected : {-1, 1}) {
+        const pid_t user = Fork([expected] {
+            const bool isUser = setgid(kStranger) == 0 && setuid(kStranger) == 0;
+            const bool isLocked = SetKey(kFile, "2") == -1 && VEXACErrGet() == VEXAC_ERR_LOCKED;
+            _exit(isUser && isLocked == (expected == -1) ? 0 : 1);
+        });
+        int status = -1;
+        waitpid(user, &status, 0);
+        EXPECT_EQ(status, 0) << expected;
+        root.End();
+    }
+    EXPECT_EQ(ReadFile(kFile), "A=2\n");
+}
+
+TEST_F(Locking, AFolderThatCannotBeWrittenNeedsNoLock) {
+    ASSERT_EQ(mount("/tmp/state", "/tmp/state", nullptr, MS_BIND, nullptr), 0);
+    ASSERT_EQ(mount(nullptr, "/tmp/state", nullptr, MS_BIND | MS_REMOUNT | MS_RDONLY, nullptr), 0);
+    EXPECT_EQ(SetKey(kFile, "1"), 1);  // as it is
+    EXPECT_EQ(SetKey(kFile, "2"), -1);
+    EXPECT_EQ(VEXACErrGet(), VEXAC_ERR_IO);
+    EXPECT_EQ(waits_.Seconds(), 0);
+}
+
+}  // namespace
+}  // namespace taviwireless::test

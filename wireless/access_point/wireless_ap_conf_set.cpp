@@ -1,0 +1,164 @@
+// Storing the settings of the access point.
+#include <tavicore/error.h>
+#include <tavicore/section.h>
+#include <taviwireless/wireless.h>
+
+#include "common/log.h"
+#include "common/sz_hash.h"
+#include "wireless/rules/ap_settings.h"
+#include "wireless/rules/paths.h"
+#include "wireless/system/grep_pattern.h"
+#include "wireless/system/guarded.h"
+#include "wireless/system/is_missing.h"
+#include "wireless/system/new_file.h"
+#include "wireless/system/shell.h"
+
+namespace taviwireless::wireless {
+
+namespace {
+
+constexpr char kLineFormat[] = "\t%s=%s\n";
+constexpr mode_t kMode = 0600;  // the file holds keys
+constexpr size_t kCommandSize = 1024;
+
+enum class Found { kFailed, kNew, kExisting };
+
+// Puts the fields that it visits into a hash. Settings of which one is missing are not to be
+// stored: without its kind of security an encrypted network would be an open one.
+class Writer {
+  public:
+    explicit Writer(SzHash& values) : values_(values) {}
+
+    void Flag(const char* key, int32_t value, int32_t) { Set(key, value ? "yes" : "no"); }
+    void Number(const std::string& key, int32_t value, int32_t) { Set(key, std::to_string(value)); }
+    void Text(const std::string& key, const char* value, const std::string&) { Set(key, value); }
+    void WriteOnly(const char* key, const char* value) { Set(key, value); }
+
+    bool IsComplete() const { return isComplete_; }
+
+  private:
+    void Set(const std::string& key, const std::string& value) {
+        isComplete_ = values_.Set(key.c_str(), value) && isComplete_;
+    }
+
+    SzHash& values_;
+    bool isComplete_ = true;
+};
+
+// For use between double quotes.
+std::string ForShell(const std::string& text) {
+    std::string quoted;
+    for (const char c : text) {
+        if (c == '$' || c == '`' || c == '"' || c == '\\') {
+            quoted += '\\';
+        }
+        quoted += c;
+    }
+    return quoted;
+}
+
+// grep keeps back a line that is no text to it: a product's name that is cut off within a
+// character.
+bool IsReadable(const char* section) {
+    SzHash values(1024);
+    return values && VEXACFileGetSection(kAPSettings, section, values.Address()) > 0;
+}
+
+// Whether "[section]" stands anywhere in the file, in any case; a value that holds it counts as
+// well, and then there is no section to replace.
+Found FindSection(const char* section) {
+    if (IsMissing(kAPSettings)) {
+        if (!MakeSureOf(kAPSettings, kMode)) {
+            TAVI_LOG_ERROR("Failed to touch %s", kAPSettings);
+            return Found::kFailed;
+        }
+        return Found::kNew;
+    }
+    const Pipe lines(Command(kCommandSize, {"grep -i \"\\[", ForShell(GrepPattern(section)).c_str(),
+                                            "\\]\" ", kAPSettings}));
+    if (!lines) {
+        TAVI_LOG_ERROR("Failed to execute command");
+        return Found::kFailed;
+    }
+    const bool isListed = fgetc(lines.get()) != EOF;
+    return isListed || IsReadable(section) ? Found::kExisting : Found::kNew;
+}
+
+int SwitchOff(const char* section) {
+    if (VEXACFileSetSectionValue(kAPSettings, section, "enable", "no", kLineFormat) < 0) {
+        TAVI_LOG_ERROR("Failed to set key[%s] of sec[%s] in file[%s].", "enable", section,
+                       kAPSettings);
+        return 0;
+    }
+    return 1;
+}
+
+bool IsKindStorable(int32_t kind) {
+    if (kind < WIRELESS_AP_OPEN || kind > WIRELESS_AP_WPA_ENTERPRISE) {
+        TAVI_LOG_ERROR("Wrong encryption");
+        return false;
+    }
+    return true;
+}
+
+bool IsSecurityStorable(const WirelessAPConf& ap) {
+    if (!IsKindStorable(ap.security)) {
+        return false;
+    }
+    if (ap.guestSecurity == WIRELESS_AP_WPA_ENTERPRISE) {
+        TAVI_LOG_ERROR("Guest Network does not have EAP encryption");
+        return false;
+    }
+    return IsKindStorable(ap.guestSecurity);
+}
+
+int Save(Found found, const char* section, const SzHash& values) {
+    const bool isNew = found == Found::kNew;
+    const int result =
+        isNew ? VEXACFileAddSection(kAPSettings, section, values.Get(), kLineFormat)
+              : VEXACFileSetSection(kAPSettings, section, nullptr, values.Get(), kLineFormat);
+    if (result < 1) {
+        TAVI_LOG_ERROR("Failed to %s section: %s from %s, errno=0x%X", isNew ? "add" : "set",
+                       section, kAPSettings, VEXACErrGet());
+        return 0;
+    }
+    return 1;
+}
+
+int Store(const WirelessAPSettings* settings) {
+    if (settings == nullptr) {
+        TAVI_LOG_ERROR("Bad parameters");
+        return 0;
+    }
+    SzHash values(1024);
+    if (!values) {
+        TAVI_LOG_ERROR("Failed to alloc memory");
+        return 0;
+    }
+    const Found found = FindSection(settings->name);
+    if (found == Found::kFailed) {
+        return 0;
+    }
+    if (settings->enabled == 0) {
+        return SwitchOff(settings->name);
+    }
+    if (!IsSecurityStorable(settings->ap)) {
+        return 0;
+    }
+    Writer writer(values);
+    VisitMainNetwork(writer, *settings);
+    VisitGuestNetwork(writer, *settings);
+    if (!writer.IsComplete()) {
+        TAVI_LOG_ERROR("Failed to alloc memory");
+        return 0;
+    }
+    return Save(found, settings->name, values);
+}
+
+}  // namespace
+
+}  // namespace taviwireless::wireless
+
+int TAVIWirelessSetAPConfig(const WirelessAPSettings* settings) {
+    return TAVI_GUARDED(0, [settings] { return taviwireless::wireless::Store(settings); });
+}

@@ -1,0 +1,259 @@
+// Switching the access point on.
+#include <tavicore/error.h>
+#include <tavicore/file.h>
+#include <tavicore/keyvalue.h>
+#include <tavicore/process.h>
+#include <tavisdk/bridge.h>
+#include <taviwireless/wireless.h>
+#include <unistd.h>
+
+#include <cstdio>
+#include <cstring>
+#include <optional>
+#include <utility>
+
+#include "common/log.h"
+#include "wireless/rules/ap_files.h"
+#include "wireless/rules/bridge_name.h"
+#include "wireless/rules/dhcp_range.h"
+#include "wireless/system/flag_file.h"
+#include "wireless/system/guarded.h"
+#include "wireless/system/shell.h"
+
+namespace taviwireless::wireless {
+
+namespace {
+
+constexpr int kChannelTries = 5;   // a second each
+constexpr int kLeaseTime = 86400;  // seconds
+
+// The bridge of the wireless LAN. Other ones belong to the wired network.
+constexpr char kLocalBridge[] = "lbr0";
+constexpr char kLocalAddress[] = "10.1.14.1";
+constexpr char kLocalNetmask[] = "255.255.255.0";
+
+template <size_t kSize>
+void Copy(char (&field)[kSize], const char* text) {
+    snprintf(field, kSize, "%s", text);
+}
+
+bool SetQuoted(const std::string& file, const char* key, const char* value) {
+    if (VEXACFileSetKeyValue(file.c_str(), key, value, kQuotedLine) <= 0) {
+        TAVI_LOG_ERROR("Failed to set key[%s] in [%s].", key, file.c_str());
+        return false;
+    }
+    return true;
+}
+
+// Nothing when they cannot be read, or say that the access point is off.
+std::optional<WirelessAPConf> ReadSettings(const char* interface) {
+    char section[1024];
+    if (TAVIWirelessApConfigSecNameGet(section, sizeof section) == 0) {
+        TAVI_LOG_ERROR("Failed to get section name of %s", interface);
+        return std::nullopt;
+    }
+    WirelessAPSettings settings;
+    if (TAVIWirelessGetAPConfig(section, &settings) <= 0) {
+        TAVI_LOG_ERROR("Failed to get ap info of secname[%s]", section);
+        return std::nullopt;
+    }
+    if (settings.enabled == 0) {
+        return std::nullopt;
+    }
+    return settings.ap;
+}
+
+struct Bridge {
+    TAVINetBridge config;
+    TAVINetBridgeMember member;
+};
+
+Bridge NewBridge(const char* interface, const char* name) {
+    Bridge bridge{};
+    Copy(bridge.config.name, name);
+    if (strcmp(name, kLocalBridge) != 0) {
+        bridge.member.kind = TAVI_NET_MEMBER_WIRED;
+        Copy(bridge.member.interface, "eth0");
+        return bridge;
+    }
+    bridge.member.kind = TAVI_NET_MEMBER_WIRELESS;
+    Copy(bridge.member.interface, interface);
+    bridge.config.isLocal = 1;
+    Copy(bridge.config.address, kLocalAddress);
+    Copy(bridge.config.netmask, kLocalNetmask);
+    return bridge;
+}
+
+std::optional<Bridge> SetUpBridge(const char* interface, const char* name) {
+    Bridge bridge{};
+    if (TAVINetGetBridgeConfig(name, &bridge.config, &bridge.member) >= 0) {
+        const std::string file = InterfaceFile(name);
+        const bool isOnAtBoot = VEXACFileCheckKeyValue(file.c_str(), "ONBOOT", "yes", 0) != 0 ||
+                                SetQuoted(file, "ONBOOT", "yes");
+        return isOnAtBoot ? std::make_optional(bridge) : std::nullopt;
+    }
+    bridge = NewBridge(interface, name);
+    if (TAVINetSetBridgeConfig(&bridge.config, &bridge.member) < 0) {
+        TAVI_LOG_ERROR("Failed to set bridge config.");
+        return std::nullopt;
+    }
+    return bridge;
+}
+
+bool IsIn(const TAVINetBridge& bridge, const char* address) {
+    return TAVINetIsSameSubnet(address, bridge.address, bridge.netmask) != 0;
+}
+
+bool SetUpNewDhcpServer(const TAVINetBridge& bridge) {
+    const std::optional<DhcpRange> range = DhcpRangeBehind(bridge.address, bridge.netmask);
+    if (!range) {
+        TAVI_LOG_ERROR("Failed to conver to inet_aton format of [%s] or [%s].", bridge.address,
+                       bridge.netmask);
+        return false;
+    }
+    if (!IsIn(bridge, range->start.c_str()) || !IsIn(bridge, range->end.c_str())) {
+        TAVI_LOG_ERROR("Failed to get the valid range of dhcp server[%s].", bridge.name);
+        return false;
+    }
+    TAVINetDhcpServer server{};
+    server.enabled = 1;
+    server.reserved = 30;
+    server.leaseTime = kLeaseTime;
+    Copy(server.rangeStart, range->start.c_str());
+    Copy(server.rangeEnd, range->end.c_str());
+    Copy(server.interface, bridge.name);
+    Copy(server.bridge, bridge.name);
+    Copy(server.gateway, bridge.address);
+    Copy(server.nameServer, bridge.address);
+    Copy(server.netmask, bridge.netmask);
+    if (TAVINetSetDhcpServerConfigFiles(&server, 1) == 0) {
+        TAVI_LOG_ERROR("Failed to set dhcpServer conf for [%s].", bridge.name);
+        return false;
+    }
+    return true;
+}
+
+// A service that fits the bridge's subnet is kept as it is, switched off by the user included.
+bool SetUpDhcpServer(const TAVINetBridge& bridge) {
+    TAVINetDhcpServer server;
+    if (TAVINetGetDhcpServerConf(bridge.name, bridge.name, &server) < 0) {
+        return SetUpNewDhcpServer(bridge);
+    }
+    const std::string info = DhcpServerInfo(bridge.name);
+    const std::string putAside = DhcpServerPutAside(bridge.name);
+    if (VEXACFileExist(putAside.c_str())) {
+        VEXACSysRename(putAside.c_str(), info.c_str());
+    }
+    if (!IsIn(bridge, server.rangeStart) || !IsIn(bridge, server.rangeEnd)) {
+        return SetUpNewDhcpServer(bridge);
+    }
+    return server.enabled == 0 || SetQuoted(info, "enable", "yes");
+}
+
+bool SetUpNetwork(const char* interface, const char* name) {
+    const std::optional<Bridge> bridge = SetUpBridge(interface, name);
+    if (!bridge ||
+        (bridge->member.kind == TAVI_NET_MEMBER_WIRELESS && !SetUpDhcpServer(bridge->config))) {
+        TAVI_LOG_ERROR("Failed to set bridge[%s] config.", name);
+        return false;
+    }
+    return true;
+}
+
+// A bridge of the wired network makes the address meaningless, but it is written all the same.
+bool WriteInterfaceFile(const char* interface, const char* bridge) {
+    const std::string file = InterfaceFile(interface);
+    const std::pair<const char*, const char*> kLines[] = {
+        {"ONBOOT", "yes"},         {"DEVICE", interface},      {"BRIDGE", bridge},
+        {"IPADDR", kLocalAddress}, {"NETMASK", kLocalNetmask}, {"BOOTPROTO", "static"}};
+    for (const auto& [key, value] : kLines) {
+        if (VEXACFileSetKeyValue(file.c_str(), key, value, kPlainLine) <= 0) {
+            TAVI_LOG_ERROR("Failed to set %s tavierr=[0x%04X]", file.c_str(), VEXACErrGet());
+            return false;
+        }
+    }
+    return true;
+}
+
+// An empty name is found out later, as it always was.
+bool CanJoin(const std::string& bridge) {
+    const std::string reason = bridge.empty() ? "" : WhyNoBridge(bridge);
+    if (!reason.empty()) {
+        TAVI_LOG_ERROR("The bridge %s", reason.c_str());
+        TAVI_LOG_ERROR("Failed to set bridge[%s] config.", bridge.c_str());
+    }
+    return reason.empty();
+}
+
+// Returns the bridge; nothing on failure.
+std::optional<std::string> BringUp(const char* interface) {
+    const std::optional<WirelessAPConf> conf = ReadSettings(interface);
+    if (!conf || !CanJoin(conf->bridge)) {
+        return std::nullopt;
+    }
+    if (TAVIWirelessSetHostAPConf(interface, &*conf) == 0) {
+        TAVI_LOG_ERROR("Failed to set hostapd conf of interface [%s].", interface);
+        return std::nullopt;
+    }
+    if (!SetQuoted(HostapdInfo(interface), "enable", "yes")) {
+        return std::nullopt;
+    }
+    if (conf->bridge[0] == '\0') {
+        TAVI_LOG_ERROR("Failed to find bridge interface.");
+        return std::nullopt;
+    }
+    if (!SetUpNetwork(interface, conf->bridge) || !WriteInterfaceFile(interface, conf->bridge)) {
+        return std::nullopt;
+    }
+    return conf->bridge;
+}
+
+// Until the adapter has channels to work on.
+bool WaitForChannels(const char* interface) {
+    const Command command(128, {"iwlist ", interface, " active_channel|wc -l"});
+    for (int i = 0; i < kChannelTries; ++i) {
+        const Pipe pipe(command);
+        int count = 0;
+        if (!pipe || fscanf(pipe.get(), " %d", &count) != 1) {
+            TAVI_LOG_ERROR("Failed to execute [%s]", command.Described().c_str());
+            return false;
+        }
+        if (count > 0) {
+            return true;
+        }
+        TAVI_LOG_ERROR("Wait for wireless interface '%s' ready (%d)", interface, i);
+        sleep(1);
+    }
+    return false;
+}
+
+int Enable() {
+    const FlagFile flag(kAPFlag);
+    if (!flag.Raise()) {
+        TAVI_LOG_ERROR("Another ap construction is going");
+        return 0;
+    }
+    const char* interface = TAVIWirelessAPInterfaceGet();
+    const std::optional<std::string> bridge = BringUp(interface);
+    if (!bridge) {
+        TAVI_LOG_ERROR("Failed to enable AP.");
+        return 0;
+    }
+    if (!WaitForChannels(interface)) {
+        TAVI_LOG_ERROR("There is no wireless interface available");
+        return 0;
+    }
+    if (VEXACExec(kNetworkScript, "restart", interface, bridge->c_str(), nullptr) != 0) {
+        TAVI_LOG_ERROR("Failed to restart /etc/rc.network");
+        return 0;
+    }
+    return 1;
+}
+
+}  // namespace
+
+}  // namespace taviwireless::wireless
+
+int TAVIWirelessAPEnable() {
+    return TAVI_GUARDED(0, taviwireless::wireless::Enable);
+}

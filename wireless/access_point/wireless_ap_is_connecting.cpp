@@ -1,0 +1,9 @@
+#include <taviwireless/wireless.h>
+
+#include "wireless/rules/ap_files.h"
+#include "wireless/system/flag_file.h"
+
+int TAVIWirelessAPIsConnecting() {
+    using namespace taviwireless::wireless;
+    return FlagFile::IsRaised(kAPFlag) ? 1 : 0;
+}

@@ -1,0 +1,32 @@
+#ifndef TAVIWIRELESS_WIRELESS_RULES_HOSTAPD_CONF_H
+#define TAVIWIRELESS_WIRELESS_RULES_HOSTAPD_CONF_H
+
+#include <taviwireless/wireless.h>
+
+#include <string>
+
+namespace taviwireless::wireless {
+
+// Lines "key=value" as hostapd reads them, which knows no way to write a line break.
+class HostapdConf {
+  public:
+    void Add(const char* key, const std::string& value);
+    void Add(const char* key, int32_t value);
+
+    const std::string& Text() const { return text_; }
+    // Whether a value holds one, and what stands behind it would be a setting of its own.
+    bool HoldsLineBreak() const { return holdsLineBreak_; }
+
+  private:
+    std::string text_;
+    bool holdsLineBreak_ = false;
+};
+
+// The main network on the interface.
+HostapdConf RenderHostConf(const std::string& interface, const WirelessAPConf& conf);
+// The block of the guest network, which is read behind the main one.
+HostapdConf RenderGuestConf(const WirelessAPConf& conf);
+
+}  // namespace taviwireless::wireless
+
+#endif

@@ -1,0 +1,25 @@
+#ifndef TAVIWIRELESS_WIRELESS_RULES_SUPPLICANT_H
+#define TAVIWIRELESS_WIRELESS_RULES_SUPPLICANT_H
+
+#include <taviwireless/wireless.h>
+
+#include <string>
+
+namespace taviwireless::wireless {
+
+constexpr char kTerminateSupplicant[] = "/usr/sbin/wpa_cli terminate > /dev/null 2>&1";
+
+struct SupplicantConf {
+    std::string text;
+    bool isWepKeyLeftOut = false;  // its length is none that a WEP key has
+    bool isAuthUnknown = false;    // the text ends before what would depend on it
+    // A value in the text holds one; what stands behind it would be a setting of its own.
+    bool holdsLineBreak = false;
+};
+
+// What wpa_supplicant is given to join the network of conf.
+SupplicantConf RenderSupplicantConf(const WirelessConf& conf);
+
+}  // namespace taviwireless::wireless
+
+#endif

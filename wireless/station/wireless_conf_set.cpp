@@ -1,0 +1,110 @@
+// Saving a network.
+#include <tavicore/error.h>
+#include <tavicore/file.h>
+#include <tavicore/section.h>
+#include <taviwireless/wireless.h>
+
+#include <ctime>
+
+#include "common/log.h"
+#include "common/sz_hash.h"
+#include "wireless/rules/paths.h"
+#include "wireless/system/guarded.h"
+#include "wireless/system/is_missing.h"
+#include "wireless/system/new_file.h"
+
+namespace taviwireless::wireless {
+
+namespace {
+
+constexpr char kLineFormat[] = "\t%s=%s\n";
+constexpr mode_t kMode = 0600;  // the file holds keys
+
+enum class Found { kFailed, kNew, kExisting };
+
+// Not readable for others before the first key is in it; later writing keeps the mode.
+bool CreateFile() {
+    if (!MakeSureOf(kSavedNetworks, kMode)) {
+        TAVI_LOG_ERROR("Failed to touch %s", kSavedNetworks);
+        return false;
+    }
+    return true;
+}
+
+// Loads what was saved of the network earlier.
+Found LoadSection(const char* section, SzHash& values) {
+    if (IsMissing(kSavedNetworks)) {
+        return CreateFile() ? Found::kNew : Found::kFailed;
+    }
+    const int result = VEXACFileGetSection(kSavedNetworks, section, values.Address());
+    if (result < 0) {
+        // File and section stand the other way round here. Kept.
+        TAVI_LOG_ERROR("Failed to get section: %s from %s, errno=0x%X", kSavedNetworks, section,
+                       VEXACErrGet());
+        return Found::kFailed;
+    }
+    return result == 0 ? Found::kNew : Found::kExisting;
+}
+
+// All of them, or false.
+bool SetValues(const WirelessConf& conf, const char* bssid, SzHash& values) {
+    const WirelessNetwork& network = conf.network;
+    const bool isEnterprise =
+        network.auth == WIRELESS_AUTH_WPA_EAP || network.auth == WIRELESS_AUTH_WPA2_EAP;
+    return values.Set("KEY", conf.key) && values.Set("IPADDR", conf.ipAddr) &&
+           values.Set("NETMASK", conf.netmask) && values.Set("GATEWAY", conf.gateway) &&
+           values.Set("ESSID", network.essid) && values.Set("BSSID", bssid) &&
+           values.Set("MODE", TAVIWirelessOpmodeStringGet(network.opmode)) &&
+           values.Set("ACCESS_TIME", std::to_string(static_cast<long long>(time(nullptr)))) &&
+           values.Set("AUTH", TAVIWirelessAuthStringGet(network.auth)) &&
+           values.Set("ENCRYPT", TAVIWirelessEncryptStringGet(network.encrypt, 0)) &&
+           (!isEnterprise || values.Set("USER", conf.user));
+}
+
+bool SaveSection(Found found, const char* section, const SzHash& values) {
+    if (found == Found::kExisting) {
+        if (VEXACFileSetSection(kSavedNetworks, section, nullptr, values.Get(), kLineFormat) < 1) {
+            TAVI_LOG_ERROR("Failed to set section: %s from %s, errno=0x%X", section, kSavedNetworks,
+                           VEXACErrGet());
+            return false;
+        }
+        return true;
+    }
+    if (VEXACFileAddSection(kSavedNetworks, section, values.Get(), kLineFormat) < 1) {
+        TAVI_LOG_ERROR("Failed to add section: %s from %s, errno=0x%X", section, kSavedNetworks,
+                       VEXACErrGet());
+        return false;
+    }
+    return true;
+}
+
+int SaveNetwork(const WirelessConf* conf) {
+    if (conf == nullptr) {
+        TAVI_LOG_ERROR("Bad parameters");
+        return -1;
+    }
+    SzHash values(1024);
+    if (!values) {
+        TAVI_LOG_ERROR("Failed to alloc memory");
+        return -1;
+    }
+    char section[128];
+    TAVIWirelessBssidStringGet(conf->network.bssid, section, sizeof section);
+    const Found found = LoadSection(section, values);
+    if (found == Found::kFailed) {
+        return -1;
+    }
+    if (!SetValues(*conf, section, values)) {
+        TAVI_LOG_ERROR("Failed to alloc memory");
+        return -1;
+    }
+    return SaveSection(found, section, values) ? 0 : -1;
+}
+
+}  // namespace
+
+}  // namespace taviwireless::wireless
+
+int TAVIWirelessConfSet(const WirelessConf* conf) {
+    return TAVI_GUARDED(-1, [conf] { return taviwireless::wireless::SaveNetwork(conf); });
+}

@@ -1,0 +1,166 @@
+// Joining a network with wpa_supplicant.
+#include <tavicore/file.h>
+#include <tavicore/keyvalue.h>
+#include <tavisdk/service.h>
+#include <taviwireless/wireless.h>
+#include <unistd.h>
+
+#include <cstring>
+#include <string>
+
+#include "common/log.h"
+#include "wireless/rules/paths.h"
+#include "wireless/rules/supplicant.h"
+#include "wireless/system/flag_file.h"
+#include "wireless/system/guarded.h"
+#include "wireless/system/interface.h"
+#include "wireless/system/new_file.h"
+#include "wireless/system/shell.h"
+
+namespace taviwireless::wireless {
+
+namespace {
+
+constexpr char kSystemInfo[] = "/etc/taviinfo.conf";
+constexpr mode_t kSupplicantMode = 0600;  // it holds the key
+constexpr mode_t kRecordMode = 0644;
+constexpr int kPolls = 15;  // a second each
+
+// Logs why not.
+bool WriteSupplicantConf(const WirelessConf& conf) {
+    const SupplicantConf rendered = RenderSupplicantConf(conf);
+    if (rendered.holdsLineBreak) {
+        TAVI_LOG_ERROR("The ESSID, key or user name holds a line break");
+        return false;
+    }
+    const File file = CreateAnew(kSupplicantConf, kSupplicantMode);
+    if (!file) {
+        TAVI_LOG_ERROR("Failed to open file[%s].", kSupplicantConf);
+        return false;
+    }
+    if (rendered.isWepKeyLeftOut) {
+        TAVI_LOG_ERROR("Wrong WEP Format.");
+    }
+    if (rendered.isAuthUnknown) {
+        TAVI_LOG_ERROR("Failed to detect authentication/encryption type");
+    }
+    const bool isWritten = fputs(rendered.text.c_str(), file.get()) >= 0 && fflush(file.get()) == 0;
+    return isWritten && !rendered.isAuthUnknown;
+}
+
+bool StopSupplicant() {
+    return TAVI_RUN(Command(128, {kTerminateSupplicant}));
+}
+
+// The supplicant quotes a pass phrase that it rejects, and not every shell knows "&>".
+bool StartSupplicant(const std::string& interface) {
+    const Command start(1024, {"/usr/sbin/wpa_supplicant -Dwext -i", Argument{interface}, " -c",
+                               kSupplicantConf, " -B -P", kSupplicantPidFile, " &> /dev/null"});
+    return TAVI_RUN_SILENTLY(start);
+}
+
+bool IsAssociated() {
+    const Pipe status(Command(128, {"/usr/sbin/wpa_cli status | grep wpa_state"}));
+    char state[32];
+    return status && fscanf(status.get(), " wpa_state=%31s", state) == 1 &&
+           strcmp(state, "COMPLETED") == 0;
+}
+
+bool WaitForAssociation() {
+    for (int i = 0; i < kPolls; ++i) {
+        sleep(1);
+        if (IsAssociated()) {
+            return true;
+        }
+    }
+    TAVI_LOG_ERROR("Time out to connect AP, kill wpa_supplicant.");
+    StopSupplicant();
+    return false;
+}
+
+// For TAVIWirelessStatusGet. What strangers put in its place, a folder for example, is removed.
+bool RecordConnection(const WirelessNetwork& network) {
+    struct stat status {};
+    if (lstat(kCurrentConnection, &status) == 0 && !IsTrusted(status)) {
+        RemoveAll(kCurrentConnection);
+    }
+    const File file = CreateAnew(kCurrentConnection, kRecordMode);
+    char bssid[18];
+    return file &&
+           fprintf(file.get(), "%s\n%d\n%d\n%d\n%s\n", network.essid, network.protocol,
+                   network.auth, network.encrypt,
+                   TAVIWirelessBssidStringGet(network.bssid, bssid, sizeof bssid)) > 0 &&
+           fflush(file.get()) == 0;
+}
+
+int Connect(const std::string& interface, const WirelessConf* conf) {
+    if (interface.empty() || conf == nullptr) {
+        TAVI_LOG_ERROR("Bad parameters");
+        return -1;
+    }
+    if (conf->network.opmode == WIRELESS_OPMODE_ADHOC) {
+        return TAVIWirelessAdhocCreate(conf);
+    }
+    if (!WriteSupplicantConf(*conf)) {
+        TAVI_LOG_ERROR("Failed to set [%s]", kSupplicantConf);
+        return -1;
+    }
+    if (VEXACFileExist(kSupplicantPidFile) && !StopSupplicant()) {
+        return -1;
+    }
+    if (!StartSupplicant(interface) || !WaitForAssociation()) {
+        return -1;
+    }
+    if (!RecordConnection(conf->network)) {
+        TAVI_LOG_ERROR("Failed to record this connection.");
+        return -1;
+    }
+    return 0;
+}
+
+void RestartMediaService(const std::string& interface) {
+    if (VEXACFileCheckKeyValue(kSystemInfo, "runmediaservice", "yes", 0) &&
+        VEXACFileCheckKeyValue(kSystemInfo, "network_mediaservice", interface.c_str(), 0)) {
+        TAVIMediaService(TAVI_MEDIA_SERVICE_RESTART);
+    }
+}
+
+// A copy, also where the resolver's file is a link to one that another program keeps; disconnecting
+// then puts the copy in the place of the link. Kept.
+void KeepResolver() {
+    if (VEXACFileExist(kResolver)) {
+        TAVI_RUN(Command(128, {"/bin/cp ", kResolver, " ", kResolverBackup}));
+    }
+}
+
+int ConnectOnce(const WirelessConf* conf) {
+    const FlagFile flag(kConnectingFlag);
+    if (TAVIWirelessAdapterNum() < 1) {
+        TAVI_LOG_ERROR("There is no wireless USB adapter plugged");
+        return -1;
+    }
+    // A radio that is blocked, or whose setting cannot be read, leaves nothing to do.
+    if (TAVIWirelessCheckBlock() != 1) {
+        return 0;
+    }
+    if (!flag.Raise()) {
+        TAVI_LOG_ERROR("Another connection construction is going");
+        return -1;
+    }
+    const std::string interface = WirelessInterface();
+    if (Connect(interface, conf) != 0) {
+        TAVI_LOG_ERROR("Failed to connect network.");
+        return -1;
+    }
+    RestartMediaService(interface);
+    KeepResolver();
+    return 0;
+}
+
+}  // namespace
+
+}  // namespace taviwireless::wireless
+
+int TAVIWirelessNetworkConnect(WirelessConf* conf) {
+    return TAVI_GUARDED(-1, [conf] { return taviwireless::wireless::ConnectOnce(conf); });
+}

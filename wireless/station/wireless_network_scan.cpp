@@ -1,0 +1,240 @@
+// The networks in range, as this system's "iwlist" lists them: a table with one network per line.
+#include <tavisdk/network.h>
+#include <taviwireless/wireless.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <cctype>
+#include <cerrno>
+#include <cstdio>
+#include <cstring>
+#include <optional>
+#include <string>
+#include <string_view>
+
+#include "common/log.h"
+#include "wireless/system/guarded.h"
+#include "wireless/system/interface.h"
+#include "wireless/system/queue.h"
+#include "wireless/system/shell.h"
+
+namespace {
+
+using namespace taviwireless::wireless;
+
+constexpr int kAdapterTries = 6;  // one second apart
+constexpr int kMaxScans = 5;
+constexpr size_t kCommandSize = 128;
+
+// The table. Columns count from 0.
+constexpr int kHeadings = 2;        // lines
+constexpr size_t kLineSize = 512;   // what is longer is read as further lines
+constexpr size_t kMinLine = 32;     // its end counted
+constexpr size_t kEssidColumn = 5;  // the channel stands before it
+constexpr size_t kAddressColumn = 37;
+// The field is a column wider than an ESSID can be. That column is not read: the record has no room
+// for it, and where the tool leaves out the blank it is the first digit of the address.
+constexpr size_t kEssidLength = WIRELESS_ESSID_SIZE - 1;
+constexpr size_t kWordSize = 32;
+
+bool WaitForAdapter() {
+    for (int tries = 0; TAVIWirelessAdapterNum() <= 0; ++tries) {
+        if (tries == kAdapterTries - 1) {
+            TAVI_LOG_ERROR("There is no wireless USB adapter plugged");
+            return false;
+        }
+        TAVI_LOG_ERROR("Wait for wlan0 ready, %d", tries);
+        sleep(1);
+    }
+    return true;
+}
+
+std::string_view ColumnsFrom(std::string_view line, size_t column) {
+    return line.substr(std::min(column, line.size()));
+}
+
+// A channel of five digits leaves no blank before the ESSID, which may begin with one.
+std::string ChannelColumns(std::string_view line) {
+    const bool isFull = isdigit(static_cast<unsigned char>(line[kEssidColumn - 1])) != 0;
+    return std::string(isFull ? line.substr(0, kEssidColumn) : line);
+}
+
+// False when nothing is left: a network that hides its name.
+bool ParseEssid(std::string_view line, WirelessNetwork& network) {
+    std::string_view essid = ColumnsFrom(line, kEssidColumn).substr(0, kEssidLength);
+    while (!essid.empty() && isspace(static_cast<unsigned char>(essid.back())) != 0) {
+        essid.remove_suffix(1);
+    }
+    essid.copy(network.essid, essid.size());
+    return !essid.empty();
+}
+
+void ParseSecurity(const char* security, WirelessNetwork& network) {
+    if (strcasecmp(security, "NONE") == 0) {
+        network.auth = WIRELESS_AUTH_OPEN;
+        network.encrypt = WIRELESS_ENCRYPT_NONE;
+        return;
+    }
+    if (strcasecmp(security, "WEP") == 0) {
+        network.auth = WIRELESS_AUTH_WEP_AUTO;
+        network.encrypt = WIRELESS_ENCRYPT_WEP;
+        return;
+    }
+    char auth[kWordSize];
+    char encrypt[kWordSize];
+    if (sscanf(security, " %31[^/]/%31s", auth, encrypt) < 2) {
+        TAVI_LOG_ERROR("Failed to parse security field '%s'", security);
+        return;
+    }
+    network.auth = TAVIWirelessAuthParse(auth);
+    network.encrypt = TAVIWirelessEncryptParse(encrypt);
+}
+
+// columns begin with the address.
+bool ParseAddressAndMore(const char* columns, WirelessNetwork& network) {
+    constexpr int kItems = 9;
+    unsigned bssid[6];
+    char protocol[kWordSize];
+    char security[kWordSize];
+    if (sscanf(columns, " %x:%x:%x:%x:%x:%x %d %31s %31s", &bssid[0], &bssid[1], &bssid[2],
+               &bssid[3], &bssid[4], &bssid[5], &network.signal, protocol, security) < kItems) {
+        return false;
+    }
+    std::transform(bssid, bssid + 6, network.bssid,
+                   [](unsigned group) { return static_cast<unsigned char>(group); });
+    network.protocol = TAVIWirelessProtocolParse(protocol);
+    ParseSecurity(security, network);
+    return true;
+}
+
+// Nothing when the line tells of no network.
+std::optional<WirelessNetwork> ParseLine(const char* text) {
+    const std::string_view line(text);
+    if (line.size() < kMinLine) {
+        return std::nullopt;
+    }
+    WirelessNetwork network{};
+    if (sscanf(ChannelColumns(line).c_str(), " %d", &network.channel) < 1) {
+        TAVI_LOG_ERROR("Failed to parse channel(%s)", text);
+        return std::nullopt;
+    }
+    if (!ParseEssid(line, network)) {
+        return std::nullopt;
+    }
+    if (!ParseAddressAndMore(ColumnsFrom(line, kAddressColumn).data(), network)) {
+        TAVI_LOG_ERROR("Failed to parse network info(%s)", text);
+        return std::nullopt;
+    }
+    return network;
+}
+
+bool Append(WirelessLink& networks, const WirelessNetwork& network) {
+    auto* const record = static_cast<WirelessNetwork*>(calloc(1, sizeof network));
+    if (record == nullptr) {
+        TAVI_LOG_ERROR("Failed to alloc memory");
+        return false;
+    }
+    *record = network;
+    InsertBefore(networks, record->link);
+    return true;
+}
+
+// Appends what one run of the tool lists. Returns the number of networks; -1 on failure, and then
+// too the list holds what was read.
+int ListNetworks(const char* interface, WirelessLink& networks) {
+    const Command command(kCommandSize, {"/sbin/iwlist ", interface, " scanning tavi"});
+    const Pipe pipe(command);
+    if (!pipe) {
+        TAVI_LOG_ERROR("Failed to popen '%s', errno=%s", command.Described().c_str(),
+                       strerror(errno));
+        return -1;
+    }
+    int count = 0;
+    char line[kLineSize];
+    for (int number = 0; fgets(line, sizeof line, pipe.get()) != nullptr; ++number) {
+        if (number < kHeadings) {
+            continue;
+        }
+        const std::optional<WirelessNetwork> network = ParseLine(line);
+        if (!network) {
+            continue;
+        }
+        if (!Append(networks, *network)) {
+            return -1;
+        }
+        ++count;
+    }
+    return count;
+}
+
+void LogUnusable(int scan, int count) {
+    if (count < 0) {
+        TAVI_LOG_ERROR("Scan %d: failed.", scan);
+    } else if (count == 0) {
+        TAVI_LOG_ERROR("Scan %d: no scan result.", scan);
+    } else {
+        TAVI_LOG_ERROR("Scan %d: result is un-stable.", scan);
+    }
+}
+
+// One scan of a USB adapter often misses some of the networks, so two must agree. What the last
+// one gives is taken as it is.
+int ListUntilStable(const char* interface, WirelessLink& networks) {
+    int previousCount = 0;
+    for (int scan = 0;; ++scan) {
+        const int count = ListNetworks(interface, networks);
+        if (count > 0 && count == previousCount) {
+            TAVI_LOG_ERROR("Scan %d: success.", scan);
+            return 0;
+        }
+        LogUnusable(scan, count);
+        const bool isLast = scan == kMaxScans - 1;
+        if (isLast && count >= 0) {
+            return 0;
+        }
+        FreeMembers<WirelessNetwork>(networks);
+        if (isLast) {
+            TAVI_LOG_ERROR("Failed to get network scanning result");
+            return -1;
+        }
+        previousCount = count;
+    }
+}
+
+int Scan(int trigger, WirelessLink* networks) {
+    if (!WaitForAdapter()) {
+        return -1;
+    }
+    const std::string name = WirelessInterface();
+    const char* interface = name.c_str();
+    if (name.empty() || networks == nullptr) {
+        TAVI_LOG_ERROR("Bad parameters");
+        return -1;
+    }
+    if (VEXANetIfUp(interface) == 0) {
+        TAVI_LOG_ERROR("Failed to activate network interface %s", interface);
+        return -1;
+    }
+    sleep(1);  // the adapter hears nothing before
+    if (trigger == 1) {
+        const Command command(kCommandSize,
+                              {"/sbin/iwlist ", interface, " scanning > /dev/null 2>&1"});
+        if (!TAVI_RUN(command)) {
+            return -1;
+        }
+    }
+    return ListUntilStable(interface, *networks);
+}
+
+}  // namespace
+
+int TAVIWirelessNetworkScan(int trigger, WirelessLink* networks) {
+    if (networks != nullptr) {
+        MakeEmpty(*networks);
+    }
+    const int result = TAVI_GUARDED(-1, [=] { return Scan(trigger, networks); });
+    if (result < 0 && networks != nullptr) {
+        FreeMembers<WirelessNetwork>(*networks);
+    }
+    return result;
+}

@@ -1,0 +1,31 @@
+#include "wireless/system/link_quality.h"
+
+#include "wireless/system/interface.h"
+#include "wireless/system/shell.h"
+
+namespace taviwireless::wireless {
+
+std::optional<LinkQuality> ReadLinkQuality() {
+    constexpr size_t kCommandSize = 128;
+    const std::string interface = WirelessInterface();
+    if (interface.empty()) {
+        return std::nullopt;
+    }
+    const Pipe pipe(
+        Command(kCommandSize, {"/sbin/iwconfig ", interface.c_str(), " | grep 'Link Quality'"}));
+    if (!pipe) {
+        return std::nullopt;
+    }
+    int value = 0;
+    int maximum = 0;
+    switch (fscanf(pipe.get(), " Link Quality=%d/%d", &value, &maximum)) {
+        case 2:
+            return LinkQuality{value, maximum};
+        case 1:
+            return LinkQuality{value, std::nullopt};
+        default:
+            return std::nullopt;
+    }
+}
+
+}  // namespace taviwireless::wireless

@@ -1,6 +1,0 @@
-#include "common/log.h"
-#include "wireless/saved_networks.h"
-
-int TAVIWirelessConfEnum(WirelessLink* confs) {
-    return taviwireless::wireless::ListSavedNetworks(confs, __FILE_NAME__, __LINE__);
-}

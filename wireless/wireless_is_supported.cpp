@@ -1,8 +1,0 @@
-#include <tavicore/keyvalue.h>
-#include <taviwireless/wireless.h>
-
-#include "wireless/paths.h"
-
-int TAVIWirelessIsSupported_core() {
-    return VEXACFileCheckKeyValue(taviwireless::wireless::kModelInfo, "support_wireless", "yes", 0);
-}
