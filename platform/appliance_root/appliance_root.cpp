@@ -1,8 +1,10 @@
 #include "platform/appliance_root/appliance_root.h"
 
+#include <fcntl.h>
 #include <linux/capability.h>
 #include <poll.h>
 #include <sched.h>
+#include <spawn.h>
 #include <sys/auxv.h>
 #include <sys/prctl.h>
 #include <sys/wait.h>
@@ -14,8 +16,10 @@
 #include <exception>
 #include <filesystem>
 #include <fstream>
+#include <iterator>
 #include <string>
 #include <system_error>
+#include <vector>
 
 #include "platform/appliance_root/private_system.h"
 
@@ -45,8 +49,52 @@ void WriteMap(const char* path, const std::string& text) {
     }
 }
 
+// What has to precede a command that is to be root among all the users that the machine lends to
+// the caller: unshare(1) reads /etc/subuid and asks newuidmap(1), which alone may give them away.
+constexpr const char* kAmongLentUsers[] = {"unshare", "--user", "--map-root-user", "--map-auto"};
+
+std::vector<char*> AmongLentUsers(std::vector<std::string>& command) {
+    command.insert(command.begin(), std::begin(kAmongLentUsers), std::end(kAmongLentUsers));
+    std::vector<char*> arguments;
+    for (std::string& argument : command) {
+        arguments.push_back(argument.data());
+    }
+    arguments.push_back(nullptr);
+    return arguments;
+}
+
+bool AreUsersLent() {
+    std::vector<std::string> nothing = {"true"};
+    const std::vector<char*> arguments = AmongLentUsers(nothing);
+    posix_spawn_file_actions_t quiet;
+    posix_spawn_file_actions_init(&quiet);
+    posix_spawn_file_actions_addopen(&quiet, STDERR_FILENO, "/dev/null", O_WRONLY, 0);
+    pid_t child = 0;
+    int status = posix_spawnp(&child, arguments[0], &quiet, nullptr, arguments.data(), environ);
+    posix_spawn_file_actions_destroy(&quiet);
+    return status == 0 && waitpid(child, &status, 0) == child && status == 0;
+}
+
+// Starts the program again as root among them. Returns when there are none.
+void BecomeRootAmongLentUsers(const fs::path& program) {
+    if (!AreUsersLent()) {
+        return;
+    }
+    std::ifstream file("/proc/self/cmdline");
+    std::vector<std::string> command;
+    for (std::string argument; std::getline(file, argument, '\0');) {
+        command.push_back(argument);
+    }
+    if (command.empty()) {
+        return;
+    }
+    command[0] = program;
+    const std::vector<char*> arguments = AmongLentUsers(command);
+    execvp(arguments[0], arguments.data());
+}
+
 // Makes the namespaces, and a user namespace first when they are refused without.
-void LeaveNamespaces() {
+void LeaveNamespaces(const fs::path& program) {
     constexpr int kNamespaces =
         CLONE_NEWNS | CLONE_NEWNET | CLONE_NEWIPC | CLONE_NEWPID | CLONE_NEWUTS;
     if (unshare(kNamespaces) == 0) {
@@ -54,7 +102,11 @@ void LeaveNamespaces() {
     }
     const std::string user = std::to_string(geteuid());
     const std::string group = std::to_string(getegid());
-    if (errno != EPERM || unshare(kNamespaces | CLONE_NEWUSER) != 0) {
+    const bool isRefused = errno == EPERM;
+    if (isRefused) {
+        BecomeRootAmongLentUsers(program);
+    }
+    if (!isRefused || unshare(kNamespaces | CLONE_NEWUSER) != 0) {
         Fail(kNamespacesRefused);
     }
     WriteMap("/proc/self/setgroups", "deny");  // the kernel's condition for mapping the group
@@ -144,7 +196,7 @@ void SetUpOrExit(const Workplace& workplace) {
 
 void EnterApplianceRoot(const std::string& output) {
     const Workplace workplace = FindWorkplace(output);
-    LeaveNamespaces();
+    LeaveNamespaces(workplace.program);
     int life[2];  // holds no data: its writing end is open as long as the process outside lives
     if (pipe(life) != 0) {
         Fail("cannot make a pipe");

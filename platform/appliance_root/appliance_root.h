@@ -47,9 +47,12 @@ constexpr int kApplianceRootFailed = 70;
 // Programs that are run inside have no power over the clock, the modules, the devices and the
 // restart of the machine.
 //
-// Without root, only the caller's own user and group exist: changing owners fails, and files of the
-// machine's root cannot be changed in place, but can be removed and created in folders at most
-// three levels deep (/var/lib/usbmodem). Folders there that the caller may not enter are empty.
+// Without root, files of the machine's root cannot be changed in place, but can be removed and
+// created in folders at most three levels deep (/var/lib/usbmodem); folders there that the caller
+// may not enter are empty. The users inside are those that the machine lends to the caller:
+// Debian's adduser notes them in /etc/subuid, and the package uidmap hands them out; the program is
+// then started a second time, by unshare(1). Where none are lent, only the caller's own user and
+// group exist, and changing owners fails.
 //
 // Throws std::system_error with one plain sentence when namespaces are refused. What fails later is
 // printed on standard error and ends the process with kApplianceRootFailed.

@@ -27,15 +27,16 @@ mode_t FileMode(const std::string& path);
 // True when `path` names something; a link that leads nowhere names nothing.
 bool Exists(const std::string& path);
 
-// Whether files can be given to user 65534: without root a machine has no second user.
+// Whether files can be given to user 65534: an ordinary user has no other users inside unless the
+// machine lends some.
 bool HasStranger();
 
 }  // namespace taviwireless::test
 
-// Ends the case, which CTest then lists as not run, where there is nobody to be kept out.
-#define TAVI_NEEDS_A_STRANGER()                                               \
-    if (!::taviwireless::test::HasStranger()) {                               \
-        GTEST_SKIP() << "run as root: an ordinary user is the only one here"; \
-    }
+// Fails the case where there is nobody to be kept out.
+#define TAVI_NEEDS_A_STRANGER()                                                                    \
+    ASSERT_TRUE(::taviwireless::test::HasStranger())                                               \
+        << "there is no second user: run as root, or install uidmap and lend yourself users with " \
+           "usermod --add-subuids 100000-165535 --add-subgids 100000-165535 NAME";
 
 #endif
