@@ -4,7 +4,7 @@
 
 #include <iostream>
 
-#include "cli/output.h"
+#include "cli/report.h"
 
 namespace taviwireless::cli {
 

@@ -8,7 +8,7 @@
 #include <string>
 #include <thread>
 
-#include "cli/commands.h"
+#include "cli/command_line.h"
 
 namespace taviwireless::cli {
 

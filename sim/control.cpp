@@ -8,7 +8,7 @@
 #include <optional>
 #include <stdexcept>
 
-#include "sim/words.h"
+#include "sim/user_text.h"
 
 namespace taviwireless::sim {
 

@@ -4,7 +4,7 @@
 #include <stdexcept>
 
 #include "sim/at_text.h"
-#include "sim/words.h"
+#include "sim/user_text.h"
 
 namespace taviwireless::sim {
 namespace {

@@ -10,7 +10,7 @@
 
 #include "sim/control.h"
 #include "sim/simulator.h"
-#include "sim/words.h"
+#include "sim/user_text.h"
 
 namespace {
 

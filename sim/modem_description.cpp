@@ -2,7 +2,7 @@
 
 #include <stdexcept>
 
-#include "sim/words.h"
+#include "sim/user_text.h"
 
 namespace taviwireless::sim {
 namespace {

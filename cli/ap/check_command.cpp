@@ -8,11 +8,11 @@
 #include <iostream>
 #include <sstream>
 
-#include "cli/ap/access.h"
-#include "cli/ap/commands.h"
-#include "cli/ap/settings.h"
-#include "cli/output.h"
-#include "cli/wifi/access.h"
+#include "cli/ap/access_point.h"
+#include "cli/ap/ap_changes.h"
+#include "cli/ap/ap_commands.h"
+#include "cli/report.h"
+#include "cli/wifi/station.h"
 #include "wireless/rules/ap_files.h"
 #include "wireless/rules/hostapd_conf.h"
 #include "wireless/system/shell.h"

@@ -7,7 +7,7 @@
 #include <memory>
 #include <sstream>
 
-#include "cli/commands.h"
+#include "cli/command_line.h"
 
 namespace taviwireless::cli {
 

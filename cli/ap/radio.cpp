@@ -2,8 +2,8 @@
 
 #include <algorithm>
 
-#include "cli/ap/words.h"
-#include "cli/commands.h"
+#include "cli/ap/setting_words.h"
+#include "cli/command_line.h"
 
 namespace taviwireless::cli {
 

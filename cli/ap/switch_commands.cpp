@@ -1,12 +1,12 @@
 // taviwireless ap: the stored settings, and switching the access point on and off.
 #include <json/json.h>
 
-#include "cli/ap/access.h"
-#include "cli/ap/commands.h"
-#include "cli/ap/output.h"
-#include "cli/ap/settings.h"
-#include "cli/ap/words.h"
-#include "cli/wifi/access.h"
+#include "cli/ap/access_point.h"
+#include "cli/ap/ap_changes.h"
+#include "cli/ap/ap_commands.h"
+#include "cli/ap/ap_report.h"
+#include "cli/ap/setting_words.h"
+#include "cli/wifi/station.h"
 
 namespace taviwireless::cli {
 

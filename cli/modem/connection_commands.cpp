@@ -7,9 +7,9 @@
 #include <thread>
 
 #include "cli/deadline.h"
-#include "cli/modem/access.h"
-#include "cli/modem/commands.h"
-#include "cli/output.h"
+#include "cli/modem/modem_access.h"
+#include "cli/modem/modem_commands.h"
+#include "cli/report.h"
 
 namespace taviwireless::cli {
 

@@ -4,8 +4,8 @@
 #include <algorithm>
 #include <set>
 
-#include "cli/modem/access.h"
-#include "cli/output.h"
+#include "cli/modem/modem_access.h"
+#include "cli/report.h"
 
 namespace taviwireless::cli {
 

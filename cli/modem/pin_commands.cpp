@@ -5,10 +5,10 @@
 #include <iostream>
 
 #include "cli/deadline.h"
-#include "cli/modem/access.h"
-#include "cli/modem/commands.h"
-#include "cli/modem/state_output.h"
-#include "cli/secret.h"
+#include "cli/modem/modem_access.h"
+#include "cli/modem/modem_commands.h"
+#include "cli/modem/modem_report.h"
+#include "cli/prompt.h"
 
 namespace taviwireless::cli {
 

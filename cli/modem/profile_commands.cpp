@@ -4,10 +4,10 @@
 #include <algorithm>
 
 #include "cli/deadline.h"
-#include "cli/modem/access.h"
-#include "cli/modem/commands.h"
-#include "cli/modem/state_output.h"
-#include "cli/secret.h"
+#include "cli/modem/modem_access.h"
+#include "cli/modem/modem_commands.h"
+#include "cli/modem/modem_report.h"
+#include "cli/prompt.h"
 
 namespace taviwireless::cli {
 

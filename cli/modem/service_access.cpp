@@ -4,9 +4,9 @@
 
 #include <algorithm>
 
-#include "cli/modem/access.h"
+#include "cli/modem/modem_access.h"
 #include "cli/modem/service_document.h"
-#include "cli/output.h"
+#include "cli/report.h"
 
 namespace taviwireless::cli {
 

@@ -3,7 +3,7 @@
 
 #include <string>
 
-#include "cli/modem/access.h"
+#include "cli/modem/modem_access.h"
 
 namespace taviwireless::cli {
 

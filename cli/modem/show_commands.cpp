@@ -4,9 +4,9 @@
 #include <iostream>
 
 #include "cli/deadline.h"
-#include "cli/modem/access.h"
-#include "cli/modem/commands.h"
-#include "cli/modem/state_output.h"
+#include "cli/modem/modem_access.h"
+#include "cli/modem/modem_commands.h"
+#include "cli/modem/modem_report.h"
 
 namespace taviwireless::cli {
 

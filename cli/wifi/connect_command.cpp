@@ -4,10 +4,10 @@
 #include <algorithm>
 #include <optional>
 
-#include "cli/wifi/access.h"
-#include "cli/wifi/commands.h"
-#include "cli/wifi/output.h"
-#include "cli/wifi/settings.h"
+#include "cli/adapter/credentials.h"
+#include "cli/wifi/station.h"
+#include "cli/wifi/wifi_commands.h"
+#include "cli/wifi/wifi_report.h"
 
 namespace taviwireless::cli {
 

@@ -5,9 +5,9 @@
 #include <algorithm>
 #include <iostream>
 
-#include "cli/wifi/access.h"
-#include "cli/wifi/commands.h"
-#include "cli/wifi/output.h"
+#include "cli/wifi/station.h"
+#include "cli/wifi/wifi_commands.h"
+#include "cli/wifi/wifi_report.h"
 
 namespace taviwireless::cli {
 

@@ -1,7 +1,7 @@
-#include "cli/output.h"
-
 #include <gmock/gmock.h>
 #include <json/json.h>
+
+#include "cli/report.h"
 
 namespace taviwireless::cli {
 namespace {

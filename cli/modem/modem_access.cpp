@@ -1,10 +1,10 @@
-#include "cli/modem/access.h"
+#include "cli/modem/modem_access.h"
 
 #include <taviwireless/usbmodem_list.h>
 
 #include <algorithm>
 
-#include "cli/output.h"
+#include "cli/report.h"
 
 namespace taviwireless::cli {
 

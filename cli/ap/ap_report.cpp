@@ -1,11 +1,11 @@
-#include "cli/ap/output.h"
+#include "cli/ap/ap_report.h"
 
 #include <json/json.h>
 
 #include "cli/ap/radio.h"
-#include "cli/ap/words.h"
-#include "cli/wifi/access.h"
-#include "cli/wifi/output.h"
+#include "cli/ap/setting_words.h"
+#include "cli/wifi/station.h"
+#include "cli/wifi/wifi_report.h"
 
 namespace taviwireless::cli {
 

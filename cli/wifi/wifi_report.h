@@ -1,5 +1,5 @@
-#ifndef TAVIWIRELESS_CLI_WIFI_OUTPUT_H
-#define TAVIWIRELESS_CLI_WIFI_OUTPUT_H
+#ifndef TAVIWIRELESS_CLI_WIFI_WIFI_REPORT_H
+#define TAVIWIRELESS_CLI_WIFI_WIFI_REPORT_H
 
 #include <json/forwards.h>
 #include <taviwireless/wireless.h>
@@ -7,8 +7,8 @@
 #include <string>
 #include <vector>
 
-#include "cli/commands.h"
-#include "cli/output.h"
+#include "cli/command_line.h"
+#include "cli/report.h"
 
 namespace taviwireless::cli {
 

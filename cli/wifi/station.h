@@ -1,12 +1,12 @@
-#ifndef TAVIWIRELESS_CLI_WIFI_ACCESS_H
-#define TAVIWIRELESS_CLI_WIFI_ACCESS_H
+#ifndef TAVIWIRELESS_CLI_WIFI_STATION_H
+#define TAVIWIRELESS_CLI_WIFI_STATION_H
 
 #include <taviwireless/wireless.h>
 
 #include <string>
 #include <vector>
 
-#include "cli/commands.h"
+#include "cli/command_line.h"
 
 namespace taviwireless::cli {
 

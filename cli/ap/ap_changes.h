@@ -1,5 +1,5 @@
-#ifndef TAVIWIRELESS_CLI_AP_SETTINGS_H
-#define TAVIWIRELESS_CLI_AP_SETTINGS_H
+#ifndef TAVIWIRELESS_CLI_AP_AP_CHANGES_H
+#define TAVIWIRELESS_CLI_AP_AP_CHANGES_H
 
 #include <taviwireless/wireless.h>
 

@@ -1,4 +1,4 @@
-#include "cli/wifi/access.h"
+#include "cli/wifi/station.h"
 
 #include <tavisdk/network.h>
 #include <tavisdk/wireless.h>

@@ -1,5 +1,5 @@
-#ifndef TAVIWIRELESS_CLI_AP_ACCESS_H
-#define TAVIWIRELESS_CLI_AP_ACCESS_H
+#ifndef TAVIWIRELESS_CLI_AP_ACCESS_POINT_H
+#define TAVIWIRELESS_CLI_AP_ACCESS_POINT_H
 
 #include <taviwireless/wireless.h>
 

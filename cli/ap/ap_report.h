@@ -1,10 +1,10 @@
-#ifndef TAVIWIRELESS_CLI_AP_OUTPUT_H
-#define TAVIWIRELESS_CLI_AP_OUTPUT_H
+#ifndef TAVIWIRELESS_CLI_AP_AP_REPORT_H
+#define TAVIWIRELESS_CLI_AP_AP_REPORT_H
 
 #include <json/forwards.h>
 
-#include "cli/ap/access.h"
-#include "cli/output.h"
+#include "cli/ap/access_point.h"
+#include "cli/report.h"
 
 namespace taviwireless::cli {
 

@@ -1,5 +1,5 @@
-#ifndef TAVIWIRELESS_SIM_WORDS_H
-#define TAVIWIRELESS_SIM_WORDS_H
+#ifndef TAVIWIRELESS_SIM_USER_TEXT_H
+#define TAVIWIRELESS_SIM_USER_TEXT_H
 
 #include <string>
 #include <vector>

@@ -1,5 +1,5 @@
-#ifndef TAVIWIRELESS_CLI_AP_WORDS_H
-#define TAVIWIRELESS_CLI_AP_WORDS_H
+#ifndef TAVIWIRELESS_CLI_AP_SETTING_WORDS_H
+#define TAVIWIRELESS_CLI_AP_SETTING_WORDS_H
 
 #include <taviwireless/wireless.h>
 

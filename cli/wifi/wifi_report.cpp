@@ -1,12 +1,12 @@
-#include "cli/wifi/output.h"
+#include "cli/wifi/wifi_report.h"
 
 #include <json/json.h>
 
 #include <algorithm>
 #include <ctime>
 
-#include "cli/wifi/access.h"
-#include "cli/wifi/settings.h"
+#include "cli/adapter/credentials.h"
+#include "cli/wifi/station.h"
 
 namespace taviwireless::cli {
 

@@ -1,18 +1,18 @@
 // What the command line understands: the commands, what they are called and what they take. CLI11
 // is a header that takes seconds to compile, so nothing else includes it.
-#include "cli/commands.h"
+#include "cli/command_line.h"
 
 #include <syslog.h>
 
 #include <CLI/CLI.hpp>
 #include <iostream>
 
-#include "cli/ap/commands.h"
-#include "cli/ap/settings.h"
-#include "cli/modem/commands.h"
-#include "cli/output.h"
-#include "cli/wifi/commands.h"
-#include "cli/wifi/settings.h"
+#include "cli/adapter/credentials.h"
+#include "cli/ap/ap_changes.h"
+#include "cli/ap/ap_commands.h"
+#include "cli/modem/modem_commands.h"
+#include "cli/report.h"
+#include "cli/wifi/wifi_commands.h"
 
 namespace taviwireless::cli {
 

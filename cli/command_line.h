@@ -1,5 +1,5 @@
-#ifndef TAVIWIRELESS_CLI_COMMANDS_H
-#define TAVIWIRELESS_CLI_COMMANDS_H
+#ifndef TAVIWIRELESS_CLI_COMMAND_LINE_H
+#define TAVIWIRELESS_CLI_COMMAND_LINE_H
 
 #include <optional>
 #include <stdexcept>

@@ -1,4 +1,4 @@
-#include "cli/modem/state_output.h"
+#include "cli/modem/modem_report.h"
 
 #include <json/json.h>
 

@@ -1,4 +1,4 @@
-#include "cli/output.h"
+#include "cli/report.h"
 
 #include <json/json.h>
 #include <unistd.h>

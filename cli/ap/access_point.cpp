@@ -1,4 +1,4 @@
-#include "cli/ap/access.h"
+#include "cli/ap/access_point.h"
 
 #include <sys/statvfs.h>
 #include <tavicore/section.h>
@@ -10,10 +10,10 @@
 #include <cstring>
 
 #include "cli/ap/dry_run.h"
-#include "cli/ap/words.h"
-#include "cli/commands.h"
-#include "cli/output.h"
-#include "cli/wifi/access.h"
+#include "cli/ap/setting_words.h"
+#include "cli/command_line.h"
+#include "cli/report.h"
+#include "cli/wifi/station.h"
 #include "wireless/rules/ap_files.h"
 #include "wireless/rules/ap_settings.h"
 #include "wireless/rules/bridge_name.h"

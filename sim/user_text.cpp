@@ -1,4 +1,4 @@
-#include "sim/words.h"
+#include "sim/user_text.h"
 
 #include <sstream>
 #include <stdexcept>

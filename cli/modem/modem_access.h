@@ -1,12 +1,12 @@
-#ifndef TAVIWIRELESS_CLI_MODEM_ACCESS_H
-#define TAVIWIRELESS_CLI_MODEM_ACCESS_H
+#ifndef TAVIWIRELESS_CLI_MODEM_MODEM_ACCESS_H
+#define TAVIWIRELESS_CLI_MODEM_MODEM_ACCESS_H
 
 #include <map>
 #include <memory>
 #include <string>
 #include <vector>
 
-#include "cli/commands.h"
+#include "cli/command_line.h"
 
 namespace taviwireless::cli {
 

@@ -1,7 +1,7 @@
-#include "cli/ap/words.h"
+#include "cli/ap/setting_words.h"
 
-#include "cli/commands.h"
-#include "cli/output.h"
+#include "cli/command_line.h"
+#include "cli/report.h"
 
 namespace taviwireless::cli {
 

@@ -1,12 +1,12 @@
-#include "cli/secret.h"
+#include "cli/prompt.h"
 
 #include <termios.h>
 #include <unistd.h>
 
 #include <iostream>
 
-#include "cli/commands.h"
-#include "cli/output.h"
+#include "cli/command_line.h"
+#include "cli/report.h"
 
 namespace taviwireless::cli {
 

@@ -1,5 +1,5 @@
-#ifndef TAVIWIRELESS_CLI_OUTPUT_H
-#define TAVIWIRELESS_CLI_OUTPUT_H
+#ifndef TAVIWIRELESS_CLI_REPORT_H
+#define TAVIWIRELESS_CLI_REPORT_H
 
 #include <json/forwards.h>
 

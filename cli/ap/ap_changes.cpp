@@ -1,17 +1,17 @@
-#include "cli/ap/settings.h"
+#include "cli/ap/ap_changes.h"
 
 #include <arpa/inet.h>
 
 #include <algorithm>
 #include <set>
 
+#include "cli/adapter/credentials.h"
 #include "cli/ap/radio.h"
-#include "cli/ap/words.h"
-#include "cli/commands.h"
-#include "cli/output.h"
-#include "cli/secret.h"
-#include "cli/wifi/access.h"
-#include "cli/wifi/settings.h"
+#include "cli/ap/setting_words.h"
+#include "cli/command_line.h"
+#include "cli/prompt.h"
+#include "cli/report.h"
+#include "cli/wifi/station.h"
 #include "wireless/rules/bridge_name.h"
 
 namespace taviwireless::cli {

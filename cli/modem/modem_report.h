@@ -1,12 +1,12 @@
-#ifndef TAVIWIRELESS_CLI_MODEM_STATE_OUTPUT_H
-#define TAVIWIRELESS_CLI_MODEM_STATE_OUTPUT_H
+#ifndef TAVIWIRELESS_CLI_MODEM_MODEM_REPORT_H
+#define TAVIWIRELESS_CLI_MODEM_MODEM_REPORT_H
 
 #include <json/forwards.h>
 
 #include <vector>
 
-#include "cli/modem/access.h"
-#include "cli/output.h"
+#include "cli/modem/modem_access.h"
+#include "cli/report.h"
 
 namespace taviwireless::cli {
 

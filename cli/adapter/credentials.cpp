@@ -1,14 +1,14 @@
-#include "cli/wifi/settings.h"
+#include "cli/adapter/credentials.h"
 
 #include <arpa/inet.h>
 
 #include <algorithm>
 #include <optional>
 
-#include "cli/commands.h"
-#include "cli/output.h"
-#include "cli/secret.h"
-#include "cli/wifi/access.h"
+#include "cli/command_line.h"
+#include "cli/prompt.h"
+#include "cli/report.h"
+#include "cli/wifi/station.h"
 #include "wireless/rules/line_break.h"
 
 namespace taviwireless::cli {
