@@ -15,20 +15,27 @@ namespace taviwireless::dbus {
 // that runs the loop. The bus connection is the one that dbus-glib shares within the process.
 class TAVIWIRELESS_API DBusServer {
   public:
-    // Connects to the bus of this type. A bus that cannot be reached shows in initialize.
+    // Connects to the bus of this type. busName: the well-known name to ask for. path: where the
+    // object is exported. Both are copied. A bus that cannot be reached shows in initialize.
     DBusServer(const char* busName, const char* path, DBusBusType type);
     virtual ~DBusServer();
     DBusServer(const DBusServer&) = delete;
     DBusServer& operator=(const DBusServer&) = delete;
 
-    // Describes the type to D-Bus, asks the bus for the name and exports the object (borrowed) at
-    // the path. Returns false, with a line in the log, when the bus cannot be asked. A name that
-    // somebody else owns is no failure here: the request is then queued.
+    // Describes the type to D-Bus, asks the bus for the name and exports the object at the path.
+    //
+    // type: the GObject type that info describes.
+    // info: what dbus-binding-tool generated for it. Borrowed for the life of the process.
+    // object: an instance of type. Borrowed; it is no longer exported once it is finalized.
+    //
+    // Returns false, with a line in the log, when the bus cannot be asked. A name that somebody
+    // else owns is no failure here: the request is then queued.
     bool initialize(GType type, const DBusGObjectInfo* info, GObject* object);
 
-    // Serves until QuitLoop. Returns at once when the loop runs already.
+    // Serves on the calling thread until QuitLoop. Returns at once when the loop runs already.
     void StartLoop();
-    // Ends the loop after the call that is being served. Does nothing when none runs.
+    // Ends the loop after the call that is being served; StartLoop then returns and may be called
+    // again. Does nothing when none runs.
     void QuitLoop();
 
     // These describe the proxy of the bus itself ("org.freedesktop.DBus"), not the service. The

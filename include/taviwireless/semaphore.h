@@ -14,21 +14,22 @@ namespace taviwireless::semaphore {
 // call.
 class TAVIWIRELESS_API Semaphore {
   public:
+    // Makes no set yet. key: the same number in every process that shares the lock.
     explicit Semaphore(unsigned int key);
 
-    // Stores the identifier of the set in *semid, creating the set if it is not there.
-    // Returns 0; -1 for a null semid and, with a line in the log, when the set can be neither
-    // created nor given its value.
-    // When the set is there but may not be opened, *semid is -1 and the result is 0: the failure
-    // then shows in semop.
+    // Stores the identifier of the set in *semid, creating the set if it is not there. Returns 0;
+    // -1 for a null semid and, with a line in the log, when the set can be neither created nor
+    // given its value. When the set is there but may not be opened, *semid is -1 and the result is
+    // 0: Enter and Release then fail.
     int Get(int* semid);
 
     // Takes the lock, waiting while another holder has it, 5 s at most: whoever may open the set
-    // can keep it. Signals do not shorten the wait. Returns 0, or -1 with a line in the log, which
-    // has errno 11 (EAGAIN) when the time is over.
+    // can keep it. Caught signals do not end the wait. Returns 0, or -1 with a line in the log,
+    // which has errno 11 (EAGAIN) when the time is over.
     int Enter();
 
-    // Gives the lock back. Returns 0, or -1 with a line in the log.
+    // Gives the lock back. Returns 0, or -1 with a line in the log. Without a lock taken before, it
+    // lets a second holder in.
     int Release();
 
   private:

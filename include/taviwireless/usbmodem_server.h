@@ -43,10 +43,15 @@ TAVIWIRELESS_API GType usbmodem_object_get_type();
 //
 // Errors are "org.freedesktop.DBus.GLib.UnmappedError.GTypePrivateDependantsArray.Code" and the
 // code as an unsigned number: -1 for a modem that is unknown, not ready, or failed to dial or hang
-// up; 1 for a missing argument; n where an operation on the modem returned -n.
+// up; 1 for a missing argument; n where an operation on the modem returned -n. The PIN methods do
+// nothing, without an error, to a modem that is busy with a connection.
+//
+// dbus/usbmodem.xml in the sources documents each method, argument and error.
 class TAVIWIRELESS_API USBModemServer : public DBusServer {
   public:
+    // Connects to the session bus and makes the object, with an empty list.
     USBModemServer();
+    // Ends the records of the list; connections that run go on.
     ~USBModemServer() override;
 
     // Asks for the name and exports the object; false when the bus cannot be asked.

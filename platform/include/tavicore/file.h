@@ -24,7 +24,11 @@ extern "C" {
  */
 TAVI_SDK_API int VEXACFileExist(const char* path);
 
-/* The same for an existing directory. */
+/*
+ * Returns 1 when path names an existing directory (a link is followed), else 0: with
+ * VEXAC_ERR_NOT_FOUND when there is none, also when something else stands there, and VEXAC_ERR_IO
+ * when that cannot be told.
+ */
 TAVI_SDK_API int VEXACFileCheckDir(const char* path);
 
 /*
@@ -41,8 +45,8 @@ TAVI_SDK_API int VEXACSysUnlink(const char* path);
 TAVI_SDK_API int VEXACSysRename(const char* oldPath, const char* newPath);
 
 /*
- * The entries of a directory that are not directories themselves; the only kind of listing that the
- * host edition offers.
+ * What VEXACFileEnumDir lists: the entries of a directory that are not directories themselves; the
+ * only kind of listing that the host edition offers.
  */
 enum { VEXAC_ENUM_FILES = 128 };
 

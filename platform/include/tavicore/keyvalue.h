@@ -43,10 +43,9 @@ TAVI_SDK_API int VEXACFileGetKeyValue(const char* file, const char* key, char* v
  * created with mode 0644, less the process's umask.
  *
  * Returns 1 on success. Returns -1 and leaves the file as it was when it cannot be read or replaced
- * (VEXAC_ERR_IO, VEXAC_ERR_LOCKED), or an argument is null, the format is another one, the key is
- * empty or holds "=",
- * "#" at its start, a blank or a line break, or the value holds a line break
- * (VEXAC_ERR_BAD_PARAMETER).
+ * (VEXAC_ERR_IO, VEXAC_ERR_LOCKED), or an argument but format is null, the format is another one,
+ * the key is empty, begins with "#", or holds "=", a blank or a line break, or the value holds a
+ * line break (VEXAC_ERR_BAD_PARAMETER).
  */
 TAVI_SDK_API int VEXACFileSetKeyValue(const char* file, const char* key, const char* value,
                                       const char* format);

@@ -15,13 +15,15 @@
 extern "C" {
 #endif
 
+/* A bridge. */
 typedef struct TAVINetBridge {
     int isLocal; /* 1: a network of its own, with address and netmask; 0: part of the wired one */
     char name[TAVI_NET_IF_NAME_SIZE];
-    char address[TAVI_NET_ADDRESS_SIZE];
+    char address[TAVI_NET_ADDRESS_SIZE]; /* empty: that of the first member */
     char netmask[TAVI_NET_ADDRESS_SIZE];
 } TAVINetBridge;
 
+/* Kinds of members. */
 enum { TAVI_NET_MEMBER_WIRED = 2, TAVI_NET_MEMBER_WIRELESS = 3 };
 
 /* The first member of a bridge, which decides what kind of bridge it is. */
@@ -54,16 +56,17 @@ TAVI_SDK_API int TAVINetSetBridgeConfig(const TAVINetBridge* config,
  */
 TAVI_SDK_API int VEXANetBridgeSlaveEnum(const char* bridge, VEXACSzList** list);
 
+/* The DHCP service on a bridge. */
 typedef struct TAVINetDhcpServer {
-    int enabled;
-    int reserved;  /* the appliance stores 30 here */
+    int enabled;   /* 1: the network script runs it */
+    int reserved;  /* the appliance stores 30 here; it means nothing to the host edition */
     int leaseTime; /* seconds */
-    char rangeStart[TAVI_NET_ADDRESS_SIZE];
-    char rangeEnd[TAVI_NET_ADDRESS_SIZE];
-    char interface[TAVI_NET_IF_NAME_SIZE];
+    char rangeStart[TAVI_NET_ADDRESS_SIZE]; /* first address that is given out */
+    char rangeEnd[TAVI_NET_ADDRESS_SIZE];   /* last one */
+    char interface[TAVI_NET_IF_NAME_SIZE];  /* part of the file's name; the bridge again */
     char bridge[TAVI_NET_IF_NAME_SIZE];
-    char gateway[TAVI_NET_ADDRESS_SIZE];
-    char nameServer[TAVI_NET_ADDRESS_SIZE];
+    char gateway[TAVI_NET_ADDRESS_SIZE];    /* what clients are told; empty: nothing */
+    char nameServer[TAVI_NET_ADDRESS_SIZE]; /* likewise */
     char netmask[TAVI_NET_ADDRESS_SIZE];
 } TAVINetDhcpServer;
 

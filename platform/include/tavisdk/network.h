@@ -53,9 +53,12 @@ TAVI_SDK_API int BlVEXAIsIpAddr(const char* text);
 
 enum { TAVI_NET_IF_NAME_SIZE = 16 }; /* an interface's name, and its zero byte */
 
-/* 1 when the interface is up (administratively), else 0. */
+/* 1 when the interface is up (administratively), else 0, also when that cannot be told. */
 TAVI_SDK_API int TAVINetIsIFUp(const char* interface);
-/* Bring the interface up or down. Return 1 when that worked or it was so already, else 0. */
+/*
+ * Bring the interface up or down (administratively), without waiting for a carrier. Return 1 when
+ * that worked or it was so already, else 0.
+ */
 TAVI_SDK_API int VEXANetIfUp(const char* interface);
 TAVI_SDK_API int VEXANetIfDown(const char* interface);
 
@@ -73,7 +76,10 @@ typedef struct VEXANetInterfaceInfo {
     int linkState; /* VEXA_NET_LINK_... */
 } VEXANetInterfaceInfo;
 
-/* Fills at most max entries. Returns their number, or -1 on error. */
+/*
+ * Fills at most max entries of interfaces, in the kernel's order; kind is VEXA_NET_ALL_INTERFACES.
+ * Returns their number, or -1 on error.
+ */
 TAVI_SDK_API int VEXANetGetInterfaceInfo(VEXANetInterfaceInfo* interfaces, int max, int kind);
 
 /* The IPv4 settings of an interface. */
@@ -98,11 +104,10 @@ TAVI_SDK_API int TAVINetSetCard1(const TAVINetCard* card, int flags);
  * one. Returns 0, or -1 with empty texts when there is no lease after 12 seconds
  * (VEXAC_ERR_NOT_FOUND).
  *
- * The client's process id is in "/etc/dhcpc/dhcpcd-INTERFACE.pid", with its start time
- * as <tavicore/process.h> describes. Its lease is in
- * "/etc/dhcpc/dhcpcd-INTERFACE.info", a key/value file of IPADDR, NETMASK and, when the network
- * has one, GATEWAY. The host edition runs udhcpc with the script "/usr/tavi/bin/dhcp-lease", which
- * sets the address and the name servers, but no route.
+ * The client's process id is in "/etc/dhcpc/dhcpcd-INTERFACE.pid", with its start time as
+ * <tavicore/process.h> describes. Its lease is in "/etc/dhcpc/dhcpcd-INTERFACE.info", a key/value
+ * file of IPADDR, NETMASK and, when the network has one, GATEWAY. The host edition runs udhcpc with
+ * the script "/usr/tavi/bin/dhcp-lease", which sets the address and the name servers, but no route.
  */
 TAVI_SDK_API int TAVIIGetDHCPTestNetInfo(TAVINetCard* card);
 

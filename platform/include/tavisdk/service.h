@@ -8,12 +8,15 @@
 extern "C" {
 #endif
 
+/* What TAVIMediaService can be asked to do. */
 enum { TAVI_MEDIA_SERVICE_RESTART = 2 };
 
 /*
- * Restarts the media service on the network as it is now; action is TAVI_MEDIA_SERVICE_RESTART. The
- * host edition runs "/etc/rc.mediaservice restart". Returns 0, or -1 with VEXAC_ERR_BAD_PARAMETER
- * for another action, VEXAC_ERR_NOT_FOUND when there is no such script, VEXAC_ERR_IO when it fails.
+ * Restarts the media service on the network as it is now, and waits until that is done; action is
+ * TAVI_MEDIA_SERVICE_RESTART. The host edition runs "/etc/rc.mediaservice restart".
+ *
+ * Returns 0, or -1 with the error code of <tavicore/error.h>: VEXAC_ERR_BAD_PARAMETER for another
+ * action, VEXAC_ERR_NOT_FOUND when there is no such script, VEXAC_ERR_IO when it fails.
  */
 TAVI_SDK_API int TAVIMediaService(int action);
 

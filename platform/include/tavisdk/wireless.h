@@ -11,11 +11,17 @@
 extern "C" {
 #endif
 
-/* The wireless interface, a constant; null when the library is not loaded. */
+/*
+ * The wireless interface, a constant that the caller does not free; null when the library is not
+ * loaded, as for the functions below with VEXAC_ERR_NOT_FOUND.
+ */
 TAVI_SDK_API const char* TAVIWirelessInterfaceGet(void);
-/* Non-zero when the model supports Wi-Fi; 0 also when the library is not loaded. */
+/* Non-zero when the model supports Wi-Fi; 0 when not, and when the library is not loaded. */
 TAVI_SDK_API int TAVIWirelessIsSupported(void);
-/* Ends the Wi-Fi connection. Returns 0, or -1 on failure, also when the library is not loaded. */
+/*
+ * Ends the Wi-Fi connection, as <taviwireless/wireless.h> describes. Returns 0, or -1 on failure,
+ * also when the library is not loaded.
+ */
 TAVI_SDK_API int TAVIWirelessNetworkDisconnect(void);
 
 #ifdef __cplusplus
