@@ -1,7 +1,8 @@
 # shellcheck shell=bash
 # A USB modem to plug in: a gadget with three serial ports on a host controller that is itself simulated, so
 # that the kernel's USB and serial drivers are the real ones. On the gadget's side modemsim answers, and gives a
-# dialled call to a real pppd; that is in a network namespace of its own, "mobile". Sourced by modem.sh and peer.sh.
+# dialled call to a real pppd; that is in a network namespace of its own, "mobile". Sourced by modem.sh and
+# bench/vm_peer.sh.
 gadget=/sys/kernel/config/usb_gadget/modem
 near_address=10.64.64.64
 far_address=10.64.64.65

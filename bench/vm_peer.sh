@@ -1,10 +1,10 @@
 #!/bin/bash
-# The modem service beside ModemManager: the same modem in the same guest, one after the other. Of the two list
-# commands, ours asks the modem anew.
+# What scripts/test-vm peer runs: the modem service beside ModemManager, with the same modem in the same guest, one
+# after the other. Of the two list commands, ours asks the modem anew.
 # shellcheck source=tests/vm/common.sh
-. "$(dirname "$0")/common.sh"
+. "$(dirname "$0")/../tests/vm/common.sh"
 # shellcheck source=tests/vm/gadget.sh
-. "$(dirname "$0")/gadget.sh"
+. "$(dirname "$0")/../tests/vm/gadget.sh"
 
 our_bus() {
     gdbus call --session -d com.merilond.usbmodem -o / -m com.merilond.usbmodem.GetUSBModemList
