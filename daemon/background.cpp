@@ -7,17 +7,16 @@
 #include <cerrno>
 #include <cstdlib>
 #include <system_error>
+#include <utility>
+
+#include "base/unique_pipe.h"
 
 namespace taviwireless::daemon {
 
 namespace {
 
-[[noreturn]] void WaitForReady(int ready, pid_t child) {
-    char byte;
-    ssize_t size;
-    while ((size = read(ready, &byte, 1)) < 0 && errno == EINTR) {
-    }
-    if (size == 1) {
+[[noreturn]] void WaitForReady(UniquePipe& pipe, pid_t child) {
+    if (pipe.ReadByte()) {
         _exit(EXIT_SUCCESS);
     }
     int status = 0;
@@ -28,30 +27,26 @@ namespace {
 }  // namespace
 
 Background::Background() {
-    int ends[2];
-    const bool hasPipe = pipe2(ends, O_CLOEXEC) == 0;
-    const pid_t child = hasPipe ? fork() : -1;
+    UniquePipe pipe;
+    const pid_t child = pipe ? fork() : -1;
     if (child < 0) {
         throw std::system_error(errno, std::generic_category(), "cannot go into the background");
     }
     if (child > 0) {
-        close(ends[1]);
-        WaitForReady(ends[0], child);
+        WaitForReady(pipe, child);
     }
-    close(ends[0]);
-    ready_ = ends[1];
+    ready_ = std::move(pipe.writeEnd);
     setsid();
 }
 
 void Background::Ready() {
-    const int nothing = open("/dev/null", O_RDWR | O_CLOEXEC);
+    const UniqueFd nothing(open("/dev/null", O_RDWR | O_CLOEXEC));
     for (const int standard : {STDIN_FILENO, STDOUT_FILENO, STDERR_FILENO}) {
-        dup2(nothing, standard);
+        dup2(nothing.Get(), standard);
     }
-    close(nothing);
     (void)!chdir("/");
-    (void)!write(ready_, "", 1);
-    close(ready_);
+    (void)!write(ready_.Get(), "", 1);
+    ready_.Close();
 }
 
 }  // namespace taviwireless::daemon

@@ -1,6 +1,8 @@
 #ifndef TAVIWIRELESS_DAEMON_BACKGROUND_H
 #define TAVIWIRELESS_DAEMON_BACKGROUND_H
 
+#include "base/unique_fd.h"
+
 namespace taviwireless::daemon {
 
 // Goes on in the background, while the process that was started waits: it ends with status 0 at
@@ -14,7 +16,7 @@ class Background {
     void Ready();
 
   private:
-    int ready_;
+    UniqueFd ready_;
 };
 
 }  // namespace taviwireless::daemon

@@ -28,13 +28,11 @@ bool Concerns(const inotify_event& event) {
 
 InfoFileWatch::InfoFileWatch(std::function<void()> onChange)
     : onChange_(std::move(onChange)), handle_(inotify_init1(IN_NONBLOCK | IN_CLOEXEC)) {
-    if (handle_ < 0 || inotify_add_watch(handle_, kFolder, kChanges) < 0) {
-        const int error = errno;
-        close(handle_);
-        throw std::system_error(error, std::generic_category(), "cannot watch /tmp/");
+    if (!handle_ || inotify_add_watch(handle_.Get(), kFolder, kChanges) < 0) {
+        throw std::system_error(errno, std::generic_category(), "cannot watch /tmp/");
     }
     source_ = g_unix_fd_add(
-        handle_, G_IO_IN,
+        handle_.Get(), G_IO_IN,
         [](gint, GIOCondition, gpointer self) -> gboolean {
             return static_cast<InfoFileWatch*>(self)->ReadEvents();
         },
@@ -46,13 +44,12 @@ InfoFileWatch::~InfoFileWatch() {
     if (delay_ != 0) {
         g_source_remove(delay_);
     }
-    close(handle_);
 }
 
 bool InfoFileWatch::ReadEvents() {
     alignas(inotify_event) char buffer[4096];
     bool hasChanged = false;
-    for (ssize_t size; (size = read(handle_, buffer, sizeof buffer)) > 0;) {
+    for (ssize_t size; (size = read(handle_.Get(), buffer, sizeof buffer)) > 0;) {
         for (const char* next = buffer; next < buffer + size;) {
             const auto& event = *reinterpret_cast<const inotify_event*>(next);
             hasChanged = hasChanged || Concerns(event);

@@ -5,6 +5,8 @@
 
 #include <functional>
 
+#include "base/unique_fd.h"
+
 namespace taviwireless::daemon {
 
 // Calls back from the main loop when an info file of a modem in "/tmp/" came, went or was written.
@@ -21,7 +23,7 @@ class InfoFileWatch {
     bool ReadEvents();
 
     std::function<void()> onChange_;
-    int handle_;
+    UniqueFd handle_;
     guint source_ = 0;
     guint delay_ = 0;
 };

@@ -11,7 +11,6 @@
 #include <utility>
 #include <vector>
 
-#include "base/unique_fd.h"
 #include "daemon/info_files.h"
 #include "daemon/lock_files.h"
 #include "daemon/semaphore_sets.h"
@@ -40,9 +39,9 @@ unsigned int TimeLimit(const std::string& info) {
     return kLimit + kLimitPerPort * static_cast<unsigned int>(commas + 2);
 }
 
-std::string ReadAll(int output) {
+std::string ReadAll(const UniqueFd& output) {
     char text[64];  // a device path
-    const ssize_t length = read(output, text, sizeof text);
+    const ssize_t length = read(output.Get(), text, sizeof text);
     return std::string(text, length > 0 ? static_cast<size_t>(length) : 0);
 }
 
@@ -64,7 +63,6 @@ Probe::~Probe() {
         g_source_remove(watch_);
         g_child_watch_add(process_, Reap, nullptr);
     }
-    UniqueFd(std::exchange(output_, -1)).Close();
 }
 
 void Probe::StartWaiting() {
@@ -80,9 +78,10 @@ void Probe::Start() {
     char option[] = "--probe";
     std::string id = std::to_string(interfaceId_);
     char* arguments[] = {program, option, id.data(), nullptr};
+    gint output = -1;
     GError* error = nullptr;
     if (!g_spawn_async_with_pipes(nullptr, arguments, nullptr, G_SPAWN_DO_NOT_REAP_CHILD, nullptr,
-                                  nullptr, &process_, nullptr, &output_, nullptr, &error)) {
+                                  nullptr, &process_, nullptr, &output, nullptr, &error)) {
         syslog(LOG_ERR, "cannot look whether modem %d answers: %s", interfaceId_, error->message);
         g_error_free(error);
         failure_ = g_idle_add(
@@ -94,6 +93,7 @@ void Probe::Start() {
             this);
         return;
     }
+    output_ = UniqueFd(output);
     ++running;
     watch_ = g_child_watch_add(process_, Reap, this);
 }

@@ -6,6 +6,8 @@
 #include <functional>
 #include <string>
 
+#include "base/unique_fd.h"
+
 namespace taviwireless::daemon {
 
 // On which port a modem answers, found out by a process of its own: a port that is silent or talks
@@ -36,7 +38,7 @@ class Probe {
     int interfaceId_;
     OnEnd onEnd_;
     GPid process_ = 0;
-    int output_ = -1;  // of the process
+    UniqueFd output_;  // of the process
     guint watch_ = 0;
     guint failure_ = 0;
 };

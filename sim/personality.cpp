@@ -8,6 +8,7 @@
 #include <regex>
 #include <stdexcept>
 
+#include "base/join.h"
 #include "sim/at_text.h"
 
 namespace taviwireless::sim {
@@ -104,7 +105,7 @@ Value Choose(const std::map<std::string, Value>& choices, const Json::Value& wor
     }
     std::string known;
     for (const auto& [name, value] : choices) {
-        known += (known.empty() ? "" : ", ") + name;
+        AddItem(known, name);
     }
     Fail(place, "'" + word.asString() + "' is none of " + known);
 }

@@ -5,6 +5,8 @@
 #include <fstream>
 #include <stdexcept>
 
+#include "base/join.h"
+
 namespace taviwireless::sim {
 
 namespace fs = std::filesystem;
@@ -167,7 +169,7 @@ void SimulatedModem::WriteInfo() {
     std::string all;
     for (size_t index = 0; index < ports_.size(); ++index) {
         const std::string number = std::to_string(numbers_[index]);
-        all += (all.empty() ? "" : ",") + number;
+        AddItem(all, number, ",");
         if (ports_[index].Role() == PortRole::kDial) {
             dial = number;
         }

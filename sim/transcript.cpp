@@ -1,5 +1,8 @@
 #include "sim/transcript.h"
 
+#include <fcntl.h>
+#include <unistd.h>
+
 #include <cerrno>
 #include <chrono>
 #include <cstring>
@@ -41,7 +44,8 @@ std::string TimeOfDay() {
 }  // namespace
 
 Transcript::Transcript(const std::string& path)
-    : file_(path == "-" ? stderr : std::fopen(path.c_str(), "ae")) {
+    : file_(path == "-" ? fdopen(fcntl(STDERR_FILENO, F_DUPFD_CLOEXEC, 0), "w")
+                        : std::fopen(path.c_str(), "ae")) {
     if (!file_) {
         throw std::runtime_error("Cannot write the log " + path + ": " + std::strerror(errno) +
                                  ".");

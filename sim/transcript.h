@@ -1,9 +1,9 @@
 #ifndef TAVIWIRELESS_SIM_TRANSCRIPT_H
 #define TAVIWIRELESS_SIM_TRANSCRIPT_H
 
-#include <cstdio>
-#include <memory>
 #include <string>
+
+#include "base/unique_file.h"
 
 namespace taviwireless::sim {
 
@@ -18,14 +18,7 @@ class Transcript {
     void Note(const std::string& port, char direction, const std::string& bytes);
 
   private:
-    struct Close {
-        void operator()(FILE* file) const {
-            if (file != stderr) {
-                std::fclose(file);
-            }
-        }
-    };
-    std::unique_ptr<FILE, Close> file_;
+    UniqueFile file_;
 };
 
 }  // namespace taviwireless::sim

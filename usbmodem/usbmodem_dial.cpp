@@ -15,6 +15,7 @@
 #include <filesystem>
 #include <vector>
 
+#include "base/unique_pipe.h"
 #include "common/log.h"
 #include "usbmodem/profile_value.h"
 #include "usbmodem/state_files.h"
@@ -65,12 +66,6 @@ void CloseAllFrom(int first) {
     execv(arguments[0], arguments);
     dprintf(STDERR_FILENO, "cannot run %s: %s\n", arguments[0], strerror(errno));
     abort();
-}
-
-void WaitUntilClosed(int pipe) {
-    char none;
-    while (read(pipe, &none, 1) < 0 && errno == EINTR) {
-    }
 }
 
 }  // namespace
@@ -200,18 +195,14 @@ int USBModem::BackgroundExec(const std::string& program, const std::string& init
     }
     pointers.push_back(nullptr);
 
-    int ends[2];
-    const bool hasPipe = pipe2(ends, O_CLOEXEC) == 0;
-    const pid_t child = hasPipe ? VEXACProcForkChildNoWait() : -1;
+    UniquePipe pidFileIsWritten;
+    const pid_t child = pidFileIsWritten ? VEXACProcForkChildNoWait() : -1;
     if (child == 0) {
-        BecomeDialler(pointers.data(), pidFile.c_str(), logFile.c_str(), ends[1]);
+        BecomeDialler(pointers.data(), pidFile.c_str(), logFile.c_str(),
+                      pidFileIsWritten.writeEnd.Get());
     }
-    if (hasPipe) {
-        close(ends[1]);
-        // Whoever looks at the link from now on finds the pid file.
-        WaitUntilClosed(ends[0]);
-        close(ends[0]);
-    }
+    // Whoever looks at the link from now on finds the pid file.
+    pidFileIsWritten.ReadByte();
     if (child < 0) {
         VEXACErrSet(VEXAC_ERR_FORK_FAILED);
         return -1;

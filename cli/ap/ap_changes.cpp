@@ -5,6 +5,7 @@
 #include <algorithm>
 #include <set>
 
+#include "base/join.h"
 #include "cli/adapter/credentials.h"
 #include "cli/ap/radio.h"
 #include "cli/ap/setting_words.h"
@@ -254,7 +255,7 @@ void CheckNetwork(const APNetwork& network) {
 std::string APSettingNames() {
     std::string names;
     for (const Key& key : Keys()) {
-        names += (names.empty() ? "" : ", ") + key.name;
+        AddItem(names, key.name);
     }
     return names;
 }

@@ -1,6 +1,5 @@
 // taviwireless ap check: what the access point would be started with, and what hostapd says of it.
 #include <json/json.h>
-#include <sys/mman.h>
 #include <unistd.h>
 
 #include <cstdio>
@@ -8,6 +7,8 @@
 #include <iostream>
 #include <sstream>
 
+#include "base/join.h"
+#include "base/memory_file.h"
 #include "cli/ap/access_point.h"
 #include "cli/ap/ap_changes.h"
 #include "cli/ap/ap_commands.h"
@@ -56,26 +57,13 @@ std::string HideSecrets(const std::string& text) {
     return hidden;
 }
 
-// A file of no folder, which nobody else can read and which is gone when the program ends.
-class MemoryFile {
-  public:
-    explicit MemoryFile(const std::string& text) : handle_(memfd_create("hostapd", MFD_CLOEXEC)) {
-        if (handle_ < 0 || write(handle_, text.data(), text.size()) != ssize_t(text.size())) {
-            throw CommandError(kFailure, "there is no memory for hostapd's settings");
-        }
+// For programs that are started.
+std::string PathOf(const UniqueFd& file) {
+    if (!file) {
+        throw CommandError(kFailure, "there is no memory for hostapd's settings");
     }
-    ~MemoryFile() { close(handle_); }
-    MemoryFile(const MemoryFile&) = delete;
-    MemoryFile& operator=(const MemoryFile&) = delete;
-
-    // For programs that are started, while this lives.
-    std::string Path() const {
-        return "/proc/" + std::to_string(getpid()) + "/fd/" + std::to_string(handle_);
-    }
-
-  private:
-    int handle_;
-};
+    return "/proc/" + std::to_string(getpid()) + "/fd/" + std::to_string(file.Get());
+}
 
 struct Verdict {
     int errors = -1;  // negative: none was heard
@@ -84,9 +72,9 @@ struct Verdict {
 
 // "Line 7: ..." counts through both files.
 Verdict AskHostapd(const std::string& text) {
-    const MemoryFile file(text + kStopper + "=1\n");
+    const UniqueFd file = MemoryFile(text + kStopper + "=1\n");
     const wireless::Pipe output(
-        wireless::Command(128, {"hostapd ", wireless::Argument{file.Path()}, " 2>&1"}));
+        wireless::Command(128, {"hostapd ", wireless::Argument{PathOf(file)}, " 2>&1"}));
     Verdict verdict;
     char line[1024];
     while (output && fgets(line, sizeof line, output.get()) != nullptr) {
@@ -106,7 +94,7 @@ Verdict AskHostapd(const std::string& text) {
 std::string Join(const std::vector<std::string>& texts) {
     std::string joined;
     for (const std::string& text : texts) {
-        joined += (joined.empty() ? "" : "; ") + text;
+        AddItem(joined, text, "; ");
     }
     return joined;
 }

@@ -1,5 +1,6 @@
 #include "cli/ap/setting_words.h"
 
+#include "base/join.h"
 #include "cli/command_line.h"
 #include "cli/report.h"
 
@@ -54,7 +55,7 @@ const Row& Find(const Row (&rows)[Count], const std::string& word, const char* w
         if (word == row.word) {
             return row;
         }
-        words += (words.empty() ? "" : ", ") + std::string(row.word);
+        AddItem(words, row.word);
     }
     throw CommandError(
         kUsage, std::string(what) + " cannot be " + Printable(word) + "; it is one of " + words);

@@ -3,6 +3,7 @@
 
 #include <algorithm>
 
+#include "base/join.h"
 #include "cli/deadline.h"
 #include "cli/modem/modem_access.h"
 #include "cli/modem/modem_commands.h"
@@ -24,7 +25,7 @@ std::string SettableKeys() {
     std::string names;
     for (const ProfileKey& key : kProfileKeys) {
         if (key.canBeSet) {
-            names += (names.empty() ? "" : ", ") + std::string(key.name);
+            AddItem(names, key.name);
         }
     }
     return names;

@@ -21,6 +21,7 @@
 #include <system_error>
 #include <vector>
 
+#include "base/unique_pipe.h"
 #include "platform/appliance_root/private_system.h"
 
 namespace taviwireless {
@@ -171,13 +172,12 @@ pid_t ForkOrFail() {
 }
 
 // Lets this process die with the one outside, which holds the other end of `outside` open.
-void DieWithOutside(int outside) {
+void DieWithOutside(const UniqueFd& outside) {
     prctl(PR_SET_PDEATHSIG, SIGKILL);
-    pollfd end{outside, POLLIN, 0};
+    pollfd end{outside.Get(), POLLIN, 0};
     if (poll(&end, 1, 0) > 0) {  // it died before it could be noticed
         _exit(128 + SIGKILL);
     }
-    close(outside);
 }
 
 void SetUpOrExit(const Workplace& workplace) {
@@ -197,8 +197,8 @@ void SetUpOrExit(const Workplace& workplace) {
 void EnterApplianceRoot(const std::string& output) {
     const Workplace workplace = FindWorkplace(output);
     LeaveNamespaces(workplace.program);
-    int life[2];  // holds no data: its writing end is open as long as the process outside lives
-    if (pipe(life) != 0) {
+    UniquePipe life;  // holds no data: its writing end is open as long as the process outside lives
+    if (!life) {
         Fail("cannot make a pipe");
     }
     fflush(nullptr);  // or every process would print what is buffered
@@ -209,11 +209,12 @@ void EnterApplianceRoot(const std::string& output) {
     sigprocmask(SIG_BLOCK, &signals, &before);
     const pid_t init = ForkOrFail();
     if (init > 0) {
-        close(life[0]);
+        life.readEnd.Close();
         Tend(init);
     }
-    close(life[1]);
-    DieWithOutside(life[0]);
+    life.writeEnd.Close();
+    DieWithOutside(life.readEnd);
+    life.readEnd.Close();
     SetUpOrExit(workplace);
     const pid_t inside = fork();
     if (inside < 0) {

@@ -1,10 +1,8 @@
 #include "tests/support/process.h"
 
-#include <fcntl.h>
 #include <poll.h>
 #include <spawn.h>
 #include <sys/auxv.h>
-#include <sys/mman.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -16,7 +14,8 @@
 #include <thread>
 #include <utility>
 
-#include "base/unique_fd.h"
+#include "base/memory_file.h"
+#include "base/unique_pipe.h"
 
 namespace taviwireless::test {
 namespace {
@@ -29,23 +28,6 @@ std::filesystem::path BuiltPrograms() {
 
 using Clock = std::chrono::steady_clock;
 using Milliseconds = Process::Milliseconds;
-
-using Descriptor = UniqueFd;
-
-struct Pipe {
-    Descriptor reading;
-    Descriptor writing;
-
-    // Both ends close on exec, so that programs started meanwhile do not hold them open.
-    Pipe() {
-        int ends[2];
-        if (pipe2(ends, O_CLOEXEC) != 0) {
-            throw std::system_error(errno, std::generic_category(), "Cannot make a pipe");
-        }
-        reading = Descriptor(ends[0]);
-        writing = Descriptor(ends[1]);
-    }
-};
 
 // A child that no longer reads must show as a failed write, not end the test.
 void IgnoreBrokenPipes() {
@@ -107,23 +89,6 @@ bool ReadMore(int descriptor, std::string* text) {
     return count > 0;
 }
 
-// A file in memory with this text, to be read from its beginning.
-Descriptor MemoryFile(const std::string& text) {
-    Descriptor file(memfd_create("program", MFD_CLOEXEC));
-    if (file.Get() < 0 || pwrite(file.Get(), text.data(), text.size(), 0) < 0) {
-        throw std::system_error(errno, std::generic_category(), "Cannot make a file in memory");
-    }
-    return file;
-}
-
-std::string Content(const Descriptor& file) {
-    lseek(file.Get(), 0, SEEK_SET);
-    std::string text;
-    while (ReadMore(file.Get(), &text)) {
-    }
-    return text;
-}
-
 // The exit status once the child has ended; nothing when it has not by the deadline.
 std::optional<int> WaitUntil(Clock::time_point deadline, pid_t pid) {
     for (;;) {
@@ -172,16 +137,19 @@ RunResult RunAsNobody(std::vector<std::string> argv) {
 
 Process::Process(const std::vector<std::string>& argv) {
     IgnoreBrokenPipes();
-    Pipe input;
-    Pipe output;
-    pid_ = Spawn(argv, input.reading.Get(), output.writing.Get(), -1);
-    input_ = input.writing.Release();
-    output_ = output.reading.Release();
+    UniquePipe input;
+    UniquePipe output;
+    if (!input || !output) {
+        throw std::system_error(errno, std::generic_category(), "Cannot make a pipe");
+    }
+    pid_ = Spawn(argv, input.readEnd.Get(), output.writeEnd.Get(), -1);
+    input_ = std::move(input.writeEnd);
+    output_ = std::move(output.readEnd);
 }
 
 Process::~Process() {
     CloseInput();
-    close(output_);
+    output_.Close();
     if (!status_) {
         kill(pid_, SIGKILL);
         Wait();
@@ -200,9 +168,9 @@ std::optional<std::string> Process::ReadLine(Milliseconds patience) {
         if (atEnd_) {
             return unread_.empty() ? std::nullopt : std::optional(std::exchange(unread_, {}));
         }
-        pollfd readable{output_, POLLIN, 0};
+        pollfd readable{output_.Get(), POLLIN, 0};
         if (poll(&readable, 1, TimeLeft(deadline)) > 0) {
-            atEnd_ = !ReadMore(output_, &unread_);
+            atEnd_ = !ReadMore(output_.Get(), &unread_);
         } else if (Clock::now() >= deadline) {
             return std::nullopt;
         }
@@ -211,13 +179,11 @@ std::optional<std::string> Process::ReadLine(Milliseconds patience) {
 
 bool Process::WriteLine(const std::string& line) {
     const std::string text = line + "\n";  // far shorter than what a pipe takes in one piece
-    return write(input_, text.data(), text.size()) == static_cast<ssize_t>(text.size());
+    return write(input_.Get(), text.data(), text.size()) == static_cast<ssize_t>(text.size());
 }
 
 void Process::CloseInput() {
-    if (input_ >= 0) {
-        close(std::exchange(input_, -1));
-    }
+    input_.Close();
 }
 
 void Process::Signal(int number) {
@@ -235,9 +201,12 @@ std::optional<int> Process::Wait(Milliseconds patience) {
 
 RunResult RunProgram(const std::vector<std::string>& argv, const std::string& input) {
     constexpr Milliseconds kRunPatience{50000};
-    const Descriptor in = MemoryFile(input);
-    const Descriptor out = MemoryFile("");
-    const Descriptor err = MemoryFile("");
+    const UniqueFd in = MemoryFile(input);
+    const UniqueFd out = MemoryFile();
+    const UniqueFd err = MemoryFile();
+    if (!in || !out || !err) {
+        throw std::system_error(errno, std::generic_category(), "Cannot make a file in memory");
+    }
     const pid_t pid = Spawn(argv, in.Get(), out.Get(), err.Get());
     const auto status = WaitUntil(Clock::now() + kRunPatience, pid);
     if (!status) {
@@ -245,7 +214,7 @@ RunResult RunProgram(const std::vector<std::string>& argv, const std::string& in
         waitpid(pid, nullptr, 0);
         throw std::runtime_error(argv[0] + " has not ended within 50 s");
     }
-    return {*status, Content(out), Content(err)};
+    return {*status, TextOf(out), TextOf(err)};
 }
 
 }  // namespace taviwireless::test

@@ -8,6 +8,8 @@
 #include <string>
 #include <vector>
 
+#include "base/unique_fd.h"
+
 namespace taviwireless::test {
 
 // The path of a program of this project, built into the same directory as the running test.
@@ -49,8 +51,8 @@ class Process {
 
   private:
     pid_t pid_ = -1;
-    int input_ = -1;
-    int output_ = -1;
+    UniqueFd input_;
+    UniqueFd output_;
     std::string unread_;
     bool atEnd_ = false;
     std::optional<int> status_;

@@ -51,7 +51,7 @@ bool MakeFolder() {
 // Nothing is left of a file that could not be written whole: the security stands at its end, and
 // half of it would be an open network.
 bool Write(const std::string& path, const HostapdConf& conf) {
-    const File file = CreateAnew(path.c_str(), kMode);
+    const UniqueFile file = CreateAnew(path.c_str(), kMode);
     if (!file) {
         return false;
     }

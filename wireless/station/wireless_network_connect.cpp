@@ -8,6 +8,7 @@
 #include <cstring>
 #include <string>
 
+#include "base/trusted_file.h"
 #include "common/log.h"
 #include "wireless/rules/paths.h"
 #include "wireless/rules/supplicant.h"
@@ -33,7 +34,7 @@ bool WriteSupplicantConf(const WirelessConf& conf) {
         TAVI_LOG_ERROR("The ESSID, key or user name holds a line break");
         return false;
     }
-    const File file = CreateAnew(kSupplicantConf, kSupplicantMode);
+    const UniqueFile file = CreateAnew(kSupplicantConf, kSupplicantMode);
     if (!file) {
         TAVI_LOG_ERROR("Failed to open file[%s].", kSupplicantConf);
         return false;
@@ -81,10 +82,10 @@ bool WaitForAssociation() {
 // For TAVIWirelessStatusGet. What strangers put in its place, a folder for example, is removed.
 bool RecordConnection(const WirelessNetwork& network) {
     struct stat status {};
-    if (lstat(kCurrentConnection, &status) == 0 && !IsTrusted(status)) {
+    if (lstat(kCurrentConnection, &status) == 0 && !IsTrustedOwner(status.st_uid)) {
         RemoveAll(kCurrentConnection);
     }
-    const File file = CreateAnew(kCurrentConnection, kRecordMode);
+    const UniqueFile file = CreateAnew(kCurrentConnection, kRecordMode);
     char bssid[18];
     return file &&
            fprintf(file.get(), "%s\n%d\n%d\n%d\n%s\n", network.essid, network.protocol,

@@ -6,7 +6,7 @@
 
 #include <cerrno>
 
-#include "base/unique_fd.h"
+#include "base/trusted_file.h"
 #include "wireless/system/new_file.h"
 
 namespace taviwireless::wireless {
@@ -29,7 +29,7 @@ FlagFile::~FlagFile() {
 
 bool FlagFile::IsRaised(const char* path) {
     struct stat status {};
-    return lstat(path, &status) == 0 && S_ISREG(status.st_mode) && IsTrusted(status);
+    return lstat(path, &status) == 0 && S_ISREG(status.st_mode) && IsTrustedOwner(status.st_uid);
 }
 
 bool FlagFile::Raise() const {

@@ -5,31 +5,28 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
-#include <cstdio>
 #include <filesystem>
-#include <memory>
+
+#include "base/unique_fd.h"
+#include "base/unique_file.h"
 
 namespace taviwireless::wireless {
 
-using File = std::unique_ptr<FILE, int (*)(FILE*)>;
-
 // Opens a file that is new: one that was there is removed, never written into, so that the mode
 // holds from the first byte and nobody reads along who had the old one open. Null on failure.
-inline File CreateAnew(const char* path, mode_t mode) {
+inline UniqueFile CreateAnew(const char* path, mode_t mode) {
     unlink(path);
-    const int handle = open(path, O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, mode);
-    return File(handle >= 0 ? fdopen(handle, "w") : nullptr, fclose);
+    UniqueFd handle(open(path, O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, mode));
+    UniqueFile file(handle ? fdopen(handle.Get(), "w") : nullptr);
+    if (file) {
+        handle.Release();
+    }
+    return file;
 }
 
 // Creates the file, empty, unless it is there already. An existing file keeps its mode.
 inline bool MakeSureOf(const char* path, mode_t mode) {
-    const int handle = open(path, O_WRONLY | O_CREAT | O_CLOEXEC, mode);
-    return handle >= 0 && close(handle) == 0;
-}
-
-// Of root or of the own user.
-inline bool IsTrusted(const struct stat& status) {
-    return status.st_uid == 0 || status.st_uid == geteuid();
+    return static_cast<bool>(UniqueFd(open(path, O_WRONLY | O_CREAT | O_CLOEXEC, mode)));
 }
 
 // Removes what stands at path, with all that is in it when it is a folder; follows no link.

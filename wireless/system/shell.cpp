@@ -1,6 +1,5 @@
 #include "wireless/system/shell.h"
 
-#include <fcntl.h>
 #include <sys/wait.h>
 #include <syslog.h>
 #include <unistd.h>
@@ -9,7 +8,7 @@
 #include <utility>
 
 #include "base/spawn_settings.h"
-#include "base/unique_fd.h"
+#include "base/unique_pipe.h"
 #include "common/log.h"
 
 namespace taviwireless::wireless {
@@ -76,26 +75,20 @@ pid_t Command::Start(Output output, int pipe) const {
 }
 
 Pipe::Pipe(const Command& command) {
-    int ends[2];
-    if (!command.fits_ || pipe2(ends, O_CLOEXEC) != 0) {
-        errno = command.fits_ ? errno : E2BIG;
+    if (!command.fits_) {
+        errno = E2BIG;
         return;
     }
-    UniqueFd readEnd(ends[0]);
-    const UniqueFd writeEnd(ends[1]);
-    process_ = command.Start(Output::kShown, writeEnd.Get());
-    if (process_ >= 0) {
-        file_ = fdopen(readEnd.Get(), "r");
-    }
-    if (file_ != nullptr) {
-        readEnd.Release();
+    UniquePipe ends;
+    process_ = ends ? command.Start(Output::kShown, ends.writeEnd.Get()) : -1;
+    file_.reset(process_ >= 0 ? fdopen(ends.readEnd.Get(), "r") : nullptr);
+    if (file_) {
+        ends.readEnd.Release();
     }
 }
 
 int Pipe::Close() {
-    if (file_ != nullptr) {
-        fclose(std::exchange(file_, nullptr));
-    }
+    file_.reset();
     const int status = process_ >= 0 ? Wait(std::exchange(process_, -1)) : -1;
     return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
 }

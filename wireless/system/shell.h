@@ -4,9 +4,10 @@
 #include <sys/types.h>
 
 #include <cstddef>
-#include <cstdio>
 #include <initializer_list>
 #include <string>
+
+#include "base/unique_file.h"
 
 namespace taviwireless::wireless {
 
@@ -66,13 +67,13 @@ class Pipe {
 
     // Without one, errno tells why.
     explicit operator bool() const { return file_ != nullptr; }
-    FILE* get() const { return file_; }
+    FILE* get() const { return file_.get(); }
 
     // Waits for the command's end. Its exit status; -1 when it has none or that cannot be told.
     int Close();
 
   private:
-    FILE* file_ = nullptr;
+    UniqueFile file_;
     pid_t process_ = -1;
 };
 

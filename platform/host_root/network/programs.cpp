@@ -2,7 +2,6 @@
 
 #include <fcntl.h>
 #include <poll.h>
-#include <sys/mman.h>
 #include <sys/stat.h>
 #include <sys/wait.h>
 #include <tavicore/process.h>
@@ -18,8 +17,8 @@ extern "C" {  // its declarations forget that
 #include <fstream>
 #include <iterator>
 
+#include "base/memory_file.h"
 #include "base/spawn_settings.h"
-#include "base/unique_fd.h"
 #include "platform/host_root/network/error.h"
 
 namespace taviwireless::network {
@@ -60,16 +59,6 @@ bool EndsWell(pid_t pid, int limit) {
            WEXITSTATUS(status) == 0;
 }
 
-std::string ReadAll(int file) {
-    std::string text;
-    char part[4096];
-    off_t offset = 0;
-    for (ssize_t count; (count = pread(file, part, sizeof part, offset)) > 0; offset += count) {
-        text.append(part, static_cast<size_t>(count));
-    }
-    return text;
-}
-
 bool AwaitPidFile(const Program& program) {
     constexpr int kMostLooks = 200;
     constexpr useconds_t kPause = 50000;  // µs
@@ -86,13 +75,13 @@ bool AwaitPidFile(const Program& program) {
 }  // namespace
 
 Outcome Run(const std::vector<std::string>& argv, int limit) {
-    const UniqueFd output(memfd_create("output", MFD_CLOEXEC));
+    const UniqueFd output = MemoryFile();
     const pid_t pid = output ? Spawn(argv, output.Get()) : -1;
     if (pid < 0) {
         return {false, argv[0] + ": " + strerror(errno) + '\n'};
     }
     const bool isDone = EndsWell(pid, limit);
-    return {isDone, ReadAll(output.Get())};
+    return {isDone, TextOf(output)};
 }
 
 Program Hostapd(const std::string& interface) {

@@ -1,12 +1,10 @@
 #ifndef TAVIWIRELESS_PLATFORM_LINUX_CORE_CHILD_REPORT_H
 #define TAVIWIRELESS_PLATFORM_LINUX_CORE_CHILD_REPORT_H
 
-#include <fcntl.h>
-
 #include <cerrno>
 #include <optional>
 
-#include "base/unique_fd.h"
+#include "base/unique_pipe.h"
 #include "failure.h"
 
 namespace tavicore {
@@ -16,33 +14,29 @@ namespace tavicore {
 class ChildReport {
   public:
     ChildReport() {
-        int ends[2];
-        if (pipe2(ends, O_CLOEXEC) != 0) {
+        if (!pipe_) {
             throw Failure{VEXAC_ERR_FORK_FAILED};
         }
-        readEnd_ = taviwireless::UniqueFd(ends[0]);
-        writeEnd_ = taviwireless::UniqueFd(ends[1]);
     }
 
-    int WriteEnd() const { return writeEnd_.Get(); }
+    int WriteEnd() const { return pipe_.writeEnd.Get(); }
     static bool Tell(int writeEnd, int number) {
         return write(writeEnd, &number, sizeof number) == sizeof number;
     }
 
     // Waits for the number; nothing when the child ended without telling it.
     std::optional<int> Hear() {
-        writeEnd_.Close();
+        pipe_.writeEnd.Close();
         int number = 0;
         ssize_t count = -1;
         do {
-            count = read(readEnd_.Get(), &number, sizeof number);
+            count = read(pipe_.readEnd.Get(), &number, sizeof number);
         } while (count < 0 && errno == EINTR);
         return count == sizeof number ? std::optional(number) : std::nullopt;
     }
 
   private:
-    taviwireless::UniqueFd readEnd_;
-    taviwireless::UniqueFd writeEnd_;
+    taviwireless::UniquePipe pipe_;
 };
 
 }  // namespace tavicore

@@ -1,0 +1,37 @@
+#ifndef TAVIWIRELESS_BASE_MEMORY_FILE_H
+#define TAVIWIRELESS_BASE_MEMORY_FILE_H
+
+#include <sys/mman.h>
+#include <unistd.h>
+
+#include <string>
+
+#include "base/unique_fd.h"
+
+namespace taviwireless {
+
+// A file of no folder, which nobody else can read and which is gone with its last descriptor. It
+// holds this text and is read from its beginning. Without one, errno tells why.
+inline UniqueFd MemoryFile(const std::string& text = "") {
+    UniqueFd file(memfd_create("memory file", MFD_CLOEXEC));
+    const auto size = static_cast<ssize_t>(text.size());
+    if (file && pwrite(file.Get(), text.data(), text.size(), 0) != size) {
+        file.Close();
+    }
+    return file;
+}
+
+// All of the file, wherever it was read up to.
+inline std::string TextOf(const UniqueFd& file) {
+    std::string text;
+    char part[4096];
+    for (ssize_t count;
+         (count = pread(file.Get(), part, sizeof part, static_cast<off_t>(text.size()))) > 0;) {
+        text.append(part, static_cast<size_t>(count));
+    }
+    return text;
+}
+
+}  // namespace taviwireless
+
+#endif
