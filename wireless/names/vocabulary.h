@@ -4,11 +4,18 @@
 #include <strings.h>
 #include <taviwireless/wireless.h>
 
+#include "common/log.h"
+
 namespace taviwireless::wireless {
 
-// The value of a name of the table, whatever its case.
-template <size_t N>
-int ValueOf(const WirelessNameValue (&names)[N], const char* text, int unknown) {
+// The value of a name of the table, whatever its case. file and line are those of the log line.
+template <size_t kSize>
+int ValueOf(const WirelessNameValue (&names)[kSize], const char* text, int unknown,
+            const char* file, int line) {
+    if (text == nullptr) {
+        WriteLog(LOG_ERR, file, line, "Bad parameters");
+        return unknown;
+    }
     for (const WirelessNameValue& entry : names) {
         if (strcasecmp(text, entry.name) == 0) {
             return entry.value;

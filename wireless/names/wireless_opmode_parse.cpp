@@ -1,12 +1,6 @@
-#include <taviwireless/wireless.h>
-
-#include "common/log.h"
 #include "wireless/names/vocabulary.h"
 
 int TAVIWirelessOpmodeParse(const char* text) {
-    if (text == nullptr) {
-        TAVI_LOG_ERROR("Bad parameters");
-        return WIRELESS_OPMODE_UNKNOWN;
-    }
-    return taviwireless::wireless::ValueOf(gWirelessOpmodes, text, WIRELESS_OPMODE_UNKNOWN);
+    return taviwireless::wireless::ValueOf(gWirelessOpmodes, text, WIRELESS_OPMODE_UNKNOWN,
+                                           __FILE_NAME__, __LINE__);
 }

@@ -1,6 +1,22 @@
-// The names that are understood. Where one value has several, they are those of drivers, tools and
+// The vocabularies: the names that are understood, and the one of each value that is printed, which
+// need not be understood. Where a value has several names, they are those of drivers, tools and
 // configuration files.
 #include <taviwireless/wireless.h>
+
+namespace taviwireless::wireless {
+
+namespace {
+
+// The name at the value's place; other values have the name of the unknown one.
+template <size_t kSize>
+const char* NameOf(const char* const (&names)[kSize], int value, int unknown) {
+    const bool isNamed = value >= 0 && static_cast<size_t>(value) < kSize;
+    return names[isNamed ? value : unknown];
+}
+
+}  // namespace
+
+}  // namespace taviwireless::wireless
 
 // The mixed kinds count as WPA2, which access points that offer both prefer.
 const WirelessNameValue gWirelessAuths[WIRELESS_AUTH_NAMES] = {
@@ -16,12 +32,35 @@ const WirelessNameValue gWirelessAuths[WIRELESS_AUTH_NAMES] = {
     {"WPA1WPA2EAP", WIRELESS_AUTH_WPA2_EAP},
 };
 
+const char* TAVIWirelessAuthStringGet(int auth) {
+    constexpr const char* kNames[] = {"unknown", "OPEN",    "SHARED", "WEPAUTO", "WPAPSK",
+                                      "WPA2PSK", "WPANONE", "WPAEAP", "WPA2EAP"};
+    return taviwireless::wireless::NameOf(kNames, auth, WIRELESS_AUTH_UNKNOWN);
+}
+
 const WirelessNameValue gWirelessEncrypts[WIRELESS_ENCRYPT_NAMES] = {
     {"UNKNOW", WIRELESS_ENCRYPT_UNKNOWN},    {"NONE", WIRELESS_ENCRYPT_NONE},
     {"WEP", WIRELESS_ENCRYPT_WEP},           {"TKIP", WIRELESS_ENCRYPT_TKIP},
     {"AES", WIRELESS_ENCRYPT_AES},           {"TKIPAES", WIRELESS_ENCRYPT_TKIP_AES},
     {"TKIP AES", WIRELESS_ENCRYPT_TKIP_AES},
 };
+
+const char* TAVIWirelessEncryptStringGet(int encrypt, int ccmpNames) {
+    switch (encrypt) {
+        case WIRELESS_ENCRYPT_NONE:
+            return "none";
+        case WIRELESS_ENCRYPT_WEP:
+            return "WEP";
+        case WIRELESS_ENCRYPT_TKIP:
+            return "TKIP";
+        case WIRELESS_ENCRYPT_AES:
+            return ccmpNames != 0 ? "CCMP" : "AES";
+        case WIRELESS_ENCRYPT_TKIP_AES:
+            return ccmpNames != 0 ? "TKIP CCMP" : "TKIP AES";
+        default:
+            return "unknown";
+    }
+}
 
 const WirelessNameValue gWirelessOpmodes[WIRELESS_OPMODE_NAMES] = {
     {"Auto", WIRELESS_OPMODE_AUTO},         {"Ad-Hoc", WIRELESS_OPMODE_ADHOC},
@@ -32,6 +71,13 @@ const WirelessNameValue gWirelessOpmodes[WIRELESS_OPMODE_NAMES] = {
     {"Infra", WIRELESS_OPMODE_MANAGED},     {"Adhoc", WIRELESS_OPMODE_ADHOC},
     {"Any", WIRELESS_OPMODE_MANAGED},
 };
+
+const char* TAVIWirelessOpmodeStringGet(int opmode) {
+    // compatible: "Secondeary" is so spelt wherever it was printed; it does not parse back
+    constexpr const char* kNames[] = {"Auto",     "Ad-Hoc",     "Managed", "Master",
+                                      "Repeater", "Secondeary", "Monitor", "Unknown"};
+    return taviwireless::wireless::NameOf(kNames, opmode, WIRELESS_OPMODE_UNKNOWN);
+}
 
 // Sets that only newer adapters report, such as "11g", can be printed and have no entry here.
 const WirelessNameValue gWirelessProtocols[WIRELESS_PROTOCOL_NAMES] = {
@@ -53,3 +99,10 @@ const WirelessNameValue gWirelessProtocols[WIRELESS_PROTOCOL_NAMES] = {
     {"11b/n", WIRELESS_PROTOCOL_BN},
     {"bn", WIRELESS_PROTOCOL_BN},
 };
+
+const char* TAVIWirelessProtocolStringGet(int protocol) {
+    constexpr const char* kNames[] = {"unknown", "11b/g",     "11b",  "11a",   "11a/b/g",
+                                      "11g",     "11a/b/g/n", "11n",  "11g/n", "11a/n",
+                                      "11b/g/n", "11a/g/n",   "11b/n"};
+    return taviwireless::wireless::NameOf(kNames, protocol, WIRELESS_PROTOCOL_UNKNOWN);
+}
