@@ -13,12 +13,12 @@ namespace taviwireless::usbmodem_lib {
 // may come late.
 std::string LoggableCommand(const std::string& text);
 
-// Returns a reply as one line, masked likewise, with its last line feed.
+// Returns a reply as one line, masked as LoggableCommand does it, with its last line feed.
 std::string LoggableReply(const std::string& reply);
 
-// The same of the reply to a command with these codes, in which they are masked wherever they
-// stand. A modem may repeat the command damaged, so that a piece of a code is left; hence of lines
-// that are no diagnostics the digits are masked as well.
+// Returns the reply to a command that held these codes as one line. The codes are masked wherever
+// they stand. A modem may repeat the command damaged, so that a piece of a code is left; hence all
+// digits are masked, except in lines that are diagnostics.
 std::string LoggableReply(const std::string& reply, std::initializer_list<std::string> codes);
 
 }  // namespace taviwireless::usbmodem_lib

@@ -12,7 +12,7 @@ inline constexpr char kStateDirectory[] = "/var/lib/usbmodem";
 inline constexpr char kProfilePrefix[] = "/var/lib/usbmodem/usbmodem.profile.";  // and the IMSI
 inline constexpr char kDialLogPrefix[] = "/var/lib/usbmodem/wvdial.log.";        // and the IMSI
 inline constexpr char kPidFilePrefix[] = "/var/lib/usbmodem/usbmodem.pid.";  // and the interface id
-inline constexpr char kStateFilePrefix[] = "/var/lib/usbmodem/usbmodem.conf.";  // likewise
+inline constexpr char kStateFilePrefix[] = "/var/lib/usbmodem/usbmodem.conf.";  // interface id
 
 // A profile holds a password, a dialler's log whom the user calls.
 inline constexpr mode_t kStateFileMode = 0600;

@@ -70,7 +70,7 @@ std::optional<std::string> ReadReply(WvModem& modem) {
 }
 
 // Returns the lines of data that are neither blank nor the echo of cmd, each ended by a line feed.
-// Two line feeds in a row end the reply.
+// A line may end in a line feed alone. Two line feeds in a row end the reply.
 std::string CleanReply(const std::string& data, const std::string& cmd) {
     std::string reply;
     for (size_t begin = 0; begin < data.size();) {
@@ -96,8 +96,10 @@ std::string CleanReply(const std::string& data, const std::string& cmd) {
     return reply;
 }
 
-// Gives a modem's lock back, on whatever way out. Also after a failed Enter. Kept: other processes
-// count on the same arithmetic, and it frees a lock that nobody would ever give back.
+// Gives a modem's lock back, on whatever way out, and after an Enter that failed as well.
+// Compatible with other processes that use the lock in this way: so a lock that its holder never
+// gives back is free again. If the holder does give it back later, two holders may be in until
+// this process ends.
 class Release {
   public:
     explicit Release(semaphore::Semaphore& semaphore) : semaphore_(semaphore) {}

@@ -117,8 +117,8 @@ bool USBModem::PrepareToDial(DialSettings& settings) {
         TAVI_LOG_ERROR("error on setting connect device node while connection");
         return false;
     }
-    // Only a result above 0 stops, and there is none: a profile that cannot be made shows when it
-    // is read. Kept.
+    // Compatible with earlier releases: only a result above 0 stops, which InitProfile never has. A
+    // profile that cannot be made shows when it is read.
     if (InitProfile() > 0) {
         TAVI_LOG_ERROR("Net connect error: profile init failed");
         return false;

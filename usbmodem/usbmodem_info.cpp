@@ -244,7 +244,8 @@ int USBModem::SetUnsolicitedReports(bool enable) {
         TAVI_LOG_ERROR("skip unsolicited reports setting, not supported");
         return 0;
     }
-    // The whole reply is searched, not the value alone: a digit anywhere in it counts. Kept.
+    // Compatible with earlier releases: the whole reply is searched, not the value alone, so a
+    // digit anywhere in it counts.
     if (reply.find(enable ? '1' : '0') != std::string::npos) {
         return 0;
     }
@@ -260,6 +261,7 @@ int USBModem::SetUnsolicitedReports(bool enable) {
     return 0;
 }
 
+// The database is read anew for every lookup: it is small, and a changed file is seen at once.
 bool USBModem::ReadAPNData(Json::Value& out) {
     std::ifstream file(kAPNDatabase);
     Json::Value root;

@@ -21,8 +21,8 @@ constexpr char kInfoDirectory[] = "/tmp/";
 constexpr char kInfoName[] = "usbmodem.info";
 
 // Returns the interface id in the name of an info file; nothing for the names of other files, such
-// as backup copies and numbers with leading zeros. -1 is not taken: it has always meant "no
-// number".
+// as backup copies and numbers with leading zeros. -1 is no interface id: compatible with earlier
+// releases, in which it means that a name has no number.
 std::optional<int> ParseInterfaceId(const std::string& name) {
     if (name.rfind(kInfoName, 0) != 0) {
         return std::nullopt;
@@ -77,8 +77,8 @@ int USBModemList::SearchInfoPath() {
 }
 
 void USBModemList::DropUnplugged() {
-    // The record that moves into a freed place is not looked at until the next call. Kept: clients
-    // may count on seeing modems go one by one.
+    // The record that moves into a freed place is not looked at until the next call. Compatible
+    // with clients that see modems go one by one.
     for (size_t i = 0; i < records_.size(); ++i) {
         if (!IsPluggedIn(records_.at(i))) {
             records_.erase(records_.begin() + static_cast<std::ptrdiff_t>(i));

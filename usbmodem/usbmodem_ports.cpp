@@ -34,8 +34,10 @@ void Retry(Assign assign, LogFailure logFailure) {
 }
 
 // Where the dialler's log names the interface; npos when it does not. The dialler marks its lines,
-// and what stands between them is what the modem answered. That may look like them, but is over
-// with the last command that the modem was sent.
+// and what stands between them is what the modem answered. An answer may look like a line of the
+// dialler, so only what follows the last command that the modem was sent counts. A modem that
+// imitates the dialler in its last answer is believed: it could as well make a connection that
+// leads nowhere.
 size_t FindInterface(const std::string& log) {
     const std::string lines = '\n' + log;
     const size_t lastCommand = lines.rfind("\n--> Sending: ");
@@ -115,8 +117,9 @@ int USBModem::AssignConnectInfo() {
     if (named == std::string::npos && Contains(log, kUsingInterface)) {
         return 2;  // only the modem spoke of one
     }
-    // Without "Using interface" this wraps to index 14 and reads a word of some other line. Kept:
-    // the dialler names the interface before the addresses, so such a log is none of its own.
+    // Without "Using interface" this wraps to index 14 and reads a word of some other line.
+    // Compatible with earlier releases, and harmless: the dialler names the interface before the
+    // addresses, so it writes no such log.
     std::istringstream rest(log.substr(named + sizeof kUsingInterface - 1));
     netIFName_.clear();
     rest >> netIFName_;

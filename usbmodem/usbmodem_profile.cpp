@@ -22,7 +22,7 @@ constexpr mode_t kDirectoryMode = 0775;
 constexpr char kDefaultNumber[] = "*99#";
 constexpr char kDefaultUser[] = "Unknown";
 
-// An empty file counts as none: a full disk left such.
+// An empty file counts as missing: a full disk leaves one.
 bool IsMissing(const std::string& path) {
     struct stat status {};
     return stat(path.c_str(), &status) == 0 ? status.st_size == 0 : errno == ENOENT;
@@ -114,7 +114,7 @@ int USBModem::SetProfileWithKey(const std::string& key, const std::string& value
     if (!IsProfileValue(key, value) ||
         VEXACFileSetSectionValue(profilePath_.c_str(), kSection, key.c_str(), value.c_str(),
                                  kLineFormat) != 0) {
-        TAVI_LOG_ERROR("failed on get key value %s", key.c_str());  // the getter's message. Kept.
+        TAVI_LOG_ERROR("failed on get key value %s", key.c_str());  // compatible: "get"
         return -1;
     }
     return 0;

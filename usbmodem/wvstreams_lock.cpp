@@ -23,13 +23,13 @@ using taviwireless::UniqueFd;
 
 constexpr char kLockPrefix[] = "/var/lock/LCK..";
 constexpr mode_t kLockMode = 0644;  // for other programs that use ports
-// Of a file that somebody makes anew as often as it is removed.
+// How often to try where somebody makes the file anew as often as it is removed.
 constexpr int kAttempts = 3;
 
 bool MakeLockFile(const char* path) {
     const UniqueFd file(open(path, O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, kLockMode));
     if (file && dprintf(file.Get(), "%10d\n", static_cast<int>(getpid())) < 0) {
-        unlink(path);  // the disk is full; an empty one would count for ever
+        unlink(path);  // the disk is full; an empty lock file would count for ever
         return false;
     }
     return static_cast<bool>(file);
