@@ -25,7 +25,8 @@ class Error {
     DBusError* Address() { return &error_; }
     const char* Message() const { return error_.message != nullptr ? error_.message : ""; }
 
-    // The service's code; 1 for every other error.
+    // The service's code; 1 for every other error. Read as a 64-bit number, since sscanf would make
+    // something else of 4294967295 where long has 32 bits.
     int Code() const {
         const size_t length = sizeof kErrorPrefix - 1;
         if (error_.name == nullptr || strncmp(error_.name, kErrorPrefix, length) != 0) {
@@ -95,7 +96,7 @@ int DBusClient::NewMessage(const char* method) {
         return -1;
     }
     Drop(message_);
-    // libdbus aborts the process when a name is none, so names are checked here.
+    // libdbus aborts the process for a name that D-Bus does not allow, so names are checked here.
     if (dbus_validate_bus_name(service_.c_str(), nullptr) &&
         dbus_validate_path(path_.c_str(), nullptr) &&
         dbus_validate_interface(interface_.c_str(), nullptr) &&
@@ -208,7 +209,7 @@ int DBusClient::GetReply(std::vector<std::string>& out) {
         out.clear();
         DBusMessageIter element;
         dbus_message_iter_recurse(&argument, &element);
-        // Elements that are no text have no characters to read and are left out.
+        // Reading ends at the first element that is no text: it has no characters to read.
         while (IsText(dbus_message_iter_get_arg_type(&element))) {
             const char* text = nullptr;
             dbus_message_iter_get_basic(&element, &text);

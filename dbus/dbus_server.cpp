@@ -69,7 +69,8 @@ void DBusServer::StartLoop() {
 }
 
 void DBusServer::QuitLoop() {
-    // Stays, as whoever quits may still hold it; referenced so that leak checkers know.
+    // The loop object is not released, since StartLoop is still running it; it is small, and one
+    // per process. This reference tells leak checkers so.
     [[gnu::used]] static GMainLoop* ended = nullptr;
     if (loop_ != nullptr) {
         ended = loop_;

@@ -10,11 +10,12 @@ namespace {
 
 using usbmodem_lib::USBModem;
 
-// A modem that answers has begun to do so long before; one that does not takes longer than this.
+// A modem that answers begins to do so long before this time is over; one that does not answer
+// costs more.
 constexpr std::chrono::milliseconds kPatience{1000};
 
-// Values stand in a document as they come, without escapes, and what could not be read is empty:
-// front ends read these layouts line by line and know no others.
+// Compatible with front ends, which read these layouts line by line and know no others: values
+// stand in a document as they come, without escapes, and what could not be read is empty.
 //
 // Once a modem does not answer any more, the rest of the document is what is known of it: others
 // are waiting, and every question to it costs a second or more.
@@ -45,7 +46,7 @@ class Document {
         }
         return answer;
     }
-    // The same for a number that is negative when it could not be read.
+    // Asks for a number that is negative when it could not be read.
     int AskNumber(int (USBModem::*query)()) {
         return Ask([query](USBModem& modem, bool& err) {
             const int number = (modem.*query)();

@@ -104,8 +104,8 @@ constexpr const char* kProfileKeys[] = {"apn",  "number",   "user", "pass",
 
 using Setting = std::pair<std::string, std::string>;  // key and value
 
-// What a line "KEY=VALUE" sets. The key counts wherever it stands in the line: kept, clients write
-// lines such as "usbmodem_apn=x". A line without a key sets nothing.
+// What a line "KEY=VALUE" sets. Compatible with clients that write lines such as "usbmodem_apn=x":
+// the key counts wherever it stands in the line. A line without a key sets nothing.
 std::optional<Setting> ParseSetting(const std::string& line) {
     for (const char* key : kProfileKeys) {
         const std::string begin = std::string(key) + '=';
@@ -223,7 +223,7 @@ gboolean usbmodem_set_profile(USBModemObject* object, char* devid, char* profile
     if (isUnknown) {
         return Fail(error, kModemFailed, "Error on checking net status " + id);
     }
-    // All of it before the connection is ended for it.
+    // Everything is checked before the connection is ended for it.
     std::vector<Setting> settings;
     if (!ParseProfile(*modem, profile, settings, error)) {
         return FALSE;
