@@ -55,7 +55,8 @@ int Read(const char* section, WirelessAPSettings* settings) {
     if (!values) {
         return -1;
     }
-    // No key is there yet. What concerns guests stays empty until there is a section.
+    // There are no keys yet, so the main network gets its defaults. What concerns guests stays
+    // empty until there is a section.
     Reader reader(values);
     VisitMainNetwork(reader, *settings);
     if (IsMissing(kAPSettings)) {

@@ -45,7 +45,7 @@ class Writer {
     bool isComplete_ = true;
 };
 
-// For use between double quotes.
+// The text for use between double quotes of the shell.
 std::string ForShell(const std::string& text) {
     std::string quoted;
     for (const char c : text) {
@@ -57,8 +57,8 @@ std::string ForShell(const std::string& text) {
     return quoted;
 }
 
-// grep keeps back a line that is no text to it: a product's name that is cut off within a
-// character.
+// Whether the SDK can read the section. grep does not print a line that is no valid text, such as a
+// product's name that was cut off within a character.
 bool IsReadable(const char* section) {
     SzHash values(1024);
     return values && VEXACFileGetSection(kAPSettings, section, values.Address()) > 0;

@@ -19,7 +19,7 @@ namespace taviwireless::wireless {
 
 namespace {
 
-// The SDK removes lines that are known to the letter, so the key gets one first.
+// The SDK removes lines whose whole text is known, so the key first gets a line without value.
 bool RemoveKey(const std::string& file, const char* key) {
     return VEXACFileSetKeyValue(file.c_str(), key, "", kPlainLine) > 0 &&
            VEXACFileRemoveLine(file.c_str(), (std::string(key) + '=').c_str()) > 0;

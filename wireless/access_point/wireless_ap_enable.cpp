@@ -45,7 +45,8 @@ bool SetQuoted(const std::string& file, const char* key, const char* value) {
     return true;
 }
 
-// Nothing when they cannot be read, or say that the access point is off.
+// Returns the stored settings; nothing when they cannot be read, or say that the access point is
+// off.
 std::optional<WirelessAPConf> ReadSettings(const char* interface) {
     char section[1024];
     if (TAVIWirelessApConfigSecNameGet(section, sizeof section) == 0) {
@@ -160,7 +161,8 @@ bool SetUpNetwork(const char* interface, const char* name) {
     return true;
 }
 
-// A bridge of the wired network makes the address meaningless, but it is written all the same.
+// Compatible with the appliance's network script: the address is written for a bridge of the wired
+// network as well, where it means nothing.
 bool WriteInterfaceFile(const char* interface, const char* bridge) {
     const std::string file = InterfaceFile(interface);
     const std::pair<const char*, const char*> kLines[] = {
@@ -175,7 +177,7 @@ bool WriteInterfaceFile(const char* interface, const char* bridge) {
     return true;
 }
 
-// An empty name is found out later, as it always was.
+// Compatible with log readers: an empty name is reported later, with a message of its own.
 bool CanJoin(const std::string& bridge) {
     const std::string reason = bridge.empty() ? "" : WhyNoBridge(bridge);
     if (!reason.empty()) {

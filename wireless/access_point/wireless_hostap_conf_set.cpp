@@ -21,8 +21,8 @@ namespace {
 constexpr mode_t kMode = 0600;  // they hold keys
 constexpr size_t kCommandSize = 1024;
 
-// The first process that has both names in its arguments. Where ps lists arguments that is the
-// shell of this very command when no hostapd runs; its end is of no interest then.
+// Ends the first process that has both names in its arguments. Where ps lists arguments and no
+// hostapd runs, that is the shell of this very command, to which the signal does no harm.
 void StopHostapd(const std::string& interface) {
     const Pipe pids(Command(
         kCommandSize,

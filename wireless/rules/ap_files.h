@@ -17,19 +17,20 @@ constexpr char kNetworkScript[] = "/etc/rc.network";  // restart INTERFACE BRIDG
 constexpr char kPlainLine[] = "%s=%s\n";
 constexpr char kQuotedLine[] = "%s=\"%s\"\n";
 
-// Of an interface or a bridge.
+// The settings of an interface or a bridge.
 inline std::string InterfaceFile(const std::string& name) {
     return "/etc/sysconfig/network-scripts/ifcfg-" + name;
 }
 
 constexpr char kHostapdFolder[] = "/etc/hostapd";
 
-// Whether hostapd is to run.
+// Says whether hostapd is to run.
 inline std::string HostapdInfo(const std::string& interface) {
     return "/etc/hostapd/hostapd-" + interface + ".info";
 }
 
-// What it is started with: the main network and, joined by the network script, the guests' block.
+// What hostapd is started with: the main network and, joined by the network script, the guests'
+// block.
 inline std::string HostapdHostConf(const std::string& interface) {
     return "/etc/hostapd/hostapd-" + interface + "-host.conf";
 }
@@ -38,7 +39,7 @@ inline std::string HostapdGuestConf(const std::string& interface) {
     return "/etc/hostapd/hostapd-" + interface + "-guest.conf";
 }
 
-// Whether the guests' block is to be joined.
+// Says whether the guests' block is to be joined.
 inline std::string HostapdGuestInfo(const std::string& interface) {
     return "/etc/hostapd/hostapd-" + interface + "-guest.info";
 }
@@ -53,7 +54,7 @@ inline std::string DhcpServerInfo(const std::string& bridge) {
     return "/etc/dhcpd/dhcpd-" + bridge + "-" + bridge + ".info";
 }
 
-// The same while the access point is off.
+// Where the bridge's DHCP service is kept while the access point is off.
 inline std::string DhcpServerPutAside(const std::string& bridge) {
     return DhcpServerInfo(bridge) + ".manual";
 }

@@ -64,7 +64,7 @@ void VisitMainNetwork(Visitor& visit, Settings& settings) {
     VisitSecret(visit, "", ap.security, ap.secret);
 }
 
-// With enterprise security, which guests do not have, the caller has something to say.
+// Guests have no enterprise security: it has no keys here, and the caller logs it.
 template <typename Visitor, typename Settings>
 void VisitGuestNetwork(Visitor& visit, Settings& settings) {
     auto& ap = settings.ap;

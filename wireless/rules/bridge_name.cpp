@@ -9,8 +9,8 @@ namespace taviwireless::wireless {
 
 namespace {
 
-// What is an interface of another kind whether it is there now or not: the wired one, which is a
-// member of bridges, and those of guests.
+// Names of interfaces of another kind, taken whether these are there now or not: the wired one,
+// which is a member of bridges, and the two of guests.
 constexpr const char* kTaken[] = {"eth0", "gbr", "gwlan"};
 
 bool IsThere(const std::string& path) {

@@ -8,7 +8,7 @@ namespace taviwireless::wireless {
 
 namespace {
 
-// Of hostapd's key "auth_algs".
+// Values of hostapd's key "auth_algs".
 constexpr int kOpenSystem = 1;
 constexpr int kOpenSystemOrSharedKey = 3;
 
@@ -187,6 +187,8 @@ HostapdConf RenderHostConf(const std::string& interface, const WirelessAPConf& c
 HostapdConf RenderGuestConf(const WirelessAPConf& conf) {
     HostapdConf lines;
     lines.Add("bss", "gwlan");
+    // Compatible with the store, which is written with a BSSID of guests that is never read back:
+    // so this line mostly has no value, and whoever starts hostapd leaves it out then.
     lines.Add("bssid", conf.guestBssid);
     lines.Add("ssid", conf.guestSsid);
     lines.Add("bridge", "gbr");

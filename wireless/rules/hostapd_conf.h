@@ -7,14 +7,14 @@
 
 namespace taviwireless::wireless {
 
-// Lines "key=value" as hostapd reads them, which knows no way to write a line break.
+// Lines "key=value" as hostapd reads them. A value cannot hold a line break.
 class HostapdConf {
   public:
     void Add(const char* key, const std::string& value);
     void Add(const char* key, int32_t value);
 
     const std::string& Text() const { return text_; }
-    // Whether a value holds one, and what stands behind it would be a setting of its own.
+    // Whether a value holds a line break; what follows it would be a setting of its own.
     bool HoldsLineBreak() const { return holdsLineBreak_; }
 
   private:

@@ -11,9 +11,9 @@ constexpr char kTerminateSupplicant[] = "/usr/sbin/wpa_cli terminate > /dev/null
 
 struct SupplicantConf {
     std::string text;
-    bool isWepKeyLeftOut = false;  // its length is none that a WEP key has
+    bool isWepKeyLeftOut = false;  // because no WEP key has its length
     bool isAuthUnknown = false;    // the text ends before what would depend on it
-    // A value in the text holds one; what stands behind it would be a setting of its own.
+    // A value in the text holds a line break; what follows it would be a setting of its own.
     bool holdsLineBreak = false;
 };
 

@@ -10,8 +10,8 @@ namespace taviwireless::wireless {
 
 namespace {
 
-// The last used first; those of the same time stay in the order of the file. False, with the list
-// as it was, when there is no memory for that.
+// Puts the last used first; networks of one time stay in the order of the file. False, with the
+// list as it was, when there is no memory for that.
 bool SortByTime(WirelessLink& head) {
     std::vector<WirelessConf*> confs;
     for (WirelessLink* member = head.next; member != &head; member = member->next) {

@@ -62,7 +62,7 @@ int TAVIWirelessConfGet(const char* section, WirelessConf* conf) {
         return -1;
     }
     if (VEXACFileGetSection(kSavedNetworks, section, values.Address()) < 1) {
-        // File and section stand the other way round here. Kept.
+        // Compatible with log readers: file and section stand in the wrong order.
         TAVI_LOG_ERROR("Not found or failed to get section: %s from %s, errno=0x%X", kSavedNetworks,
                        section, VEXACErrGet());
         return -1;

@@ -22,7 +22,8 @@ constexpr mode_t kMode = 0600;  // the file holds keys
 
 enum class Found { kFailed, kNew, kExisting };
 
-// Not readable for others before the first key is in it; later writing keeps the mode.
+// Creates the file with its mode, so that others cannot read it before the first key is in it;
+// later writing keeps the mode.
 bool CreateFile() {
     if (!MakeSureOf(kSavedNetworks, kMode)) {
         TAVI_LOG_ERROR("Failed to touch %s", kSavedNetworks);
@@ -38,7 +39,7 @@ Found LoadSection(const char* section, SzHash& values) {
     }
     const int result = VEXACFileGetSection(kSavedNetworks, section, values.Address());
     if (result < 0) {
-        // File and section stand the other way round here. Kept.
+        // Compatible with log readers: file and section stand in the wrong order.
         TAVI_LOG_ERROR("Failed to get section: %s from %s, errno=0x%X", kSavedNetworks, section,
                        VEXACErrGet());
         return Found::kFailed;
@@ -46,7 +47,7 @@ Found LoadSection(const char* section, SzHash& values) {
     return result == 0 ? Found::kNew : Found::kExisting;
 }
 
-// All of them, or false.
+// Sets all values, or returns false.
 bool SetValues(const WirelessConf& conf, const char* bssid, SzHash& values) {
     const WirelessNetwork& network = conf.network;
     const bool isEnterprise =

@@ -27,7 +27,7 @@ constexpr mode_t kSupplicantMode = 0600;  // it holds the key
 constexpr mode_t kRecordMode = 0644;
 constexpr int kPolls = 15;  // a second each
 
-// Logs why not.
+// Writes what the supplicant is started with. False, with the reason in the log, when it cannot.
 bool WriteSupplicantConf(const WirelessConf& conf) {
     const SupplicantConf rendered = RenderSupplicantConf(conf);
     if (rendered.holdsLineBreak) {
@@ -53,7 +53,8 @@ bool StopSupplicant() {
     return TAVI_RUN(Command(128, {kTerminateSupplicant}));
 }
 
-// The supplicant quotes a pass phrase that it rejects, and not every shell knows "&>".
+// The output is dropped here as well, because the supplicant quotes a pass phrase that it rejects
+// and not every shell knows "&>".
 bool StartSupplicant(const std::string& interface) {
     const Command start(1024, {"/usr/sbin/wpa_supplicant -Dwext -i", Argument{interface}, " -c",
                                kSupplicantConf, " -B -P", kSupplicantPidFile, " &> /dev/null"});
@@ -79,7 +80,8 @@ bool WaitForAssociation() {
     return false;
 }
 
-// For TAVIWirelessStatusGet. What strangers put in its place, a folder for example, is removed.
+// Notes the network for TAVIWirelessStatusGet. What strangers put in the place of the file, a
+// folder for example, is removed.
 bool RecordConnection(const WirelessNetwork& network) {
     struct stat status {};
     if (lstat(kCurrentConnection, &status) == 0 && !IsTrustedOwner(status.st_uid)) {
@@ -126,8 +128,8 @@ void RestartMediaService(const std::string& interface) {
     }
 }
 
-// A copy, also where the resolver's file is a link to one that another program keeps; disconnecting
-// then puts the copy in the place of the link. Kept.
+// Keeps a copy, also where the resolver's file is a link to one that another program writes.
+// Compatible with earlier releases: disconnecting puts the copy in the place of the link.
 void KeepResolver() {
     if (VEXACFileExist(kResolver)) {
         TAVI_RUN(Command(128, {"/bin/cp ", kResolver, " ", kResolverBackup}));

@@ -46,8 +46,9 @@ bool StopSupplicant() {
     return true;
 }
 
-// Whoever has the recorded number is killed; that it is still the client is for the SDK to see. And
-// one that can never be killed is waited for without end. Kept.
+// Compatible with earlier releases: the process of the number in the file is killed without a look
+// at what it is, since VEXACReadPidFile gives no number that is another process's by now; and one
+// that may not be killed is waited for without end.
 void StopDhcpClient(const std::string& interface) {
     const std::string pidFile = kDhcpClientPrefix + interface + ".pid";
     pid_t pid;
@@ -63,7 +64,8 @@ void StopDhcpClient(const std::string& interface) {
     }
 }
 
-// Where the resolver's file was a link, the copy takes the place of the link. Kept.
+// Compatible with earlier releases: where the resolver's file was a link, the copy takes the place
+// of the link.
 bool RestoreResolver() {
     if (VEXACFileExist(kResolverBackup) && VEXACSysRename(kResolverBackup, kResolver) < 0) {
         TAVI_LOG_ERROR("Failed to rename '%s'", kResolverBackup);

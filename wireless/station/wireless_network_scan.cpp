@@ -26,7 +26,7 @@ constexpr int kAdapterTries = 6;  // one second apart
 constexpr int kMaxScans = 5;
 constexpr size_t kCommandSize = 128;
 
-// The table. Columns count from 0.
+// The table that the tool prints. Columns count from 0.
 constexpr int kHeadings = 2;        // lines
 constexpr size_t kLineSize = 512;   // what is longer is read as further lines
 constexpr size_t kMinLine = 32;     // its end counted
@@ -59,7 +59,7 @@ std::string ChannelColumns(std::string_view line) {
     return std::string(isFull ? line.substr(0, kEssidColumn) : line);
 }
 
-// False when nothing is left: a network that hides its name.
+// Reads the ESSID. False when it is blank: the network hides its name.
 bool ParseEssid(std::string_view line, WirelessNetwork& network) {
     std::string_view essid = ColumnsFrom(line, kEssidColumn).substr(0, kEssidLength);
     while (!essid.empty() && isspace(static_cast<unsigned char>(essid.back())) != 0) {
@@ -107,7 +107,7 @@ bool ParseAddressAndMore(const char* columns, WirelessNetwork& network) {
     return true;
 }
 
-// Nothing when the line tells of no network.
+// Returns the network of a line; nothing when the line describes none.
 std::optional<WirelessNetwork> ParseLine(const char* text) {
     const std::string_view line(text);
     if (line.size() < kMinLine) {

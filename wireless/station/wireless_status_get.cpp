@@ -37,7 +37,8 @@ std::optional<ConnectionRecord> ReadConnectionRecord() {
     return record;
 }
 
-// Percent; negative, and no percentage, when the driver does not know what the most is.
+// The signal in percent; a negative number that is no percentage when the driver does not know its
+// maximum.
 int SignalOfConnection() {
     constexpr int kUnknownMaximum = -1;
     const std::optional<LinkQuality> quality = ReadLinkQuality();

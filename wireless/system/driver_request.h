@@ -5,7 +5,7 @@
 
 namespace taviwireless::wireless {
 
-// Refused: also when there is no wireless interface to ask about.
+// kRefused also when there is no wireless interface to ask about.
 enum class DriverResult { kDone, kNoSocket, kRefused };
 
 // Sends a request of the wireless extensions (SIOCGIW..., SIOCSIW...) about the wireless interface.

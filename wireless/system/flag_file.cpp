@@ -15,7 +15,7 @@ namespace {
 
 constexpr mode_t kMode = 0644;
 
-// Never through a link. False when something is there already.
+// Creates the file, never through a link. False when something is there already.
 bool Create(const char* path) {
     const UniqueFd file(open(path, O_WRONLY | O_CREAT | O_EXCL | O_NOFOLLOW | O_CLOEXEC, kMode));
     return file || errno != EEXIST;

@@ -3,9 +3,9 @@
 
 namespace taviwireless::wireless {
 
-// A file that exists while a caller in some process does what only one should do. A second caller
-// that is refused takes the flag away as well, so this is no lock: whoever hangs or is killed
-// leaves nothing behind that keeps the next but one from its work.
+// A file that exists while a caller in some process does what only one should do. Compatible with
+// earlier releases: a second caller, who is refused, removes the flag as well. So this is no lock,
+// and a caller that hangs or was killed keeps one other caller from its work at most.
 //
 // It lies in a folder in which others can write. Only a regular file of root or of the own user is
 // a flag; whatever else stands there is removed.
@@ -18,7 +18,8 @@ class FlagFile {
 
     static bool IsRaised(const char* path);
 
-    // False when it is raised already. One that cannot be created keeps nobody from the work.
+    // False when it is raised already. True when the file cannot be created: that is no reason not
+    // to work.
     bool Raise() const;
 
   private:

@@ -11,7 +11,7 @@ struct LinkQuality {
     std::optional<int> maximum;
 };
 
-// Nothing when it cannot be read.
+// Runs iwconfig. Nothing when it prints no quality.
 std::optional<LinkQuality> ReadLinkQuality();
 
 }  // namespace taviwireless::wireless

@@ -15,7 +15,7 @@ namespace taviwireless::wireless {
 
 namespace {
 
-// A quote for every character that a shell could act on; blanks still split.
+// Returns the character, quoted if a shell could act on it. Blanks are not: they still split.
 std::string Quoted(char c) {
     constexpr char kActive[] = "|&;<>()$`\\\"'*?[]#~=%!{}^";
     if (c == '\n') {
@@ -25,7 +25,8 @@ std::string Quoted(char c) {
     return isActive ? std::string("\\") + c : std::string(1, c);
 }
 
-// A caller that ignores SIGCHLD has no child to wait for when this returns, but it did wait.
+// Waits for the process's end and returns its status. Where the caller ignores SIGCHLD, waitpid
+// waits as well, but has no status to give.
 int Wait(pid_t process) {
     int status = -1;
     while (waitpid(process, &status, 0) < 0 && errno == EINTR) {

@@ -11,14 +11,14 @@
 
 namespace taviwireless::wireless {
 
-// A text of others in a command: an ESSID, a key, an address. The shell splits it at blanks and
-// does nothing else with it, whatever it holds.
+// Foreign text in a command: an ESSID, a key, an address. The shell splits it at blanks and does
+// nothing else with it, whatever it holds.
 struct Argument {
     std::string text;
     bool isSecret = false;  // stars stand for it in log lines
 };
 
-// What becomes of what a command prints.
+// Where the output of a command goes: to the caller's, or nowhere.
 enum class Output { kShown, kDropped };
 
 // A shell command, made of parts that stand as they are and arguments. It runs with no input, no
@@ -65,11 +65,12 @@ class Pipe {
     Pipe(const Pipe&) = delete;
     Pipe& operator=(const Pipe&) = delete;
 
-    // Without one, errno tells why.
+    // Whether the command runs; if not, errno tells why.
     explicit operator bool() const { return file_ != nullptr; }
     FILE* get() const { return file_.get(); }
 
-    // Waits for the command's end. Its exit status; -1 when it has none or that cannot be told.
+    // Waits for the command's end and returns its exit status; -1 when it has none or that cannot
+    // be told.
     int Close();
 
   private:
