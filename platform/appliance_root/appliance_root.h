@@ -29,8 +29,7 @@ constexpr int kApplianceRootFailed = 70;
 // /dev: null, zero, full, random, urandom, tty, a pts of its own with ptmx, shm, fd, stdin, stdout,
 //     stderr. None of the machine's devices; links such as /dev/ttyUSB0 can be made.
 // Fresh: /proc, and /sys, which cannot be written. /sys/class/net shows the network inside: lo,
-// which
-//     is up. In /proc what would change the whole machine cannot be written, such as most of
+//     which is up. In /proc what would change the whole machine cannot be written, such as most of
 //     /proc/sys.
 // Private: System V and POSIX IPC, process numbers, host name, network devices, addresses, abstract
 //     sockets.

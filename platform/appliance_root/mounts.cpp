@@ -20,7 +20,8 @@ void SetAttributes(const fs::path& path, unsigned int flags, const mount_attr& a
     }
 }
 
-// Whatever the caller's umask: a service within may run as somebody else.
+// Makes the directory with the permissions of the model, whatever the caller's umask: a service
+// inside may run as somebody else.
 void CreateLike(const fs::path& model, const fs::path& directory) {
     fs::create_directories(directory);
     fs::permissions(directory, fs::status(model).permissions());
@@ -28,8 +29,8 @@ void CreateLike(const fs::path& model, const fs::path& directory) {
 
 // A user namespace does not give power over files of the machine's root, and what a copy of a
 // folder lets one do is decided by the owner of its changed half: so that half gets the folders of
-// the first two levels beforehand, owned by the caller. Those that the caller cannot look into are
-// added to `closed`.
+// the first two levels beforehand, owned by the caller. Folders that the caller cannot look into
+// are added to `closed`.
 void OwnFolders(const fs::path& machine, const fs::path& changed, int levels,
                 std::vector<fs::path>& closed) {
     for (const auto& entry : fs::directory_iterator(machine)) {

@@ -57,9 +57,9 @@ class Planner {
         }
     }
 
-    // A bridge around an interface that another tool configures was made for the access point
-    // alone. Switched off, that leaves the settings as they are, but the tool is to find its
-    // interface as it knows it.
+    // Whether the bridge was made for the access point alone, around an interface that another tool
+    // configures, and the access point is off now. Its settings stay as they are, but it is taken
+    // down, so that the tool finds its interface as it knows it.
     bool HasServedItsTurn(const BridgeSettings& bridge) {
         const Origins& origins = plan_.origins[bridge.name];
         const Names ports = plan_.now.PortsOf(bridge.name);
@@ -100,7 +100,8 @@ class Planner {
         GiveCard(bridge.name, bridge.card, plan_.origins[bridge.name]);
     }
 
-    // What was somebody else's goes to a wired interface, which the network came by.
+    // Addresses and routes that somebody else gave the bridge go to its first wired port, by which
+    // the network came.
     void TakeDown(const BridgeSettings& bridge) {
         const Interface* existing = plan_.now.Find(bridge.name);
         if (existing == nullptr) {
@@ -131,7 +132,7 @@ class Planner {
         plan_.origins[bridge.name].clear();
     }
 
-    // Without an access point it is in none but those that the settings name.
+    // While the access point is off, the radio is in no bridge but those that the settings name.
     void ReleaseRadio() {
         const Interface* radio = Wanted().Find(Radio());
         if (radio == nullptr || radio->master.empty() || plan_.settings.accessPoint) {
@@ -146,8 +147,8 @@ class Planner {
         WantedOf(Radio()).master.clear();
     }
 
-    // A port that this program put there, or whose file says where it belongs. Others are somebody
-    // else's.
+    // Whether this program put the port into the bridge, or the port's file says that it belongs
+    // there. Other ports are somebody else's and stay.
     bool IsOurs(const BridgeSettings& bridge, const std::string& port) {
         return port == Radio() || plan_.origins[bridge.name].count({port, ""}) != 0 ||
                HasFile(port);
@@ -163,7 +164,7 @@ class Planner {
         return "";
     }
 
-    // Addresses that the settings gave the bridge when they were others.
+    // Removes addresses that earlier settings gave the bridge.
     void ForgetOldSettings(const BridgeSettings& bridge) {
         Origins& origins = plan_.origins[bridge.name];
         for (const auto& origin : Origins(origins)) {
@@ -175,7 +176,8 @@ class Planner {
         }
     }
 
-    // What is plugged in joins; the others do when they are and the program is called again.
+    // An interface that is not plugged in is passed over: it joins when it is there and the program
+    // is called again.
     void Join(const BridgeSettings& bridge, const std::string& member) {
         if (plan_.now.Find(member) == nullptr) {
             return;
@@ -205,7 +207,7 @@ class Planner {
         }
     }
 
-    // The bridge that was asked for before, with another name.
+    // Takes the interface out of another bridge, into which an earlier run of this program put it.
     void LeaveOther(const std::string& other, const std::string& member) {
         plan_.origins[other] = ReadOrigins(other);
         if (plan_.origins[other].count({member, ""}) == 0) {
@@ -217,7 +219,7 @@ class Planner {
         Leave(left, member);
     }
 
-    // It gets back what it brought, and what its file gives it.
+    // The port gets back what it brought into the bridge, and what its file gives it.
     void Leave(const BridgeSettings& bridge, const std::string& port) {
         plan_.names.insert(port);
         WantedOf(port).master.clear();
@@ -247,7 +249,7 @@ class Planner {
         GiveCard(port, OwnCard(port), none);
     }
 
-    // origins takes down what the interface did not have before.
+    // Gives the interface its card. What it did not have before is noted in origins.
     void GiveCard(const std::string& name, const Card& card, Origins& origins) {
         if (card.byDhcp) {
             plan_.wantedClients.insert(name);
@@ -314,7 +316,7 @@ class Planner {
                   all.end());
     }
 
-    // All addresses and routes.
+    // Takes all addresses and routes from the interface.
     void Drop(const std::string& name) {
         WantedOf(name).addresses.clear();
         std::vector<Route>& routes = Wanted().routes;
@@ -325,7 +327,7 @@ class Planner {
 
     static bool HasClient(const std::string& name) { return BlTAVILnxIsDHCP(name.c_str()) == 1; }
 
-    // One that runs on a bridge already keeps its lease.
+    // Finds the DHCP clients that run. One that runs on a bridge already keeps its lease.
     void LookAtClients() {
         for (const std::string& name : plan_.names) {
             if (HasClient(name)) {
@@ -339,7 +341,8 @@ class Planner {
         }
     }
 
-    // The way by Wi-Fi does not count: who makes the adapter an access point gives it up.
+    // Refuses to take the last default route away. One through the radio does not count: whoever
+    // makes the adapter an access point gives it up.
     void CheckRoute() const {
         const auto counts = [this](const Route& route) {
             return route.isDefault && route.device != Radio();

@@ -109,7 +109,7 @@ void StartHostapd(const Settings& settings) {
     }
 }
 
-// From its settings as they are now, whoever changed them.
+// Starts the server with the settings as they are now, whoever changed them.
 void StartDhcpServer(const std::string& bridge) {
     const Program server = DhcpServer(bridge);
     unlink(server.conf.c_str());
@@ -125,8 +125,9 @@ void StartDhcpServer(const std::string& bridge) {
     }
 }
 
-// hostapd goes into the background before it has made the guests' interface and joined the bridges:
-// it may look first which of its neighbours need 20 MHz.
+// Waits until the radio is in its bridges. hostapd goes into the background before it has made the
+// guests' interface and joined the bridges, since it may first listen for neighbours that need
+// channels of 20 MHz.
 void AwaitRadios(const Plan& plan, const State& wanted) {
     Names radios;
     for (const std::string& name : plan.names) {
@@ -182,7 +183,8 @@ void Apply(const Plan& plan) {
     }
 }
 
-// As much as can be: what fails is told, and the rest is done all the same.
+// Does one step of putting back what was: a failure is told, and the other steps are done all the
+// same.
 template <typename Step>
 void Try(Step step) {
     try {

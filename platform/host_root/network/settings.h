@@ -39,7 +39,7 @@ struct Settings {
 struct Enabled {
     bool guests = false;
     std::string member;   // of a bridge without settings
-    std::string address;  // "10.1.14.1/24", likewise
+    std::string address;  // "10.1.14.1/24", of a bridge without settings
     bool leases = false;  // the bridge has a DHCP server
 };
 

@@ -98,7 +98,7 @@ void RemoveInterface(nl_sock* socket, const std::string& name) {
     Require(rtnl_link_delete(socket, link.get()), "remove the bridge " + name);
 }
 
-// An empty bridge is none.
+// Puts the interface into the bridge; without a name of a bridge, takes it out of the one it is in.
 void SetMaster(nl_sock* socket, const std::string& name, const std::string& bridge) {
     const int index = tavisdk::FindInterface(name.c_str());
     if (bridge.empty()) {
@@ -187,7 +187,7 @@ void RemoveBridges(nl_sock* socket, const State& now, const State& wanted, const
     }
 }
 
-// Those to neighbours first, through which gateways of the others are reached.
+// Routes to neighbours come first: gateways of the others are reached through them.
 void AddRoutes(nl_sock* socket, const State& wanted, const Names& names) {
     for (const bool toNeighbours : {true, false}) {
         for (const Route& route : wanted.routes) {

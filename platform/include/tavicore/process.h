@@ -45,9 +45,9 @@ TAVI_SDK_API int VEXACProcPidFileCreate(const char* file);
 TAVI_SDK_API int VEXACProcAliveByPidFile(const char* file);
 
 /*
- * Sends signal to the process named in the pid file. Returns 0, or -1 when there is no such file
- * or process (VEXAC_ERR_NOT_FOUND), the process id now belongs to another program (likewise), or
- * the signal may not be sent (VEXAC_ERR_IO).
+ * Sends signal to the process named in the pid file. Returns 0; -1 with VEXAC_ERR_NOT_FOUND when
+ * there is no such file or process, or the process id now belongs to another program; -1 with
+ * VEXAC_ERR_IO when the signal may not be sent.
  */
 TAVI_SDK_API int VEXACProcSignalByPidFile(const char* file, int signal);
 

@@ -66,7 +66,7 @@ typedef struct TAVINetDhcpServer {
     char interface[TAVI_NET_IF_NAME_SIZE];  /* part of the file's name; the bridge again */
     char bridge[TAVI_NET_IF_NAME_SIZE];
     char gateway[TAVI_NET_ADDRESS_SIZE];    /* what clients are told; empty: nothing */
-    char nameServer[TAVI_NET_ADDRESS_SIZE]; /* likewise */
+    char nameServer[TAVI_NET_ADDRESS_SIZE]; /* what clients are told, too */
     char netmask[TAVI_NET_ADDRESS_SIZE];
 } TAVINetDhcpServer;
 

@@ -14,7 +14,9 @@ struct Failure {
     int code;  // VEXAC_ERR_...
 };
 
-// What errno says about a file. ESRCH is of a process's file in "/proc" when that has ended.
+// What errno says about a file. Missing is only what the system calls so; every other error is a
+// failure, so that nobody makes settings anew that he could not read. ESRCH is of a process's file
+// in "/proc" when that process has ended.
 inline Failure FileFailure() {
     const bool isMissing = errno == ENOENT || errno == ENOTDIR || errno == ESRCH;
     return {isMissing ? VEXAC_ERR_NOT_FOUND : VEXAC_ERR_IO};

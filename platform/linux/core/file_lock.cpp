@@ -20,13 +20,14 @@ constexpr std::chrono::seconds kLongestWait{2};
 constexpr useconds_t kPause = 1000;  // µs
 constexpr int kCarefully = O_RDWR | O_NOFOLLOW | O_NONBLOCK | O_NOCTTY | O_CLOEXEC;
 
-// Whoever has the folder may have the lock of a file in it.
+// Whether the lock file counts: root, this user and the owner of the folder may have the lock.
 bool IsOurs(const struct stat& lock, const Place& place) {
     return S_ISREG(lock.st_mode) &&
            (taviwireless::IsTrustedOwner(lock.st_uid) || lock.st_uid == place.owner);
 }
 
-// Marks beside the lock itself, of which flock() tells nothing: who has it, and that it is awaited.
+// flock() does not tell who has a lock, nor that somebody waits for it. These two marks in the lock
+// file do: locks of fcntl(), on a byte each.
 constexpr off_t kHolderMark = 0;
 constexpr off_t kWaiterMark = 1;
 
@@ -91,7 +92,7 @@ FileLock::~FileLock() {
     // Closing alone would not unlock while a child that another thread forked has the file.
     flock(file_.Get(), LOCK_UN);
     if (isAwaited) {
-        usleep(2 * kPause);  // or who writes again at once would keep those who wait from it
+        usleep(2 * kPause);  // else a writer that comes again at once would always win
     }
 }
 
@@ -122,7 +123,8 @@ bool FileLock::Try() {
     return true;
 }
 
-// False when the folder cannot be written. What is there and cannot be opened stays unopened.
+// Opens or makes the lock file. False when the folder cannot be written. A lock file that is there
+// but cannot be opened leaves file_ empty.
 bool FileLock::Open() {
     const int folder = place_.directory.Get();
     file_ = UniqueFd(openat(folder, name_.c_str(), O_CREAT | O_EXCL | kCarefully, 0600));
@@ -144,9 +146,9 @@ bool FileLock::Open() {
     return true;
 }
 
-// Removes what somebody else put there, if he may not keep it; he may where we may not. Another
-// writer may have put his lock there since the look: then one of two changes is lost, which is less
-// than to be kept from writing.
+// Removes what a stranger put at the lock file's name, where the folder lets this user. Between the
+// look and the removal another writer may have put its lock there: then one of two changes is lost,
+// which is better than that nobody can write.
 void FileLock::RemoveStrangers() const {
     struct stat status {};
     if (LookAtPath(&status) && !IsOurs(status, place_)) {

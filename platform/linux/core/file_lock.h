@@ -12,8 +12,10 @@ namespace tavicore {
 // The right to replace the file at a place, which one writer has at a time.
 //
 // It is the lock of a file of its own beside the file, ".NAME.lock", which nobody but its owner and
-// root can open, and so nobody else can lock. Whoever can replace the file can also make that one.
-// It is removed with the lock; one that a killed writer left is not locked and is taken over.
+// root can open, and so nobody else can lock. It lies beside the file and in no folder of locks,
+// because there whoever can replace the file can also make it, at any time of the boot, and all
+// names of the file meet. It stays empty and needs no room on a full disk. It is removed with the
+// lock; one that a killed writer left is not locked and is taken over.
 class FileLock {
   public:
     // Waits up to two seconds; then logs who has the lock, as a holder of this file by the name of

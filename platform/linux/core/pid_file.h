@@ -9,7 +9,7 @@
 namespace tavicore {
 
 // The process id, 0 when there is none in the file, and the time at which that process started, if
-// it says so.
+// the file says so. The age of the file would not do: appliances set their clock after boot.
 struct PidFile {
     pid_t pid;
     std::string startTime;  // clock ticks since boot

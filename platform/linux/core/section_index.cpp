@@ -27,14 +27,16 @@ std::optional<std::string> ReadHeader(std::string_view line) {
     return std::string(text.substr(1, text.size() - 2));
 }
 
-// The change time, which no program can set, tells a file from one that got its number later.
+// Whether both are of one unchanged file. The change time, which no program can set, tells a file
+// from another that got its inode number later.
 bool IsSame(const struct stat& a, const struct stat& b) {
     return a.st_dev == b.st_dev && a.st_ino == b.st_ino && a.st_size == b.st_size &&
            a.st_ctim.tv_sec == b.st_ctim.tv_sec && a.st_ctim.tv_nsec == b.st_ctim.tv_nsec;
 }
 
-// Whether any later change shows in the change time. One within the same tick of the clock that
-// files are stamped with would not: a tick is 10 ms at most, and 2 s where seconds are not divided.
+// Whether any later change of the file will show in its change time. A change within one tick of
+// the clock that files are stamped with does not show. A tick is 10 ms at most, and 2 s on file
+// systems that keep whole seconds.
 bool IsSettled(const struct stat& status, const timespec& now) {
     constexpr long long kNanosecondsPerSecond = 1'000'000'000;
     constexpr long long kTwoTicks = 20'000'000;

@@ -137,7 +137,8 @@ int TAVINetGetBridgeConfig(const char* bridge, TAVINetBridge* config, TAVINetBri
         ReadSetting(file, "IPADDR", config->address, sizeof config->address);
         ReadSetting(file, "NETMASK", config->netmask, sizeof config->netmask);
         if (config->address[0] == '\0' && (config->isLocal != 0 || member->interface[0] == '\0')) {
-            throw Failure{VEXAC_ERR_NOT_FOUND};  // a rest, such as ONBOOT alone
+            // What is left of a bridge that was taken down, such as ONBOOT alone, describes none.
+            throw Failure{VEXAC_ERR_NOT_FOUND};
         }
         return 0;
     });

@@ -106,10 +106,10 @@ int TAVINetDefaultGatewaySet(const char* gateway) {
         }
         rtnl_route_set_family(route.get(), AF_INET);
         Require(rtnl_route_set_dst(route.get(), everywhere.get()));
-        // The same metric, so that it takes the old route's place instead of standing beside it.
+        // With the old route's metric it takes that route's place instead of standing beside it.
         rtnl_route_set_priority(route.get(), old ? rtnl_route_get_priority(old.get()) : 0);
-        // As of the routes that pppd sets: a second one like it is refused then. Of another
-        // protocol, it would stand beside this one.
+        // The protocol is that of the routes that pppd sets, so that the kernel refuses pppd a
+        // second route like this one; with another protocol both would stand side by side.
         rtnl_route_set_protocol(route.get(), RTPROT_BOOT);
         rtnl_route_nh_set_gateway(hop.get(), address.get());
         rtnl_route_add_nexthop(route.get(), hop.release());  // it owns the hop now

@@ -36,7 +36,8 @@ std::string PidFileOf(const char* interface) {
     return FileOf(interface, ".pid");
 }
 
-// The number in the pid file may be another program's: the client writes no more than it.
+// Whether the client runs. The number in the pid file may be another program's by now, since the
+// client writes the number alone.
 bool ClientRuns(const char* interface) {
     const std::string file = PidFileOf(interface);
     if (VEXACProcAliveByPidFile(file.c_str()) == 0) {
@@ -47,7 +48,8 @@ bool ClientRuns(const char* interface) {
     return std::getline(status, name) && name == kClientName;
 }
 
-// The client's parent ends before the client has written its own number over its parent's.
+// Waits until the pid file names the client: its parent, whose number stands there at first, ends
+// before the client has written its own.
 bool ClientSettles(const char* interface) {
     constexpr int kMostLooks = 200;
     for (int i = 0; i < kMostLooks && !ClientRuns(interface); ++i) {

@@ -72,7 +72,7 @@ std::string Settings(const TAVINetDhcpServer& server) {
            format.Line("netmask", server.netmask);
 }
 
-// In the machine's byte order.
+// An address as a number in the machine's byte order.
 uint32_t ParseNumber(const char* address) {
     in_addr number;
     if (inet_pton(AF_INET, address, &number) != 1) {
@@ -81,8 +81,8 @@ uint32_t ParseNumber(const char* address) {
     return ntohl(number.s_addr);
 }
 
-// Throws when a value is missing or none of its kind: the server's configuration has no quotes, so
-// nothing else may get into it.
+// Throws when a value is missing or is no name, address or number where one belongs: the server's
+// configuration has no quotes, so nothing else may get into it.
 void Check(const TAVINetDhcpServer& server) {
     RequireInterfaceName(server.interface);
     RequireInterfaceName(server.bridge);
@@ -126,9 +126,9 @@ std::string NameOf(const std::string& file, const char* suffix) {
     return file.substr(begin, file.size() - begin - strlen(suffix));
 }
 
-// A file that is no settings, half of one, or another bridge's, is passed over: it must not keep
-// another bridge's access point from being switched on or off. But nothing is served any more from
-// what it was.
+// A file without valid settings of its own bridge is passed over: it must not keep another bridge's
+// access point from being switched on or off. Its old configuration is removed, so that nothing is
+// served from it any more.
 void WriteConfiguration(const std::string& file, const char* suffix) {
     const std::string name = NameOf(file, suffix);
     const std::string configuration = std::string(kFolder) + '/' + kFilePrefix + name + ".conf";

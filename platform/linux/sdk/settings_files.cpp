@@ -10,7 +10,7 @@ using namespace tavicore;
 namespace tavisdk {
 namespace {
 
-// After an SDK call that failed.
+// Throws, unless the SDK call that has just failed found nothing, or a value that is too long.
 void RequireMissing() {
     const int code = VEXACErrGet();
     if (code != VEXAC_ERR_NOT_FOUND && code != VEXAC_ERR_TOO_LONG) {
