@@ -12,9 +12,9 @@
 
 namespace taviwireless {
 
-// How a program starts that is to have nothing of its caller: no signal blocked or ignored, and,
-// with InheritNothingElse, no descriptor but the standard ones. Nothing of that is left out when
-// memory is short: std::bad_alloc is thrown.
+// How a program starts that is to inherit nothing of its caller: no signal is blocked or ignored
+// and, with InheritNothingElse, no descriptor but the standard ones is open. When memory is too
+// short for one of the settings, std::bad_alloc is thrown.
 class SpawnSettings {
   public:
     SpawnSettings() {

@@ -16,7 +16,7 @@
 // clients. So every line is printable: see MakePrintable.
 #define TAVI_LOG_ERROR(...) ::taviwireless::WriteLog(LOG_ERR, __FILE_NAME__, __LINE__, __VA_ARGS__)
 
-// The same at debug priority.
+// Writes such a line at debug priority.
 #define TAVI_LOG_DEBUG(...) \
     ::taviwireless::WriteLog(LOG_DEBUG, __FILE_NAME__, __LINE__, __VA_ARGS__)
 

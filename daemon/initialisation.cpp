@@ -17,8 +17,9 @@ using usbmodem_lib::USBModem;
 constexpr guint kFirstPause = 2;     // seconds
 constexpr guint kLongestPause = 60;  // seconds
 
-// Whether the SIM is known, without which the next look at a connection that runs would take its
-// log for missing and end it. One that waits for its PIN, or is not there, has nothing to tell.
+// Whether the SIM is known: otherwise the next look at a running connection would take its log for
+// missing and end it. A SIM that waits for its PIN, or is missing, has nothing to tell and counts
+// as known.
 bool KnowsItsSIM(USBModem& modem) {
     const int connection = modem.RecallConnection();
     if (connection > 0) {

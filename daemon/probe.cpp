@@ -28,7 +28,7 @@ constexpr unsigned int kLimit = 10;        // seconds, for everything else
 int running = 0;
 std::vector<Probe*> waiting;
 
-// One that was killed had no time to tidy up.
+// Does what a probe that was killed had no time for: removes its locks of ports and its semaphores.
 void TidyUp(GPid process) {
     RemovePrivateSemaphoreSets(process);
     RemovePortLocks(process);

@@ -10,9 +10,9 @@
 
 namespace taviwireless::daemon {
 
-// On which port a modem answers, found out by a process of its own: a port that is silent or talks
-// without end takes seconds or minutes, in which the service could answer nobody. Few processes run
-// at a time; the others wait for their turn.
+// Finds out, in a process of its own, on which port a modem answers: a port that is silent or talks
+// without end takes seconds or minutes, in which the service could answer nobody. Few such
+// processes run at a time; the others wait for their turn.
 class Probe {
   public:
     // Gets the query port that answers, or an empty text.

@@ -51,7 +51,8 @@ bool SessionBus::IsLost() const {
     return dbus_connection_get_is_connected(connection_) == FALSE;
 }
 
-// Asked of the bus itself: its signal about the caller still waits behind the calls.
+// Whether the caller has left the bus. The bus itself is asked, since its signal about the caller
+// still waits behind the calls.
 bool SessionBus::HasLeft(const char* caller) {
     if (caller == gone_) {
         return true;
@@ -64,8 +65,8 @@ bool SessionBus::HasLeft(const char* caller) {
     return true;
 }
 
-// The first source runs before the next call, of which there may always be one; the second once no
-// call is waiting.
+// Makes two sources: served_ calls back before the next call, since calls may never stop; idle_
+// goes away once no call is waiting.
 void SessionBus::Serve() {
     if (served_ == 0) {
         served_ = g_idle_add_full(
@@ -98,7 +99,7 @@ DBusHandlerResult SessionBus::Look(DBusConnection* /*connection*/, DBusMessage* 
     }
     const bool hasWaited = self->idle_ != 0;
     const char* caller = dbus_message_get_sender(message);
-    // Who wants no reply may leave.
+    // A caller that wants no reply may leave before it is served.
     if (hasWaited && caller != nullptr && dbus_message_get_no_reply(message) == FALSE &&
         self->HasLeft(caller)) {
         return DBUS_HANDLER_RESULT_HANDLED;

@@ -34,7 +34,7 @@ class SessionBus {
     std::function<void()> onLost_;
     DBusConnection* connection_;
     unsigned int served_ = 0;  // GLib source, while one is waiting
-    unsigned int idle_ = 0;    // likewise; until then calls have been waiting
+    unsigned int idle_ = 0;    // GLib source; while there is one, calls have been waiting
     std::string gone_;         // the last caller that had left; names are never used again
 };
 
