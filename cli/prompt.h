@@ -12,8 +12,8 @@ std::string ReadSecret(const std::string& prompt);
 // ReadSecret, at a terminal twice: throws CommandError unless both are the same.
 std::string ReadNewSecret(const std::string& prompt);
 
-// Asks a question at the terminal; true when the answer is "yes". Nobody is asked when standard
-// input is none: throws CommandError with this sentence then.
+// Asks a question at the terminal; true when the answer is "yes". When standard input is no
+// terminal, throws CommandError with the sentence withoutTerminal.
 bool Confirm(const std::string& question, const std::string& withoutTerminal);
 
 }  // namespace taviwireless::cli

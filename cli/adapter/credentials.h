@@ -27,7 +27,7 @@ void SetSecurity(WirelessNetwork& network, const std::string& word);
 // time of an attempt.
 void CheckKey(Security security, const std::string& key);
 
-// An EAP identity.
+// Throws unless the text can be an EAP identity.
 void CheckUser(const std::string& user);
 
 // Reads the key behind a prompt, and checks it.

@@ -26,7 +26,7 @@ namespace {
 
 using wireless::kAPSettings;
 
-// Gives what it visits its default.
+// A visitor that gives every field its default.
 struct Defaults {
     template <typename Key>
     void Number(const Key&, int32_t& field, int32_t value) const {
@@ -40,8 +40,9 @@ struct Defaults {
     void WriteOnly(const char*, const char (&)[Size]) const {}
 };
 
-// Nothing where no adapter is named, or where the user may not read the store. One that cannot be
-// read for another reason is a failure: what it holds may be what protects a network.
+// Returns the settings of the plugged adapter, stored or default; nothing where no adapter is
+// named, or where the user may not read the store. A store that cannot be read for another reason
+// is a failure: what it holds may be what protects a network.
 std::optional<WirelessAPSettings> FindSettings() {
     char section[sizeof WirelessAPSettings::name];
     const bool mayRead = access(kAPSettings, R_OK) == 0 || errno != EACCES;
@@ -63,7 +64,7 @@ std::optional<WirelessAPSettings> FindSettings() {
     return settings;
 }
 
-// Whether the section says how the network is protected, be it not at all.
+// Whether the section says how the network is protected; an open network says that, too.
 bool IsStored(const WirelessAPSettings& settings) {
     char kind[16];
     return VEXACFileGetSectionValue(kAPSettings, settings.name, "encryption", kind, sizeof kind) ==
@@ -81,7 +82,7 @@ void Store(const WirelessAPSettings& settings) {
     RequireStored(TAVIWirelessSetAPConfig(&settings) == 1);
 }
 
-// Nothing else in the file changes.
+// Stores whether the access point is on, and changes nothing else in the file.
 void StoreEnabled(const WirelessAPSettings& settings, const char* yesOrNo) {
     RequireStored(
         VEXACFileSetSectionValue(kAPSettings, settings.name, "enable", yesOrNo, "\t%s=%s\n") == 0);
@@ -164,11 +165,11 @@ WirelessAPSettings ReadAPSettings() {
 }
 
 void StoreAPSettings(WirelessAPSettings settings) {
-    // The library does not read it back, and would store none.
+    // The library does not read the guests' BSSID back, and would store an empty one.
     VEXACFileGetSectionValue(kAPSettings, settings.name, "bssid", settings.ap.guestBssid,
                              sizeof settings.ap.guestBssid);
     const int32_t enabled = settings.enabled;
-    settings.enabled = 1;  // of an access point that is off nothing but that is stored
+    settings.enabled = 1;  // the library stores of settings that are off nothing but that
     Store(settings);
     if (enabled == 0) {
         settings.enabled = 0;
@@ -178,7 +179,8 @@ void StoreAPSettings(WirelessAPSettings settings) {
 
 void SwitchAPOn() {
     if (TAVIWirelessAPIsConnecting() == 1) {
-        // Refused, which also removes what is left of an attempt that was killed.
+        // This is refused, but also removes the flag that an attempt may have left when it was
+        // killed.
         TAVIWirelessAPEnable();
         throw CommandError(kBusy,
                            "an access point is being switched on already; if that was interrupted, "
@@ -213,7 +215,8 @@ void SwitchAPOff() {
         throw CommandError(kFailure,
                            "the access point could not be switched off; the system log tells why");
     }
-    // Those of an adapter that was pulled out cannot be found; its network goes all the same.
+    // The settings of an adapter that was pulled out cannot be found; its network goes all the
+    // same.
     if (const auto settings = FindSettings(); settings && settings->enabled != 0) {
         StoreEnabled(*settings, "no");
     }

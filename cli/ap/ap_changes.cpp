@@ -21,7 +21,7 @@ namespace {
 
 constexpr char kForGuests[] = "guest-";
 
-// Of a file's line.
+// Whether the text can stand in a line of a file.
 bool IsPrintable(const std::string& text) {
     return Printable(text) == text;
 }

@@ -22,8 +22,8 @@ namespace taviwireless::cli {
 
 namespace {
 
-// hostapd has no mode that only checks. A line that it cannot understand keeps it from starting,
-// and it names all others first.
+// hostapd has no mode that only checks. This key, which it cannot know, keeps it from starting; it
+// names all other faults first.
 constexpr char kStopper[] = "taviwireless_only_checks";
 
 struct ConfFile {
@@ -31,7 +31,7 @@ struct ConfFile {
     std::string text;
 };
 
-// As the access point would be started with them.
+// The files with which the access point would be started.
 std::vector<ConfFile> Render(const WirelessAPConf& conf) {
     const std::string interface = TAVIWirelessAPInterfaceGet();
     std::vector<ConfFile> files{
@@ -70,7 +70,7 @@ struct Verdict {
     std::vector<std::string> remarks;
 };
 
-// "Line 7: ..." counts through both files.
+// Returns what hostapd says of the text of both files. Its "Line 7: ..." counts through both.
 Verdict AskHostapd(const std::string& text) {
     const UniqueFd file = MemoryFile(text + kStopper + "=1\n");
     const wireless::Pipe output(

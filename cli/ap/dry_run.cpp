@@ -31,13 +31,13 @@ Bridge BridgeOf(const char* name) {
     return {false, "eth0", ""};
 }
 
-// A server that its owner has switched off stays so.
+// Whether there will be a DHCP server: a server that its owner has switched off stays off.
 bool ServesLeases(const char* bridge) {
     TAVINetDhcpServer server;
     return TAVINetGetDhcpServerConf(bridge, bridge, &server) < 0 || server.enabled != 0;
 }
 
-// For the shell, as one word.
+// The text as one word for the shell.
 std::string Quoted(std::string text) {
     for (size_t place = 0; (place = text.find('\'', place)) != text.npos; place += 4) {
         text.replace(place, 1, "'\\''");

@@ -11,7 +11,7 @@ namespace taviwireless::cli {
 std::string ChannelWord(const WirelessAPConf& conf);
 void SetChannelWord(WirelessAPConf& conf, const std::string& word);
 
-// Of a channel, in MHz: 20, or 40 where the settings allow that and the mode knows it.
+// The width of a channel in MHz: 20, or 40 where the settings allow that and the mode knows it.
 int ChannelWidth(const WirelessAPConf& conf);
 void SetWidthWord(WirelessAPConf& conf, const std::string& word);
 

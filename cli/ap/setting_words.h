@@ -20,8 +20,8 @@ APNetwork MainNetwork(WirelessAPConf& conf);
 APNetwork GuestNetwork(WirelessAPConf& conf);
 
 // What a person calls the settings. The functions that return a word return the empty text for a
-// value that has none. Those that set something by its word throw CommandError, with the words that
-// are allowed, for another.
+// value without a word. The functions that set something by its word throw CommandError for any
+// other word, with those that are allowed.
 
 // "open", "wpa2" ... A kind of security that the network did not have begins without a secret.
 std::string SecurityWord(const APNetwork& network);

@@ -39,7 +39,7 @@ void ShowPlan(const Options& options) {
 
 }  // namespace
 
-// For everybody.
+// Needs no root.
 void ShowAP(const Options& options) {
     const APStatus status = LookAtAP();
     options.json ? Print(ToJson(status)) : Print(StatusTable(status));

@@ -76,10 +76,10 @@ class ModemAccess {
     // Asks the modem everything: about two seconds.
     virtual ModemState Look(const std::string& id) = 0;
     virtual Connection LookAtConnection(const std::string& id) = 0;
-    // Of the modems that are ready for use.
+    // The network interfaces of the modems that are ready for use.
     virtual std::vector<Interface> Interfaces() = 0;
 
-    // For a modem that was looked at before.
+    // The operations on PIN and PUK want a modem that was looked at before.
     virtual int EnterPIN(const std::string& id, const std::string& pin) = 0;
     virtual int EnterPUK(const std::string& id, const std::string& puk,
                          const std::string& newPin) = 0;

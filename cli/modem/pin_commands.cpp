@@ -111,7 +111,7 @@ class PINCommand {
     }
 
   private:
-    // While a modem dials, it would be left alone without a word.
+    // Refuses a modem that is dialling: the library would do nothing and report success.
     ModemState Look() {
         const ModemState state = deadline_.Limit([this] { return access_->Look(options_.id); });
         if (state.netStatus == kConnecting) {

@@ -56,7 +56,7 @@ Setting ParseSetting(const std::string& text) {
     return setting;
 }
 
-// Shows a person nothing: there is nothing to tell that was not asked for.
+// Makes the change. Prints a person nothing: what was asked for is done.
 template <typename Change>
 void ChangeAndReport(const Options& options, const Change& change) {
     const auto access = MakeAccess(options);

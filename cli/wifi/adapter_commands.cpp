@@ -23,7 +23,7 @@ void CheckOneWord(const std::string& text, const char* what) {
 
 }  // namespace
 
-// For everybody: that there is no adapter is an answer here.
+// Needs no root and no adapter: that there is none is an answer here.
 void ShowWifi(const Options& options) {
     const WirelessStatus status = LookAtWifi();
     const std::string address = WifiAddress();
@@ -57,7 +57,7 @@ void DisconnectWifi(const Options& options) {
 void ConnectAutomatically(const Options& options) {
     RequireAdapter();
     RequireRadio();
-    // It would end the connection that exists.
+    // The library would end the connection that exists.
     if (IsInNetwork(TAVIWirelessConnStatusGet())) {
         throw CommandError(kBusy, WifiInterface() +
                                       " has a connection already; taviwireless wifi disconnect "

@@ -92,7 +92,7 @@ class Joining {
         return conf;
     }
 
-    // A password belongs to its user.
+    // Whether the saved key can be used. An EAP password belongs to its user.
     bool HasUsableKey(const WirelessConf& saved) const {
         const bool isOfUser = options_.user.empty() || options_.user == saved.user;
         return saved.key[0] != '\0' && isOfUser && !options_.newKey;
@@ -128,7 +128,7 @@ class Joining {
     void SetAddress(const WirelessConf& conf) const {
         ShowProgress("Setting the address ...");
         const bool isSet = TAVIWirelessIfconfigSet(WifiInterface().c_str(), &conf) == 0;
-        // That there was no lease is no failure to the library.
+        // The library may report success although there was no lease.
         if (IsDHCP(conf) && (!isSet || WifiAddress().empty())) {
             GiveUp("joined " + name_ + " but got no address by DHCP; --static sets one");
         }

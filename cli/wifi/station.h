@@ -15,14 +15,15 @@ namespace taviwireless::cli {
 std::string WifiInterface();
 
 void RequireWifiSupport();
-// Root, and a model that supports Wi-Fi.
+// Throws unless the user is root and the model supports Wi-Fi.
 void RequireWifiSettings();
-// The same, and an adapter that is plugged in.
+// Throws unless RequireWifiSettings passes and an adapter is plugged in.
 void RequireAdapter();
-// A radio that may be used: with another, the library's functions succeed and do nothing.
+// Throws unless the radio may be used: if it may not, the library's functions succeed and do
+// nothing.
 void RequireRadio();
 
-// An ESSID that can be joined or created.
+// Throws unless the ESSID can be joined or created.
 void CheckEssid(const std::string& essid);
 
 CommandError ScanError();
@@ -37,7 +38,7 @@ bool IsInNetwork(int status);
 WirelessStatus LookAtWifi();
 // The IPv4 address of the interface; empty without one.
 std::string WifiAddress();
-// False when there is no default route after it either.
+// Sets the default route. False when there is none afterwards.
 bool SetDefaultGateway(const char* gateway);
 // The gateway that the connection should use; empty when none is known.
 std::string ConnectionGateway();
@@ -46,7 +47,8 @@ std::string ConnectionGateway();
 bool UseLeasedGateway();
 
 void EndConnection();
-// The same unless there is none. A connection cannot replace another without a trace of the old.
+// Ends the connection if there is one. To be called before another network is joined, or traces of
+// the old connection would stay.
 void LeaveNetwork();
 
 // Sets a text of a record; what does not fit is cut off.

@@ -18,7 +18,7 @@ std::string BssidText(const unsigned char (&bssid)[6]);
 std::string SecurityText(const WirelessNetwork& network);
 
 Json::Value ToJson(const WirelessNetwork& network);
-// In the order that they have.
+// The networks in the order that they have.
 Json::Value ToJson(const std::vector<WirelessNetwork>& networks);
 // A row for each network, or the sentence that there is none.
 std::string ListText(const std::vector<WirelessNetwork>& networks);
