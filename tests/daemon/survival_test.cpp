@@ -20,7 +20,7 @@ namespace {
 using dbus::USBModemClient;
 using testing::HasSubstr;
 
-// Short ones would take a modem that babbles for a quiet one.
+// The service with its real waits: with short ones a modem that babbles would pass for a quiet one.
 std::vector<std::string> WithItsWaits() {
     return {BuiltProgram("usbmodemd"), "--foreground"};
 }
@@ -95,7 +95,7 @@ TEST(Survival, AModemThatBeginsToBabbleIsOutOfServiceUntilItIsQuiet) {
     ModemService service(WithItsWaits());
     ASSERT_TRUE(service.Lists({"usbmodem0", "usbmodem1"}));
     simulator.Fault("0.1", "babble");
-    // Of these only the first is asked of the modem.
+    // Of these calls only the first asks the modem.
     std::vector<std::future<RunResult>> calls;
     for (int i = 0; i < 3; ++i) {
         calls.push_back(std::async(std::launch::async, [] {
@@ -194,7 +194,7 @@ TEST(Survival, ThousandsOfStatusRequestsWithoutGrowth) {
     EXPECT_EQ(running.service.Daemon().Wait(), 0);
 }
 
-// With calls waiting all the time, too.
+// The sets are removed even while calls are waiting all the time.
 TEST(Survival, ALowLimitOnSemaphoreSets) {
     WriteFile("/proc/sys/kernel/sem", "32000 1024000 500 24");
     RunningService running;

@@ -136,7 +136,7 @@ TEST(Methods, AnswerTheDocumentsByteForByte) {
     EXPECT_TRUE(g_utf8_validate(document.c_str(), -1, nullptr)) << document;
 }
 
-// Others wait meanwhile, so a modem is given up for this time.
+// Other callers wait meanwhile, so the rest of the document is what was known of a silent modem.
 TEST(Methods, AskAModemNothingMoreOnceItIsSilent) {
     Service service({"--modem", "12d1"});
     ASSERT_EQ(service.object->list.Update(), 0);
@@ -150,7 +150,7 @@ TEST(Methods, AskAModemNothingMoreOnceItIsSilent) {
         EXPECT_THAT(document, HasSubstr(known));
     }
     EXPECT_FALSE(service.object->list.FindUSBModem(0).IsError());
-    // One that leaves a single command unanswered is asked on.
+    // A modem that leaves a single command unanswered is asked the rest.
     service.simulator.Fault("0", "off");
     service.simulator.Fault("0", "noecho");
     service.simulator.Reply("0", "AT+CGMM", "");

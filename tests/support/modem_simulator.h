@@ -17,7 +17,7 @@ class ModemSimulator {
     // says nothing.
     explicit ModemSimulator(const std::vector<std::string>& arguments = {});
 
-    // The same in a folder of the caller's, which holds links and info files.
+    // Links and info files lie in this folder, the caller's own, instead of "/dev" and "/tmp".
     ModemSimulator(const std::string& folder, const std::vector<std::string>& arguments);
 
     // As if modemsim was told to end, and waits until links and info files are gone.
@@ -34,7 +34,7 @@ class ModemSimulator {
     void Fault(const std::string& target, const std::string& fault);
     // From now on the modem answers `command` with `text`, as it stands, behind the echo.
     void Reply(const std::string& id, const std::string& command, const std::string& text);
-    // The same for the next time only.
+    // The modem answers `command` with `text` once, and then as before.
     void ReplyOnce(const std::string& id, const std::string& command, const std::string& text);
     void Set(const std::string& id, const std::string& name, const std::string& value);
     void Send(const std::string& target, const std::string& text);

@@ -68,7 +68,7 @@ struct RunResult {
 // is killed, and std::runtime_error thrown.
 RunResult RunProgram(const std::vector<std::string>& argv, const std::string& input = "");
 
-// The same as a user who is not root, wherever the program lies.
+// RunProgram as a user who is not root, wherever the program lies.
 RunResult RunAsNobody(std::vector<std::string> argv);
 
 }  // namespace taviwireless::test

@@ -165,8 +165,8 @@ comes_back_after_restart() {
     in_air ping -c 2 -i 0.2 -W 2 10.1.14.1
 }
 
-# One is done, the other is refused or done as well.
-# Found out by the command line, or, if both look at the same moment, by the library.
+# Two enable at the same time: one of them succeeds, the other is refused or succeeds as well.
+# A refusal is the command line's or, if both look at the same moment, the library's.
 is_refused() {
     [ "$1" = 4 ] || same 1 "$1"
 }

@@ -185,7 +185,7 @@ networks_of() {
     sed '1d; s/   *.*//' <<<"$1" | paste -sd, | sed 's/,/, /g'
 }
 
-# Those that were joined before are saved. The one that was used last is off the air.
+# Both networks were joined before, so they are saved. The one that was used last is off the air.
 joins_automatically() {
     start_afresh
     same "My Net, Café 24/7, Old" "$(networks_of "$(wifi saved list)")"

@@ -73,7 +73,7 @@ INSTANTIATE_TEST_SUITE_P(ApplianceRoot, SignalFromOutside,
                          testing::Values(NamedSignal(SIGTERM, "TERM"), NamedSignal(SIGINT, "INT"),
                                          NamedSignal(SIGHUP, "HUP")));
 
-// Whatever is left holds the output open, which RunProgram() would wait for.
+// A program that was left running would hold the output open, and RunProgram() would wait for it.
 TEST(ApplianceRoot, KillsWhatTheCommandLeftRunning) {
     const auto start = std::chrono::steady_clock::now();
     const auto result = RunInside({"sh", "-c", "sleep 60 & (setsid sleep 60 &) ; echo left"});

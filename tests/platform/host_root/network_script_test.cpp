@@ -274,7 +274,7 @@ TEST_F(NetworkProgram, ConfiguredGatewayIsUsedWhereverItStands) {
         ASSERT_EQ(Restart("br0"), "");
         EXPECT_EQ(Ip("route show default"), "default via " + std::string(gateway) + " dev br0 \n");
     }
-    // One that another connection has set meanwhile is left in force.
+    // A default route that another connection has set meanwhile stays in force.
     Ip("route delete default");
     MakeInterface("ppp0", "10.64.0.5/24");
     Ip("route add default via 10.64.0.1");
@@ -282,7 +282,7 @@ TEST_F(NetworkProgram, ConfiguredGatewayIsUsedWhereverItStands) {
     EXPECT_EQ(Ip("route show default"), "default via 10.64.0.1 dev ppp0 \n");
 }
 
-// By a real client and a real server, at the far end of the cable.
+// The lease is of a real server at the far end of the cable, by the real client.
 TEST_F(NetworkProgram, LeaseOfTheWiredInterfaceBecomesTheBridges) {
     HurryServer();
     MakeInterface("eth0", "10.9.0.5/16");
@@ -327,7 +327,7 @@ TEST_F(NetworkProgram, BridgeWithoutALeaseKeepsWhatItsInterfaceHad) {
     EXPECT_EQ(Running("udhcpc"), 0);
 }
 
-// Whatever step fails: addresses, routes, members and what ran are as they were.
+// Whatever step fails, addresses, routes, members and programs are as they were.
 TEST_F(NetworkProgram, FailurePutsBackWhatWas) {
     const struct {
         const char *fault, *repair, *sentence;

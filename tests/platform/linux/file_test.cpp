@@ -98,7 +98,8 @@ std::vector<std::function<int(const char*)>> Readers() {
         [](const char* f) { return VEXACFileSetKeyValue(f, "K", "v", "%s=%s\n") == 1 ? 0 : -1; }};
 }
 
-// Where everybody can put files, those of strangers are none, and nobody leads root elsewhere.
+// In a folder in which everybody can put files, files of strangers do not count, and their links
+// lead nobody elsewhere.
 TEST(SharedFolder, OnlyRegularFilesOfRootOrOneselfCount) {
     TAVI_NEEDS_A_STRANGER()
     constexpr char kText[] = "7\nK=v\n[S]\nL=v\n";

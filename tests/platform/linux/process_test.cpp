@@ -75,7 +75,7 @@ void ReapAll(int) {
     }
 }
 
-// Whatever the caller does about its children.
+// The exit status arrives whatever the caller does about its children.
 TEST(Exec, GivesTheExitStatusToWhoDoesNotWait) {
     struct sigaction ignore {};
     ignore.sa_handler = SIG_IGN;

@@ -225,7 +225,7 @@ TEST_F(Locking, AStrangerLocksNothingThatAWriterNeeds) {
     waitpid(stranger, nullptr, 0);
 }
 
-// What he puts at the lock's place in a folder where he may, is in nobody's way.
+// What a stranger puts at the lock's name, in a folder where he may, keeps nobody from writing.
 TEST_F(Locking, AStrangersFileOrLinkIsNoLock) {
     TAVI_NEEDS_A_STRANGER()
     constexpr char kSharedFile[] = "/tmp/file";
