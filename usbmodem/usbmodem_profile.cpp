@@ -33,7 +33,7 @@ bool IsMissing(const std::string& path) {
 bool USBModem::ComputeProfilePath() {
     bool failed = false;
     const std::string imsi = GetIMSI(failed);
-    // While busy, one that was never asked for is empty without an error.
+    // While busy, an IMSI that was never asked for is empty without an error.
     profilePath_ = failed || imsi.empty() ? "" : kProfilePrefix + imsi;
     return !profilePath_.empty();
 }

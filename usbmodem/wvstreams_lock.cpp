@@ -70,8 +70,8 @@ WvLockDev::~WvLockDev() {
     }
 }
 
-// Where a stranger keeps the name taken (by a folder, say) there is no lock file: the port itself
-// is locked as well.
+// Where a stranger keeps the name taken (by a folder, say), the port is used without a lock file:
+// it is locked itself as well.
 bool WvLockDev::lock() {
     for (int attempt = 0; lock_count == 0 && attempt < kAttempts; ++attempt) {
         if (MakeLockFile(filename)) {
