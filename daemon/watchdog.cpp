@@ -13,7 +13,7 @@
 
 #include "base/unique_fd.h"
 
-// Not libsystemd's: that is a library more for one datagram.
+// Written here, because libsystemd would be one more library for a single datagram.
 namespace taviwireless::daemon {
 
 namespace {
