@@ -141,7 +141,7 @@ int DBusClient::Append(bool value) {
 int DBusClient::SendMessage(bool wantReply, int timeout) {
     Drop(reply_);
     if (message_ != nullptr && dbus_message_get_serial(message_) != 0) {
-        // It was sent before; libdbus aborts the process when such a message is changed.
+        // This message was sent before; libdbus aborts the process when such a message is changed.
         DBusMessage* copy = dbus_message_copy(message_);
         Drop(message_);
         message_ = copy;
