@@ -210,7 +210,7 @@ std::optional<std::string> BringUp(const char* interface) {
     return conf->bridge;
 }
 
-// Until the adapter has channels to work on.
+// Waits until the adapter has channels to work on.
 bool WaitForChannels(const char* interface) {
     const Command command(128, {"iwlist ", interface, " active_channel|wc -l"});
     for (int i = 0; i < kChannelTries; ++i) {

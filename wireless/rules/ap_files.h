@@ -44,7 +44,7 @@ inline std::string HostapdGuestInfo(const std::string& interface) {
     return "/etc/hostapd/hostapd-" + interface + "-guest.info";
 }
 
-// Not every model has a guest network.
+// Whether the model has a guest network.
 inline bool OffersGuestNetwork() {
     return VEXACFileCheckKeyValue(kModelInfo, "support_pci_wifi", "yes", 0) != 0;
 }

@@ -51,7 +51,9 @@ std::string HtCapabilities(const WirelessAPConf& conf) {
     return narrow + "[SHORT-GI-40][MAX-AMSDU-7935]" + Direction(conf.band, conf.channel);
 }
 
-// With 802.11n, a set of more than "n only" is one of the older protocols, which n is added to.
+// The band that hw_mode is made of. With 802.11n on, "n only" counts when it is the only bit;
+// beside other bits it is dropped, since n is added to the protocol that they name. Without 802.11n
+// a set of several bits stays, for which no hw_mode is written, like for any other unknown value.
 int32_t BandInUse(const WirelessAPConf& conf) {
     const bool isReduced = conf.ieee80211n > 0 && conf.band != WIRELESS_AP_N_ONLY;
     return isReduced ? conf.band & kSetsWithoutNOnly : conf.band;
