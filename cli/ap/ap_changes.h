@@ -8,7 +8,7 @@
 
 namespace taviwireless::cli {
 
-// One setting to change, checked only for being one.
+// One setting to change. Its name is known; its value is not checked yet.
 struct APChange {
     std::string key;
     std::string value;

@@ -146,7 +146,7 @@ void CheckAP(const Options& options) {
     }
     if (!options.json) {
         for (const ConfFile& file : shown) {
-            // Not the line breaks, which belong to the file.
+            // Line by line: the line breaks belong to the file and stay.
             std::istringstream lines(file.text);
             std::cout << "# " << file.path << '\n';
             for (std::string line; std::getline(lines, line);) {

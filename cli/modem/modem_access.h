@@ -104,7 +104,7 @@ std::unique_ptr<ModemAccess> MakeServiceAccess();
 std::unique_ptr<ModemAccess> MakeDirectAccess();
 std::unique_ptr<ModemAccess> MakeAccess(const Options& options);
 
-// For the implementations.
+// Helpers of the implementations of ModemAccess.
 
 // Device ids by the info files in "/tmp/"; touches no modem.
 std::vector<std::string> PluggedModems();

@@ -42,7 +42,8 @@ void ListNetworks(const Options& options) {
     }
 }
 
-// With the adapter unplugged, the connection has left its address and its resolver file behind.
+// Disconnects also when the adapter was unplugged: the connection has then left its address and its
+// resolver file behind.
 void DisconnectWifi(const Options& options) {
     RequireWifiSettings();
     const WirelessStatus status = LookAtWifi();

@@ -30,7 +30,7 @@ void ListSavedNetworks(const Options& options) {
     }
 }
 
-// Of several access points with one name, the one that was used last.
+// Shows, of several access points with one name, the one that was used last.
 void ShowSavedNetwork(const Options& options) {
     RequireWifiSettings();
     const auto saved = SavedNetworks();

@@ -16,7 +16,7 @@ struct StatusWord {
     const char* word;
     const char* text;
 };
-// By the numbers of WIRELESS_STATUS_...
+// The index is WIRELESS_STATUS_...
 constexpr StatusWord kStatuses[] = {{"other_mode", "in a mode that is not used here"},
                                     {"not_supported", "this model does not support Wi-Fi"},
                                     {"no_adapter", "there is no Wi-Fi adapter"},
