@@ -188,7 +188,8 @@ void EnterNewRoot(const fs::path& output) {
             ShowInNewRoot(entry, entry.path(), MS_REC);
         }
     }
-    // As root of a chroot, which need not be a mount that pivot_root could put away.
+    // Moved over the old root like this, because pivot_root refuses a root that is no mount, such
+    // as that of a plain chroot, which package builders use.
     if (chdir(kNewRoot.target) != 0 || mount(".", "/", nullptr, MS_MOVE, nullptr) != 0 ||
         chroot(".") != 0 || chdir("/") != 0) {
         FailTo("enter a private root");
@@ -273,7 +274,7 @@ void LeaveChroot() {
     }
 }
 
-// Also for a caller who is root of a container that maps its users.
+// True also for root of a container that maps its users.
 bool IsInUserNamespace() {
     std::ifstream map("/proc/self/uid_map");
     unsigned long first = 0;
@@ -307,7 +308,7 @@ void SetUpPrivateSystem(const Workplace& workplace) {
         }
     }
     ProtectKernel();
-    // By its path: the directory itself may be one that is covered now.
+    // Entered anew by its path, since the directory itself may be covered now.
     if (chdir(workplace.current.c_str()) != 0 && chdir("/") != 0) {
         FailTo("enter the current directory " + workplace.current.string());
     }

@@ -13,7 +13,7 @@
 
 namespace taviwireless::iwlist {
 
-// One plain sentence.
+// A failure, as one plain sentence.
 struct Error : std::runtime_error {
     using std::runtime_error::runtime_error;
 };

@@ -21,8 +21,8 @@ std::string Read(const std::string& path) {
     return *text;
 }
 
-// What of 802.11n the radio can do in all of its bands, as its bits; all of them where that cannot
-// be told.
+// The capabilities of 802.11n that the radio has in all of its bands, as the bits of nl80211; all
+// bits where that cannot be told.
 unsigned int Capabilities(const std::string& interface) {
     std::string phy = ReadText("/sys/class/net/" + interface + "/phy80211/name").value_or("");
     phy = phy.substr(0, phy.find('\n'));

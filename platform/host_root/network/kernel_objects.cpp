@@ -45,7 +45,8 @@ bool IsDefault(rtnl_route* route) {
     return destination == nullptr || nl_addr_get_prefixlen(destination) == 0;
 }
 
-// With an end: who would renew it asks at the interface that had it, which gets no answers there.
+// Takes the end of its lifetime from an address: the tool that would renew it asks at the interface
+// that had it, and gets no answers there.
 void MakePermanent(rtnl_addr* address) {
     constexpr uint32_t kForEver = UINT32_MAX;
     rtnl_addr_set_preferred_lifetime(address, kForEver);

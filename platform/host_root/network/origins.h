@@ -15,7 +15,7 @@ using Origins = std::set<std::pair<std::string, std::string>>;
 
 constexpr char kForAccessPoint[] = "access-point";
 
-// They are kept in "/var/run", which like the bridge is gone after a restart of the machine.
+// Origins are kept in "/var/run", which like the bridge is gone after a restart of the machine.
 Origins ReadOrigins(const std::string& bridge);
 void WriteOrigins(const std::string& bridge, const Origins& origins);
 

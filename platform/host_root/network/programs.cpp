@@ -53,7 +53,7 @@ bool EndsWell(pid_t pid, int limit) {
     if (!inTime) {
         kill(-pid, SIGKILL);
     }
-    // One that the kernel does not let go of is left to its fate.
+    // A process that the kernel does not let go of, even killed, is not waited for.
     int status = -1;
     return waitpid(pid, &status, inTime ? 0 : WNOHANG) == pid && inTime && WIFEXITED(status) &&
            WEXITSTATUS(status) == 0;
@@ -95,7 +95,7 @@ Program DhcpServer(const std::string& bridge) {
     return {"udhcpd", bridge, "/var/run/udhcpd-" + bridge + ".pid", conf, {"udhcpd", "-S", conf}};
 }
 
-// Without an answer after 12 s it goes on asking in the background.
+// The DHCP client. Without an answer after 12 s it goes on asking in the background.
 Program DhcpClient(const std::string& interface) {
     const std::string pidFile = "/etc/dhcpc/dhcpcd-" + interface + ".pid";
     return {"udhcpc",

@@ -17,7 +17,7 @@ struct Outcome {
 // blocked. It is killed when it has not ended after `limit` seconds.
 Outcome Run(const std::vector<std::string>& argv, int limit);
 
-// One that goes to the background and writes a pid file.
+// A program that goes to the background and writes a pid file.
 struct Program {
     std::string name;
     std::string interface;

@@ -59,7 +59,7 @@ void ReadRoutes(nl_sock* socket, int family, State& state) {
     const Cache cache(all);
     ForEach(all, [&](nl_object* object) {
         auto* route = reinterpret_cast<rtnl_route*>(object);
-        // One with several ways does not belong to an interface.
+        // A route with several next hops does not belong to one interface.
         if (rtnl_route_get_nnexthops(route) == 1 && WasGiven(route)) {
             const int index = rtnl_route_nh_get_ifindex(rtnl_route_nexthop_n(route, 0));
             state.routes.push_back(Describe(route, NameOf(index)));
@@ -75,8 +75,8 @@ tavisdk::Link NewLink() {
     return link;
 }
 
-// With the hardware address of the interface that brings the network, so that others on it see no
-// change.
+// Makes a bridge with the hardware address of the interface that brings the network, so that other
+// machines on it see no change.
 void MakeBridge(nl_sock* socket, const std::string& name, const std::string& hardware) {
     const tavisdk::Link bridge(rtnl_link_bridge_alloc());
     if (!bridge) {
