@@ -367,7 +367,7 @@ TAVIWIRELESS_API int TAVIWirelessConfEnum(WirelessLink* confs);
 TAVIWIRELESS_API int TAVIWirelessConfEnumByAtime(WirelessLink* confs);
 /*
  * Connects to the last used saved network that can be joined, and sets its address. Networks that a
- * scan does not find are tried, too, with their saved settings, since they may hide their name. A
+ * scan does not find may hide their name: they are tried, too, when their saved security is known. A
  * connection that exists is ended instead, with -1. When nothing could be joined, or its address
  * could not be set, the adapter is disconnected and the result is -1.
  */
