@@ -1,18 +1,17 @@
-// What goes over the line, byte for byte, and clients that come and go.
+// What goes over the line, byte for byte: commands, misbehaviour, calls, clients that come and go.
 #include <gmock/gmock.h>
 
-#include <fstream>
-#include <sstream>
-#include <thread>
-
 #include "tests/sim/client.h"
+#include "tests/support/files.h"
 #include "tests/support/modem_simulator.h"
 #include "tests/support/wait.h"
 
 namespace taviwireless::test {
 namespace {
 
+using testing::AnyOf;
 using testing::ElementsAre;
+using testing::EndsWith;
 
 struct Exchange {
     const char* sent;
@@ -25,21 +24,16 @@ TEST(Line, IsFramedAndEchoedLikeAModems) {
         {"at+csq\r", "at+csq\r\r\n+CSQ: 17,99\r\n\r\nOK\r\n"},
         {"AT+CSQ\r\n", "AT+CSQ\r\r\n+CSQ: 17,99\r\n\r\nOK\r\n"},
         {"\r", ""},
-        {"\r\r\r\r\r", ""},
         {"AT+NONSENSE\r", "AT+NONSENSE\r\r\nERROR\r\n"},
         {"no command\r", "no command\r"},
         {"AT+CSQ;+CFUN?\r", "AT+CSQ;+CFUN?\r\r\n+CSQ: 17,99\r\n+CFUN: 1\r\n\r\nOK\r\n"},
         {"ATQ0 V1 E1 S0=0 &C1 &D2 +FCLASS=0\r", "ATQ0 V1 E1 S0=0 &C1 &D2 +FCLASS=0\r\r\nOK\r\n"},
-        {"AT+CSQ+\r", "AT+CSQ+\r\r\nERROR\r\n"},
-        {"AT+CFUN=?\r", "AT+CFUN=?\r\r\nOK\r\n"},
         {"AT+CFUN=\r", "AT+CFUN=\r\r\n+CME ERROR: incorrect parameters\r\n"},
         {"AT+CGDCONT=1,\"IP\",\"my Net\"\r", "AT+CGDCONT=1,\"IP\",\"my Net\"\r\r\nOK\r\n"},
         {"AT+CGDCONT?\r",
          "AT+CGDCONT?\r\r\n+CGDCONT: 1,\"IP\",\"my Net\",\"0.0.0.0\",0,0\r\n\r\nOK\r\n"},
         {"AT+CMEE=1\r", "AT+CMEE=1\r\r\nOK\r\n"},
         {"AT+CFUN=\r", "AT+CFUN=\r\r\n+CME ERROR: 50\r\n"},
-        {"AT+CMEE=0\r", "AT+CMEE=0\r\r\nOK\r\n"},
-        {"AT+CFUN=\r", "AT+CFUN=\r\r\nERROR\r\n"},
         {"ATE0\r", "ATE0\r\r\nOK\r\n"},
         {"AT+CSQ\r", "\r\n+CSQ: 17,99\r\n\r\nOK\r\n"},
         {"ATZ\r", "\r\nOK\r\n"},
@@ -61,7 +55,7 @@ TEST(Line, IsFramedAndEchoedLikeAModems) {
 
 TEST(Line, OutlivesItsClientsAndKeepsNothingForTheNext) {
     ModemSimulator simulator;
-    for (int round = 0; round < 50; ++round) {
+    for (int round = 0; round < 20; ++round) {
         Client(1).Write("AT+CGMM\r");  // leaves before the reply
         std::vector<std::string> received;
         Eventually([&] { return !(received = simulator.Received("0")).empty(); });
@@ -87,28 +81,109 @@ TEST(Line, DialledPortCarriesDataUntilItIsEscapedFromOrReopened) {
     EXPECT_EQ(Client(0).Ask("AT"), "AT\r\r\nOK\r\n");
 }
 
-// Clock ticks of processor time that a process has used.
-long TicksUsed(pid_t pid) {
-    std::ifstream file("/proc/" + std::to_string(pid) + "/stat");
-    std::string word;
-    for (int field = 1; field <= 13; ++field) {
-        file >> word;
+constexpr char kSignal[] = "\r\n+CSQ: 17,99\r\n\r\nOK\r\n";
+const std::string kEchoed = "AT+CSQ\r" + std::string(kSignal);
+
+TEST(Fault, ChangesTheReplyAndCanBeTakenAway) {
+    const struct {
+        const char* fault;
+        std::string reply;
+    } kFaults[] = {
+        {"silent", ""},
+        {"error", "AT+CSQ\r\r\nERROR\r\n"},
+        {"error=at+csq", "AT+CSQ\r\r\nERROR\r\n"},
+        {"error=AT+CGMM", kEchoed},
+        {"noecho", kSignal},
+        {"garbage", "AT+CSQ\r\xff\xfe\x80\x01\x1b\xc3\x28\x7f" + std::string(kSignal)},
+        {"unsolicited=^RSSI:21",
+         "AT+CSQ\r\r\n^RSSI:21\r\n\r\n+CSQ: 17,99\r\n\r\n^RSSI:21\r\n\r\nOK\r\n"},
+        {"pieces=3/1", kEchoed},
+        {"slow=1", kEchoed},
+    };
+    ModemSimulator simulator;
+    Client client(1);
+    for (const auto& fault : kFaults) {
+        SCOPED_TRACE(fault.fault);
+        simulator.Fault("0", fault.fault);
+        client.Write("AT+CSQ\r");
+        std::string reply;
+        if (fault.reply.empty()) {
+            reply = client.ReadUntilQuiet();
+        }
+        while (reply.size() < fault.reply.size() && client.ReadMore(Client::kPatience, &reply)) {
+        }
+        EXPECT_EQ(reply, fault.reply);
+        simulator.Fault("0", "off");
+        EXPECT_EQ(client.Ask("AT+CSQ"), kEchoed);
     }
-    long user = 0;
-    long system = 0;
-    if (!(file >> user >> system)) {
-        throw std::runtime_error("The process has no statistics");
-    }
-    return user + system;
+    EXPECT_EQ(client.ReadUntilQuiet(), "");
 }
 
-TEST(Line, CostsNothingWhileNobodyTalks) {
-    ModemSimulator simulator({"--fault", "0:babble"});
-    Client(0).Write("AT\r");
-    { Client client(1); }
-    const long before = TicksUsed(simulator.Pid());
-    std::this_thread::sleep_for(std::chrono::milliseconds(500));
-    EXPECT_LE(TicksUsed(simulator.Pid()) - before, 2);  // of 50
+TEST(Fault, VanishUnplugsTheModemWithinAReply) {
+    const struct {
+        const char* fault;
+        const char* heard;
+    } kFaults[] = {{"vanish", "AT+CSQ\r"}, {"vanish=9", "AT+CSQ\r\r\n+CSQ: 1"}};
+    ModemSimulator simulator;
+    for (const auto& fault : kFaults) {
+        SCOPED_TRACE(fault.fault);
+        simulator.Fault("0.1", fault.fault);
+        Client client(1);
+        client.Write("AT+CSQ\r");
+        // The kernel drops what was not read when the line is hung up.
+        EXPECT_THAT(client.ReadUntilQuiet(Client::kPatience), AnyOf(fault.heard, ""));
+        EXPECT_TRUE(client.IsHungUp());
+        EXPECT_FALSE(Exists("/dev/ttyUSB1"));
+        EXPECT_FALSE(Exists("/tmp/usbmodem.info0"));
+        simulator.Plug("0");
+        EXPECT_EQ(Client(1).Ask("AT+CSQ"), kEchoed);  // it vanishes once
+    }
+}
+
+TEST(Reply, IsWhatWasGivenUntilItIsTakenBack) {
+    const char kText[] = "\r\n+CSQ: \"99\"\r\n\0\x7f tail\r\nOK\r\n";
+    const std::string text(kText, sizeof kText - 1);
+    ModemSimulator simulator;
+    Client client(1);
+    simulator.Reply("0", "at+csq", text);
+    EXPECT_EQ(client.Ask("AT+CSQ"), "AT+CSQ\r" + text);
+    EXPECT_EQ(client.Ask("AT+CSQ"), "AT+CSQ\r" + text);
+    simulator.Command("reply 0 AT+CSQ off");
+    EXPECT_EQ(client.Ask("AT+CSQ"), kEchoed);
+}
+
+// Everything up to these words.
+std::string ReadUntil(Client& client, const std::string& last) {
+    std::string text;
+    while (text.find(last) == std::string::npos && client.ReadMore(Client::kPatience, &text)) {
+    }
+    return text;
+}
+
+TEST(Call, CommandHasTheLineUntilItEndsAndThenTheModemHangsUp) {
+    ModemSimulator simulator(
+        {"--on-dial", "echo welcome; read -r line; echo \"heard $line\"; exit 3"});
+    Client client(0);
+    for (int round = 0; round < 2; ++round) {
+        client.Write("ATD*99#\r");
+        EXPECT_THAT(ReadUntil(client, "welcome\n"), EndsWith("\r\nCONNECT\r\nwelcome\n"));
+        simulator.Received("0");
+        client.Write("AT+CSQ\n");  // is the command's now
+        EXPECT_EQ(ReadUntil(client, "NO CARRIER\r\n"), "heard AT+CSQ\n\r\nNO CARRIER\r\n");
+        EXPECT_THAT(simulator.Received("0"), testing::IsEmpty());
+        EXPECT_THAT(client.Ask("AT"), EndsWith("OK\r\n"));
+    }
+}
+
+TEST(Call, CommandEndsWithTheModem) {
+    ModemSimulator simulator({"--on-dial",
+                              "trap 'echo gone >/tmp/call; exit' TERM; echo welcome; "
+                              "while :; do sleep 0.1; done"});
+    Client client(0);
+    client.Write("ATD*99#\r");
+    ReadUntil(client, "welcome\n");
+    simulator.Unplug("0");
+    EXPECT_EQ(ReadFile("/tmp/call"), "gone\n");
 }
 
 }  // namespace

@@ -1,0 +1,205 @@
+// The modem behind the line: its SIM card, its personality, and how it comes and goes.
+#include <gmock/gmock.h>
+
+#include <chrono>
+#include <filesystem>
+#include <thread>
+
+#include "tests/sim/client.h"
+#include "tests/support/files.h"
+#include "tests/support/modem_simulator.h"
+#include "tests/support/wait.h"
+
+namespace taviwireless::test {
+namespace {
+
+constexpr char kWrong[] = "+CME ERROR: incorrect password";
+constexpr char kNotAllowed[] = "+CME ERROR: operation not allowed";
+constexpr char kBadArgument[] = "+CME ERROR: incorrect parameters";
+constexpr char kNeedsPin[] = "+CME ERROR: SIM PIN required";
+constexpr char kNeedsPuk[] = "+CME ERROR: SIM PUK required";
+
+struct Step {
+    const char* command;
+    const char* reply;  // without line ends; a blank between lines
+};
+
+std::string Flat(const std::string& reply) {
+    std::string flat;
+    for (const char c : reply) {
+        if (c == '\n' && !flat.empty() && flat.back() != ' ') {
+            flat += ' ';
+        } else if (c != '\r' && c != '\n') {
+            flat += c;
+        }
+    }
+    return flat.substr(0, flat.find_last_not_of(' ') + 1);
+}
+
+void RunSteps(const std::string& modem, const std::vector<Step>& steps) {
+    ModemSimulator simulator({"--modem", modem});
+    Client client(2);
+    client.Ask("ATE0");
+    for (const Step& step : steps) {
+        SCOPED_TRACE(step.command);
+        EXPECT_EQ(Flat(client.Ask(step.command)), step.reply);
+    }
+}
+
+TEST(SimCard, AThirdWrongPinAsksForThePukWhichSetsANewPin) {
+    RunSteps("12d1,pin=1234,puk=87654321", {{"AT+CPIN=1111", kWrong},
+                                            {"AT^CPIN?", "^CPIN: SIM PIN,2,10,2,10,3 OK"},
+                                            {"AT+CPIN=12", kBadArgument},  // never reaches the card
+                                            {"AT+CPIN=1111", kWrong},
+                                            {"AT^CPIN?", "^CPIN: SIM PIN,1,10,1,10,3 OK"},
+                                            {"AT+CPIN=1111", kWrong},
+                                            {"AT+CPIN?", "+CPIN: SIM PUK OK"},
+                                            {"AT+CPIN=1234", kNeedsPuk},
+                                            {"AT+CIMI", kNeedsPuk},
+                                            {"AT+CPIN=11111111,5678", kWrong},
+                                            {"AT^CPIN?", "^CPIN: SIM PUK,9,9,0,10,3 OK"},
+                                            {"AT+CPIN=\"87654321\",\"5678\"", "OK"},
+                                            {"AT^CPIN?", "^CPIN: READY,,10,3,10,3 OK"},
+                                            {"AT+CLCK=\"SC\",0,\"5678\"", "OK"}});
+}
+
+TEST(SimCard, ProtectionAndPinAreChangedWithThePinOnly) {
+    RunSteps("12d1,pin=1234,lock=off", {{"AT+CPIN?", "+CPIN: READY OK"},
+                                        {"AT+CLCK=\"SC\",1,\"1111\"", kWrong},
+                                        {"AT+CLCK=\"SC\",2", "+CLCK: 0 OK"},
+                                        {"AT+CLCK=SC,1,1234", "OK"},
+                                        {"AT+CLCK=\"SC\",2", "+CLCK: 1 OK"},
+                                        {"AT+CPWD=\"SC\",\"1111\",\"5678\"", kWrong},
+                                        {"AT+CPWD=\"SC\",\"1234\",\"56\"", kBadArgument},
+                                        {"AT+CPWD=\"SC\",\"1234\",\"5678\"", "OK"},
+                                        {"AT+CLCK=\"SC\",0,\"1234\"", kWrong},
+                                        {"AT+CLCK=\"SC\",0,\"5678\"", "OK"},
+                                        {"AT+CLCK=\"SC\",2", "+CLCK: 0 OK"}});
+}
+
+TEST(SimCard, ThatIsNotUsableSaysWhy) {
+    ModemSimulator simulator;
+    Client client(1);
+    client.Ask("ATE0");
+    const Step kStates[] = {{"absent", "+CME ERROR: SIM not inserted"},
+                            {"busy", "+CME ERROR: SIM BUSY"},
+                            {"failure", "+CME ERROR: SIM failure"},
+                            {"ready", "+CPIN: READY OK"}};
+    for (const Step& state : kStates) {
+        simulator.Set("0", "sim", state.command);
+        EXPECT_EQ(Flat(client.Ask("AT+CPIN?")), state.reply);
+    }
+}
+
+TEST(SimCard, AsksForItsPinAgainAfterPowerWasLost) {
+    ModemSimulator simulator({"--modem", "generic,pin=1234"});
+    EXPECT_EQ(Client(1).Ask("AT+CPIN=1234"), "AT+CPIN=1234\r\r\nOK\r\n");
+    simulator.Unplug("0");
+    simulator.Plug("0");
+    EXPECT_THAT(Client(1).Ask("AT+CPIN?"), testing::HasSubstr("+CPIN: SIM PIN\r\n"));
+}
+
+TEST(PersonalityFile, OfAPersonsOwnAddsToAnotherOne) {
+    WriteFile("/tmp/mine.json", R"({"extends": "12d1", "vendor_id": "19d2", "ports": ["at"],
+        "variables": {"band": "900"},
+        "commands": {"AT+CSQ": null,
+                     "AT+BAND?": {"reply": ["+BAND: {band}", "{imsi}"]},
+                     "AT+BAND=*": {"set": {"band": 2, "operator": "none"}}}})");
+    ModemSimulator simulator({"--modem", "/tmp/mine.json,ports=2"});
+    EXPECT_EQ(ReadFile("/tmp/usbmodem.info0"),
+              "USB_ID_VENDOR=19d2\nCONNECTNODE=\nDEVICENODE=0,1\n");
+    Client client(1);
+    client.Ask("ATE0");
+    EXPECT_EQ(client.Ask("AT+CSQ"), "\r\nERROR\r\n");
+    EXPECT_EQ(client.Ask("AT+BAND=1,\"18 00\""), "\r\nOK\r\n");
+    EXPECT_EQ(client.Ask("AT+BAND?"), "\r\n+BAND: 18 00\r\n001010123456789\r\n\r\nOK\r\n");
+    EXPECT_EQ(client.Ask("AT^CURC?"), "\r\n^CURC: 1\r\n\r\nOK\r\n");
+}
+
+namespace fs = std::filesystem;
+
+using testing::UnorderedElementsAre;
+
+std::vector<std::string> Names(const std::string& folder, const std::string& part) {
+    std::vector<std::string> names;
+    for (const auto& entry : fs::directory_iterator(folder)) {
+        const std::string name = entry.path().filename();
+        if (name.find(part) != std::string::npos) {
+            names.push_back(name);
+        }
+    }
+    return names;
+}
+
+TEST(Plug, WritesAnInfoFilePerModemAndCountsPortsOverAll) {
+    ModemSimulator simulator({"--modem", "2001,id=7", "--modem", "12d1", "--first-port", "3"});
+    EXPECT_EQ(ReadFile("/tmp/usbmodem.info7"),
+              "USB_ID_VENDOR=2001\nCONNECTNODE=5\nDEVICENODE=3,4,5\n");
+    EXPECT_EQ(ReadFile("/tmp/usbmodem.info0"),
+              "USB_ID_VENDOR=12d1\nCONNECTNODE=6\nDEVICENODE=6,7,8\n");
+    EXPECT_THAT(Names("/dev", "ttyUSB"), UnorderedElementsAre("ttyUSB3", "ttyUSB4", "ttyUSB5",
+                                                              "ttyUSB6", "ttyUSB7", "ttyUSB8"));
+    EXPECT_THAT(Names("/tmp", "info"), UnorderedElementsAre("usbmodem.info0", "usbmodem.info7"));
+}
+
+TEST(Plug, UnpluggingHangsClientsUpAndPluggingStartsAfresh) {
+    ModemSimulator simulator({"--modem", "generic", "--modem", "generic"});
+    Client client(1);
+    client.Ask("ATE0");
+    simulator.Unplug("0");
+    EXPECT_EQ(client.ReadUntilQuiet(), "");
+    EXPECT_TRUE(client.IsHungUp());
+    EXPECT_THAT(Names("/dev", "ttyUSB"), UnorderedElementsAre("ttyUSB2", "ttyUSB3"));
+    EXPECT_THAT(Names("/tmp", "info"), UnorderedElementsAre("usbmodem.info1"));
+    EXPECT_EQ(Client(3).Ask("AT"), "AT\r\r\nOK\r\n");
+    simulator.Unplug("0");  // a second time changes nothing
+
+    simulator.Plug("0");
+    EXPECT_EQ(Client(1).Ask("AT"), "AT\r\r\nOK\r\n");
+    EXPECT_TRUE(Exists("/tmp/usbmodem.info0"));
+}
+
+TEST(Plug, NothingStaysBehindAfterASignalOrTheEndOfItsInput) {
+    for (const int signal : {SIGTERM, SIGINT, SIGHUP, 0}) {
+        SCOPED_TRACE(signal);
+        Process simulator(
+            {BuiltProgram("modemsim"), "--link-dir", "/dev", "--info-dir", "/tmp", "--control"});
+        while (simulator.ReadLine() != "ready") {
+            ASSERT_FALSE(simulator.AtEnd());
+        }
+        EXPECT_TRUE(Exists("/tmp/usbmodem.info0"));
+        if (signal == 0) {
+            simulator.CloseInput();
+        } else {
+            simulator.Signal(signal);
+        }
+        EXPECT_EQ(simulator.Wait(), 0);
+        EXPECT_THAT(Names("/dev", "ttyUSB"), UnorderedElementsAre());
+        EXPECT_THAT(Names("/tmp", "info"), UnorderedElementsAre());
+    }
+}
+
+TEST(Plug, AGivenTtyAnswersWithoutLinkAndInfoFileAndItsModemLosesPowerWhenItHangsUp) {
+    ModemSimulator far({"--fault", "0:silent"});  // what is behind the tty's other end
+    fs::create_directory("/tmp/near");
+    ModemSimulator near("/tmp/near", {"--modem", "generic,pin=1234", "--tty", "/dev/ttyUSB1"});
+    EXPECT_TRUE(fs::is_empty("/tmp/near"));
+    const auto answers = [&far](const char* command) {
+        std::vector<std::string> lines;
+        Eventually([&] {  // the echo, and what it says
+            far.Send("0.1", command);
+            std::this_thread::sleep_for(std::chrono::milliseconds(20));
+            return (lines = far.Received("0.1")).size() >= 2;
+        });
+        return lines;
+    };
+    answers("AT+CPIN=1234\r");
+    EXPECT_THAT(answers("AT+CPIN?\r"), testing::Contains("+CPIN: READY"));
+    far.Unplug("0");
+    near.Command("received 0");
+    far.Plug("0");
+    EXPECT_THAT(answers("AT+CPIN?\r"), testing::Contains("+CPIN: SIM PIN"));
+}
+
+}  // namespace
+}  // namespace taviwireless::test
