@@ -4,9 +4,8 @@
 #include "wireless/system/driver_request.h"
 #include "wireless/system/interface.h"
 
-using taviwireless::wireless::DriverResult;
-
 int TAVIWirelessOpmodeSet(int mode) {
+    using namespace taviwireless::wireless;
     const char* name = TAVIWirelessOpmodeStringGet(mode);
     if (mode != WIRELESS_OPMODE_ADHOC && mode != WIRELESS_OPMODE_MANAGED) {
         TAVI_LOG_ERROR("Opmode(%s) isn't supported", name);
@@ -18,16 +17,11 @@ int TAVIWirelessOpmodeSet(int mode) {
     }
     iwreq argument{};
     argument.u.mode = static_cast<unsigned>(mode);
-    switch (taviwireless::wireless::RequestDriver(SIOCSIWMODE, argument)) {
-        case DriverResult::kNoSocket:
-            TAVI_LOG_ERROR("Cannot get socket.");
-            return -1;
-        case DriverResult::kRefused:
-            TAVI_LOG_ERROR("Failed to set opmode[%s] of %s.", name,
-                           taviwireless::wireless::WirelessInterface().c_str());
-            return -1;
-        case DriverResult::kDone:
-            break;
+    const DriverResult result = RequestDriver(SIOCSIWMODE, argument);
+    if (result == DriverResult::kNoSocket) {
+        TAVI_LOG_ERROR("Cannot get socket.");
+    } else if (result == DriverResult::kRefused) {
+        TAVI_LOG_ERROR("Failed to set opmode[%s] of %s.", name, WirelessInterface().c_str());
     }
-    return 0;
+    return result == DriverResult::kDone ? 0 : -1;
 }

@@ -73,7 +73,7 @@ const WirelessNameValue gWirelessOpmodes[WIRELESS_OPMODE_NAMES] = {
 };
 
 const char* TAVIWirelessOpmodeStringGet(int opmode) {
-    // compatible: "Secondeary" is so spelt wherever it was printed; it does not parse back
+    // Compatible with what was printed before: "Secondeary", which does not parse back.
     constexpr const char* kNames[] = {"Auto",     "Ad-Hoc",     "Managed", "Master",
                                       "Repeater", "Secondeary", "Monitor", "Unknown"};
     return taviwireless::wireless::NameOf(kNames, opmode, WIRELESS_OPMODE_UNKNOWN);

@@ -7,9 +7,9 @@
 #include "wireless/system/interface.h"
 #include "wireless/system/link_quality.h"
 
-namespace {
+namespace taviwireless::wireless {
 
-using Quality = std::optional<taviwireless::wireless::LinkQuality>;
+namespace {
 
 constexpr int kSupposedSignal = 70;  // many drivers measure none in ad-hoc mode
 
@@ -26,7 +26,10 @@ void CopyEssid(const char* essid, char* out) {
 
 }  // namespace
 
+}  // namespace taviwireless::wireless
+
 int TAVIWirelessAdhocNetworkGet(WirelessNetwork* out) {
+    using namespace taviwireless::wireless;
     if (out == nullptr) {
         TAVI_LOG_ERROR("Bad parameters");
         return -1;
@@ -34,8 +37,7 @@ int TAVIWirelessAdhocNetworkGet(WirelessNetwork* out) {
     *out = {};
     out->opmode = TAVIWirelessOpmodeGet();
     if (out->opmode != WIRELESS_OPMODE_ADHOC) {
-        TAVI_LOG_ERROR("%s is not Ad-Hoc mode.",
-                       taviwireless::wireless::WirelessInterface().c_str());
+        TAVI_LOG_ERROR("%s is not Ad-Hoc mode.", WirelessInterface().c_str());
         return -1;
     }
     // What the driver refuses to tell stays zero.
@@ -49,7 +51,7 @@ int TAVIWirelessAdhocNetworkGet(WirelessNetwork* out) {
     out->protocol = protocol.value;
     out->auth = keyState.value;  // open without a key, shared with one
     out->encrypt = out->auth == WIRELESS_AUTH_SHARED ? WIRELESS_ENCRYPT_WEP : WIRELESS_ENCRYPT_NONE;
-    const auto quality = TAVI_GUARDED(Quality(), taviwireless::wireless::ReadLinkQuality);
+    const auto quality = TAVI_GUARDED(std::optional<LinkQuality>(), ReadLinkQuality);
     out->signal = quality ? quality->value : kSupposedSignal;
     return 0;
 }

@@ -12,9 +12,9 @@
 #include "wireless/system/guarded.h"
 #include "wireless/system/interface.h"
 
-namespace {
+namespace taviwireless::wireless {
 
-using namespace taviwireless::wireless;
+namespace {
 
 bool AskDriver(unsigned long request, iwreq& argument) {
     return RequestDriver(request, argument) == DriverResult::kDone;
@@ -132,6 +132,8 @@ int Get(int what, void* out) {
 
 }  // namespace
 
+}  // namespace taviwireless::wireless
+
 int TAVIWirelessCurInfoGet(int what, void* out) {
-    return TAVI_GUARDED(-1, [=] { return Get(what, out); });
+    return TAVI_GUARDED(-1, [=] { return taviwireless::wireless::Get(what, out); });
 }

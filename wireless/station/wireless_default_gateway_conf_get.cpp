@@ -11,9 +11,9 @@
 #include "wireless/system/guarded.h"
 #include "wireless/system/interface.h"
 
-namespace {
+namespace taviwireless::wireless {
 
-using namespace taviwireless::wireless;
+namespace {
 
 int Get(char* buf, size_t size) {
     const std::string interface = WirelessInterface();
@@ -42,6 +42,8 @@ int Get(char* buf, size_t size) {
 
 }  // namespace
 
+}  // namespace taviwireless::wireless
+
 int TAVIWirelessDefaultGatewayConfGet_core(char* buf, size_t size) {
-    return TAVI_GUARDED(-1, [=] { return Get(buf, size); });
+    return TAVI_GUARDED(-1, [=] { return taviwireless::wireless::Get(buf, size); });
 }

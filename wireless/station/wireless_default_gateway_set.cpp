@@ -5,9 +5,9 @@
 #include "wireless/system/interface.h"
 #include "wireless/system/shell.h"
 
-namespace {
+namespace taviwireless::wireless {
 
-using namespace taviwireless::wireless;
+namespace {
 
 int Set(const char* gateway) {
     const std::string interface = WirelessInterface();
@@ -22,6 +22,8 @@ int Set(const char* gateway) {
 
 }  // namespace
 
+}  // namespace taviwireless::wireless
+
 int TAVIWirelessDefaultGatewaySet(const char* gateway) {
-    return TAVI_GUARDED(-1, [gateway] { return Set(gateway); });
+    return TAVI_GUARDED(-1, [gateway] { return taviwireless::wireless::Set(gateway); });
 }

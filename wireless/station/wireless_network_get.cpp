@@ -5,9 +5,9 @@
 #include "common/log.h"
 #include "wireless/system/queue.h"
 
-namespace {
+namespace taviwireless::wireless {
 
-using namespace taviwireless::wireless;
+namespace {
 
 bool Matches(const WirelessNetwork& network, const void* key, int keyKind) {
     switch (keyKind) {
@@ -30,7 +30,10 @@ bool Scan(int trigger, OwnedList<WirelessNetwork>& networks) {
 
 }  // namespace
 
+}  // namespace taviwireless::wireless
+
 int TAVIWirelessNetworkGet(const void* key, int keyKind, WirelessNetwork* out) {
+    using namespace taviwireless::wireless;
     if (key == nullptr || out == nullptr) {
         TAVI_LOG_ERROR("Bad parameters");
         return -1;

@@ -18,9 +18,9 @@
 #include "wireless/system/queue.h"
 #include "wireless/system/shell.h"
 
-namespace {
+namespace taviwireless::wireless {
 
-using namespace taviwireless::wireless;
+namespace {
 
 constexpr int kAdapterTries = 6;  // one second apart
 constexpr int kMaxScans = 5;
@@ -167,16 +167,6 @@ int ListNetworks(const char* interface, WirelessLink& networks) {
     return count;
 }
 
-void LogUnusable(int scan, int count) {
-    if (count < 0) {
-        TAVI_LOG_ERROR("Scan %d: failed.", scan);
-    } else if (count == 0) {
-        TAVI_LOG_ERROR("Scan %d: no scan result.", scan);
-    } else {
-        TAVI_LOG_ERROR("Scan %d: result is un-stable.", scan);
-    }
-}
-
 // One scan of a USB adapter often misses some of the networks, so two must agree. What the last
 // one gives is taken as it is.
 int ListUntilStable(const char* interface, WirelessLink& networks) {
@@ -187,7 +177,10 @@ int ListUntilStable(const char* interface, WirelessLink& networks) {
             TAVI_LOG_ERROR("Scan %d: success.", scan);
             return 0;
         }
-        LogUnusable(scan, count);
+        TAVI_LOG_ERROR("Scan %d: %s.", scan,
+                       count < 0    ? "failed"
+                       : count == 0 ? "no scan result"
+                                    : "result is un-stable");
         const bool isLast = scan == kMaxScans - 1;
         if (isLast && count >= 0) {
             return 0;
@@ -228,11 +221,15 @@ int Scan(int trigger, WirelessLink* networks) {
 
 }  // namespace
 
+}  // namespace taviwireless::wireless
+
 int TAVIWirelessNetworkScan(int trigger, WirelessLink* networks) {
+    using namespace taviwireless::wireless;
     if (networks != nullptr) {
         MakeEmpty(*networks);
     }
-    const int result = TAVI_GUARDED(-1, [=] { return Scan(trigger, networks); });
+    const int result =
+        TAVI_GUARDED(-1, [=] { return taviwireless::wireless::Scan(trigger, networks); });
     if (result < 0 && networks != nullptr) {
         FreeMembers<WirelessNetwork>(*networks);
     }

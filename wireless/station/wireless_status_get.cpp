@@ -12,9 +12,9 @@
 #include "wireless/system/guarded.h"
 #include "wireless/system/link_quality.h"
 
-namespace {
+namespace taviwireless::wireless {
 
-using namespace taviwireless::wireless;
+namespace {
 
 // What TAVIWirelessNetworkConnect wrote down of the network that it joined.
 struct ConnectionRecord {
@@ -23,7 +23,7 @@ struct ConnectionRecord {
 };
 
 std::optional<ConnectionRecord> ReadConnectionRecord() {
-    const std::optional<std::string> text = taviwireless::ReadTrusted(kCurrentConnection);
+    const std::optional<std::string> text = ReadTrusted(kCurrentConnection);
     if (!text) {
         return std::nullopt;
     }
@@ -63,7 +63,10 @@ bool FillConnectedNetwork(WirelessNetwork& network) {
 
 }  // namespace
 
+}  // namespace taviwireless::wireless
+
 WirelessStatus* TAVIWirelessStatusGet(WirelessStatus* out) {
+    using namespace taviwireless::wireless;
     if (out == nullptr) {
         TAVI_LOG_ERROR("Bad parameters");
         return nullptr;

@@ -18,14 +18,11 @@ std::optional<LinkQuality> ReadLinkQuality() {
     }
     int value = 0;
     int maximum = 0;
-    switch (fscanf(pipe.get(), " Link Quality=%d/%d", &value, &maximum)) {
-        case 2:
-            return LinkQuality{value, maximum};
-        case 1:
-            return LinkQuality{value, std::nullopt};
-        default:
-            return std::nullopt;
+    const int items = fscanf(pipe.get(), " Link Quality=%d/%d", &value, &maximum);
+    if (items < 1) {
+        return std::nullopt;
     }
+    return LinkQuality{value, items == 2 ? std::make_optional(maximum) : std::nullopt};
 }
 
 }  // namespace taviwireless::wireless
