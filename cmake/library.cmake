@@ -1,6 +1,8 @@
 # libtaviwireless.so.4: the product, linked from the object libraries of its folders.
 add_library(taviwireless SHARED)
-target_link_libraries(taviwireless PRIVATE tavi_common tavi_usbmodem tavi_dbus tavi_wireless)
+target_link_libraries(taviwireless PRIVATE
+  tavi_usbmodem tavi_dbus
+  tavi_wireless_names tavi_wireless_adapter tavi_wireless_station tavi_wireless_access_point)
 target_link_libraries(taviwireless PUBLIC tavi::core tavi::sdk PkgConfig::DBUS)
 target_include_directories(taviwireless PUBLIC
   $<BUILD_INTERFACE:${PROJECT_SOURCE_DIR}/include>

@@ -2,20 +2,17 @@
 
 #include <arpa/inet.h>
 
-#include <algorithm>
 #include <optional>
 
+#include "base/fixed_field.h"
 #include "cli/command_line.h"
 #include "cli/prompt.h"
 #include "cli/report.h"
-#include "cli/wifi/station.h"
 #include "wireless/rules/line_break.h"
 
 namespace taviwireless::cli {
 
 namespace {
-
-constexpr char kDHCP[] = "DHCP";
 
 struct SecurityWord {
     const char* word;
@@ -31,32 +28,6 @@ constexpr SecurityWord kSecurityWords[] = {
     {"wpa-eap", WIRELESS_AUTH_WPA_EAP, WIRELESS_ENCRYPT_TKIP_AES},
     {"wpa2-eap", WIRELESS_AUTH_WPA2_EAP, WIRELESS_ENCRYPT_TKIP_AES},
 };
-
-bool IsHexDigit(char c) {
-    return (c >= '0' && c <= '9') || (c >= 'a' && c <= 'f') || (c >= 'A' && c <= 'F');
-}
-
-bool IsWEPKey(const std::string& key) {
-    const size_t size = key.size();
-    return size == 5 || size == 13 ||
-           ((size == 10 || size == 26) && std::all_of(key.begin(), key.end(), IsHexDigit));
-}
-
-// A password may be UTF-8 text.
-bool IsAllowed(Security security, unsigned char c) {
-    return c >= ' ' && c != 0x7F && (c < 0x80 || security == Security::kEAP);
-}
-
-bool HasForm(Security security, const std::string& key) {
-    switch (security) {
-        case Security::kWEP:
-            return IsWEPKey(key);
-        case Security::kWPA:
-            return key.size() >= 8 && key.size() <= 63;
-        default:
-            return !key.empty() && key.size() < WIRELESS_KEY_SIZE;
-    }
-}
 
 const char* FormOf(Security security) {
     switch (security) {
@@ -95,24 +66,6 @@ std::string ToText(in_addr address) {
 
 }  // namespace
 
-Security SecurityOf(const WirelessNetwork& network) {
-    switch (network.auth) {
-        case WIRELESS_AUTH_WPA_EAP:
-        case WIRELESS_AUTH_WPA2_EAP:
-            return Security::kEAP;
-        case WIRELESS_AUTH_WPA_PSK:
-        case WIRELESS_AUTH_WPA2_PSK:
-            return Security::kWPA;
-        case WIRELESS_AUTH_SHARED:
-        case WIRELESS_AUTH_WEP_AUTO:
-            return Security::kWEP;
-        case WIRELESS_AUTH_OPEN:
-            return network.encrypt == WIRELESS_ENCRYPT_WEP ? Security::kWEP : Security::kOpen;
-        default:
-            return Security::kUnknown;
-    }
-}
-
 const std::vector<std::string>& SecurityWords() {
     static const std::vector<std::string> words = [] {
         std::vector<std::string> all;
@@ -134,9 +87,7 @@ void SetSecurity(WirelessNetwork& network, const std::string& word) {
 }
 
 void CheckKey(Security security, const std::string& key) {
-    const bool isText =
-        std::all_of(key.begin(), key.end(), [security](char c) { return IsAllowed(security, c); });
-    if (!isText || !HasForm(security, key)) {
+    if (!wireless::IsKey(security, key)) {
         throw CommandError(kUsage, std::string(FormOf(security)) + "; nothing was tried");
     }
 }
@@ -172,19 +123,15 @@ void SetStaticAddress(WirelessConf& conf, const std::string& text) {
         throw CommandError(kUsage, "the gateway " + ToText(*gateway) +
                                        " is not in the network of " + ToText(*address));
     }
-    SetField(conf.ipAddr, ToText(*address));
-    SetField(conf.netmask, ToText(*mask));
-    SetField(conf.gateway, gateway ? ToText(*gateway) : "");
+    CopyField(conf.ipAddr, ToText(*address));
+    CopyField(conf.netmask, ToText(*mask));
+    CopyField(conf.gateway, gateway ? ToText(*gateway) : "");
 }
 
 void SetDHCP(WirelessConf& conf) {
-    SetField(conf.ipAddr, kDHCP);
-    SetField(conf.netmask, "");
-    SetField(conf.gateway, "");
-}
-
-bool IsDHCP(const WirelessConf& conf) {
-    return std::string(conf.ipAddr) == kDHCP;
+    CopyField(conf.ipAddr, wireless::kByDHCP);
+    CopyField(conf.netmask, "");
+    CopyField(conf.gateway, "");
 }
 
 }  // namespace taviwireless::cli

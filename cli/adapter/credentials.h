@@ -6,18 +6,14 @@
 #include <string>
 #include <vector>
 
+#include "wireless/rules/dhcp.h"
+#include "wireless/rules/security.h"
+
 namespace taviwireless::cli {
 
-// What a network wants of who joins it.
-enum class Security {
-    kOpen,
-    kWEP,  // a key of fixed length
-    kWPA,  // a pass phrase
-    kEAP,  // user and password
-    kUnknown
-};
-
-Security SecurityOf(const WirelessNetwork& network);
+using wireless::IsDHCP;
+using wireless::Security;
+using wireless::SecurityOf;
 
 // The words of --security, and what a network of that kind has.
 const std::vector<std::string>& SecurityWords();
@@ -36,7 +32,6 @@ std::string ReadKey(Security security, const std::string& essid);
 // "ADDRESS/PREFIX" or "ADDRESS/PREFIX,GATEWAY", IPv4.
 void SetStaticAddress(WirelessConf& conf, const std::string& text);
 void SetDHCP(WirelessConf& conf);
-bool IsDHCP(const WirelessConf& conf);
 
 }  // namespace taviwireless::cli
 

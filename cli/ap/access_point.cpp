@@ -14,10 +14,9 @@
 #include "cli/command_line.h"
 #include "cli/report.h"
 #include "cli/wifi/station.h"
-#include "wireless/rules/ap_files.h"
 #include "wireless/rules/ap_settings.h"
-#include "wireless/rules/bridge_name.h"
 #include "wireless/rules/paths.h"
+#include "wireless/system/bridge.h"
 #include "wireless/system/shell.h"
 
 namespace taviwireless::cli {
@@ -25,20 +24,6 @@ namespace taviwireless::cli {
 namespace {
 
 using wireless::kAPSettings;
-
-// A visitor that gives every field its default.
-struct Defaults {
-    template <typename Key>
-    void Number(const Key&, int32_t& field, int32_t value) const {
-        field = value;
-    }
-    template <typename Key, size_t Size>
-    void Text(const Key&, char (&field)[Size], const std::string& value) const {
-        SetField(field, value);
-    }
-    template <size_t Size>
-    void WriteOnly(const char*, const char (&)[Size]) const {}
-};
 
 // Returns the settings of the plugged adapter, stored or default; nothing where no adapter is
 // named, or where the user may not read the store. A store that cannot be read for another reason
@@ -58,8 +43,7 @@ std::optional<WirelessAPSettings> FindSettings() {
     if (found == 0) {
         // Without a section the guests' part is empty; stored like that, it would take down the
         // barriers that are up by default.
-        const Defaults defaults;
-        wireless::VisitGuestNetwork(defaults, settings);
+        wireless::VisitGuestNetwork(wireless::DefaultSetter(), settings);
     }
     return settings;
 }
@@ -84,8 +68,8 @@ void Store(const WirelessAPSettings& settings) {
 
 // Stores whether the access point is on, and changes nothing else in the file.
 void StoreEnabled(const WirelessAPSettings& settings, const char* yesOrNo) {
-    RequireStored(
-        VEXACFileSetSectionValue(kAPSettings, settings.name, "enable", yesOrNo, "\t%s=%s\n") == 0);
+    RequireStored(VEXACFileSetSectionValue(kAPSettings, settings.name, "enable", yesOrNo,
+                                           wireless::kSectionLine) == 0);
 }
 
 // Settings with which an access point may be served; throws when there are none.
@@ -157,9 +141,9 @@ APStatus LookAtAP() {
 WirelessAPSettings ReadAPSettings() {
     const auto settings = FindSettings();
     if (!settings) {
-        throw CommandError(kFailure,
-                           "there are no settings without an adapter: /tmp/wireless.info does not "
-                           "name its product; plug one in");
+        throw CommandError(kFailure, std::string("there are no settings without an adapter: ") +
+                                         wireless::kAdapterInfo +
+                                         " does not name its product; plug one in");
     }
     return *settings;
 }

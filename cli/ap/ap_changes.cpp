@@ -2,9 +2,9 @@
 
 #include <arpa/inet.h>
 
-#include <algorithm>
 #include <set>
 
+#include "base/fixed_field.h"
 #include "base/join.h"
 #include "cli/adapter/credentials.h"
 #include "cli/ap/radio.h"
@@ -13,13 +13,11 @@
 #include "cli/prompt.h"
 #include "cli/report.h"
 #include "cli/wifi/station.h"
-#include "wireless/rules/bridge_name.h"
+#include "wireless/system/bridge.h"
 
 namespace taviwireless::cli {
 
 namespace {
-
-constexpr char kForGuests[] = "guest-";
 
 // Whether the text can stand in a line of a file.
 bool IsPrintable(const std::string& text) {
@@ -50,55 +48,31 @@ void CheckBridge(const std::string& bridge) {
     }
 }
 
-void SetBridge(WirelessAPConf& conf, APNetwork&, const std::string& value) {
+void SetBridge(APNetwork& network, const std::string& value) {
     CheckBridge(value);
-    SetField(conf.bridge, value);
+    CopyField(network.conf.bridge, value);
 }
 
-void SetBand(WirelessAPConf& conf, APNetwork&, const std::string& value) {
-    SetBandWord(conf, value);
+void SetGuest(APNetwork& network, const std::string& value) {
+    network.conf.guestEnabled = ParseYesNo(value, "guest");
 }
 
-void SetMode(WirelessAPConf& conf, APNetwork&, const std::string& value) {
-    SetModeWord(conf, value);
+void SetIsolate(APNetwork& network, const std::string& value) {
+    network.conf.guestIsolate = ParseYesNo(value, "guest-isolate");
 }
 
-void SetChannel(WirelessAPConf& conf, APNetwork&, const std::string& value) {
-    SetChannelWord(conf, value);
-}
-
-void SetWidth(WirelessAPConf& conf, APNetwork&, const std::string& value) {
-    SetWidthWord(conf, value);
-}
-
-void SetGuest(WirelessAPConf& conf, APNetwork&, const std::string& value) {
-    conf.guestEnabled = ParseYesNo(value, "guest");
-}
-
-void SetIsolate(WirelessAPConf& conf, APNetwork&, const std::string& value) {
-    conf.guestIsolate = ParseYesNo(value, "guest-isolate");
-}
-
-void SetSsid(WirelessAPConf&, APNetwork& network, const std::string& value) {
+void SetSsid(APNetwork& network, const std::string& value) {
     CheckEssid(value);
-    SetField(network.ssid, value);
+    CopyField(network.ssid, value);
 }
 
-void SetHidden(WirelessAPConf&, APNetwork& network, const std::string& value) {
+void SetHidden(APNetwork& network, const std::string& value) {
     network.hidden = ParseYesNo(value, "hidden");
 }
 
-void SetMaxStations(WirelessAPConf&, APNetwork& network, const std::string& value) {
+void SetMaxStations(APNetwork& network, const std::string& value) {
     constexpr int kMostStations = 2007;  // of the numbers that a station may get
     network.maxStations = ParseNumber(value, kMostStations, "max-stations");
-}
-
-void SetNetworkSecurity(WirelessAPConf&, APNetwork& network, const std::string& value) {
-    SetSecurityWord(network, value);
-}
-
-void SetCipher(WirelessAPConf&, APNetwork& network, const std::string& value) {
-    SetCipherWord(network, value);
 }
 
 void RequireSecurity(const APNetwork& network, int security, const char* sentence) {
@@ -107,120 +81,101 @@ void RequireSecurity(const APNetwork& network, int security, const char* sentenc
     }
 }
 
-void SetPassphrase(WirelessAPConf&, APNetwork& network, const std::string& value) {
+void SetPassphrase(APNetwork& network, const std::string& value) {
     RequireSecurity(network, WIRELESS_AP_WPA,
                     "a passphrase needs the security wpa, wpa2 or wpa-mixed");
     CheckKey(Security::kWPA, value);
-    SetField(network.secret.wpa.passphrase, value);
+    CopyField(network.secret.wpa.passphrase, value);
 }
 
-void SetWEPKey(WirelessAPConf&, APNetwork& network, const std::string& value) {
+void SetWEPKey(APNetwork& network, const std::string& value) {
     RequireSecurity(network, WIRELESS_AP_WEP, "a WEP key needs the security wep");
     CheckKey(Security::kWEP, value);
-    SetField(network.secret.wepKey, value);
+    CopyField(network.secret.wepKey, value);
 }
 
 constexpr char kNeedsEAP[] =
     "a RADIUS server needs the security wpa-eap, wpa2-eap or wpa-mixed-eap";
 
-void SetRadiusServer(WirelessAPConf&, APNetwork& network, const std::string& value) {
+void SetRadiusServer(APNetwork& network, const std::string& value) {
     RequireSecurity(network, WIRELESS_AP_WPA_ENTERPRISE, kNeedsEAP);
     in_addr address{};
     if (inet_pton(AF_INET, value.c_str(), &address) != 1) {
         throw CommandError(kUsage, "radius-server is an IPv4 address");
     }
-    SetField(network.secret.enterprise.radiusAddr, value);
+    CopyField(network.secret.enterprise.radiusAddr, value);
 }
 
-void SetRadiusPort(WirelessAPConf&, APNetwork& network, const std::string& value) {
+void SetRadiusPort(APNetwork& network, const std::string& value) {
     RequireSecurity(network, WIRELESS_AP_WPA_ENTERPRISE, kNeedsEAP);
     network.secret.enterprise.radiusPort = ParseNumber(value, 65535, "radius-port");
 }
 
-void SetRadiusSecret(WirelessAPConf&, APNetwork& network, const std::string& value) {
+void SetRadiusSecret(APNetwork& network, const std::string& value) {
     RequireSecurity(network, WIRELESS_AP_WPA_ENTERPRISE, kNeedsEAP);
     if (value.empty() || value.size() >= WIRELESS_AP_PASSPHRASE_SIZE || !IsPrintable(value)) {
         throw CommandError(kUsage, "radius-secret has 1 to 255 printable characters");
     }
-    SetField(network.secret.enterprise.radiusSecret, value);
+    CopyField(network.secret.enterprise.radiusSecret, value);
 }
-
-enum class Scope { kMain, kGuests, kBoth };
 
 struct Setting {
     const char* key;
-    Scope scope;
+    bool isForGuests;
     bool isSecret;
-    void (*set)(WirelessAPConf&, APNetwork&, const std::string&);
+    void (*set)(APNetwork&, const std::string&);
 };
 // In the order in which they are set: what a setting depends on stands above it.
 constexpr Setting kSettings[] = {
-    {"bridge", Scope::kMain, false, SetBridge},
-    {"band", Scope::kMain, false, SetBand},
-    {"mode", Scope::kMain, false, SetMode},
-    {"channel", Scope::kMain, false, SetChannel},
-    {"width", Scope::kMain, false, SetWidth},
-    {"guest", Scope::kMain, false, SetGuest},
-    {"isolate", Scope::kGuests, false, SetIsolate},
-    {"ssid", Scope::kBoth, false, SetSsid},
-    {"hidden", Scope::kBoth, false, SetHidden},
-    {"max-stations", Scope::kBoth, false, SetMaxStations},
-    {"security", Scope::kBoth, false, SetNetworkSecurity},
-    {"cipher", Scope::kBoth, false, SetCipher},
-    {"passphrase", Scope::kBoth, true, SetPassphrase},
-    {"wep-key", Scope::kBoth, true, SetWEPKey},
-    {"radius-server", Scope::kMain, false, SetRadiusServer},
-    {"radius-port", Scope::kMain, false, SetRadiusPort},
-    {"radius-secret", Scope::kMain, true, SetRadiusSecret},
+    {"bridge", false, false, SetBridge},
+    {"band", false, false, SetBandWord},
+    {"mode", false, false, SetModeWord},
+    {"channel", false, false, SetChannelWord},
+    {"width", false, false, SetWidthWord},
+    {"guest", false, false, SetGuest},
+    {"ssid", false, false, SetSsid},
+    {"hidden", false, false, SetHidden},
+    {"max-stations", false, false, SetMaxStations},
+    {"security", false, false, SetSecurityWord},
+    {"cipher", false, false, SetCipherWord},
+    {"passphrase", false, true, SetPassphrase},
+    {"wep-key", false, true, SetWEPKey},
+    {"radius-server", false, false, SetRadiusServer},
+    {"radius-port", false, false, SetRadiusPort},
+    {"radius-secret", false, true, SetRadiusSecret},
+    {"guest-isolate", true, false, SetIsolate},
+    {"guest-ssid", true, false, SetSsid},
+    {"guest-hidden", true, false, SetHidden},
+    {"guest-max-stations", true, false, SetMaxStations},
+    {"guest-security", true, false, SetSecurityWord},
+    {"guest-cipher", true, false, SetCipherWord},
+    {"guest-passphrase", true, true, SetPassphrase},
+    {"guest-wep-key", true, true, SetWEPKey},
 };
 
-struct Key {
-    std::string name;
-    const Setting* setting;
-    bool isForGuests;
-};
-
-const std::vector<Key>& Keys() {
-    static const std::vector<Key> keys = [] {
-        std::vector<Key> all;
-        for (const Setting& setting : kSettings) {
-            if (setting.scope != Scope::kGuests) {
-                all.push_back({setting.key, &setting, false});
-            }
+const Setting& FindSetting(const std::string& key) {
+    for (const Setting& setting : kSettings) {
+        if (key == setting.key) {
+            return setting;
         }
-        for (const Setting& setting : kSettings) {
-            if (setting.scope != Scope::kMain) {
-                all.push_back({std::string(kForGuests) + setting.key, &setting, true});
-            }
-        }
-        return all;
-    }();
-    return keys;
-}
-
-const Key& FindKey(const std::string& name) {
-    const auto found = std::find_if(Keys().begin(), Keys().end(),
-                                    [&](const Key& key) { return key.name == name; });
-    if (found == Keys().end()) {
-        throw CommandError(kUsage, "an access point has no setting " + Printable(name) +
-                                       "; there are " + APSettingNames());
     }
-    return *found;
+    throw CommandError(kUsage, "an access point has no setting " + Printable(key) + "; there are " +
+                                   APSettingNames());
 }
 
-void CheckForm(const Key& key, bool hasValue) {
-    if (key.setting->isSecret && hasValue) {
-        throw CommandError(kUsage, key.name +
+void CheckForm(const std::string& key, bool isSecret, bool hasValue) {
+    if (isSecret && hasValue) {
+        throw CommandError(kUsage, key +
                                        " is read from standard input, where nobody else "
                                        "sees it; give it without a value");
     }
-    if (!key.setting->isSecret && !hasValue) {
-        throw CommandError(kUsage, key.name + " needs a value: " + key.name + "=VALUE");
+    if (!isSecret && !hasValue) {
+        throw CommandError(kUsage, key + " needs a value: " + key + "=VALUE");
     }
 }
 
 void CheckSecret(const APNetwork& network) {
-    const std::string prefix = network.isForGuests ? kForGuests : "";
+    const std::string prefix = network.isForGuests ? "guest-" : "";
     const auto require = [&](const char* text, const char* key) {
         if (text[0] == '\0') {
             throw CommandError(
@@ -254,8 +209,8 @@ void CheckNetwork(const APNetwork& network) {
 
 std::string APSettingNames() {
     std::string names;
-    for (const Key& key : Keys()) {
-        AddItem(names, key.name);
+    for (const Setting& setting : kSettings) {
+        AddItem(names, setting.key);
     }
     return names;
 }
@@ -265,15 +220,16 @@ std::vector<APChange> ReadAPChanges(const std::vector<std::string>& texts) {
     std::set<std::string> names;
     for (const std::string& text : texts) {
         const size_t equals = text.find('=');
-        const Key& key = FindKey(text.substr(0, equals));
-        CheckForm(key, equals != std::string::npos);
-        if (!names.insert(key.name).second) {
-            throw CommandError(kUsage, key.name + " is given twice");
+        const std::string key = text.substr(0, equals);
+        const bool isSecret = FindSetting(key).isSecret;
+        CheckForm(key, isSecret, equals != std::string::npos);
+        if (!names.insert(key).second) {
+            throw CommandError(kUsage, key + " is given twice");
         }
-        changes.push_back({key.name, key.setting->isSecret ? "" : text.substr(equals + 1)});
+        changes.push_back({key, isSecret ? "" : text.substr(equals + 1)});
     }
     for (APChange& change : changes) {
-        if (FindKey(change.key).setting->isSecret) {
+        if (FindSetting(change.key).isSecret) {
             change.value = ReadNewSecret("New " + change.key);
         }
     }
@@ -281,11 +237,11 @@ std::vector<APChange> ReadAPChanges(const std::vector<std::string>& texts) {
 }
 
 void ApplyAPChanges(const std::vector<APChange>& changes, WirelessAPConf& conf) {
-    for (const Key& key : Keys()) {
-        APNetwork network = key.isForGuests ? GuestNetwork(conf) : MainNetwork(conf);
+    for (const Setting& setting : kSettings) {
+        APNetwork network = setting.isForGuests ? GuestNetwork(conf) : MainNetwork(conf);
         for (const APChange& change : changes) {
-            if (change.key == key.name) {
-                key.setting->set(conf, network, change.value);
+            if (change.key == setting.key) {
+                setting.set(network, change.value);
             }
         }
     }

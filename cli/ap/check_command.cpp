@@ -14,8 +14,9 @@
 #include "cli/ap/ap_commands.h"
 #include "cli/report.h"
 #include "cli/wifi/station.h"
-#include "wireless/rules/ap_files.h"
 #include "wireless/rules/hostapd_conf.h"
+#include "wireless/rules/paths.h"
+#include "wireless/system/guest_network.h"
 #include "wireless/system/shell.h"
 
 namespace taviwireless::cli {
@@ -28,33 +29,23 @@ constexpr char kStopper[] = "taviwireless_only_checks";
 
 struct ConfFile {
     std::string path;
-    std::string text;
+    wireless::HostapdConf conf;
 };
+
+// What may be shown of the file.
+const std::string& Shown(const ConfFile& file, bool showSecrets) {
+    return showSecrets ? file.conf.Text() : file.conf.Shown();
+}
 
 // The files with which the access point would be started.
 std::vector<ConfFile> Render(const WirelessAPConf& conf) {
     const std::string interface = TAVIWirelessAPInterfaceGet();
     std::vector<ConfFile> files{
-        {wireless::HostapdHostConf(interface), wireless::RenderHostConf(interface, conf).Text()}};
+        {wireless::HostapdHostConf(interface), wireless::RenderHostConf(interface, conf)}};
     if (wireless::OffersGuestNetwork() && conf.guestEnabled != 0) {
-        files.push_back(
-            {wireless::HostapdGuestConf(interface), wireless::RenderGuestConf(conf).Text()});
+        files.push_back({wireless::HostapdGuestConf(interface), wireless::RenderGuestConf(conf)});
     }
     return files;
-}
-
-std::string HideSecrets(const std::string& text) {
-    std::istringstream lines(text);
-    std::string hidden;
-    for (std::string line; std::getline(lines, line);) {
-        for (const char* key : {"wpa_passphrase=", "wep_key0=", "auth_server_shared_secret="}) {
-            if (line.rfind(key, 0) == 0) {
-                line = key + std::string("********");
-            }
-        }
-        hidden += line + "\n";
-    }
-    return hidden;
 }
 
 // For programs that are started.
@@ -102,7 +93,7 @@ std::string Join(const std::vector<std::string>& texts) {
 Verdict CheckWithHostapd(const std::vector<ConfFile>& files) {
     std::string text;
     for (const ConfFile& file : files) {
-        text += file.text;
+        text += file.conf.Text();
     }
     // The network script leaves this line out as well; the BSSID of guests is not read from the
     // settings, and hostapd derives one.
@@ -121,11 +112,11 @@ Verdict CheckWithHostapd(const std::vector<ConfFile>& files) {
     return verdict;
 }
 
-Json::Value ToJson(const std::vector<ConfFile>& files, const Verdict& verdict) {
+Json::Value ToJson(const std::vector<ConfFile>& files, const Verdict& verdict, bool showSecrets) {
     Json::Value document;
     document["files"] = Json::Value(Json::objectValue);
     for (const ConfFile& file : files) {
-        document["files"][file.path] = file.text;
+        document["files"][file.path] = Shown(file, showSecrets);
     }
     document["remarks"] = Json::Value(Json::arrayValue);
     for (const std::string& remark : verdict.remarks) {
@@ -140,14 +131,10 @@ void CheckAP(const Options& options) {
     RequireWifiSettings();
     const WirelessAPSettings settings = ReadAPSettings();
     const std::vector<ConfFile> files = Render(settings.ap);
-    std::vector<ConfFile> shown = files;
-    for (ConfFile& file : shown) {
-        file.text = options.showSecrets ? file.text : HideSecrets(file.text);
-    }
     if (!options.json) {
-        for (const ConfFile& file : shown) {
+        for (const ConfFile& file : files) {
             // Line by line: the line breaks belong to the file and stay.
-            std::istringstream lines(file.text);
+            std::istringstream lines(Shown(file, options.showSecrets));
             std::cout << "# " << file.path << '\n';
             for (std::string line; std::getline(lines, line);) {
                 std::cout << Printable(line) << '\n';
@@ -158,7 +145,7 @@ void CheckAP(const Options& options) {
     CheckAPConf(settings.ap);
     const Verdict verdict = CheckWithHostapd(files);
     if (options.json) {
-        return Print(ToJson(shown, verdict));
+        return Print(ToJson(files, verdict, options.showSecrets));
     }
     for (const std::string& remark : verdict.remarks) {
         std::cout << "hostapd: " << remark << '\n';

@@ -1,35 +1,17 @@
 #include "cli/ap/dry_run.h"
 
-#include <tavisdk/bridge.h>
-
 #include <cstdio>
 #include <cstring>
-#include <memory>
-#include <sstream>
 
 #include "cli/command_line.h"
+#include "wireless/rules/bridge_names.h"
+#include "wireless/rules/paths.h"
+#include "wireless/system/bridge.h"
+#include "wireless/system/shell.h"
 
 namespace taviwireless::cli {
 
 namespace {
-
-// The bridge as it is stored, or as the library makes one.
-struct Bridge {
-    bool isLocal;
-    std::string member, address;  // of one that is not stored
-};
-
-Bridge BridgeOf(const char* name) {
-    TAVINetBridge config;
-    TAVINetBridgeMember member;
-    if (TAVINetGetBridgeConfig(name, &config, &member) >= 0) {
-        return {config.isLocal != 0, "", ""};
-    }
-    if (strcmp(name, "lbr0") == 0) {
-        return {true, "", "10.1.14.1/24"};
-    }
-    return {false, "eth0", ""};
-}
 
 // Whether there will be a DHCP server: a server that its owner has switched off stays off.
 bool ServesLeases(const char* bridge) {
@@ -37,42 +19,37 @@ bool ServesLeases(const char* bridge) {
     return TAVINetGetDhcpServerConf(bridge, bridge, &server) < 0 || server.enabled != 0;
 }
 
-// The text as one word for the shell.
-std::string Quoted(std::string text) {
-    for (size_t place = 0; (place = text.find('\'', place)) != text.npos; place += 4) {
-        text.replace(place, 1, "'\\''");
-    }
-    return " '" + text + '\'';
-}
-
-std::string YesNo(bool value) {
+const char* YesNo(bool value) {
     return value ? "yes" : "no";
 }
 
 }  // namespace
 
 std::vector<std::string> PlanOfEnabling(const WirelessAPConf& conf) {
-    const Bridge bridge = BridgeOf(conf.bridge);
-    std::string command = "/etc/rc.network --dry-run enable";
-    for (const std::string& word :
-         {std::string(TAVIWirelessAPInterfaceGet()), std::string(conf.bridge),
-          YesNo(conf.guestEnabled != 0), bridge.member, bridge.address,
-          YesNo(bridge.isLocal && ServesLeases(conf.bridge))}) {
-        command += Quoted(word);
-    }
-    FILE* output = popen((command + " 2>&1").c_str(), "r");
-    if (output == nullptr) {
-        throw CommandError(kFailure, "cannot run /etc/rc.network");
-    }
+    const char* interface = TAVIWirelessAPInterfaceGet();
+    const auto stored = wireless::StoredBridge(conf.bridge);
+    const wireless::Bridge bridge = stored.value_or(wireless::NewBridge(interface, conf.bridge));
+    const bool isLocal = bridge.config.isLocal != 0;
+    // What a bridge that is still to be made gets; the access point is a member of any.
+    const std::string member = stored || isLocal ? "" : bridge.member.interface;
+    const std::string address =
+        stored || !isLocal ? "" : std::string(bridge.config.address) + wireless::kLocalPrefix;
+    wireless::Pipe output(wireless::Command(
+        512,
+        {wireless::kNetworkScript, " --dry-run enable ", interface, " ",
+         wireless::Argument{conf.bridge}, " ", YesNo(conf.guestEnabled != 0), " '", member.c_str(),
+         "' '", address.c_str(), "' ", YesNo(isLocal && ServesLeases(conf.bridge)), " 2>&1"}));
     std::vector<std::string> lines;
     char line[512];
-    while (fgets(line, sizeof line, output) != nullptr) {
+    while (output && fgets(line, sizeof line, output.get()) != nullptr) {
         line[strcspn(line, "\n")] = '\0';
         lines.emplace_back(line);
     }
-    if (pclose(output) != 0) {
-        throw CommandError(kFailure, "the access point cannot be switched on: " +
-                                         (lines.empty() ? "/etc/rc.network fails" : lines.back()));
+    if (output.Close() != 0) {
+        throw CommandError(
+            kFailure,
+            "the access point cannot be switched on: " +
+                (lines.empty() ? wireless::kNetworkScript + std::string(" fails") : lines.back()));
     }
     return lines;
 }

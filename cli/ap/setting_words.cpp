@@ -3,6 +3,8 @@
 #include "base/join.h"
 #include "cli/command_line.h"
 #include "cli/report.h"
+#include "wireless/rules/ap_settings.h"
+#include "wireless/rules/radio.h"
 
 namespace taviwireless::cli {
 
@@ -61,38 +63,27 @@ const Row& Find(const Row (&rows)[Count], const std::string& word, const char* w
         kUsage, std::string(what) + " cannot be " + Printable(word) + "; it is one of " + words);
 }
 
-// Null where the security has no ciphers.
-int32_t* CipherOf(const APNetwork& network) {
+// Nulls where the security is not WPA, of either kind.
+struct WPA {
+    int32_t* version;
+    int32_t* cipher;
+};
+WPA WPAOf(const APNetwork& network) {
+    WirelessAPSecret& secret = network.secret;
     switch (network.security) {
         case WIRELESS_AP_WPA:
-            return &network.secret.wpa.cipher;
+            return {&secret.wpa.wpaVersion, &secret.wpa.cipher};
         case WIRELESS_AP_WPA_ENTERPRISE:
-            return &network.secret.enterprise.cipher;
+            return {&secret.enterprise.wpaVersion, &secret.enterprise.cipher};
         default:
-            return nullptr;
+            return {};
     }
-}
-
-int32_t* WPAVersionOf(const APNetwork& network) {
-    switch (network.security) {
-        case WIRELESS_AP_WPA:
-            return &network.secret.wpa.wpaVersion;
-        case WIRELESS_AP_WPA_ENTERPRISE:
-            return &network.secret.enterprise.wpaVersion;
-        default:
-            return nullptr;
-    }
-}
-
-// As hostapd's file will have it: with 802.11n, "n only" counts unless it is the only bit.
-int32_t EffectiveBand(const WirelessAPConf& conf) {
-    constexpr int32_t kLegacy = WIRELESS_AP_A | WIRELESS_AP_B | WIRELESS_AP_G;
-    return Is80211n(conf) && conf.band != WIRELESS_AP_N_ONLY ? conf.band & kLegacy : conf.band;
 }
 
 const Mode* ModeOf(const WirelessAPConf& conf) {
     for (const Mode& mode : kModes) {
-        if (mode.band == EffectiveBand(conf) && (mode.ieee80211n != 0) == Is80211n(conf)) {
+        if (mode.band == wireless::BandInUse(conf) &&
+            (mode.ieee80211n != 0) == wireless::Is80211n(conf)) {
             return &mode;
         }
     }
@@ -102,20 +93,21 @@ const Mode* ModeOf(const WirelessAPConf& conf) {
 }  // namespace
 
 APNetwork MainNetwork(WirelessAPConf& conf) {
-    return {conf.ssid, conf.hidden, conf.maxStations, conf.security, conf.secret, false};
+    return {conf, conf.ssid, conf.hidden, conf.maxStations, conf.security, conf.secret, false};
 }
 
 APNetwork GuestNetwork(WirelessAPConf& conf) {
-    return {conf.guestSsid,     conf.guestHidden, conf.guestMaxStations,
-            conf.guestSecurity, conf.guestSecret, true};
-}
-
-bool IsWPA(const APNetwork& network) {
-    return CipherOf(network) != nullptr;
+    return {conf,
+            conf.guestSsid,
+            conf.guestHidden,
+            conf.guestMaxStations,
+            conf.guestSecurity,
+            conf.guestSecret,
+            true};
 }
 
 std::string SecurityWord(const APNetwork& network) {
-    const int32_t* version = WPAVersionOf(network);
+    const int32_t* version = WPAOf(network).version;
     for (const Kind& kind : kKinds) {
         if (kind.security == network.security && (!version || kind.wpaVersion == *version)) {
             return kind.word;
@@ -125,27 +117,21 @@ std::string SecurityWord(const APNetwork& network) {
 }
 
 void SetSecurityWord(APNetwork& network, const std::string& word) {
-    constexpr int32_t kRadiusPort = 1812;
     const Kind& kind = Find(kKinds, word, "security", [&](const Kind& known) {
         return !network.isForGuests || known.security != WIRELESS_AP_WPA_ENTERPRISE;
     });
     if (kind.security != network.security) {
         network.security = kind.security;
         network.secret = {};
-        if (IsWPA(network)) {
-            *CipherOf(network) = WIRELESS_AP_CCMP;
-        }
-        if (kind.security == WIRELESS_AP_WPA_ENTERPRISE) {
-            network.secret.enterprise.radiusPort = kRadiusPort;
-        }
+        wireless::VisitSecret(wireless::DefaultSetter(), "", kind.security, network.secret);
     }
-    if (int32_t* version = WPAVersionOf(network)) {
+    if (int32_t* version = WPAOf(network).version) {
         *version = kind.wpaVersion;
     }
 }
 
 std::string CipherWord(const APNetwork& network) {
-    const int32_t* cipher = CipherOf(network);
+    const int32_t* cipher = WPAOf(network).cipher;
     for (const Cipher& known : kCiphers) {
         if (cipher != nullptr && known.cipher == *cipher) {
             return known.word;
@@ -156,14 +142,11 @@ std::string CipherWord(const APNetwork& network) {
 
 void SetCipherWord(APNetwork& network, const std::string& word) {
     const Cipher& known = Find(kCiphers, word, "cipher", [](const Cipher&) { return true; });
-    if (!IsWPA(network)) {
+    int32_t* cipher = WPAOf(network).cipher;
+    if (cipher == nullptr) {
         throw CommandError(kUsage, "a cipher needs one of the kinds of security with wpa");
     }
-    *CipherOf(network) = known.cipher;
-}
-
-bool Is80211n(const WirelessAPConf& conf) {
-    return conf.ieee80211n > 0;
+    *cipher = known.cipher;
 }
 
 std::string ModeWord(const WirelessAPConf& conf) {
@@ -171,23 +154,23 @@ std::string ModeWord(const WirelessAPConf& conf) {
     return mode == nullptr ? "" : mode->word;
 }
 
-void SetModeWord(WirelessAPConf& conf, const std::string& word) {
+void SetModeWord(APNetwork& network, const std::string& word) {
     const Mode& mode = Find(kModes, word, "mode", [](const Mode&) { return true; });
-    conf.band = mode.band;
-    conf.ieee80211n = mode.ieee80211n;
+    network.conf.band = mode.band;
+    network.conf.ieee80211n = mode.ieee80211n;
 }
 
 std::string BandWord(const WirelessAPConf& conf) {
-    return EffectiveBand(conf) == WIRELESS_AP_A ? "5" : "2.4";
+    return wireless::BandInUse(conf) == WIRELESS_AP_A ? "5" : "2.4";
 }
 
-void SetBandWord(WirelessAPConf& conf, const std::string& word) {
+void SetBandWord(APNetwork& network, const std::string& word) {
     if (word != "2.4" && word != "5") {
         throw CommandError(kUsage, "band is 2.4 or 5 (GHz)");
     }
-    if (word != BandWord(conf)) {
-        const Mode* mode = ModeOf(conf);
-        SetModeWord(conf, mode != nullptr ? mode->inOtherBand : word == "5" ? "an" : "bgn");
+    if (word != BandWord(network.conf)) {
+        const Mode* mode = ModeOf(network.conf);
+        SetModeWord(network, mode != nullptr ? mode->inOtherBand : word == "5" ? "an" : "bgn");
     }
 }
 

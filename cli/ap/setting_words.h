@@ -7,8 +7,9 @@
 
 namespace taviwireless::cli {
 
-// One of the two networks of an access point, in a record that outlives it.
+// One of the two networks of an access point, in its record, which outlives it.
 struct APNetwork {
+    WirelessAPConf& conf;
     char (&ssid)[WIRELESS_AP_SSID_SIZE];
     int32_t& hidden;
     int32_t& maxStations;
@@ -26,7 +27,6 @@ APNetwork GuestNetwork(WirelessAPConf& conf);
 // "open", "wpa2" ... A kind of security that the network did not have begins without a secret.
 std::string SecurityWord(const APNetwork& network);
 void SetSecurityWord(APNetwork& network, const std::string& word);
-bool IsWPA(const APNetwork& network);  // of either kind
 
 // "tkip", "aes", "both"; of WPA only.
 std::string CipherWord(const APNetwork& network);
@@ -34,12 +34,11 @@ void SetCipherWord(APNetwork& network, const std::string& word);
 
 // "bgn" ...: the protocols of the stations that are let in.
 std::string ModeWord(const WirelessAPConf& conf);
-void SetModeWord(WirelessAPConf& conf, const std::string& word);
-bool Is80211n(const WirelessAPConf& conf);
+void SetModeWord(APNetwork& network, const std::string& word);
 
 // "2.4" or "5", GHz. Another band keeps what it can of the mode.
 std::string BandWord(const WirelessAPConf& conf);
-void SetBandWord(WirelessAPConf& conf, const std::string& word);
+void SetBandWord(APNetwork& network, const std::string& word);
 
 }  // namespace taviwireless::cli
 

@@ -7,6 +7,7 @@
 #include "cli/ap/ap_report.h"
 #include "cli/ap/setting_words.h"
 #include "cli/wifi/station.h"
+#include "wireless/rules/paths.h"
 
 namespace taviwireless::cli {
 
@@ -16,8 +17,9 @@ void RequireAPSupport() {
     RequireWifiSettings();
     if (TAVIWirelessAPIsSupported() != 1) {
         throw CommandError(kFailure,
-                           "there is no adapter that can be an access point: none is plugged in, "
-                           "or /tmp/wireless.info does not say AP_SUPPORT=yes");
+                           std::string("there is no adapter that can be an access point: none is "
+                                       "plugged in, or ") +
+                               wireless::kAdapterInfo + " does not say AP_SUPPORT=yes");
     }
 }
 

@@ -4,10 +4,12 @@
 
 #include <iostream>
 
+#include "base/fixed_field.h"
 #include "cli/adapter/credentials.h"
 #include "cli/wifi/station.h"
 #include "cli/wifi/wifi_commands.h"
 #include "cli/wifi/wifi_report.h"
+#include "wireless/rules/paths.h"
 
 namespace taviwireless::cli {
 
@@ -86,13 +88,13 @@ void CreateAdhoc(const Options& options) {
     RequireAdapter();
     RequireRadio();
     WirelessConf conf{};
-    SetField(conf.network.essid, options.network);
+    CopyField(conf.network.essid, options.network);
     conf.network.opmode = WIRELESS_OPMODE_ADHOC;
     SetSecurity(conf.network, options.wep ? "wep" : "open");
     if (options.wep) {
         const std::string key = ReadKey(Security::kWEP, options.network);
         CheckOneWord(key, "the key");
-        SetField(conf.key, key);
+        CopyField(conf.key, key);
     }
     LeaveNetwork();
     ShowProgress("Creating " + Printable(options.network) + " ...");
@@ -109,9 +111,8 @@ void ChangeWifiMode(const Options& options) {
     RequireWifiSettings();
     ShowProgress("Changing the mode ...");
     if (TAVIWirelessModeChange(options.mode == "ap" ? kAccessPoint : kClient) == 0) {
-        throw CommandError(kFailure,
-                           "the mode of the adapter could not be changed: "
-                           "/usr/tavi/hotplug/usb.wireless.function failed or is not there");
+        throw CommandError(kFailure, std::string("the mode of the adapter could not be changed: ") +
+                                         wireless::kHotplugScript + " failed or is not there");
     }
     ReportWifi(options);
 }

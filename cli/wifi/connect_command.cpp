@@ -4,6 +4,7 @@
 #include <algorithm>
 #include <optional>
 
+#include "base/fixed_field.h"
 #include "cli/adapter/credentials.h"
 #include "cli/wifi/station.h"
 #include "cli/wifi/wifi_commands.h"
@@ -60,7 +61,7 @@ class Joining {
 
     WirelessNetwork HiddenNetwork() const {
         WirelessNetwork network{};
-        SetField(network.essid, options_.network);
+        CopyField(network.essid, options_.network);
         if (!options_.security.empty()) {
             SetSecurity(network, options_.security);
             return network;
@@ -87,7 +88,7 @@ class Joining {
         DescribeUser(conf, security);
         isSavedKey_ = saved && HasUsableKey(*saved);
         if (security != Security::kOpen && !isSavedKey_) {
-            SetField(conf.key, ReadKey(security, options_.network));
+            CopyField(conf.key, ReadKey(security, options_.network));
         }
         return conf;
     }
@@ -108,7 +109,7 @@ class Joining {
 
     void DescribeUser(WirelessConf& conf, Security security) const {
         if (!options_.user.empty()) {
-            SetField(conf.user, options_.user);
+            CopyField(conf.user, options_.user);
         }
         if (security == Security::kEAP && conf.user[0] == '\0') {
             throw CommandError(kUsage, name_ + " wants a user name; add --user NAME");

@@ -11,8 +11,8 @@
 #include "wireless/rules/line_break.h"
 #include "wireless/rules/paths.h"
 #include "wireless/system/driver_request.h"
+#include "wireless/system/files.h"
 #include "wireless/system/interface.h"
-#include "wireless/system/is_missing.h"
 
 namespace taviwireless::cli {
 
@@ -47,9 +47,9 @@ std::string WifiInterface() {
 
 void RequireWifiSupport() {
     if (TAVIWirelessIsSupported() == 0) {
-        throw CommandError(kFailure,
-                           "this model does not support Wi-Fi: /etc.defaults/taviinfo.conf does "
-                           "not say support_wireless=yes");
+        throw CommandError(kFailure, std::string("this model does not support Wi-Fi: ") +
+                                         wireless::kModelInfo +
+                                         " does not say support_wireless=yes");
     }
 }
 
@@ -71,14 +71,15 @@ void RequireRadio() {
     const int mayBeUsed = TAVIWirelessCheckBlock();
     if (mayBeUsed == 0) {
         throw CommandError(kFailure,
-                           "the radio is switched off: unblock=no is set for this adapter in "
-                           "/usr/tavi/etc/wireless_ap.conf");
+                           std::string("the radio is switched off: unblock=no is set for this "
+                                       "adapter in ") +
+                               wireless::kAPSettings);
     }
     if (mayBeUsed < 0) {
-        throw CommandError(kFailure,
-                           "cannot tell whether the radio may be used: /tmp/wireless.info does not "
-                           "name the adapter, or its section in /usr/tavi/etc/wireless_ap.conf has "
-                           "no unblock");
+        throw CommandError(kFailure, std::string("cannot tell whether the radio may be used: ") +
+                                         wireless::kAdapterInfo +
+                                         " does not name the adapter, or its section in " +
+                                         wireless::kAPSettings + " has no unblock");
     }
 }
 

@@ -51,12 +51,6 @@ void EndConnection();
 // the old connection would stay.
 void LeaveNetwork();
 
-// Sets a text of a record; what does not fit is cut off.
-template <size_t Size>
-void SetField(char (&field)[Size], const std::string& text) {
-    field[text.copy(field, Size - 1)] = '\0';
-}
-
 }  // namespace taviwireless::cli
 
 #endif

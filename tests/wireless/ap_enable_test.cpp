@@ -9,7 +9,7 @@
 #include "tests/support/log_capture.h"
 #include "tests/support/sleep_capture.h"
 #include "tests/wireless/wifi_fixture.h"
-#include "wireless/rules/dhcp_range.h"
+#include "wireless/rules/dhcp.h"
 
 namespace {
 

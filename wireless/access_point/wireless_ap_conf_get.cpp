@@ -2,16 +2,16 @@
 #include <tavicore/section.h>
 #include <taviwireless/wireless.h>
 
-#include <cstdio>
 #include <cstdlib>
 #include <cstring>
 
+#include "base/fixed_field.h"
 #include "common/log.h"
 #include "common/sz_hash.h"
 #include "wireless/rules/ap_settings.h"
 #include "wireless/rules/paths.h"
+#include "wireless/system/files.h"
 #include "wireless/system/guarded.h"
-#include "wireless/system/is_missing.h"
 
 namespace taviwireless::wireless {
 
@@ -33,9 +33,7 @@ class Reader {
     template <size_t kSize>
     void Text(const std::string& key, char (&field)[kSize], const std::string& otherwise) const {
         const char* value = values_[key.c_str()];
-        const std::string text = value != nullptr ? value : otherwise;
-        memset(field, 0, kSize);  // a longer default may have stood there
-        text.copy(field, kSize - 1);
+        CopyField(field, value != nullptr ? value : otherwise);
     }
     template <size_t kSize>
     void WriteOnly(const std::string&, const char (&)[kSize]) const {}
@@ -50,15 +48,13 @@ int Read(const char* section, WirelessAPSettings* settings) {
         return -1;
     }
     *settings = {};
-    snprintf(settings->name, sizeof settings->name, "%s", section);
+    CopyField(settings->name, section);
     SzHash values(1024);
     if (!values) {
         return -1;
     }
-    // There are no keys yet, so the main network gets its defaults. What concerns guests stays
-    // empty until there is a section.
-    Reader reader(values);
-    VisitMainNetwork(reader, *settings);
+    // The main network gets its defaults. What concerns guests stays empty until there is a section.
+    VisitMainNetwork(DefaultSetter(), *settings);
     if (IsMissing(kAPSettings)) {
         return 0;
     }
@@ -66,6 +62,7 @@ int Read(const char* section, WirelessAPSettings* settings) {
     if (result <= 0) {
         return result;
     }
+    const Reader reader(values);
     VisitMainNetwork(reader, *settings);
     VisitGuestNetwork(reader, *settings);
     if (settings->ap.guestSecurity == WIRELESS_AP_WPA_ENTERPRISE) {

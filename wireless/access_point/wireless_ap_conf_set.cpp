@@ -1,5 +1,4 @@
 // Storing the settings of the access point.
-#include <tavicore/error.h>
 #include <tavicore/section.h>
 #include <taviwireless/wireless.h>
 
@@ -9,19 +8,14 @@
 #include "wireless/rules/paths.h"
 #include "wireless/system/grep_pattern.h"
 #include "wireless/system/guarded.h"
-#include "wireless/system/is_missing.h"
-#include "wireless/system/new_file.h"
+#include "wireless/system/section_store.h"
 #include "wireless/system/shell.h"
 
 namespace taviwireless::wireless {
 
 namespace {
 
-constexpr char kLineFormat[] = "\t%s=%s\n";
-constexpr mode_t kMode = 0600;  // the file holds keys
 constexpr size_t kCommandSize = 1024;
-
-enum class Found { kFailed, kNew, kExisting };
 
 // Puts the fields that it visits into a hash. Settings of which one is missing are not to be
 // stored: without its kind of security an encrypted network would be an open one.
@@ -67,12 +61,9 @@ bool IsReadable(const char* section) {
 // Whether "[section]" stands anywhere in the file, in any case; a value that holds it counts as
 // well, and then there is no section to replace.
 Found FindSection(const char* section) {
-    if (IsMissing(kAPSettings)) {
-        if (!MakeSureOf(kAPSettings, kMode)) {
-            TAVI_LOG_ERROR("Failed to touch %s", kAPSettings);
-            return Found::kFailed;
-        }
-        return Found::kNew;
+    const Found store = FindStore(kAPSettings, __FILE_NAME__, __LINE__);
+    if (store != Found::kExisting) {
+        return store;
     }
     const Pipe lines(Command(kCommandSize, {"grep -i \"\\[", ForShell(GrepPattern(section)).c_str(),
                                             "\\]\" ", kAPSettings}));
@@ -85,7 +76,7 @@ Found FindSection(const char* section) {
 }
 
 int SwitchOff(const char* section) {
-    if (VEXACFileSetSectionValue(kAPSettings, section, "enable", "no", kLineFormat) < 0) {
+    if (VEXACFileSetSectionValue(kAPSettings, section, "enable", "no", kSectionLine) < 0) {
         TAVI_LOG_ERROR("Failed to set key[%s] of sec[%s] in file[%s].", "enable", section,
                        kAPSettings);
         return 0;
@@ -110,19 +101,6 @@ bool IsSecurityStorable(const WirelessAPConf& ap) {
         return false;
     }
     return IsKindStorable(ap.guestSecurity);
-}
-
-int Save(Found found, const char* section, const SzHash& values) {
-    const bool isNew = found == Found::kNew;
-    const int result =
-        isNew ? VEXACFileAddSection(kAPSettings, section, values.Get(), kLineFormat)
-              : VEXACFileSetSection(kAPSettings, section, nullptr, values.Get(), kLineFormat);
-    if (result < 1) {
-        TAVI_LOG_ERROR("Failed to %s section: %s from %s, errno=0x%X", isNew ? "add" : "set",
-                       section, kAPSettings, VEXACErrGet());
-        return 0;
-    }
-    return 1;
 }
 
 int Store(const WirelessAPSettings* settings) {
@@ -152,7 +130,7 @@ int Store(const WirelessAPSettings* settings) {
         TAVI_LOG_ERROR("Failed to alloc memory");
         return 0;
     }
-    return Save(found, settings->name, values);
+    return SaveSection(kAPSettings, found, settings->name, values, __FILE_NAME__, __LINE__);
 }
 
 }  // namespace

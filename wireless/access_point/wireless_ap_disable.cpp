@@ -12,7 +12,7 @@
 #include "base/interface_name.h"
 #include "common/log.h"
 #include "common/sz_list.h"
-#include "wireless/rules/ap_files.h"
+#include "wireless/rules/paths.h"
 #include "wireless/system/guarded.h"
 
 namespace taviwireless::wireless {

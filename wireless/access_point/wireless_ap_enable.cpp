@@ -3,19 +3,19 @@
 #include <tavicore/file.h>
 #include <tavicore/keyvalue.h>
 #include <tavicore/process.h>
-#include <tavisdk/bridge.h>
 #include <taviwireless/wireless.h>
 #include <unistd.h>
 
 #include <cstdio>
-#include <cstring>
 #include <optional>
 #include <utility>
 
+#include "base/fixed_field.h"
 #include "common/log.h"
-#include "wireless/rules/ap_files.h"
-#include "wireless/rules/bridge_name.h"
-#include "wireless/rules/dhcp_range.h"
+#include "wireless/rules/bridge_names.h"
+#include "wireless/rules/dhcp.h"
+#include "wireless/rules/paths.h"
+#include "wireless/system/bridge.h"
 #include "wireless/system/flag_file.h"
 #include "wireless/system/guarded.h"
 #include "wireless/system/shell.h"
@@ -26,16 +26,6 @@ namespace {
 
 constexpr int kChannelTries = 5;   // a second each
 constexpr int kLeaseTime = 86400;  // seconds
-
-// The bridge of the wireless LAN. Other ones belong to the wired network.
-constexpr char kLocalBridge[] = "lbr0";
-constexpr char kLocalAddress[] = "10.1.14.1";
-constexpr char kLocalNetmask[] = "255.255.255.0";
-
-template <size_t kSize>
-void Copy(char (&field)[kSize], const char* text) {
-    snprintf(field, kSize, "%s", text);
-}
 
 bool SetQuoted(const std::string& file, const char* key, const char* value) {
     if (VEXACFileSetKeyValue(file.c_str(), key, value, kQuotedLine) <= 0) {
@@ -64,36 +54,14 @@ std::optional<WirelessAPConf> ReadSettings(const char* interface) {
     return settings.ap;
 }
 
-struct Bridge {
-    TAVINetBridge config;
-    TAVINetBridgeMember member;
-};
-
-Bridge NewBridge(const char* interface, const char* name) {
-    Bridge bridge{};
-    Copy(bridge.config.name, name);
-    if (strcmp(name, kLocalBridge) != 0) {
-        bridge.member.kind = TAVI_NET_MEMBER_WIRED;
-        Copy(bridge.member.interface, "eth0");
-        return bridge;
-    }
-    bridge.member.kind = TAVI_NET_MEMBER_WIRELESS;
-    Copy(bridge.member.interface, interface);
-    bridge.config.isLocal = 1;
-    Copy(bridge.config.address, kLocalAddress);
-    Copy(bridge.config.netmask, kLocalNetmask);
-    return bridge;
-}
-
 std::optional<Bridge> SetUpBridge(const char* interface, const char* name) {
-    Bridge bridge{};
-    if (TAVINetGetBridgeConfig(name, &bridge.config, &bridge.member) >= 0) {
+    if (const std::optional<Bridge> stored = StoredBridge(name)) {
         const std::string file = InterfaceFile(name);
         const bool isOnAtBoot = VEXACFileCheckKeyValue(file.c_str(), "ONBOOT", "yes", 0) != 0 ||
                                 SetQuoted(file, "ONBOOT", "yes");
-        return isOnAtBoot ? std::make_optional(bridge) : std::nullopt;
+        return isOnAtBoot ? stored : std::nullopt;
     }
-    bridge = NewBridge(interface, name);
+    const Bridge bridge = NewBridge(interface, name);
     if (TAVINetSetBridgeConfig(&bridge.config, &bridge.member) < 0) {
         TAVI_LOG_ERROR("Failed to set bridge config.");
         return std::nullopt;
@@ -120,13 +88,13 @@ bool SetUpNewDhcpServer(const TAVINetBridge& bridge) {
     server.enabled = 1;
     server.reserved = 30;
     server.leaseTime = kLeaseTime;
-    Copy(server.rangeStart, range->start.c_str());
-    Copy(server.rangeEnd, range->end.c_str());
-    Copy(server.interface, bridge.name);
-    Copy(server.bridge, bridge.name);
-    Copy(server.gateway, bridge.address);
-    Copy(server.nameServer, bridge.address);
-    Copy(server.netmask, bridge.netmask);
+    CopyField(server.rangeStart, range->start);
+    CopyField(server.rangeEnd, range->end);
+    CopyField(server.interface, bridge.name);
+    CopyField(server.bridge, bridge.name);
+    CopyField(server.gateway, bridge.address);
+    CopyField(server.nameServer, bridge.address);
+    CopyField(server.netmask, bridge.netmask);
     if (TAVINetSetDhcpServerConfigFiles(&server, 1) == 0) {
         TAVI_LOG_ERROR("Failed to set dhcpServer conf for [%s].", bridge.name);
         return false;

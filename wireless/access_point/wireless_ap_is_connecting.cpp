@@ -1,6 +1,6 @@
 #include <taviwireless/wireless.h>
 
-#include "wireless/rules/ap_files.h"
+#include "wireless/rules/paths.h"
 #include "wireless/system/flag_file.h"
 
 int TAVIWirelessAPIsConnecting() {

@@ -7,11 +7,12 @@
 
 #include "base/interface_name.h"
 #include "common/log.h"
-#include "wireless/rules/ap_files.h"
 #include "wireless/rules/hostapd_conf.h"
+#include "wireless/rules/paths.h"
+#include "wireless/system/files.h"
 #include "wireless/system/grep_pattern.h"
 #include "wireless/system/guarded.h"
-#include "wireless/system/new_file.h"
+#include "wireless/system/guest_network.h"
 #include "wireless/system/shell.h"
 
 namespace taviwireless::wireless {

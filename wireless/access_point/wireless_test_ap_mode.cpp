@@ -1,7 +1,7 @@
 #include <tavicore/file.h>
 #include <taviwireless/wireless.h>
 
-#include "wireless/rules/ap_files.h"
+#include "wireless/rules/paths.h"
 
 int TAVIWirelessTestAPMode() {
     return VEXACFileExist(taviwireless::wireless::kAPFlag);

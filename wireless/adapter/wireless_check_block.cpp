@@ -8,7 +8,7 @@
 
 #include "common/sz_hash.h"
 #include "wireless/rules/paths.h"
-#include "wireless/system/is_missing.h"
+#include "wireless/system/files.h"
 
 int TAVIWirelessCheckBlock() {
     using namespace taviwireless::wireless;

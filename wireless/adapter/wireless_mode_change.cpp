@@ -3,6 +3,7 @@
 #include <taviwireless/wireless.h>
 
 #include "common/log.h"
+#include "wireless/rules/paths.h"
 
 int TAVIWirelessModeChange(int mode) {
     constexpr const char* kModes[] = {"ap", "client"};
@@ -11,7 +12,7 @@ int TAVIWirelessModeChange(int mode) {
         return 0;
     }
     const char* name = kModes[mode];
-    if (VEXACExec("/usr/tavi/hotplug/usb.wireless.function", "change-mode", name, nullptr) != 0) {
+    if (VEXACExec(taviwireless::wireless::kHotplugScript, "change-mode", name, nullptr) != 0) {
         TAVI_LOG_ERROR("Failed to change to wireless %s mode.", mode == 0 ? "AP" : "client");
         return 0;
     }

@@ -5,6 +5,9 @@
 
 #include <string>
 
+#include "base/fixed_field.h"
+#include "wireless/rules/bridge_names.h"
+
 // The keys of a section of the access point's settings, in the order of the file, each with its
 // default. Reading and writing visit the same table: a visitor has
 //   Flag(key, number, value when missing)   "yes" or "no"
@@ -20,7 +23,7 @@ inline std::string FullSchedule() {
 
 // The keys of a security kind begin with prefix. Other kinds have none.
 template <typename Visitor, typename Secret>
-void VisitSecret(Visitor& visit, const std::string& prefix, int32_t kind, Secret& secret) {
+void VisitSecret(Visitor&& visit, const std::string& prefix, int32_t kind, Secret& secret) {
     const auto key = [&prefix](const char* name) { return prefix + name; };
     switch (kind) {
         case WIRELESS_AP_WEP:
@@ -44,13 +47,13 @@ void VisitSecret(Visitor& visit, const std::string& prefix, int32_t kind, Secret
 }
 
 template <typename Visitor, typename Settings>
-void VisitMainNetwork(Visitor& visit, Settings& settings) {
+void VisitMainNetwork(Visitor&& visit, Settings& settings) {
     auto& ap = settings.ap;
     visit.Flag("enable", settings.enabled, 0);
     visit.Flag("unblock", settings.unblock, 1);
     visit.Number("txpower", settings.txPower, 10);
     visit.Text("ssid", ap.ssid, "Merilond");
-    visit.Text("bridge", ap.bridge, "lbr0");
+    visit.Text("bridge", ap.bridge, kLocalBridge);
     visit.Text("wifi_sched", settings.schedule, FullSchedule());
     visit.Number("wifi_sched_enabled", settings.scheduleEnabled, 0);
     visit.Number("ignore_broadcast_ssid", ap.hidden, 0);
@@ -66,7 +69,7 @@ void VisitMainNetwork(Visitor& visit, Settings& settings) {
 
 // Guests have no enterprise security: it has no keys here, and the caller logs it.
 template <typename Visitor, typename Settings>
-void VisitGuestNetwork(Visitor& visit, Settings& settings) {
+void VisitGuestNetwork(Visitor&& visit, Settings& settings) {
     auto& ap = settings.ap;
     visit.Number("guest_net_enable", ap.guestEnabled, 0);
     visit.WriteOnly("bssid", ap.guestBssid);
@@ -85,6 +88,18 @@ void VisitGuestNetwork(Visitor& visit, Settings& settings) {
     visit.Text("guest_net_sched", settings.guestSchedule, FullSchedule());
     visit.Number("guest_net_sched_enable", settings.guestScheduleEnabled, 0);
 }
+
+// A visitor that gives every field its default.
+struct DefaultSetter {
+    void Flag(const std::string&, int32_t& field, int32_t value) const { field = value; }
+    void Number(const std::string&, int32_t& field, int32_t value) const { field = value; }
+    template <size_t kSize>
+    void Text(const std::string&, char (&field)[kSize], const std::string& value) const {
+        CopyField(field, value);
+    }
+    template <size_t kSize>
+    void WriteOnly(const std::string&, const char (&)[kSize]) const {}
+};
 
 }  // namespace taviwireless::wireless
 

@@ -1,8 +1,11 @@
 #include "wireless/rules/hostapd_conf.h"
 
-#include <cstring>
+#include <optional>
 
+#include "wireless/rules/bridge_names.h"
 #include "wireless/rules/line_break.h"
+#include "wireless/rules/radio.h"
+#include "wireless/rules/security.h"
 
 namespace taviwireless::wireless {
 
@@ -12,7 +15,6 @@ namespace {
 constexpr int kOpenSystem = 1;
 constexpr int kOpenSystemOrSharedKey = 3;
 
-constexpr int kSetsWithoutNOnly = WIRELESS_AP_A | WIRELESS_AP_B | WIRELESS_AP_G;
 constexpr char kControlSockets[] = "/var/run/hostapd";
 
 void AddIfPositive(HostapdConf& lines, const char* key, int32_t value) {
@@ -21,42 +23,11 @@ void AddIfPositive(HostapdConf& lines, const char* key, int32_t value) {
     }
 }
 
-// On which side of the channel the second half of 40 MHz lies. At 5 GHz the channels are paired
-// from 36 up; those above 64 are left to hostapd.
-const char* Direction(int32_t band, int32_t channel) {
-    if (band != WIRELESS_AP_A) {
-        return channel < 6 ? "[HT40+]" : "[HT40-]";
-    }
-    switch (channel) {
-        case 36:
-        case 44:
-        case 52:
-        case 60:
-            return "[HT40+]";
-        case 40:
-        case 48:
-        case 56:
-        case 64:
-            return "[HT40-]";
-        default:
-            return "";
-    }
-}
-
 std::string HtCapabilities(const WirelessAPConf& conf) {
     const std::string narrow = "[SHORT-GI-20][DELAYED-BA]";
-    if ((conf.htFlags & WIRELESS_AP_40_MHZ) == 0) {
-        return narrow;
-    }
-    return narrow + "[SHORT-GI-40][MAX-AMSDU-7935]" + Direction(conf.band, conf.channel);
-}
-
-// The band that hw_mode is made of. With 802.11n on, "n only" counts when it is the only bit;
-// beside other bits it is dropped, since n is added to the protocol that they name. Without 802.11n
-// a set of several bits stays, for which no hw_mode is written, like for any other unknown value.
-int32_t BandInUse(const WirelessAPConf& conf) {
-    const bool isReduced = conf.ieee80211n > 0 && conf.band != WIRELESS_AP_N_ONLY;
-    return isReduced ? conf.band & kSetsWithoutNOnly : conf.band;
+    return IsWide(conf)
+               ? narrow + "[SHORT-GI-40][MAX-AMSDU-7935]" + SecondHalf(conf.band, conf.channel)
+               : narrow;
 }
 
 // 802.11n itself knows neither WEP nor TKIP.
@@ -98,17 +69,8 @@ void AddPairwise(HostapdConf& lines, int32_t cipher) {
 void AddWep(HostapdConf& lines, const char* key) {
     lines.Add("auth_algs", kOpenSystemOrSharedKey);
     lines.Add("wep_default_key", 0);
-    switch (strlen(key)) {
-        case 5:
-        case 13:
-            lines.Add("wep_key0", std::string("\"") + key + "\"");
-            break;
-        case 10:
-        case 26:  // hexadecimal
-            lines.Add("wep_key0", key);
-            break;
-        default:
-            break;
+    if (const std::optional<std::string> value = WepKeyValue(key)) {
+        lines.AddSecret("wep_key0", *value);
     }
 }
 
@@ -116,7 +78,7 @@ void AddPersonal(HostapdConf& lines, const WirelessAPSecret& secret) {
     lines.Add("auth_algs", kOpenSystem);
     lines.Add("wpa", secret.wpa.wpaVersion);
     lines.Add("wpa_key_mgmt", "WPA-PSK");
-    lines.Add("wpa_passphrase", secret.wpa.passphrase);
+    lines.AddSecret("wpa_passphrase", secret.wpa.passphrase);
     AddPairwise(lines, secret.wpa.cipher);
 }
 
@@ -128,7 +90,7 @@ void AddEnterprise(HostapdConf& lines, const WirelessAPSecret& secret) {
     lines.Add("ieee8021x", 1);
     lines.Add("auth_server_addr", secret.enterprise.radiusAddr);
     lines.Add("auth_server_port", secret.enterprise.radiusPort);
-    lines.Add("auth_server_shared_secret", secret.enterprise.radiusSecret);
+    lines.AddSecret("auth_server_shared_secret", secret.enterprise.radiusSecret);
 }
 
 void AddSecurity(HostapdConf& lines, const WirelessAPConf& conf) {
@@ -153,8 +115,17 @@ void AddSecurity(HostapdConf& lines, const WirelessAPConf& conf) {
 }  // namespace
 
 void HostapdConf::Add(const char* key, const std::string& value) {
+    AddLine(key, value, value);
+}
+
+void HostapdConf::AddSecret(const char* key, const std::string& value) {
+    AddLine(key, value, "********");
+}
+
+void HostapdConf::AddLine(const char* key, const std::string& value, const std::string& shown) {
     holdsLineBreak_ = holdsLineBreak_ || wireless::HoldsLineBreak(value);
     text_ += key + ("=" + value) + "\n";
+    shown_ += key + ("=" + shown) + "\n";
 }
 
 void HostapdConf::Add(const char* key, int32_t value) {
@@ -176,7 +147,7 @@ HostapdConf RenderHostConf(const std::string& interface, const WirelessAPConf& c
     AddIfPositive(lines, "max_num_sta", conf.maxStations);
     lines.Add("bridge", conf.bridge);
     lines.Add("channel", conf.channel);
-    if (conf.ieee80211n > 0) {
+    if (Is80211n(conf)) {
         lines.Add("ieee80211n", conf.ieee80211n);
         lines.Add("ht_capab", HtCapabilities(conf));
     }
@@ -188,12 +159,12 @@ HostapdConf RenderHostConf(const std::string& interface, const WirelessAPConf& c
 
 HostapdConf RenderGuestConf(const WirelessAPConf& conf) {
     HostapdConf lines;
-    lines.Add("bss", "gwlan");
+    lines.Add("bss", kGuestInterface);
     // Compatible with the store, which is written with a BSSID of guests that is never read back:
     // so this line mostly has no value, and whoever starts hostapd leaves it out then.
     lines.Add("bssid", conf.guestBssid);
     lines.Add("ssid", conf.guestSsid);
-    lines.Add("bridge", "gbr");
+    lines.Add("bridge", kGuestBridge);
     lines.Add("ctrl_interface", kControlSockets);
     AddIfPositive(lines, "max_num_sta", conf.guestMaxStations);
     if (conf.guestIsolate != 0) {

@@ -12,13 +12,19 @@ class HostapdConf {
   public:
     void Add(const char* key, const std::string& value);
     void Add(const char* key, int32_t value);
+    void AddSecret(const char* key, const std::string& value);
 
     const std::string& Text() const { return text_; }
+    // The text with stars in place of the secrets.
+    const std::string& Shown() const { return shown_; }
     // Whether a value holds a line break; what follows it would be a setting of its own.
     bool HoldsLineBreak() const { return holdsLineBreak_; }
 
   private:
+    void AddLine(const char* key, const std::string& value, const std::string& shown);
+
     std::string text_;
+    std::string shown_;
     bool holdsLineBreak_ = false;
 };
 

@@ -1,9 +1,10 @@
 #include "wireless/rules/supplicant.h"
 
 #include <algorithm>
-#include <cstring>
+#include <optional>
 
 #include "wireless/rules/line_break.h"
+#include "wireless/rules/security.h"
 
 namespace taviwireless::wireless {
 
@@ -50,23 +51,14 @@ void AddPersonal(SupplicantConf& rendered, const WirelessConf& conf) {
     Add(rendered, "psk", Quoted(conf.key));
 }
 
-void AddWepKey(SupplicantConf& rendered, const char* key) {
-    switch (strlen(key)) {
-        case 5:
-        case 13:
-            return Add(rendered, "wep_key0", Quoted(key));
-        case 10:
-        case 26:  // hexadecimal
-            return Add(rendered, "wep_key0", key);
-        default:
-            rendered.isWepKeyLeftOut = true;
-    }
-}
-
 void AddOpenOrWep(SupplicantConf& rendered, const WirelessConf& conf) {
     Add(rendered, "key_mgmt", "NONE");
     if (conf.network.encrypt == WIRELESS_ENCRYPT_WEP) {
-        AddWepKey(rendered, conf.key);
+        const std::optional<std::string> key = WepKeyValue(conf.key);
+        rendered.isWepKeyLeftOut = !key;
+        if (key) {
+            Add(rendered, "wep_key0", *key);
+        }
         Add(rendered, "wep_tx_keyidx", "0");
         Add(rendered, "auth_alg", "OPEN SHARED");
     }
@@ -80,18 +72,15 @@ SupplicantConf RenderSupplicantConf(const WirelessConf& conf) {
     Add(rendered, "ssid", Quoted(conf.network.essid));
     AddBssid(rendered, conf);
     Add(rendered, "scan_ssid", "1");  // hidden networks are found, too
-    switch (conf.network.auth) {
-        case WIRELESS_AUTH_WPA_EAP:
-        case WIRELESS_AUTH_WPA2_EAP:
+    switch (SecurityOf(conf.network)) {
+        case Security::kEAP:
             AddEnterprise(rendered, conf);
             break;
-        case WIRELESS_AUTH_WPA_PSK:
-        case WIRELESS_AUTH_WPA2_PSK:
+        case Security::kWPA:
             AddPersonal(rendered, conf);
             break;
-        case WIRELESS_AUTH_OPEN:
-        case WIRELESS_AUTH_SHARED:
-        case WIRELESS_AUTH_WEP_AUTO:
+        case Security::kOpen:
+        case Security::kWEP:
             AddOpenOrWep(rendered, conf);
             break;
         default:

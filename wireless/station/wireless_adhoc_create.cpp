@@ -6,13 +6,14 @@
 #include <string>
 
 #include "common/log.h"
+#include "wireless/rules/security.h"
 #include "wireless/system/guarded.h"
 #include "wireless/system/interface.h"
 #include "wireless/system/shell.h"
 
-namespace {
+namespace taviwireless::wireless {
 
-using namespace taviwireless::wireless;
+namespace {
 
 constexpr size_t kCommandSize = 128;
 
@@ -56,10 +57,8 @@ bool SetKey(const char* interface, const WirelessConf& conf) {
         return TAVI_RUN(command);
     }
     const Argument key{std::string(conf.key, strnlen(conf.key, WIRELESS_KEY_SIZE)), true};
-    const size_t length = key.text.size();
-    const bool isText = length == 5 || length == 13;
-    const bool isHexadecimal = length == 10 || length == 26;
-    if (!isText && !isHexadecimal) {
+    const bool isText = IsWepText(key.text);
+    if (!isText && !IsWepHexadecimal(key.text)) {
         TAVI_LOG_ERROR("The key is not standard WEP format.");
         return false;
     }
@@ -97,6 +96,8 @@ int Create(const WirelessConf* conf) {
 
 }  // namespace
 
+}  // namespace taviwireless::wireless
+
 int TAVIWirelessAdhocCreate(const WirelessConf* conf) {
-    return TAVI_GUARDED(-1, [conf] { return Create(conf); });
+    return TAVI_GUARDED(-1, [conf] { return taviwireless::wireless::Create(conf); });
 }

@@ -4,9 +4,9 @@
 #include <tavicore/section.h>
 #include <taviwireless/wireless.h>
 
-#include <cstdio>
 #include <cstdlib>
 
+#include "base/fixed_field.h"
 #include "common/log.h"
 #include "common/sz_hash.h"
 #include "wireless/rules/paths.h"
@@ -16,9 +16,8 @@ namespace taviwireless::wireless {
 namespace {
 
 // A missing value makes the field empty.
-template <size_t kSize>
-void Copy(const char* value, char (&field)[kSize]) {
-    snprintf(field, kSize, "%s", value != nullptr ? value : "");
+const char* TextOf(const char* value) {
+    return value != nullptr ? value : "";
 }
 
 int ParseIfThere(const char* value, int (*parse)(const char*)) {
@@ -26,12 +25,12 @@ int ParseIfThere(const char* value, int (*parse)(const char*)) {
 }
 
 void Fill(const SzHash& values, const char* section, WirelessConf* conf) {
-    Copy(values["IPADDR"], conf->ipAddr);
-    Copy(values["NETMASK"], conf->netmask);
-    Copy(values["GATEWAY"], conf->gateway);
-    Copy(values["KEY"], conf->key);
-    Copy(values["ESSID"], conf->network.essid);
-    Copy(values["USER"], conf->user);
+    CopyField(conf->ipAddr, TextOf(values["IPADDR"]));
+    CopyField(conf->netmask, TextOf(values["NETMASK"]));
+    CopyField(conf->gateway, TextOf(values["GATEWAY"]));
+    CopyField(conf->key, TextOf(values["KEY"]));
+    CopyField(conf->network.essid, TextOf(values["ESSID"]));
+    CopyField(conf->user, TextOf(values["USER"]));
     TAVIWirelessBssidParse(section, conf->network.bssid);
     conf->network.opmode = TAVIWirelessOpmodeParse(values["MODE"]);
     conf->network.auth = ParseIfThere(values["AUTH"], TAVIWirelessAuthParse);

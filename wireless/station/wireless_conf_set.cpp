@@ -1,6 +1,5 @@
 // Saving a network.
 #include <tavicore/error.h>
-#include <tavicore/file.h>
 #include <tavicore/section.h>
 #include <taviwireless/wireless.h>
 
@@ -9,33 +8,19 @@
 #include "common/log.h"
 #include "common/sz_hash.h"
 #include "wireless/rules/paths.h"
+#include "wireless/rules/security.h"
 #include "wireless/system/guarded.h"
-#include "wireless/system/is_missing.h"
-#include "wireless/system/new_file.h"
+#include "wireless/system/section_store.h"
 
 namespace taviwireless::wireless {
 
 namespace {
 
-constexpr char kLineFormat[] = "\t%s=%s\n";
-constexpr mode_t kMode = 0600;  // the file holds keys
-
-enum class Found { kFailed, kNew, kExisting };
-
-// Creates the file with its mode, so that others cannot read it before the first key is in it;
-// later writing keeps the mode.
-bool CreateFile() {
-    if (!MakeSureOf(kSavedNetworks, kMode)) {
-        TAVI_LOG_ERROR("Failed to touch %s", kSavedNetworks);
-        return false;
-    }
-    return true;
-}
-
 // Loads what was saved of the network earlier.
 Found LoadSection(const char* section, SzHash& values) {
-    if (IsMissing(kSavedNetworks)) {
-        return CreateFile() ? Found::kNew : Found::kFailed;
+    const Found store = FindStore(kSavedNetworks, __FILE_NAME__, __LINE__);
+    if (store != Found::kExisting) {
+        return store;
     }
     const int result = VEXACFileGetSection(kSavedNetworks, section, values.Address());
     if (result < 0) {
@@ -50,8 +35,7 @@ Found LoadSection(const char* section, SzHash& values) {
 // Sets all values, or returns false.
 bool SetValues(const WirelessConf& conf, const char* bssid, SzHash& values) {
     const WirelessNetwork& network = conf.network;
-    const bool isEnterprise =
-        network.auth == WIRELESS_AUTH_WPA_EAP || network.auth == WIRELESS_AUTH_WPA2_EAP;
+    const bool hasUser = SecurityOf(network) == Security::kEAP;
     return values.Set("KEY", conf.key) && values.Set("IPADDR", conf.ipAddr) &&
            values.Set("NETMASK", conf.netmask) && values.Set("GATEWAY", conf.gateway) &&
            values.Set("ESSID", network.essid) && values.Set("BSSID", bssid) &&
@@ -59,24 +43,7 @@ bool SetValues(const WirelessConf& conf, const char* bssid, SzHash& values) {
            values.Set("ACCESS_TIME", std::to_string(static_cast<long long>(time(nullptr)))) &&
            values.Set("AUTH", TAVIWirelessAuthStringGet(network.auth)) &&
            values.Set("ENCRYPT", TAVIWirelessEncryptStringGet(network.encrypt, 0)) &&
-           (!isEnterprise || values.Set("USER", conf.user));
-}
-
-bool SaveSection(Found found, const char* section, const SzHash& values) {
-    if (found == Found::kExisting) {
-        if (VEXACFileSetSection(kSavedNetworks, section, nullptr, values.Get(), kLineFormat) < 1) {
-            TAVI_LOG_ERROR("Failed to set section: %s from %s, errno=0x%X", section, kSavedNetworks,
-                           VEXACErrGet());
-            return false;
-        }
-        return true;
-    }
-    if (VEXACFileAddSection(kSavedNetworks, section, values.Get(), kLineFormat) < 1) {
-        TAVI_LOG_ERROR("Failed to add section: %s from %s, errno=0x%X", section, kSavedNetworks,
-                       VEXACErrGet());
-        return false;
-    }
-    return true;
+           (!hasUser || values.Set("USER", conf.user));
 }
 
 int SaveNetwork(const WirelessConf* conf) {
@@ -99,7 +66,9 @@ int SaveNetwork(const WirelessConf* conf) {
         TAVI_LOG_ERROR("Failed to alloc memory");
         return -1;
     }
-    return SaveSection(found, section, values) ? 0 : -1;
+    const bool isSaved =
+        SaveSection(kSavedNetworks, found, section, values, __FILE_NAME__, __LINE__);
+    return isSaved ? 0 : -1;
 }
 
 }  // namespace

@@ -12,10 +12,10 @@
 #include "common/log.h"
 #include "wireless/rules/paths.h"
 #include "wireless/rules/supplicant.h"
+#include "wireless/system/files.h"
 #include "wireless/system/flag_file.h"
 #include "wireless/system/guarded.h"
 #include "wireless/system/interface.h"
-#include "wireless/system/new_file.h"
 #include "wireless/system/shell.h"
 
 namespace taviwireless::wireless {

@@ -7,7 +7,7 @@
 #include <cerrno>
 
 #include "base/trusted_file.h"
-#include "wireless/system/new_file.h"
+#include "wireless/system/files.h"
 
 namespace taviwireless::wireless {
 

@@ -1,10 +1,13 @@
-#ifndef TAVIWIRELESS_WIRELESS_SYSTEM_NEW_FILE_H
-#define TAVIWIRELESS_WIRELESS_SYSTEM_NEW_FILE_H
+#ifndef TAVIWIRELESS_WIRELESS_SYSTEM_FILES_H
+#define TAVIWIRELESS_WIRELESS_SYSTEM_FILES_H
 
 #include <fcntl.h>
 #include <sys/stat.h>
+#include <tavicore/file.h>
 #include <unistd.h>
 
+#include <cerrno>
+#include <cstdio>
 #include <filesystem>
 
 #include "base/unique_fd.h"
@@ -24,9 +27,11 @@ inline UniqueFile CreateAnew(const char* path, mode_t mode) {
     return file;
 }
 
-// Creates the file, empty, unless it is there already. An existing file keeps its mode.
-inline bool MakeSureOf(const char* path, mode_t mode) {
-    return static_cast<bool>(UniqueFd(open(path, O_WRONLY | O_CREAT | O_CLOEXEC, mode)));
+// Whether the system says that there is no such file. One that merely cannot be looked at is not
+// missing: settings in it may be what protects a network.
+inline bool IsMissing(const char* path) {
+    struct stat status {};
+    return VEXACFileExist(path) == 0 && stat(path, &status) != 0 && errno == ENOENT;
 }
 
 // Removes what stands at path, with all that is in it when it is a folder; follows no link.

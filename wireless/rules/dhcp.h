@@ -1,12 +1,20 @@
-#ifndef TAVIWIRELESS_WIRELESS_RULES_DHCP_RANGE_H
-#define TAVIWIRELESS_WIRELESS_RULES_DHCP_RANGE_H
+#ifndef TAVIWIRELESS_WIRELESS_RULES_DHCP_H
+#define TAVIWIRELESS_WIRELESS_RULES_DHCP_H
 
 #include <arpa/inet.h>
+#include <taviwireless/wireless.h>
 
 #include <optional>
 #include <string>
+#include <string_view>
 
 namespace taviwireless::wireless {
+
+constexpr char kByDHCP[] = "DHCP";  // instead of the address of a saved network
+
+inline bool IsDHCP(const WirelessConf& conf) {
+    return std::string_view(conf.ipAddr) == kByDHCP;
+}
 
 struct DhcpRange {
     std::string start;
