@@ -3,18 +3,18 @@
 #include <sys/signalfd.h>
 #include <unistd.h>
 
-#include <CLI/CLI.hpp>
 #include <algorithm>
 #include <iostream>
 #include <stdexcept>
 
+#include "base/command_line/command_line.h"
 #include "sim/control.h"
 #include "sim/simulator.h"
 #include "sim/user_text.h"
 
 namespace {
 
-using taviwireless::UniqueFd;
+using namespace taviwireless;
 using namespace taviwireless::sim;
 
 constexpr int kFailed = 1;
@@ -53,49 +53,43 @@ std::string Footer() {
            "  modemsim --modem 12d1,pin=1234 --log -   a locked SIM card; shows what is said\n"
            "  modemsim --link-dir /dev --info-dir /tmp --modem 12d1 --modem 2001,id=5\n"
            "                                           two modems as plugged into this machine\n"
-           "  modemsim --tty /dev/ttyGS0,/dev/ttyGS1   answers on a USB gadget's serial ports\n";
+           "  modemsim --tty /dev/ttyGS0,/dev/ttyGS1   answers on a USB gadget's serial ports\n\n";
 }
 
-void Define(CLI::App& app, Options& options) {
-    // Without the descriptions that would go into the help behind the type.
-    const CLI::Validator existing = CLI::Validator(CLI::ExistingDirectory).description("");
-    const CLI::Validator number = CLI::Validator(CLI::Range(0, 999)).description("");
-    app.description("Simulates USB 3G modems on serial lines, until a signal ends it.");
-    app.footer(Footer);
-    app.set_help_flag("-h,--help", "Print this help");
-    app.add_option("-m,--modem", options.modems, "A modem; may be repeated (one generic modem)")
-        ->type_name("MODEM")
-        ->allow_extra_args(false);
-    app.add_option("--tty", options.ttys,
-                   "Ttys to use instead of new pseudo-terminals; the first --tty is for the first "
-                   "--modem and so on; such a modem gets no links and no info file")
-        ->type_name("PATH[,PATH...]")
-        ->allow_extra_args(false);
-    app.add_option(
-           "--on-dial", options.onDial,
-           "Run COMMAND with the line as its input and output when a connection is dialled; "
-           "its end ends the connection")
-        ->type_name("COMMAND");
-    CLI::Option* linkDir =
-        app.add_option("--link-dir", options.places.linkDir,
-                       "Link the ports as DIR/ttyUSB0 and so on, while this runs")
-            ->type_name("DIR")
-            ->check(existing);
-    app.add_option("--first-port", options.places.firstPort, "Begin with this number instead of 0")
-        ->type_name("N")
-        ->check(number);
-    app.add_option("--info-dir", options.places.infoDir,
-                   "Write DIR/usbmodem.infoN for each modem, while this runs")
-        ->type_name("DIR")
-        ->check(existing)
-        ->needs(linkDir);
-    app.add_option("--fault", options.faults, "Make modem ID misbehave from the start")
-        ->type_name("ID:FAULT")
-        ->allow_extra_args(false);
-    app.add_flag("--control", options.control, "Take commands from standard input");
-    app.add_option("--log", options.log,
-                   "Append what is said to FILE (- for standard error), PINs included")
-        ->type_name("FILE");
+void Define(const Command& program, Options& options) {
+    program.SetFooter(Footer());
+    program.SetHelp("Print this help");
+    program.AddOption("-m,--modem", options.modems, "A modem; may be repeated (one generic modem)",
+                      "MODEM");
+    program.AddOption(
+        "--tty", options.ttys,
+        "Ttys to use instead of new pseudo-terminals; the first --tty is for the first "
+        "--modem and so on; such a modem gets no links and no info file",
+        "PATH[,PATH...]");
+    program.AddOption(
+        "--on-dial", options.onDial,
+        "Run COMMAND with the line as its input and output when a connection is dialled; "
+        "its end ends the connection",
+        "COMMAND");
+    const Argument linkDir =
+        program
+            .AddOption("--link-dir", options.places.linkDir,
+                       "Link the ports as DIR/ttyUSB0 and so on, while this runs", "DIR")
+            .ExistingFolder();
+    program
+        .AddOption("--first-port", options.places.firstPort, "Begin with this number instead of 0",
+                   "N")
+        .Between(0, 999);
+    program
+        .AddOption("--info-dir", options.places.infoDir,
+                   "Write DIR/usbmodem.infoN for each modem, while this runs", "DIR")
+        .ExistingFolder()
+        .Needs(linkDir);
+    program.AddOption("--fault", options.faults, "Make modem ID misbehave from the start",
+                      "ID:FAULT");
+    program.AddFlag("--control", options.control, "Take commands from standard input");
+    program.AddOption("--log", options.log,
+                      "Append what is said to FILE (- for standard error), PINs included", "FILE");
 }
 
 void AddModems(const Options& options, Simulator& simulator) {
@@ -186,14 +180,14 @@ void Run(const Options& options) {
 
 int main(int argc, char** argv) {
     Options options;
-    CLI::App app;
     try {
-        Define(app, options);
-        app.parse(argc, argv);
-        Run(options);
-    } catch (const CLI::CallForHelp& help) {
-        return app.exit(help);
-    } catch (const CLI::ParseError& error) {
+        if (ReadCommandLine(argc, argv, "",
+                            "Simulates USB 3G modems on serial lines, until a signal ends it.",
+                            [&](const Command& program) { Define(program, options); })) {
+            Run(options);
+        }
+        return 0;
+    } catch (const UsageError& error) {
         std::cerr << "modemsim: " << error.what() << " (see modemsim --help)\n";
         return kBadUsage;
     } catch (const std::invalid_argument& error) {
@@ -203,5 +197,4 @@ int main(int argc, char** argv) {
         std::cerr << "modemsim: " << error.what() << "\n";
         return kFailed;
     }
-    return 0;
 }
