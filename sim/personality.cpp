@@ -5,7 +5,6 @@
 #include <algorithm>
 #include <filesystem>
 #include <fstream>
-#include <regex>
 #include <stdexcept>
 
 #include "base/join.h"
@@ -54,8 +53,16 @@ fs::path Folder() {
            "share/taviwireless/modemsim";
 }
 
+// Without line breaks and the star before the first line.
 std::string OneLine(const std::string& text) {
-    return std::regex_replace(text, std::regex("\\s*\\n\\s*|^\\* "), " ");
+    constexpr char kBlanks[] = " \t\r\n";
+    std::string line = text.substr(text.rfind("* ", 0) == 0 ? 1 : 0);
+    for (size_t end = 0; (end = line.find('\n')) != std::string::npos;) {
+        const size_t begin = line.find_last_not_of(kBlanks, end) + 1;
+        const size_t next = std::min(line.find_first_not_of(kBlanks, end), line.size());
+        line.replace(begin, next - begin, " ");
+    }
+    return line;
 }
 
 // What is wrong with a file; LoadInto adds the file's name.
@@ -197,10 +204,10 @@ void Apply(const Json::Value& root, Personality* target) {
 
 void CheckPlaceholders(const Personality& personality, const std::string& line,
                        const std::string& place) {
-    static const std::regex kPlaceholder("\\{([^}]*)\\}");
-    for (std::sregex_iterator match(line.begin(), line.end(), kPlaceholder), end; match != end;
-         ++match) {
-        const std::string name = (*match)[1];
+    size_t close = 0;
+    for (size_t open = 0; (open = line.find('{', close)) != std::string::npos &&
+                          (close = line.find('}', open)) != std::string::npos;) {
+        const std::string name = line.substr(open + 1, close - open - 1);
         if (personality.variables.count(name) == 0 && !Holds(kComputedPlaceholders, name)) {
             Fail(place, "there is no variable '" + name + "'");
         }
