@@ -14,7 +14,7 @@ class FolderMatches {
     FolderMatches(const FolderMatches&) = delete;
     FolderMatches& operator=(const FolderMatches&) = delete;
 
-    // What is wrong, as a sentence; null when there is nothing. No match is no fault.
+    // What went wrong, as a sentence; null when nothing did. That nothing matches is no fault.
     const char* Fault() const {
         return result_ == GLOB_NOSPACE   ? "Failed to allocate memory to hold the result"
                : result_ == GLOB_ABORTED ? "There was an error opening a directory"

@@ -10,8 +10,9 @@
 
 namespace taviwireless {
 
-// A file of no folder, which nobody else can read and which is gone with its last descriptor. It
-// holds this text and is read from its beginning. Without one, errno tells why.
+// Makes a file that is in no folder, so that nobody else can open it and it is gone with its last
+// descriptor. It holds this text and is read from its beginning. Without a descriptor, errno tells
+// why.
 inline UniqueFd MemoryFile(const std::string& text = "") {
     UniqueFd file(memfd_create("memory file", MFD_CLOEXEC));
     const auto size = static_cast<ssize_t>(text.size());
@@ -21,7 +22,7 @@ inline UniqueFd MemoryFile(const std::string& text = "") {
     return file;
 }
 
-// All of the file, wherever it was read up to.
+// Returns the whole text of the file. How far it was read before does not matter.
 inline std::string TextOf(const UniqueFd& file) {
     std::string text;
     char part[4096];

@@ -10,8 +10,8 @@
 
 namespace taviwireless {
 
-// Both ends of a pipe, which close themselves, and in programs that are started. Without them,
-// errno tells why.
+// Both ends of a pipe, which close themselves and are closed in programs that are started. Without
+// them, errno tells why.
 struct UniquePipe {
     UniqueFd readEnd;
     UniqueFd writeEnd;
@@ -25,8 +25,8 @@ struct UniquePipe {
     }
     explicit operator bool() const { return static_cast<bool>(readEnd); }
 
-    // Waits, through signals, until there is something to read or all writing ends are closed, this
-    // one among them. Whether a byte came.
+    // Closes the writing end here, then waits, through signals, until there is something to read or
+    // every other writing end is closed. Returns whether a byte came.
     bool ReadByte() {
         writeEnd.Close();
         char byte;

@@ -8,7 +8,8 @@
 
 namespace taviwireless::wireless {
 
-// The value of a name of the table, whatever its case. file and line are those of the log line.
+// Returns the value of a name of the table, whatever its case. file and line are those of the log
+// line.
 template <size_t kSize>
 int ValueOf(const WirelessNameValue (&names)[kSize], const char* text, int unknown,
             const char* file, int line) {

@@ -7,7 +7,7 @@ namespace taviwireless::wireless {
 
 namespace {
 
-// The name at the value's place; other values have the name of the unknown one.
+// Returns the name at the value's place; for other values that of the unknown one.
 template <size_t kSize>
 const char* NameOf(const char* const (&names)[kSize], int value, int unknown) {
     const bool isNamed = value >= 0 && static_cast<size_t>(value) < kSize;

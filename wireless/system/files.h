@@ -15,8 +15,8 @@
 
 namespace taviwireless::wireless {
 
-// Opens a file that is new: one that was there is removed, never written into, so that the mode
-// holds from the first byte and nobody reads along who had the old one open. Null on failure.
+// Opens a new file. A file that was there is removed and never written into, so that the mode holds
+// from the first byte, and nobody who had the old file open can read the new text. Null on failure.
 inline UniqueFile CreateAnew(const char* path, mode_t mode) {
     unlink(path);
     UniqueFd handle(open(path, O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, mode));
