@@ -4,12 +4,13 @@
 
 #include <iostream>
 
+#include "cli/command_error.h"
 #include "cli/report.h"
 
 namespace taviwireless::cli {
 
 Deadline::Deadline(const Options& options, std::optional<int> seconds)
-    : seconds_(options.timeout ? options.timeout : seconds), json_(options.json) {
+    : seconds_(options.timeout ? options.timeout : seconds), options_(options) {
     if (seconds_) {
         sentence_ = "not done within " + std::to_string(*seconds_) +
                     " s; what was begun may still come to its end";
@@ -61,7 +62,7 @@ void Deadline::Watch() {
             changed_.wait_until(lock, *end_);
         } else {
             // The lock stays held: the work cannot end, and report, at the same time.
-            PrintFailure(json_, sentence_);
+            PrintFailure(options_, sentence_);
             std::cout.flush();
             _exit(kFailure);
         }

@@ -8,7 +8,7 @@
 #include <string>
 #include <thread>
 
-#include "cli/command_line.h"
+#include "cli/options.h"
 
 namespace taviwireless::cli {
 
@@ -56,7 +56,7 @@ class Deadline {
     void Watch();
 
     const std::optional<int> seconds_;
-    const bool json_;
+    const Options& options_;
     std::mutex mutex_;  // guards what follows
     std::condition_variable changed_;
     std::string sentence_;

@@ -1,11 +1,11 @@
 #include "cli/report.h"
 
-#include <json/json.h>
-#include <unistd.h>
+#include <json/writer.h>
 
 #include <algorithm>
-#include <cstdio>
 #include <iostream>
+
+#include "cli/terminal.h"
 
 namespace taviwireless::cli {
 
@@ -16,8 +16,6 @@ size_t Width(const std::string& text) {
     return static_cast<size_t>(
         std::count_if(text.begin(), text.end(), [](char c) { return (c & 0xC0) != 0x80; }));
 }
-
-}  // namespace
 
 std::string ToText(const Table& table) {
     std::vector<size_t> widths;
@@ -39,46 +37,31 @@ std::string ToText(const Table& table) {
     return text;
 }
 
-void Print(const Table& table) {
-    ShowProgress("");
-    std::cout << ToText(table);
-}
-
-void Print(const Json::Value& document) {
-    ShowProgress("");
+std::string ToText(const Json::Value& document, bool inOneLine) {
     Json::StreamWriterBuilder builder;
-    builder["indentation"] = "  ";
-    builder["enableYAMLCompatibility"] = true;  // "key": value, without a blank before the colon
-    std::cout << Json::writeString(builder, document) << '\n';
+    builder["indentation"] = inOneLine ? "" : "  ";
+    // "key": value, without a blank before the colon
+    builder["enableYAMLCompatibility"] = !inOneLine;
+    return Json::writeString(builder, document) + "\n";
 }
 
-std::string ToLine(const Json::Value& document) {
-    Json::StreamWriterBuilder builder;
-    builder["indentation"] = "";
-    return Json::writeString(builder, document);
+}  // namespace
+
+void Report::Add(const char* key, const char* title, const std::string& text) {
+    Add(key, title, TextOrNull(text), Cell(text));
 }
 
-void PrintFailure(bool json, const std::string& sentence) {
-    ShowProgress("");
-    if (json) {
-        Json::Value document;
-        document["error"] = sentence;
-        Print(document);
-    } else {
-        std::cerr << "taviwireless: " << sentence << '\n';
+void Report::Add(const char* key, const char* title, const Json::Value& value,
+                 const std::string& cell) {
+    document[key] = value;
+    rows.push_back({title, cell});
+}
+
+void Report::AddPart(const char* key, const std::string& prefix, const Report& part) {
+    document[key] = part.document;
+    for (const auto& row : part.rows) {
+        rows.push_back({prefix + row[0], row[1]});
     }
-}
-
-std::string Printable(const std::string& text) {
-    std::string printable;
-    for (size_t i = 0; i < text.size(); ++i) {
-        const auto byte = static_cast<unsigned char>(text[i]);
-        const auto next = static_cast<unsigned char>(text[i + 1]);      // zero at the end
-        const bool isC1 = byte == 0xC2 && next >= 0x80 && next < 0xA0;  // in UTF-8, two bytes
-        printable += byte < 0x20 || byte == 0x7F || isC1 ? '?' : text[i];
-        i += isC1 ? 1 : 0;
-    }
-    return printable;
 }
 
 Json::Value TextOrNull(const std::string& text) {
@@ -93,9 +76,23 @@ std::string SecretText(const std::string& secret, bool showSecrets) {
     return secret.empty() || showSecrets ? secret : "********";
 }
 
-void ShowProgress(const std::string& text) {
-    if (isatty(STDERR_FILENO)) {
-        std::fprintf(stderr, "\r\033[K%s", text.c_str());
+std::string Render(const Options& options, const Report& report, bool documentInOneLine) {
+    return options.json ? ToText(report.document, documentInOneLine) : ToText(report.rows);
+}
+
+void Print(const Options& options, const Report& report) {
+    ShowProgress("");
+    std::cout << Render(options, report);
+}
+
+void PrintFailure(const Options& options, const std::string& sentence) {
+    ShowProgress("");
+    if (options.json) {
+        Report report;
+        report.document["error"] = sentence;
+        Print(options, report);
+    } else {
+        std::cerr << "taviwireless: " << sentence << '\n';
     }
 }
 

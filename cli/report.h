@@ -1,43 +1,55 @@
 #ifndef TAVIWIRELESS_CLI_REPORT_H
 #define TAVIWIRELESS_CLI_REPORT_H
 
-#include <json/forwards.h>
+#include <json/value.h>
 
 #include <string>
 #include <vector>
 
+#include "cli/options.h"
+
 namespace taviwireless::cli {
 
-// Rows of cells, each column as wide as its widest cell; the first row is the heading.
+// Rows of cells, each column as wide as its widest cell.
 using Table = std::vector<std::vector<std::string>>;
 
-// The table as it is printed.
-std::string ToText(const Table& table);
+// What a command has to tell: rows for a person, a document for a program. What is not known is
+// "-" in rows and null in documents.
+struct Report {
+    Table rows;
+    Json::Value document;
 
-// Print on standard output; what ShowProgress shows goes away.
-void Print(const Table& table);
-void Print(const Json::Value& document);
+    // A value with a title and a key. What is empty is not known.
+    void Add(const char* key, const char* title, const std::string& text);
+    // A value that a person reads in other words.
+    void Add(const char* key, const char* title, const Json::Value& value, const std::string& cell);
 
-// The document in one line, without its end.
-std::string ToLine(const Json::Value& document);
+    // Another thing as a part of this one; the prefix stands before its titles.
+    void AddPart(const char* key, const std::string& prefix, const Report& part);
+};
 
-// Reports a failure: {"error": SENTENCE} on standard output, or the sentence on standard error.
-void PrintFailure(bool json, const std::string& sentence);
-
-// Returns text with control characters replaced by "?": what a modem sends may not steer the
-// terminal.
-std::string Printable(const std::string& text);
-
-// What is not known is null in documents and "-" in tables.
 Json::Value TextOrNull(const std::string& text);
 std::string Cell(const std::string& text);
 
 // Stars, unless secrets are to be shown.
 std::string SecretText(const std::string& secret, bool showSecrets);
 
-// Shows on standard error what is being waited for, one line that each call replaces; the empty
-// text removes it. Nothing is shown unless standard error is a terminal.
-void ShowProgress(const std::string& text);
+// The report as it is printed, in the form that the options ask for.
+std::string Render(const Options& options, const Report& report, bool documentInOneLine = false);
+
+// Prints on standard output; what ShowProgress shows goes away.
+void Print(const Options& options, const Report& report);
+
+// What a command that changed something ends with: a sentence for a person, none when it is empty;
+// for a program the new state, which is looked at for it alone.
+template <typename State>
+void PrintOutcome(const Options& options, const std::string& sentence, const State& state) {
+    const Table rows = sentence.empty() ? Table() : Table{{sentence}};
+    Print(options, options.json ? state() : Report{rows, {}});
+}
+
+// Reports a failure: {"error": SENTENCE} on standard output, or the sentence on standard error.
+void PrintFailure(const Options& options, const std::string& sentence);
 
 }  // namespace taviwireless::cli
 

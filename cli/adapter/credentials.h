@@ -6,18 +6,19 @@
 #include <string>
 #include <vector>
 
-#include "wireless/rules/dhcp.h"
 #include "wireless/rules/security.h"
 
 namespace taviwireless::cli {
 
-using wireless::IsDHCP;
 using wireless::Security;
 using wireless::SecurityOf;
 
 // The words of --security, and what a network of that kind has.
 const std::vector<std::string>& SecurityWords();
 void SetSecurity(WirelessNetwork& network, const std::string& word);
+
+// Throws unless the ESSID can be joined or created.
+void CheckEssid(const std::string& essid);
 
 // Throws unless the key has the form that such a network wants: a wrong one would only cost the
 // time of an attempt.
@@ -28,10 +29,6 @@ void CheckUser(const std::string& user);
 
 // Reads the key behind a prompt, and checks it.
 std::string ReadKey(Security security, const std::string& essid);
-
-// "ADDRESS/PREFIX" or "ADDRESS/PREFIX,GATEWAY", IPv4.
-void SetStaticAddress(WirelessConf& conf, const std::string& text);
-void SetDHCP(WirelessConf& conf);
 
 }  // namespace taviwireless::cli
 

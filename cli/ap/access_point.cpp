@@ -11,9 +11,8 @@
 
 #include "cli/ap/dry_run.h"
 #include "cli/ap/setting_words.h"
-#include "cli/command_line.h"
-#include "cli/report.h"
-#include "cli/wifi/station.h"
+#include "cli/command_error.h"
+#include "cli/terminal.h"
 #include "wireless/rules/ap_settings.h"
 #include "wireless/rules/paths.h"
 #include "wireless/system/bridge.h"

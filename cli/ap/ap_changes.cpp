@@ -9,10 +9,8 @@
 #include "cli/adapter/credentials.h"
 #include "cli/ap/radio.h"
 #include "cli/ap/setting_words.h"
-#include "cli/command_line.h"
-#include "cli/prompt.h"
-#include "cli/report.h"
-#include "cli/wifi/station.h"
+#include "cli/command_error.h"
+#include "cli/terminal.h"
 #include "wireless/system/bridge.h"
 
 namespace taviwireless::cli {

@@ -1,7 +1,7 @@
 #ifndef TAVIWIRELESS_CLI_AP_AP_COMMANDS_H
 #define TAVIWIRELESS_CLI_AP_AP_COMMANDS_H
 
-#include "cli/command_line.h"
+#include "cli/options.h"
 
 // What the commands about the access point do. Each throws CommandError when it fails.
 namespace taviwireless::cli {

@@ -1,11 +1,7 @@
 #include "cli/ap/ap_report.h"
 
-#include <json/json.h>
-
 #include "cli/ap/radio.h"
 #include "cli/ap/setting_words.h"
-#include "cli/wifi/station.h"
-#include "cli/wifi/wifi_report.h"
 
 namespace taviwireless::cli {
 
@@ -38,48 +34,35 @@ bool HasRadius(const APNetwork& network) {
     return network.security == WIRELESS_AP_WPA_ENTERPRISE;
 }
 
-Json::Value LimitOrNull(int32_t maxStations) {
-    return maxStations > 0 ? Json::Value(maxStations) : Json::Value();
+void AddFlag(Report& report, const char* key, const char* title, bool value) {
+    report.Add(key, title, value, YesNo(value));
 }
 
-std::string LimitCell(int32_t maxStations) {
-    return maxStations > 0 ? std::to_string(maxStations) : "-";
+void AddLimit(Report& report, int32_t maxStations) {
+    const bool isLimited = maxStations > 0;
+    report.Add("max_stations", "Stations at most",
+               isLimited ? Json::Value(maxStations) : Json::Value(),
+               isLimited ? std::to_string(maxStations) : "-");
 }
 
-void AddNetwork(Json::Value& document, const APNetwork& network, bool showSecrets) {
-    document["ssid"] = TextOrNull(network.ssid);
-    document["hidden"] = network.hidden != 0;
-    document["max_stations"] = LimitOrNull(network.maxStations);
-    document["security"] = TextOrNull(SecurityWord(network));
-    document["cipher"] = TextOrNull(CipherWord(network));
-    const Secret secret = SecretOf(network);
-    if (secret.key != nullptr) {
-        document[secret.key] = TextOrNull(SecretText(secret.text, showSecrets));
-    }
-    if (HasRadius(network)) {
-        document["radius_server"] = TextOrNull(network.secret.enterprise.radiusAddr);
-        document["radius_port"] = network.secret.enterprise.radiusPort;
-    }
-}
-
-void AddNetwork(Table& table, const APNetwork& network, bool showSecrets) {
-    const std::string prefix = network.isForGuests ? "Guests: " : "";
-    const auto add = [&](const char* title, const std::string& cell) {
-        table.push_back({prefix + title, cell});
-    };
+void AddNetwork(Report& report, const APNetwork& network, bool showSecrets) {
+    const std::string security = SecurityWord(network);
     const std::string cipher = CipherWord(network);
-    add("Network", Cell(network.ssid));
-    add("Hidden", YesNo(network.hidden != 0));
-    add("Stations at most", LimitCell(network.maxStations));
-    add("Security", Cell(SecurityWord(network)) + (cipher.empty() ? "" : ", cipher " + cipher));
+    report.Add("ssid", "Network", network.ssid);
+    AddFlag(report, "hidden", "Hidden", network.hidden != 0);
+    AddLimit(report, network.maxStations);
+    report.Add("security", "Security", TextOrNull(security),
+               Cell(security) + (cipher.empty() ? "" : ", cipher " + cipher));
+    report.document["cipher"] = TextOrNull(cipher);
     const Secret secret = SecretOf(network);
     if (secret.key != nullptr) {
-        add(secret.title, Cell(SecretText(secret.text, showSecrets)));
+        report.Add(secret.key, secret.title, SecretText(secret.text, showSecrets));
     }
     if (HasRadius(network)) {
         const auto& radius = network.secret.enterprise;
-        add("RADIUS server",
-            Cell(radius.radiusAddr) + ", port " + std::to_string(radius.radiusPort));
+        report.Add("radius_server", "RADIUS server", TextOrNull(radius.radiusAddr),
+                   Cell(radius.radiusAddr) + ", port " + std::to_string(radius.radiusPort));
+        report.document["radius_port"] = radius.radiusPort;
     }
 }
 
@@ -93,73 +76,62 @@ const char* StateText(const APStatus& status) {
     return status.isSupported ? "off" : "the adapter, if there is one, cannot be an access point";
 }
 
+// Rows only while there is a network for guests.
+Report DescribeGuests(WirelessAPConf& ap, bool showSecrets) {
+    Report report;
+    AddNetwork(report, GuestNetwork(ap), showSecrets);
+    AddFlag(report, "isolate", "Isolated", ap.guestIsolate != 0);
+    report.document["enabled"] = ap.guestEnabled != 0;
+    if (ap.guestEnabled == 0) {
+        report.rows.clear();
+    }
+    return report;
+}
+
 }  // namespace
 
-Json::Value ToJson(const APStatus& status) {
-    Json::Value document;
-    document["interface"] = TAVIWirelessAPInterfaceGet();
-    document["supported"] = status.isSupported;
-    document["connecting"] = status.isConnecting;
-    document["on"] = status.isOn;
-    for (const char* key : {"enabled", "ssid", "bridge", "max_stations"}) {
-        document[key] = Json::Value();
+Report Describe(const APStatus& status) {
+    const std::string interface = TAVIWirelessAPInterfaceGet();
+    Report report;
+    report.Add("interface", "Interface", interface, interface);
+    report.rows.push_back({"State", StateText(status)});
+    report.document["supported"] = status.isSupported;
+    report.document["connecting"] = status.isConnecting;
+    report.document["on"] = status.isOn;
+    if (!status.settings) {
+        for (const char* key : {"enabled", "ssid", "bridge", "address", "max_stations"}) {
+            report.document[key] = Json::Value();
+        }
+        return report;
     }
-    if (status.settings) {
-        const WirelessAPConf& ap = status.settings->ap;
-        document["enabled"] = status.settings->enabled != 0;
-        document["ssid"] = TextOrNull(ap.ssid);
-        document["bridge"] = TextOrNull(ap.bridge);
-        document["max_stations"] = LimitOrNull(ap.maxStations);
-    }
-    document["address"] = TextOrNull(status.bridgeAddress);
-    return document;
+    const WirelessAPConf& ap = status.settings->ap;
+    AddFlag(report, "enabled", "To be on", status.settings->enabled != 0);
+    report.Add("ssid", "Network", ap.ssid);
+    report.Add("bridge", "Bridge", ap.bridge);
+    report.Add("address", "Address", status.bridgeAddress);
+    AddLimit(report, ap.maxStations);
+    return report;
 }
 
-Table StatusTable(const APStatus& status) {
-    Table table{{"Interface", TAVIWirelessAPInterfaceGet()}, {"State", StateText(status)}};
-    if (status.settings) {
-        const WirelessAPConf& ap = status.settings->ap;
-        table.push_back({"To be on", YesNo(status.settings->enabled != 0)});
-        table.push_back({"Network", Cell(ap.ssid)});
-        table.push_back({"Bridge", Cell(ap.bridge)});
-        table.push_back({"Address", Cell(status.bridgeAddress)});
-        table.push_back({"Stations at most", LimitCell(ap.maxStations)});
-    }
-    return table;
-}
-
-Json::Value ToJson(WirelessAPSettings settings, bool showSecrets) {
+Report Describe(WirelessAPSettings settings, bool showSecrets) {
     WirelessAPConf& ap = settings.ap;
-    Json::Value document;
-    document["adapter"] = TextOrNull(settings.name);
-    document["enabled"] = settings.enabled != 0;
-    AddNetwork(document, MainNetwork(ap), showSecrets);
-    document["bridge"] = TextOrNull(ap.bridge);
-    document["mode"] = TextOrNull(ModeWord(ap));
-    document["band"] = BandWord(ap);
-    document["channel"] = ap.channel == 0 ? Json::Value("auto") : Json::Value(ap.channel);
-    document["width"] = ChannelWidth(ap);
-    Json::Value& guest = document["guest"];
-    guest["enabled"] = ap.guestEnabled != 0;
-    AddNetwork(guest, GuestNetwork(ap), showSecrets);
-    guest["isolate"] = ap.guestIsolate != 0;
-    return document;
-}
-
-Table ShowTable(WirelessAPSettings settings, bool showSecrets) {
-    WirelessAPConf& ap = settings.ap;
-    Table table{{"Adapter", Cell(settings.name)}, {"To be on", YesNo(settings.enabled != 0)}};
-    AddNetwork(table, MainNetwork(ap), showSecrets);
-    table.push_back({"Bridge", Cell(ap.bridge)});
-    table.push_back({"Mode", "802.11" + Cell(ModeWord(ap)) + " at " + BandWord(ap) + " GHz"});
-    table.push_back(
-        {"Channel", ChannelWord(ap) + ", " + std::to_string(ChannelWidth(ap)) + " MHz"});
-    table.push_back({"Guest network", YesNo(ap.guestEnabled != 0)});
-    if (ap.guestEnabled != 0) {
-        AddNetwork(table, GuestNetwork(ap), showSecrets);
-        table.push_back({"Guests: Isolated", YesNo(ap.guestIsolate != 0)});
-    }
-    return table;
+    const std::string band = BandWord(ap);
+    const std::string mode = ModeWord(ap);
+    const int width = ChannelWidth(ap);
+    Report report;
+    report.Add("adapter", "Adapter", settings.name);
+    AddFlag(report, "enabled", "To be on", settings.enabled != 0);
+    AddNetwork(report, MainNetwork(ap), showSecrets);
+    report.Add("bridge", "Bridge", ap.bridge);
+    report.Add("mode", "Mode", TextOrNull(mode), "802.11" + Cell(mode) + " at " + band + " GHz");
+    report.document["band"] = band;
+    report.Add("channel", "Channel",
+               ap.channel == 0 ? Json::Value(ChannelWord(ap)) : Json::Value(ap.channel),
+               ChannelWord(ap) + ", " + std::to_string(width) + " MHz");
+    report.document["width"] = width;
+    report.rows.push_back({"Guest network", YesNo(ap.guestEnabled != 0)});
+    report.AddPart("guest", "Guests: ", DescribeGuests(ap, showSecrets));
+    return report;
 }
 
 }  // namespace taviwireless::cli

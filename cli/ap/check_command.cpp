@@ -1,5 +1,4 @@
 // taviwireless ap check: what the access point would be started with, and what hostapd says of it.
-#include <json/json.h>
 #include <unistd.h>
 
 #include <cstdio>
@@ -9,11 +8,13 @@
 
 #include "base/join.h"
 #include "base/memory_file.h"
+#include "cli/adapter/requirements.h"
 #include "cli/ap/access_point.h"
 #include "cli/ap/ap_changes.h"
 #include "cli/ap/ap_commands.h"
+#include "cli/command_error.h"
 #include "cli/report.h"
-#include "cli/wifi/station.h"
+#include "cli/terminal.h"
 #include "wireless/rules/hostapd_conf.h"
 #include "wireless/rules/paths.h"
 #include "wireless/system/guest_network.h"
@@ -112,17 +113,32 @@ Verdict CheckWithHostapd(const std::vector<ConfFile>& files) {
     return verdict;
 }
 
-Json::Value ToJson(const std::vector<ConfFile>& files, const Verdict& verdict, bool showSecrets) {
-    Json::Value document;
-    document["files"] = Json::Value(Json::objectValue);
+// A person reads it before what is said of it, whatever comes then.
+void PrintText(const std::vector<ConfFile>& files, bool showSecrets) {
     for (const ConfFile& file : files) {
-        document["files"][file.path] = Shown(file, showSecrets);
+        // Line by line: the line breaks belong to the file and stay.
+        std::istringstream lines(Shown(file, showSecrets));
+        std::cout << "# " << file.path << '\n';
+        for (std::string line; std::getline(lines, line);) {
+            std::cout << Printable(line) << '\n';
+        }
     }
-    document["remarks"] = Json::Value(Json::arrayValue);
+    std::cout.flush();
+}
+
+Report Describe(const std::vector<ConfFile>& files, const Verdict& verdict, bool showSecrets) {
+    Report report;
+    report.document["files"] = Json::Value(Json::objectValue);
+    for (const ConfFile& file : files) {
+        report.document["files"][file.path] = Shown(file, showSecrets);
+    }
+    report.document["remarks"] = Json::Value(Json::arrayValue);
     for (const std::string& remark : verdict.remarks) {
-        document["remarks"].append(remark);
+        report.document["remarks"].append(remark);
+        report.rows.push_back({"hostapd: " + remark});
     }
-    return document;
+    report.rows.push_back({"hostapd understands all of it."});
+    return report;
 }
 
 }  // namespace
@@ -132,25 +148,10 @@ void CheckAP(const Options& options) {
     const WirelessAPSettings settings = ReadAPSettings();
     const std::vector<ConfFile> files = Render(settings.ap);
     if (!options.json) {
-        for (const ConfFile& file : files) {
-            // Line by line: the line breaks belong to the file and stay.
-            std::istringstream lines(Shown(file, options.showSecrets));
-            std::cout << "# " << file.path << '\n';
-            for (std::string line; std::getline(lines, line);) {
-                std::cout << Printable(line) << '\n';
-            }
-        }
-        std::cout.flush();  // before what is said of them
+        PrintText(files, options.showSecrets);
     }
     CheckAPConf(settings.ap);
-    const Verdict verdict = CheckWithHostapd(files);
-    if (options.json) {
-        return Print(ToJson(files, verdict, options.showSecrets));
-    }
-    for (const std::string& remark : verdict.remarks) {
-        std::cout << "hostapd: " << remark << '\n';
-    }
-    std::cout << "hostapd understands all of it.\n";
+    Print(options, Describe(files, CheckWithHostapd(files), options.showSecrets));
 }
 
 }  // namespace taviwireless::cli

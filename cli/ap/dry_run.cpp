@@ -3,7 +3,7 @@
 #include <cstdio>
 #include <cstring>
 
-#include "cli/command_line.h"
+#include "cli/command_error.h"
 #include "wireless/rules/bridge_names.h"
 #include "wireless/rules/paths.h"
 #include "wireless/system/bridge.h"

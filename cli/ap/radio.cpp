@@ -1,6 +1,6 @@
 #include "cli/ap/radio.h"
 
-#include "cli/command_line.h"
+#include "cli/command_error.h"
 #include "wireless/rules/radio.h"
 
 namespace taviwireless::cli {

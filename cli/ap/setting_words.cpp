@@ -1,8 +1,8 @@
 #include "cli/ap/setting_words.h"
 
 #include "base/join.h"
-#include "cli/command_line.h"
-#include "cli/report.h"
+#include "cli/command_error.h"
+#include "cli/terminal.h"
 #include "wireless/rules/ap_settings.h"
 #include "wireless/rules/radio.h"
 

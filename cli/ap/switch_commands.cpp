@@ -1,12 +1,12 @@
 // taviwireless ap: the stored settings, and switching the access point on and off.
-#include <json/json.h>
-
+#include "cli/adapter/requirements.h"
 #include "cli/ap/access_point.h"
 #include "cli/ap/ap_changes.h"
 #include "cli/ap/ap_commands.h"
 #include "cli/ap/ap_report.h"
 #include "cli/ap/setting_words.h"
-#include "cli/wifi/station.h"
+#include "cli/command_error.h"
+#include "cli/terminal.h"
 #include "wireless/rules/paths.h"
 
 namespace taviwireless::cli {
@@ -30,28 +30,29 @@ std::string WhoCanJoin(WirelessAPConf conf) {
 }
 
 void ShowPlan(const Options& options) {
-    Json::Value document;
-    Table table;
+    Report report;
     for (const std::string& line : PlanAP()) {
-        document["plan"].append(line);
-        table.push_back({Printable(line)});
+        report.document["plan"].append(line);
+        report.rows.push_back({Printable(line)});
     }
-    options.json ? Print(document) : Print(table);
+    Print(options, report);
+}
+
+void PrintOutcomeOfSwitching(const Options& options, const std::string& outcome) {
+    PrintOutcome(options, TAVIWirelessAPInterfaceGet() + (": access point " + outcome),
+                 [] { return Describe(LookAtAP()); });
 }
 
 }  // namespace
 
 // Needs no root.
 void ShowAP(const Options& options) {
-    const APStatus status = LookAtAP();
-    options.json ? Print(ToJson(status)) : Print(StatusTable(status));
+    Print(options, Describe(LookAtAP()));
 }
 
 void ShowAPSettings(const Options& options) {
     RequireWifiSettings();
-    const WirelessAPSettings settings = ReadAPSettings();
-    options.json ? Print(ToJson(settings, options.showSecrets))
-                 : Print(ShowTable(settings, options.showSecrets));
+    Print(options, Describe(ReadAPSettings(), options.showSecrets));
 }
 
 void SetAP(const Options& options) {
@@ -60,8 +61,8 @@ void SetAP(const Options& options) {
     ApplyAPChanges(ReadAPChanges(options.settings), settings.ap);
     CheckAPConf(settings.ap);
     StoreAPSettings(settings);
-    options.json ? Print(ToJson(settings, false))
-                 : Print(Table{{"Stored; taviwireless ap enable puts it into force."}});
+    PrintOutcome(options, "Stored; taviwireless ap enable puts it into force.",
+                 [&] { return Describe(settings); });
 }
 
 void EnableAP(const Options& options) {
@@ -72,18 +73,14 @@ void EnableAP(const Options& options) {
     ShowProgress("Switching the access point on ...");
     SwitchAPOn();
     const WirelessAPConf conf = ReadAPSettings().ap;
-    options.json ? Print(ToJson(LookAtAP()))
-                 : Print(Table{{std::string(TAVIWirelessAPInterfaceGet()) + ": access point " +
-                                Printable(conf.ssid) + " switched on, " + WhoCanJoin(conf)}});
+    PrintOutcomeOfSwitching(options, Printable(conf.ssid) + " switched on, " + WhoCanJoin(conf));
 }
 
 void DisableAP(const Options& options) {
     RequireWifiSettings();
     ShowProgress("Switching the access point off ...");
     SwitchAPOff();
-    options.json
-        ? Print(ToJson(LookAtAP()))
-        : Print(Table{{std::string(TAVIWirelessAPInterfaceGet()) + ": access point switched off"}});
+    PrintOutcomeOfSwitching(options, "switched off");
 }
 
 }  // namespace taviwireless::cli

@@ -1,6 +1,4 @@
 // taviwireless modem connect, disconnect and status: the data connection.
-#include <json/json.h>
-
 #include <chrono>
 #include <iomanip>
 #include <sstream>
@@ -10,6 +8,7 @@
 #include "cli/modem/modem_access.h"
 #include "cli/modem/modem_commands.h"
 #include "cli/report.h"
+#include "cli/terminal.h"
 
 namespace taviwireless::cli {
 
@@ -20,21 +19,21 @@ using Clock = std::chrono::steady_clock;
 constexpr std::chrono::milliseconds kLookPause{250};
 constexpr int kConnectTimeout = 60;  // seconds
 
-Json::Value ToJson(const std::string& id, const Connection& connection) {
-    Json::Value document;
-    document["id"] = id;
-    document["net_status"] = connection.status;
-    document["interface"] = connection.interface;
-    document["ip"] = connection.address;
-    return document;
-}
-
-std::string ToText(const std::string& id, const Connection& connection) {
+std::string Sentence(const std::string& id, const Connection& connection) {
     std::string text = id + ": " + connection.status;
     if (!connection.address.empty()) {
         text += ", " + connection.address + " on " + connection.interface;
     }
     return Printable(text);
+}
+
+Report Describe(const std::string& id, const Connection& connection) {
+    Report report{{{Sentence(id, connection)}}, {}};
+    report.document["id"] = id;
+    report.document["net_status"] = connection.status;
+    report.document["interface"] = connection.interface;
+    report.document["ip"] = connection.address;
+    return report;
 }
 
 double SecondsSince(Clock::time_point begin) {
@@ -91,13 +90,10 @@ void ConnectModem(const Options& options) {
     const auto begin = Clock::now();
     const Connection connection = deadline.Limit([&] { return Dial(*access, options, deadline); });
     const double seconds = SecondsSince(begin);
-    if (options.json) {
-        Json::Value document = ToJson(options.id, connection);
-        document["seconds"] = seconds;
-        Print(document);
-    } else {
-        Print(Table{{ToText(options.id, connection) + " after " + Seconds(seconds, 1)}});
-    }
+    Report report = Describe(options.id, connection);
+    report.rows = {{Sentence(options.id, connection) + " after " + Seconds(seconds, 1)}};
+    report.document["seconds"] = seconds;
+    Print(options, report);
 }
 
 void DisconnectModem(const Options& options) {
@@ -115,16 +111,14 @@ void DisconnectModem(const Options& options) {
         return connection;
     };
     const Connection connection = Deadline(options).Limit(hangUp);
-    options.json ? Print(ToJson(options.id, connection))
-                 : Print(Table{{ToText(options.id, connection)}});
+    Print(options, Describe(options.id, connection));
 }
 
 void ShowConnection(const Options& options) {
     const auto access = MakeAccess(options);
     const Connection connection =
         Deadline(options).Limit([&] { return access->LookAtConnection(options.id); });
-    options.json ? Print(ToJson(options.id, connection))
-                 : Print(Table{{ToText(options.id, connection)}});
+    Print(options, Describe(options.id, connection));
 }
 
 }  // namespace taviwireless::cli

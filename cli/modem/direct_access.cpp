@@ -5,7 +5,7 @@
 #include <set>
 
 #include "cli/modem/modem_access.h"
-#include "cli/report.h"
+#include "cli/terminal.h"
 
 namespace taviwireless::cli {
 

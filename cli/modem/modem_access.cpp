@@ -4,7 +4,7 @@
 
 #include <algorithm>
 
-#include "cli/report.h"
+#include "cli/terminal.h"
 
 namespace taviwireless::cli {
 

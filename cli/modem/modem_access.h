@@ -6,12 +6,27 @@
 #include <string>
 #include <vector>
 
-#include "cli/command_line.h"
+#include "cli/command_error.h"
+#include "cli/options.h"
 
 namespace taviwireless::cli {
 
-// The keys location, isp, apn, number, user, pass, roaming and default_gw, all as text.
+// The connection profile of a SIM: its values by key, all as text.
 using Profile = std::map<std::string, std::string>;
+
+// Its keys, in the order in which they are shown.
+struct ProfileKey {
+    const char* name;
+    const char* title;
+    bool canBeSet;
+};
+constexpr char kPassword[] = "pass";
+constexpr ProfileKey kProfileKeys[] = {
+    {"number", "Number", true},    {"user", "User", true},
+    {kPassword, "Password", true}, {"apn", "APN", true},
+    {"isp", "ISP", true},          {"location", "Location", true},
+    {"roaming", "Roaming", false}, {"default_gw", "Default route", true},
+};
 
 // Statuses of a SIM. "no_answer" is that of a modem that is plugged in but not ready for use.
 constexpr char kReady[] = "ready";

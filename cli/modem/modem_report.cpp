@@ -1,6 +1,6 @@
 #include "cli/modem/modem_report.h"
 
-#include <json/json.h>
+#include "cli/terminal.h"
 
 namespace taviwireless::cli {
 
@@ -20,10 +20,6 @@ std::string WithoutBlanks(const std::string& text) {
     return begin == std::string::npos ? "" : text.substr(begin);
 }
 
-Json::Value AttemptsOrNull(const ModemState& state, int attempts) {
-    return HasSIM(state) && attempts >= 0 ? Json::Value(attempts) : Json::Value();
-}
-
 std::string SignalCell(const ModemState& state) {
     return state.simStatus == kReady ? std::to_string(state.signal) + "%" : "-";
 }
@@ -32,8 +28,12 @@ std::string ProtectionCell(const ModemState& state) {
     return HasSIM(state) ? (state.pinProtected ? "on" : "off") : "-";
 }
 
+bool AreKnown(const ModemState& state, int attempts) {
+    return HasSIM(state) && attempts >= 0;
+}
+
 std::string AttemptsCell(const ModemState& state, int attempts) {
-    return HasSIM(state) && attempts >= 0 ? std::to_string(attempts) : "-";
+    return AreKnown(state, attempts) ? std::to_string(attempts) : "-";
 }
 
 std::string SIMCell(const std::string& status) {
@@ -55,93 +55,67 @@ std::string ProfileValue(const Profile& profile, const std::string& key, bool sh
     if (found == profile.end()) {
         return "";
     }
-    const bool isHidden = key == kPassword && !showSecrets && !found->second.empty();
-    return isHidden ? "********" : found->second;
+    return key == kPassword ? SecretText(found->second, showSecrets) : found->second;
 }
 
 }  // namespace
 
-Json::Value ToJson(const Profile& profile, bool showSecrets) {
-    Json::Value document(Json::objectValue);
+Report Describe(const Profile& profile, bool showSecrets) {
+    Report report;
     for (const ProfileKey& key : kProfileKeys) {
-        document[key.name] = ProfileValue(profile, key.name, showSecrets);
+        const std::string value = ProfileValue(profile, key.name, showSecrets);
+        report.Add(key.name, key.title, value, Printable(value));
     }
+    Json::Value& document = report.document;
     document["default_gw"] = document["default_gw"] == "true";
-    const std::string roaming = document["roaming"].asString();
-    document["roaming"] = roaming.empty() ? Json::Value() : Json::Value(roaming == "true");
-    return document;
+    document["roaming"] = document["roaming"] == "" ? Json::Value() : document["roaming"] == "true";
+    return report;
 }
 
-Json::Value ToJson(const ModemState& state, bool showSecrets) {
-    Json::Value document;
-    document["id"] = state.id;
-    document["vendor"] = TextOrNull(WithoutBlanks(state.vendor));
-    document["product"] = TextOrNull(WithoutBlanks(state.product));
-    document["carrier"] = TextOrNull(WithoutBlanks(state.carrier));
-    document["signal"] = state.simStatus == kReady ? Json::Value(state.signal) : Json::Value();
-    document["sim_status"] = state.simStatus;
-    document["pin_protected"] = HasSIM(state) ? Json::Value(state.pinProtected) : Json::Value();
-    document["pin_remains"] = AttemptsOrNull(state, state.pinRemains);
-    document["puk_remains"] = AttemptsOrNull(state, state.pukRemains);
-    document["net_status"] = TextOrNull(state.netStatus);
-    document["ip"] = TextOrNull(state.ip);
-    document["profile"] =
-        state.simStatus == kReady ? ToJson(state.profile, showSecrets) : Json::Value();
-    return document;
+Report Describe(const ModemState& state, bool showSecrets) {
+    const Json::Value unknown;
+    const bool isReady = state.simStatus == kReady;
+    Report report;
+    const auto addAttempts = [&](const char* key, const char* title, int attempts) {
+        report.Add(key, title, AreKnown(state, attempts) ? Json::Value(attempts) : unknown,
+                   AttemptsCell(state, attempts));
+    };
+    report.Add("id", "Device", state.id, state.id);
+    report.Add("vendor", "Vendor", WithoutBlanks(state.vendor));
+    report.Add("product", "Product", WithoutBlanks(state.product));
+    report.Add("carrier", "Operator", WithoutBlanks(state.carrier));
+    report.Add("signal", "Signal", isReady ? Json::Value(state.signal) : unknown,
+               SignalCell(state));
+    report.Add("sim_status", "SIM", state.simStatus, SIMCell(state.simStatus));
+    report.Add("pin_protected", "PIN lock",
+               HasSIM(state) ? Json::Value(state.pinProtected) : unknown, ProtectionCell(state));
+    addAttempts("pin_remains", "PIN attempts", state.pinRemains);
+    addAttempts("puk_remains", "PUK attempts", state.pukRemains);
+    report.Add("net_status", "Network", TextOrNull(state.netStatus), NetworkCell(state.netStatus));
+    report.Add("ip", "Address", state.ip);
+    report.AddPart("profile",
+                   "Profile: ", isReady ? Describe(state.profile, showSecrets) : Report());
+    return report;
 }
 
-Json::Value ToJson(const std::vector<ModemState>& states) {
-    Json::Value documents(Json::arrayValue);
-    for (const ModemState& state : states) {
-        documents.append(ToJson(state));
-    }
-    return documents;
-}
-
-std::string ListText(const std::vector<ModemState>& states) {
+Report DescribeAll(const std::vector<ModemState>& states) {
     if (states.empty()) {
-        return "No modem is plugged in: there is no usbmodem.info file in /tmp/.\n";
+        return {{{"No modem is plugged in: there is no usbmodem.info file in /tmp/."}},
+                Json::arrayValue};
     }
-    Table table{{"DEVICE", "VENDOR", "PRODUCT", "OPERATOR", "SIGNAL", "SIM", "PIN LOCK",
-                 "PIN/PUK LEFT", "NETWORK", "ADDRESS"}};
+    Report all{{{"DEVICE", "VENDOR", "PRODUCT", "OPERATOR", "SIGNAL", "SIM", "PIN LOCK",
+                 "PIN/PUK LEFT", "NETWORK", "ADDRESS"}},
+               Json::arrayValue};
     for (const ModemState& state : states) {
-        table.push_back(
+        all.document.append(Describe(state).document);
+        all.rows.push_back(
             {state.id, Cell(WithoutBlanks(state.vendor)), Cell(WithoutBlanks(state.product)),
              Cell(WithoutBlanks(state.carrier)), SignalCell(state), SIMCell(state.simStatus),
              ProtectionCell(state),
              AttemptsCell(state, state.pinRemains) + " / " + AttemptsCell(state, state.pukRemains),
              NetworkCell(state.netStatus), Cell(state.ip)});
     }
-    return ToText(table);
-}
-
-Table ShowTable(const ModemState& state, bool showSecrets) {
-    Table table{{"Device", state.id},
-                {"Vendor", Cell(WithoutBlanks(state.vendor))},
-                {"Product", Cell(WithoutBlanks(state.product))},
-                {"Operator", Cell(WithoutBlanks(state.carrier))},
-                {"Signal", SignalCell(state)},
-                {"SIM", SIMCell(state.simStatus)},
-                {"PIN lock", ProtectionCell(state)},
-                {"PIN attempts", AttemptsCell(state, state.pinRemains)},
-                {"PUK attempts", AttemptsCell(state, state.pukRemains)},
-                {"Network", NetworkCell(state.netStatus)},
-                {"Address", Cell(state.ip)}};
-    if (state.simStatus == kReady) {
-        for (auto& row : ProfileTable(state.profile, showSecrets)) {
-            row[0] = "Profile: " + row[0];
-            table.push_back(row);
-        }
-    }
-    return table;
-}
-
-Table ProfileTable(const Profile& profile, bool showSecrets) {
-    Table table;
-    for (const ProfileKey& key : kProfileKeys) {
-        table.push_back({key.title, Printable(ProfileValue(profile, key.name, showSecrets))});
-    }
-    return table;
+    return all;
 }
 
 }  // namespace taviwireless::cli

@@ -1,14 +1,11 @@
 // taviwireless modem unlock, pin and puk: what the SIM in a modem asks for.
-#include <json/json.h>
-
 #include <algorithm>
-#include <iostream>
 
 #include "cli/deadline.h"
 #include "cli/modem/modem_access.h"
 #include "cli/modem/modem_commands.h"
 #include "cli/modem/modem_report.h"
-#include "cli/prompt.h"
+#include "cli/terminal.h"
 
 namespace taviwireless::cli {
 
@@ -185,11 +182,7 @@ class PINCommand {
     }
 
     void Report(const ModemState& state, const std::string& sentence) const {
-        if (options_.json) {
-            Print(ToJson(state));
-        } else {
-            Print(Table{{state.id + ": " + sentence}});
-        }
+        PrintOutcome(options_, state.id + ": " + sentence, [&] { return Describe(state); });
     }
 
     const Options& options_;

@@ -1,6 +1,4 @@
 // taviwireless modem profile: the connection profile of the SIM in a modem.
-#include <json/json.h>
-
 #include <algorithm>
 
 #include "base/join.h"
@@ -8,7 +6,7 @@
 #include "cli/modem/modem_access.h"
 #include "cli/modem/modem_commands.h"
 #include "cli/modem/modem_report.h"
-#include "cli/prompt.h"
+#include "cli/terminal.h"
 
 namespace taviwireless::cli {
 
@@ -60,14 +58,12 @@ Setting ParseSetting(const std::string& text) {
 template <typename Change>
 void ChangeAndReport(const Options& options, const Change& change) {
     const auto access = MakeAccess(options);
-    const Profile profile = Deadline(options).Limit([&] {
-        change(*access);
-        return options.json ? access->ReadProfile(options.id) : Profile();
+    Deadline deadline(options);
+    deadline.Limit([&] { change(*access); });
+    PrintOutcome(options, "", [&] {
+        return Describe(deadline.Limit([&] { return access->ReadProfile(options.id); }),
+                        options.showSecrets);
     });
-    ShowProgress("");
-    if (options.json) {
-        Print(ToJson(profile, options.showSecrets));
-    }
 }
 
 }  // namespace
@@ -76,8 +72,7 @@ void ShowProfile(const Options& options) {
     const auto access = MakeAccess(options);
     const Profile profile =
         Deadline(options).Limit([&] { return access->ReadProfile(options.id); });
-    options.json ? Print(ToJson(profile, options.showSecrets))
-                 : Print(ProfileTable(profile, options.showSecrets));
+    Print(options, Describe(profile, options.showSecrets));
 }
 
 void SetProfile(const Options& options) {

@@ -6,7 +6,7 @@
 
 #include "cli/modem/modem_access.h"
 #include "cli/modem/service_document.h"
-#include "cli/report.h"
+#include "cli/terminal.h"
 
 namespace taviwireless::cli {
 

@@ -43,11 +43,10 @@ int NumberOr(const std::map<std::string, std::string>& values, const char* key, 
 
 Profile ProfileOf(const std::map<std::string, std::string>& values) {
     Profile profile;
-    for (const char* key :
-         {"location", "isp", "apn", "number", "user", "pass", "roaming", "default_gw"}) {
-        const auto found = values.find(key);
+    for (const ProfileKey& key : kProfileKeys) {
+        const auto found = values.find(key.name);
         if (found != values.end()) {
-            profile[key] = found->second;
+            profile.insert(*found);
         }
     }
     return profile;

@@ -1,5 +1,4 @@
 // taviwireless modem watch: the states of the modems as they change.
-#include <json/json.h>
 #include <signal.h>
 #include <unistd.h>
 
@@ -7,10 +6,12 @@
 #include <iostream>
 #include <thread>
 
+#include "cli/command_error.h"
 #include "cli/deadline.h"
 #include "cli/modem/modem_access.h"
 #include "cli/modem/modem_commands.h"
 #include "cli/modem/modem_report.h"
+#include "cli/terminal.h"
 
 namespace taviwireless::cli {
 
@@ -24,13 +25,8 @@ void EndWithSuccess(int) {
     _exit(kSuccess);
 }
 
-std::string LookAgain(ModemAccess& access, const Options& options) {
-    if (options.id.empty()) {
-        const auto states = access.LookAtAll();
-        return options.json ? ToLine(ToJson(states)) + "\n" : ListText(states);
-    }
-    const ModemState state = access.Look(options.id);
-    return options.json ? ToLine(ToJson(state)) + "\n" : ToText(ShowTable(state, false));
+Report LookAgain(ModemAccess& access, const std::string& id) {
+    return id.empty() ? DescribeAll(access.LookAtAll()) : Describe(access.Look(id));
 }
 
 void Show(const std::string& text, bool inPlace) {
@@ -50,10 +46,12 @@ void WatchModems(const Options& options) {
     const bool inPlace = !options.json && isatty(STDOUT_FILENO);
     const auto access = MakeAccess(options);
     Deadline deadline(options);
+    constexpr bool kInOneLine = true;
     std::string shown;
     for (;;) {
         deadline.Restart();
-        const std::string text = deadline.Limit([&] { return LookAgain(*access, options); });
+        const Report report = deadline.Limit([&] { return LookAgain(*access, options.id); });
+        const std::string text = Render(options, report, kInOneLine);
         if (text != shown) {
             const bool isNextTable = !options.json && !inPlace && !shown.empty();
             Show(isNextTable ? "\n" + text : text, inPlace);

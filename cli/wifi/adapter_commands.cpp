@@ -1,11 +1,10 @@
 // taviwireless wifi: the adapter and its connection.
-#include <json/json.h>
 #include <taviwireless/wireless.h>
-
-#include <iostream>
 
 #include "base/fixed_field.h"
 #include "cli/adapter/credentials.h"
+#include "cli/adapter/requirements.h"
+#include "cli/terminal.h"
 #include "cli/wifi/station.h"
 #include "cli/wifi/wifi_commands.h"
 #include "cli/wifi/wifi_report.h"
@@ -28,20 +27,13 @@ void CheckOneWord(const std::string& text, const char* what) {
 // Needs no root and no adapter: that there is none is an answer here.
 void ShowWifi(const Options& options) {
     const WirelessStatus status = LookAtWifi();
-    const std::string address = WifiAddress();
-    options.json ? Print(ToJson(status, address)) : Print(StatusTable(status, address));
+    Print(options, Describe(status, WifiAddress()));
 }
 
 void ListNetworks(const Options& options) {
     RequireAdapter();
     ShowProgress("Looking for networks ...");
-    const auto networks = Scan();
-    if (options.json) {
-        Print(ToJson(networks));
-    } else {
-        ShowProgress("");
-        std::cout << ListText(networks);
-    }
+    Print(options, DescribeAll(Scan()));
 }
 
 // Disconnects also when the adapter was unplugged: the connection has then left its address and its
@@ -54,7 +46,7 @@ void DisconnectWifi(const Options& options) {
     }
     ShowProgress("Disconnecting ...");
     EndConnection();
-    ReportWifi(options);
+    PrintConnection(options);
 }
 
 void ConnectAutomatically(const Options& options) {
@@ -79,7 +71,7 @@ void ConnectAutomatically(const Options& options) {
         throw CommandError(kFailure, "connected, but could not make " + ConnectionGateway() +
                                          " the default gateway; the system log tells why");
     }
-    ReportWifi(options);
+    PrintConnection(options);
 }
 
 void CreateAdhoc(const Options& options) {
@@ -102,7 +94,7 @@ void CreateAdhoc(const Options& options) {
         throw CommandError(kFailure, "cannot create the ad-hoc network " +
                                          Printable(options.network) + "; the system log tells why");
     }
-    ReportWifi(options);
+    PrintConnection(options);
 }
 
 void ChangeWifiMode(const Options& options) {
@@ -114,7 +106,7 @@ void ChangeWifiMode(const Options& options) {
         throw CommandError(kFailure, std::string("the mode of the adapter could not be changed: ") +
                                          wireless::kHotplugScript + " failed or is not there");
     }
-    ReportWifi(options);
+    PrintConnection(options);
 }
 
 void ShowWifiGateway(const Options& options) {
@@ -124,9 +116,9 @@ void ShowWifiGateway(const Options& options) {
         throw CommandError(kFailure, "no gateway is known for " + WifiInterface() +
                                          ": it is not connected, or its network has none");
     }
-    Json::Value document;
-    document["gateway"] = gateway;
-    options.json ? Print(document) : Print(Table{{Printable(gateway)}});
+    Report report{{{Printable(gateway)}}, {}};
+    report.document["gateway"] = gateway;
+    Print(options, report);
 }
 
 }  // namespace taviwireless::cli

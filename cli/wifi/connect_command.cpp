@@ -6,6 +6,9 @@
 
 #include "base/fixed_field.h"
 #include "cli/adapter/credentials.h"
+#include "cli/adapter/requirements.h"
+#include "cli/terminal.h"
+#include "cli/wifi/ip_address.h"
 #include "cli/wifi/station.h"
 #include "cli/wifi/wifi_commands.h"
 #include "cli/wifi/wifi_report.h"
@@ -187,7 +190,7 @@ void ConnectWifi(const Options& options) {
     RequireAdapter();
     RequireRadio();
     Joining(options).Run();
-    ReportWifi(options);
+    PrintConnection(options);
 }
 
 }  // namespace taviwireless::cli

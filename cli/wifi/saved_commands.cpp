@@ -1,10 +1,10 @@
 // taviwireless wifi saved: the networks that were joined before.
-#include <json/json.h>
 #include <strings.h>
 
 #include <algorithm>
-#include <iostream>
 
+#include "cli/adapter/requirements.h"
+#include "cli/terminal.h"
 #include "cli/wifi/station.h"
 #include "cli/wifi/wifi_commands.h"
 #include "cli/wifi/wifi_report.h"
@@ -22,12 +22,7 @@ bool IsCalled(const WirelessConf& conf, const std::string& name) {
 
 void ListSavedNetworks(const Options& options) {
     RequireWifiSettings();
-    const auto saved = SavedNetworks();
-    if (options.json) {
-        Print(ToJson(saved));
-    } else {
-        std::cout << ListText(saved);
-    }
+    Print(options, DescribeAll(SavedNetworks()));
 }
 
 // Shows, of several access points with one name, the one that was used last.
@@ -42,8 +37,7 @@ void ShowSavedNetwork(const Options& options) {
                                           " is saved; taviwireless wifi saved list shows those "
                                           "that are");
     }
-    options.json ? Print(ToJson(*found, options.showSecrets))
-                 : Print(ShowTable(*found, options.showSecrets));
+    Print(options, Describe(*found, options.showSecrets));
 }
 
 }  // namespace taviwireless::cli

@@ -2,17 +2,15 @@
 
 #include <tavisdk/network.h>
 #include <tavisdk/wireless.h>
-#include <unistd.h>
 
 #include <algorithm>
 #include <cstdlib>
 #include <memory>
 
-#include "wireless/rules/line_break.h"
+#include "cli/adapter/requirements.h"
 #include "wireless/rules/paths.h"
 #include "wireless/system/driver_request.h"
 #include "wireless/system/files.h"
-#include "wireless/system/interface.h"
 
 namespace taviwireless::cli {
 
@@ -40,57 +38,6 @@ void UpdateBssid(unsigned char (&bssid)[6]) {
 }
 
 }  // namespace
-
-std::string WifiInterface() {
-    return wireless::WirelessInterface();
-}
-
-void RequireWifiSupport() {
-    if (TAVIWirelessIsSupported() == 0) {
-        throw CommandError(kFailure, std::string("this model does not support Wi-Fi: ") +
-                                         wireless::kModelInfo +
-                                         " does not say support_wireless=yes");
-    }
-}
-
-void RequireWifiSettings() {
-    RequireWifiSupport();
-    if (geteuid() != 0) {
-        throw CommandError(kFailure, "Wi-Fi settings need root");
-    }
-}
-
-void RequireAdapter() {
-    RequireWifiSettings();
-    if (TAVIWirelessConnStatusGet() == WIRELESS_STATUS_NO_ADAPTER) {
-        throw CommandError(kFailure, "there is no Wi-Fi adapter: no interface " + WifiInterface());
-    }
-}
-
-void RequireRadio() {
-    const int mayBeUsed = TAVIWirelessCheckBlock();
-    if (mayBeUsed == 0) {
-        throw CommandError(kFailure,
-                           std::string("the radio is switched off: unblock=no is set for this "
-                                       "adapter in ") +
-                               wireless::kAPSettings);
-    }
-    if (mayBeUsed < 0) {
-        throw CommandError(kFailure, std::string("cannot tell whether the radio may be used: ") +
-                                         wireless::kAdapterInfo +
-                                         " does not name the adapter, or its section in " +
-                                         wireless::kAPSettings + " has no unblock");
-    }
-}
-
-void CheckEssid(const std::string& essid) {
-    if (essid.empty() || essid.size() >= WIRELESS_ESSID_SIZE) {
-        throw CommandError(kUsage, "the name of a network has 1 to 32 bytes");
-    }
-    if (wireless::HoldsLineBreak(essid)) {
-        throw CommandError(kUsage, "the name of a network may not hold a line break");
-    }
-}
 
 CommandError ScanError() {
     return {kFailure,

@@ -6,25 +6,12 @@
 #include <string>
 #include <vector>
 
-#include "cli/command_line.h"
+#include "cli/command_error.h"
 
 namespace taviwireless::cli {
 
-// The library's Wi-Fi functions with texts, vectors and exceptions. Failures throw CommandError.
-
-std::string WifiInterface();
-
-void RequireWifiSupport();
-// Throws unless the user is root and the model supports Wi-Fi.
-void RequireWifiSettings();
-// Throws unless RequireWifiSettings passes and an adapter is plugged in.
-void RequireAdapter();
-// Throws unless the radio may be used: if it may not, the library's functions succeed and do
-// nothing.
-void RequireRadio();
-
-// Throws unless the ESSID can be joined or created.
-void CheckEssid(const std::string& essid);
+// The adapter as a station: the library's functions with texts, vectors and exceptions. Failures
+// throw CommandError.
 
 CommandError ScanError();
 // The networks in range, the best signal first; takes some seconds.

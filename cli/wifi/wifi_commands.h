@@ -1,7 +1,7 @@
 #ifndef TAVIWIRELESS_CLI_WIFI_WIFI_COMMANDS_H
 #define TAVIWIRELESS_CLI_WIFI_WIFI_COMMANDS_H
 
-#include "cli/command_line.h"
+#include "cli/options.h"
 
 // What the commands about the Wi-Fi adapter do. Each throws CommandError when it fails.
 namespace taviwireless::cli {

@@ -1,11 +1,12 @@
 #include "cli/wifi/wifi_report.h"
 
-#include <json/json.h>
-
 #include <algorithm>
 #include <ctime>
 
 #include "cli/adapter/credentials.h"
+#include "cli/adapter/requirements.h"
+#include "cli/terminal.h"
+#include "cli/wifi/ip_address.h"
 #include "cli/wifi/station.h"
 
 namespace taviwireless::cli {
@@ -83,6 +84,32 @@ std::string AddressText(const WirelessConf& conf) {
     return IsDHCP(conf) ? "by DHCP" : conf.ipAddr;
 }
 
+std::string SecurityText(const WirelessNetwork& network) {
+    switch (SecurityOf(network)) {
+        case Security::kOpen:
+            return "open";
+        case Security::kWEP:
+            return "WEP";
+        case Security::kUnknown:
+            return "";
+        default:
+            break;
+    }
+    const std::string cipher = EncryptText(network);
+    return AuthText(network) + (cipher.empty() ? "" : "/" + cipher);
+}
+
+void AddNetwork(Report& report, const WirelessNetwork& network) {
+    report.Add("essid", "Network", network.essid);
+    report.Add("bssid", "BSSID", BssidText(network.bssid));
+    report.Add("channel", "Channel", NumberOrNull(network.channel), ChannelCell(network));
+    report.Add("protocol", "Protocol", ProtocolText(network));
+    report.rows.push_back({"Security", Cell(SecurityText(network))});
+    report.document["auth"] = TextOrNull(AuthText(network));
+    report.document["encrypt"] = TextOrNull(EncryptText(network));
+    report.Add("signal", "Signal", NumberOrNull(network.signal), SignalCell(network.signal));
+}
+
 std::string StatusLine(const WirelessStatus& status, const std::string& address) {
     std::string line = WifiInterface() + ": " + WordsOf(status).text;
     const std::string essid = status.network.essid;
@@ -101,130 +128,75 @@ std::string BssidText(const unsigned char (&bssid)[6]) {
     return isKnown ? TAVIWirelessBssidStringGet(bssid, text, sizeof text) : "";
 }
 
-std::string SecurityText(const WirelessNetwork& network) {
-    switch (SecurityOf(network)) {
-        case Security::kOpen:
-            return "open";
-        case Security::kWEP:
-            return "WEP";
-        case Security::kUnknown:
-            return "";
-        default:
-            break;
-    }
-    const std::string cipher = EncryptText(network);
-    return AuthText(network) + (cipher.empty() ? "" : "/" + cipher);
-}
-
-Json::Value ToJson(const WirelessNetwork& network) {
-    Json::Value document;
-    document["essid"] = TextOrNull(network.essid);
-    document["bssid"] = TextOrNull(BssidText(network.bssid));
-    document["channel"] = NumberOrNull(network.channel);
-    document["signal"] = NumberOrNull(network.signal);
-    document["protocol"] = TextOrNull(ProtocolText(network));
-    document["auth"] = TextOrNull(AuthText(network));
-    document["encrypt"] = TextOrNull(EncryptText(network));
-    return document;
-}
-
-Json::Value ToJson(const std::vector<WirelessNetwork>& networks) {
-    Json::Value documents(Json::arrayValue);
-    for (const WirelessNetwork& network : networks) {
-        documents.append(ToJson(network));
-    }
-    return documents;
-}
-
-std::string ListText(const std::vector<WirelessNetwork>& networks) {
+Report DescribeAll(const std::vector<WirelessNetwork>& networks) {
     if (networks.empty()) {
-        return "No network is in range.\n";
+        return {{{"No network is in range."}}, Json::arrayValue};
     }
-    Table table{{"NETWORK", "SIGNAL", "SECURITY", "CHANNEL", "BSSID"}};
+    Report all{{{"NETWORK", "SIGNAL", "SECURITY", "CHANNEL", "BSSID"}}, Json::arrayValue};
     for (const WirelessNetwork& network : networks) {
         const std::string essid = network.essid;
-        table.push_back({essid.empty() ? "(hidden)" : Printable(essid), SignalCell(network.signal),
-                         Cell(SecurityText(network)), ChannelCell(network),
-                         BssidText(network.bssid)});
+        Report one;
+        AddNetwork(one, network);
+        all.document.append(one.document);
+        all.rows.push_back({essid.empty() ? "(hidden)" : Printable(essid),
+                            SignalCell(network.signal), Cell(SecurityText(network)),
+                            ChannelCell(network), BssidText(network.bssid)});
     }
-    return ToText(table);
+    return all;
 }
 
-Json::Value ToJson(const WirelessStatus& status, const std::string& address) {
-    Json::Value document = ToJson(status.network);
-    document["interface"] = TextOrNull(WifiInterface());
-    document["status"] = WordsOf(status).word;
-    document["ip"] = TextOrNull(address);
-    return document;
+Report DescribeAll(const std::vector<WirelessConf>& confs) {
+    if (confs.empty()) {
+        return {{{"No network is saved."}}, Json::arrayValue};
+    }
+    Report all{{{"NETWORK", "SECURITY", "BSSID", "ADDRESS", "LAST USED"}}, Json::arrayValue};
+    for (const WirelessConf& conf : confs) {
+        all.document.append(Describe(conf).document);
+        all.rows.push_back({Cell(conf.network.essid), Cell(SecurityText(conf.network)),
+                            Cell(BssidText(conf.network.bssid)), Cell(AddressText(conf)),
+                            Cell(TimeText(conf.accessTime))});
+    }
+    return all;
 }
 
-void ReportWifi(const Options& options) {
+Report Describe(const WirelessConf& conf, bool showSecrets) {
+    const WirelessNetwork& network = conf.network;
+    const bool isDHCP = IsDHCP(conf);
+    Report report;
+    report.Add("essid", "Network", network.essid);
+    report.Add("bssid", "BSSID", BssidText(network.bssid));
+    report.rows.push_back({"Security", Cell(SecurityText(network))});
+    report.document["auth"] = TextOrNull(AuthText(network));
+    report.document["encrypt"] = TextOrNull(EncryptText(network));
+    report.Add("key", "Key", SecretText(conf.key, showSecrets));
+    report.Add("user", "User", conf.user);
+    report.document["dhcp"] = isDHCP;
+    report.Add("ip", "Address", TextOrNull(isDHCP ? "" : conf.ipAddr), Cell(AddressText(conf)));
+    report.Add("netmask", "Netmask", conf.netmask);
+    report.Add("gateway", "Gateway", conf.gateway);
+    report.Add("last_used", "Last used", NumberOrNull(conf.accessTime),
+               Cell(TimeText(conf.accessTime)));
+    return report;
+}
+
+Report Describe(const WirelessStatus& status, const std::string& address) {
+    const StatusWord& words = WordsOf(status);
+    Report report;
+    report.Add("interface", "Interface", WifiInterface());
+    report.Add("status", "State", words.word, words.text);
+    const Table outsideNetworks = report.rows;
+    AddNetwork(report, status.network);
+    if (!IsInNetwork(status.status)) {
+        report.rows = outsideNetworks;
+    }
+    report.Add("ip", "Address", address);
+    return report;
+}
+
+void PrintConnection(const Options& options) {
     const WirelessStatus status = LookAtWifi();
     const std::string address = WifiAddress();
-    options.json ? Print(ToJson(status, address)) : Print(Table{{StatusLine(status, address)}});
-}
-
-Table StatusTable(const WirelessStatus& status, const std::string& address) {
-    Table table{{"Interface", Cell(WifiInterface())}, {"State", WordsOf(status).text}};
-    if (IsInNetwork(status.status)) {
-        const WirelessNetwork& network = status.network;
-        table.push_back({"Network", Cell(network.essid)});
-        table.push_back({"BSSID", Cell(BssidText(network.bssid))});
-        table.push_back({"Channel", ChannelCell(network)});
-        table.push_back({"Protocol", Cell(ProtocolText(network))});
-        table.push_back({"Security", Cell(SecurityText(network))});
-        table.push_back({"Signal", SignalCell(network.signal)});
-    }
-    table.push_back({"Address", Cell(address)});
-    return table;
-}
-
-Json::Value ToJson(const WirelessConf& conf, bool showSecrets) {
-    Json::Value document = ToJson(conf.network);
-    for (const char* key : {"channel", "signal", "protocol"}) {
-        document.removeMember(key);  // not saved
-    }
-    document["key"] = TextOrNull(SecretText(conf.key, showSecrets));
-    document["user"] = TextOrNull(conf.user);
-    document["dhcp"] = IsDHCP(conf);
-    document["ip"] = IsDHCP(conf) ? Json::Value() : TextOrNull(conf.ipAddr);
-    document["netmask"] = TextOrNull(conf.netmask);
-    document["gateway"] = TextOrNull(conf.gateway);
-    document["last_used"] = NumberOrNull(conf.accessTime);
-    return document;
-}
-
-Json::Value ToJson(const std::vector<WirelessConf>& confs) {
-    Json::Value documents(Json::arrayValue);
-    for (const WirelessConf& conf : confs) {
-        documents.append(ToJson(conf, false));
-    }
-    return documents;
-}
-
-std::string ListText(const std::vector<WirelessConf>& confs) {
-    if (confs.empty()) {
-        return "No network is saved.\n";
-    }
-    Table table{{"NETWORK", "SECURITY", "BSSID", "ADDRESS", "LAST USED"}};
-    for (const WirelessConf& conf : confs) {
-        table.push_back({Cell(conf.network.essid), Cell(SecurityText(conf.network)),
-                         Cell(BssidText(conf.network.bssid)), Cell(AddressText(conf)),
-                         Cell(TimeText(conf.accessTime))});
-    }
-    return ToText(table);
-}
-
-Table ShowTable(const WirelessConf& conf, bool showSecrets) {
-    return {{"Network", Cell(conf.network.essid)},
-            {"BSSID", Cell(BssidText(conf.network.bssid))},
-            {"Security", Cell(SecurityText(conf.network))},
-            {"Key", Cell(SecretText(conf.key, showSecrets))},
-            {"User", Cell(conf.user)},
-            {"Address", Cell(AddressText(conf))},
-            {"Netmask", Cell(conf.netmask)},
-            {"Gateway", Cell(conf.gateway)},
-            {"Last used", Cell(TimeText(conf.accessTime))}};
+    PrintOutcome(options, StatusLine(status, address), [&] { return Describe(status, address); });
 }
 
 }  // namespace taviwireless::cli

@@ -2,14 +2,14 @@
 #include <json/json.h>
 
 #include "cli/report.h"
+#include "cli/terminal.h"
 
 namespace taviwireless::cli {
 namespace {
 
 TEST(Output, AlignsColumnsByCharactersNotBytes) {
-    testing::internal::CaptureStdout();
-    Print(Table{{"NAME", "X"}, {"Zürich", "1"}, {"A", ""}});
-    EXPECT_EQ(testing::internal::GetCapturedStdout(), "NAME    X\nZürich  1\nA\n");
+    EXPECT_EQ(Render(Options(), {{{"NAME", "X"}, {"Zürich", "1"}, {"A", ""}}, {}}),
+              "NAME    X\nZürich  1\nA\n");
 }
 
 TEST(Output, TextOfAModemCannotSteerTheTerminal) {
@@ -20,13 +20,13 @@ TEST(Output, TextOfAModemCannotSteerTheTerminal) {
 }
 
 TEST(Output, JsonStaysJsonWhateverTheModemSays) {
-    Json::Value document;
-    document["text"] = std::string("a\"\n\x1b\xff");
-    testing::internal::CaptureStdout();
-    Print(document);
+    Report report;
+    report.document["text"] = std::string("a\"\n\x1b\xff");
+    Options options;
+    options.json = true;
     Json::Value parsed;
     std::string errors;
-    std::istringstream printed(testing::internal::GetCapturedStdout());
+    std::istringstream printed(Render(options, report));
     EXPECT_TRUE(Json::parseFromStream(Json::CharReaderBuilder(), printed, &parsed, &errors));
     EXPECT_EQ(parsed["text"].asString().substr(0, 4), "a\"\n\x1b");
 }

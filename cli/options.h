@@ -1,33 +1,11 @@
-#ifndef TAVIWIRELESS_CLI_COMMAND_LINE_H
-#define TAVIWIRELESS_CLI_COMMAND_LINE_H
+#ifndef TAVIWIRELESS_CLI_OPTIONS_H
+#define TAVIWIRELESS_CLI_OPTIONS_H
 
 #include <optional>
-#include <stdexcept>
 #include <string>
 #include <vector>
 
 namespace taviwireless::cli {
-
-// What the program ends with.
-enum ExitStatus {
-    kSuccess = 0,
-    kFailure = 1,
-    kUsage = 2,
-    kNotFound = 3,
-    kBusy = 4,
-    kNoService = 5
-};
-
-// A failure to report: one plain sentence, and what the program ends with.
-class CommandError : public std::runtime_error {
-  public:
-    CommandError(ExitStatus status, const std::string& sentence)
-        : std::runtime_error(sentence), status_(status) {}
-    ExitStatus Status() const { return status_; }
-
-  private:
-    ExitStatus status_;
-};
 
 // What the command line says.
 struct Options {
@@ -56,9 +34,6 @@ struct Options {
     bool wep = false;           // adhoc: with a WEP key
     std::string mode;           // "ap" or "client"
 };
-
-// Reads the command line and runs the command that it names. Returns what the program ends with.
-int RunCommandLine(int argc, char** argv);
 
 }  // namespace taviwireless::cli
 

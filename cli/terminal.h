@@ -1,9 +1,17 @@
-#ifndef TAVIWIRELESS_CLI_PROMPT_H
-#define TAVIWIRELESS_CLI_PROMPT_H
+#ifndef TAVIWIRELESS_CLI_TERMINAL_H
+#define TAVIWIRELESS_CLI_TERMINAL_H
 
 #include <string>
 
 namespace taviwireless::cli {
+
+// Returns text with control characters replaced by "?": what a modem sends may not steer the
+// terminal.
+std::string Printable(const std::string& text);
+
+// Shows on standard error what is being waited for, one line that each call replaces; the empty
+// text removes it. Nothing is shown unless standard error is a terminal.
+void ShowProgress(const std::string& text);
 
 // Reads one line from standard input: at a terminal behind a prompt and without echo, so that it
 // appears neither on the screen nor in a process list. Throws CommandError when there is none.

@@ -1,12 +1,12 @@
-#include "cli/prompt.h"
+#include "cli/terminal.h"
 
 #include <termios.h>
 #include <unistd.h>
 
+#include <cstdio>
 #include <iostream>
 
-#include "cli/command_line.h"
-#include "cli/report.h"
+#include "cli/command_error.h"
 
 namespace taviwireless::cli {
 
@@ -37,6 +37,24 @@ class NoEcho {
 };
 
 }  // namespace
+
+std::string Printable(const std::string& text) {
+    std::string printable;
+    for (size_t i = 0; i < text.size(); ++i) {
+        const auto byte = static_cast<unsigned char>(text[i]);
+        const auto next = static_cast<unsigned char>(text[i + 1]);      // zero at the end
+        const bool isC1 = byte == 0xC2 && next >= 0x80 && next < 0xA0;  // in UTF-8, two bytes
+        printable += byte < 0x20 || byte == 0x7F || isC1 ? '?' : text[i];
+        i += isC1 ? 1 : 0;
+    }
+    return printable;
+}
+
+void ShowProgress(const std::string& text) {
+    if (isatty(STDERR_FILENO)) {
+        std::fprintf(stderr, "\r\033[K%s", text.c_str());
+    }
+}
 
 std::string ReadSecret(const std::string& prompt) {
     if (isatty(STDIN_FILENO)) {

@@ -1,0 +1,23 @@
+#ifndef TAVIWIRELESS_CLI_ADAPTER_REQUIREMENTS_H
+#define TAVIWIRELESS_CLI_ADAPTER_REQUIREMENTS_H
+
+#include <string>
+
+namespace taviwireless::cli {
+
+std::string WifiInterface();
+
+// What commands about the Wi-Fi adapter want before they begin.
+
+void RequireWifiSupport();
+// Throws unless the user is root and the model supports Wi-Fi.
+void RequireWifiSettings();
+// Throws unless RequireWifiSettings passes and an adapter is plugged in.
+void RequireAdapter();
+// Throws unless the radio may be used: if it may not, the library's functions succeed and do
+// nothing.
+void RequireRadio();
+
+}  // namespace taviwireless::cli
+
+#endif
