@@ -30,10 +30,6 @@ Secret SecretOf(const APNetwork& network) {
     }
 }
 
-bool HasRadius(const APNetwork& network) {
-    return network.security == WIRELESS_AP_WPA_ENTERPRISE;
-}
-
 void AddFlag(Report& report, const char* key, const char* title, bool value) {
     report.Add(key, title, value, YesNo(value));
 }
@@ -58,7 +54,7 @@ void AddNetwork(Report& report, const APNetwork& network, bool showSecrets) {
     if (secret.key != nullptr) {
         report.Add(secret.key, secret.title, SecretText(secret.text, showSecrets));
     }
-    if (HasRadius(network)) {
+    if (network.security == WIRELESS_AP_WPA_ENTERPRISE) {
         const auto& radius = network.secret.enterprise;
         report.Add("radius_server", "RADIUS server", TextOrNull(radius.radiusAddr),
                    Cell(radius.radiusAddr) + ", port " + std::to_string(radius.radiusPort));
