@@ -4,6 +4,7 @@
 #include <sys/socket.h>
 #include <unistd.h>
 
+#include "base/fixed_field.h"
 #include "wireless/system/interface.h"
 
 namespace taviwireless::wireless {
@@ -17,7 +18,7 @@ DriverResult RequestDriver(unsigned long request, iwreq& argument) {
     if (handle < 0) {
         return DriverResult::kNoSocket;
     }
-    interface.copy(argument.ifr_name, sizeof argument.ifr_name - 1);
+    CopyField(argument.ifr_name, interface);
     const bool isDone = ioctl(handle, request, &argument) >= 0;
     // Descriptor 0 is left open: a caller without standard input would get another file in its
     // place, and read that.
