@@ -49,7 +49,7 @@ std::vector<ConfFile> Render(const WirelessAPConf& conf) {
     return files;
 }
 
-// For programs that are started.
+// The path by which programs that are started meanwhile can open the file.
 std::string PathOf(const UniqueFd& file) {
     if (!file) {
         throw CommandError(kFailure, "there is no memory for hostapd's settings");
