@@ -91,8 +91,6 @@ TEST_F(Dhcp, FailureLeavesTheCardEmpty) {
     EXPECT_STREQ(card_.netmask, "");
     card_ = {"none7", 0, "", ""};
     EXPECT_EQ(TAVIIGetDHCPTestNetInfo(&card_), -1);
-    EXPECT_EQ(TAVIIGetDHCPTestNetInfo(nullptr), -1);
-    EXPECT_EQ(BlTAVILnxIsDHCP(nullptr), 0);
 }
 
 TEST_F(Dhcp, ProgramThatGotTheClientsNumberIsSpared) {

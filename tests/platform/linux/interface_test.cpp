@@ -1,4 +1,4 @@
-// Interfaces going up and down, their links' states and their addresses.
+// Interfaces going up and down, their addresses, and the default route, on veth pairs.
 #include <gmock/gmock.h>
 #include <tavicore/error.h>
 #include <tavicore/process.h>
@@ -43,23 +43,14 @@ TEST(Link, IsSwitchedAndTellsItsState) {
 }
 
 TEST(Link, FailsWithoutAnInterface) {
-    for (const char* name : {"none7", "", "a-name-longer-than-any-interface"}) {
-        EXPECT_EQ(TAVINetIsIFUp(name), 0);
-        EXPECT_EQ(VEXANetIfUp(name), 0);
-        EXPECT_EQ(VEXANetIfDown(name), 0);
-        EXPECT_EQ(VEXACErrGet(), VEXAC_ERR_NOT_FOUND);
-    }
-    EXPECT_EQ(VEXANetIfUp(nullptr), 0);
-    EXPECT_EQ(VEXACErrGet(), VEXAC_ERR_BAD_PARAMETER);
-}
-
-TEST(Interfaces, AreCutOffAtTheRoomThereIs) {
+    EXPECT_EQ(TAVINetIsIFUp("none7"), 0);
+    EXPECT_EQ(VEXANetIfUp("none7"), 0);
+    EXPECT_EQ(VEXANetIfDown("a-name-longer-than-any-interface"), 0);
+    EXPECT_EQ(VEXACErrGet(), VEXAC_ERR_NOT_FOUND);
+    VEXANetInterfaceInfo infos[2] = {{"", 0}, {"untouched", 0}};  // the room there is, and more
     MakeInterface("eth7", "10.7.0.2/24");
-    VEXANetInterfaceInfo infos[2] = {{"", 0}, {"untouched", 0}};
     EXPECT_EQ(VEXANetGetInterfaceInfo(infos, 1, VEXA_NET_ALL_INTERFACES), 1);
     EXPECT_STREQ(infos[1].name, "untouched");
-    EXPECT_EQ(VEXANetGetInterfaceInfo(infos, 1, 1), -1);
-    EXPECT_EQ(VEXANetGetInterfaceInfo(nullptr, 1, VEXA_NET_ALL_INTERFACES), -1);
 }
 
 std::string AddressesOf(const std::string& interface) {
@@ -72,7 +63,6 @@ TEST(Card, HasNoOtherAddressThanItsOwnAndKeepsThatWhereverItStood) {
         TAVINetCard card;
         const char* addresses;
     } kRows[] = {
-        {{"eth7", 1, "10.9.0.5", "255.255.0.0"}, "10.9.0.5/16 brd 10.9.255.255\n"},
         {{"eth7", 1, "10.9.0.5", "255.255.0.0"}, "10.9.0.5/16 brd 10.9.255.255\n"},
         {{"eth7", 1, "10.9.0.5", "255.255.255.128"}, "10.9.0.5/25 brd 10.9.0.127\n"},
         {{"eth7", 1, "10.9.0.5", "255.255.255.255"}, "10.9.0.5/32\n"},
@@ -97,7 +87,6 @@ TEST(Card, ThatIsWrongChangesNothing) {
         int flags, error;
     } kRows[] = {
         {{"eth7", 1, "dhcp", "255.255.255.0"}, 0, VEXAC_ERR_BAD_PARAMETER},
-        {{"eth7", 1, "", ""}, 0, VEXAC_ERR_BAD_PARAMETER},
         {{"eth7", 1, "10.9.0.5", "255.0.255.0"}, 0, VEXAC_ERR_BAD_PARAMETER},
         {{"eth7", 1, "10.9.0.5", "24"}, 0, VEXAC_ERR_BAD_PARAMETER},
         {{"eth7", 1, "10.9.0.5", "255.255.255.0"}, 1, VEXAC_ERR_BAD_PARAMETER},
@@ -108,8 +97,87 @@ TEST(Card, ThatIsWrongChangesNothing) {
         EXPECT_EQ(TAVINetSetCard1(&row.card, row.flags), -1);
         EXPECT_EQ(VEXACErrGet(), row.error);
     }
-    EXPECT_EQ(TAVINetSetCard1(nullptr, 0), -1);
     EXPECT_THAT(AddressesOf("eth7"), testing::StartsWith("10.7.0.2/24"));
+}
+
+std::string Gateway() {
+    char gateway[TAVI_NET_ADDRESS_SIZE] = "unchanged";
+    return TAVINetDefaultGatewayGet(gateway, sizeof gateway) == 0 ? gateway : "none";
+}
+
+TEST(Interface, GivesItsLocalAddress) {
+    MakeInterface("eth7", "10.7.0.2/24");
+    MakeInterface("ppp7", "10.64.64.64 peer 10.64.64.65");
+    Ip("link add bare7 type veth peer name bare7-far");
+    const struct {
+        const char* name;
+        int result;
+        const char* address;
+    } kRows[] = {{"eth7", 1, "10.7.0.2"},
+                 {"ppp7", 1, "10.64.64.64"},
+                 {"bare7", 0, ""},
+                 {"none7", 0, ""},
+                 {"a-name-longer-than-any-interface", 0, ""}};
+    const auto before = OpenDescriptors();
+    for (const auto& row : kRows) {
+        SCOPED_TRACE(row.name);
+        TAVINetIFInfo info{"unchanged"};
+        EXPECT_EQ(TAVINetIFGetInfo(row.name, &info), row.result);
+        EXPECT_STREQ(info.address, row.address);
+    }
+    EXPECT_EQ(OpenDescriptors(), before);
+}
+
+TEST(DefaultGateway, IsThatOfTheLowestMetric) {
+    MakeInterface("eth7", "10.7.0.2/24");
+    EXPECT_EQ(Gateway(), "none");
+    EXPECT_EQ(VEXACErrGet(), VEXAC_ERR_NOT_FOUND);
+    Ip("route add default via 10.7.0.9 metric 200");
+    EXPECT_EQ(Gateway(), "10.7.0.9");
+    Ip("route add default via 10.7.0.1 metric 100");
+    EXPECT_EQ(Gateway(), "10.7.0.1");
+    Ip("route add default via 10.7.0.3 table 77");
+    Ip("route add unreachable default metric 5");
+    EXPECT_EQ(Gateway(), "10.7.0.1");
+    MakeInterface("ppp7", "10.64.64.64 peer 10.64.64.65");
+    Ip("route add default dev ppp7");  // needs no gateway: the other end is it
+    EXPECT_EQ(Gateway(), "10.64.64.65");
+    char tooSmall[8];
+    EXPECT_EQ(TAVINetDefaultGatewayGet(tooSmall, sizeof tooSmall), -1);
+    EXPECT_EQ(VEXACErrGet(), VEXAC_ERR_TOO_LONG);
+}
+
+TEST(DefaultGateway, IsReplacedInItsPlace) {
+    MakeInterface("eth7", "10.7.0.2/24");
+    EXPECT_EQ(TAVINetDefaultGatewaySet("10.7.0.1"), 0);
+    EXPECT_EQ(Ip("route show default"), "default via 10.7.0.1 dev eth7 \n");
+    Ip("route delete default");
+    Ip("route add default via 10.7.0.1 metric 100");
+    EXPECT_EQ(TAVINetDefaultGatewaySet("10.7.0.9"), 0);
+    EXPECT_EQ(Ip("route show default"), "default via 10.7.0.9 dev eth7 metric 100 \n");
+}
+
+TEST(DefaultGateway, ThatCannotBeSetLeavesTheOldOne) {
+    MakeInterface("eth7", "10.7.0.2/24");
+    Ip("route add default via 10.7.0.1");
+    for (const char* gateway : {"192.168.99.1", "10.7.0", "10.7.0.1/24", "fe80::1", "host", ""}) {
+        EXPECT_EQ(TAVINetDefaultGatewaySet(gateway), -1) << gateway;
+    }
+    EXPECT_EQ(Gateway(), "10.7.0.1");
+}
+
+TEST(DefaultGateway, IsReadFromTheSavedSettings) {
+    char gateway[TAVI_NET_ADDRESS_SIZE];
+    EXPECT_EQ(TAVINetDefaultGatewayGetConf(gateway, sizeof gateway), -1);
+    const std::string scripts = "/etc/sysconfig/network-scripts/";
+    WriteFile(scripts + "ifcfg-eth0", "ONBOOT=no\nGATEWAY=10.0.0.1\n");
+    WriteFile(scripts + "ifcfg-eth1", "DEVICE=eth1\n");
+    WriteFile(scripts + "ifcfg-eth2", "ONBOOT=\"yes\"\nGATEWAY=\"10.0.0.3\"\n");
+    EXPECT_EQ(TAVINetDefaultGatewayGetConf(gateway, sizeof gateway), 0);
+    EXPECT_STREQ(gateway, "10.0.0.3");
+    WriteFile("/etc/sysconfig/network", "NETWORKING=yes\nGATEWAY=10.0.0.4\n");
+    EXPECT_EQ(TAVINetDefaultGatewayGetConf(gateway, sizeof gateway), 0);
+    EXPECT_STREQ(gateway, "10.0.0.4");
 }
 
 }  // namespace
