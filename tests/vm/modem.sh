@@ -65,18 +65,6 @@ finds_modem() {
     test -c /dev/ttyUSB2
 }
 
-forgets_modem() {
-    unplug
-    wait_for 10 test ! -e $info
-    must_fail test -e /dev/ttyUSB0
-    plug
-    wait_for 10 test -e $info
-    cp $info /run/info.by.udev
-    rm $info
-    /usr/tavi/hotplug/usb.plug # by hand
-    diff /run/info.by.udev $info
-}
-
 lists_modem() {
     # The first call starts the service.
     gdbus call --session -d com.merilond.usbmodem -o / -m com.merilond.usbmodem.GetUSBModemList
@@ -110,30 +98,9 @@ connects() {
     must_fail reaches $beyond
 }
 
-# Goes on where the one before ended.
-outlives_service() {
-    pkill -x usbmodemd
-    wait_for 10 ended usbmodemd
-    reaches $far_address
-    usbmodemd
-    wait_for 20 is_value net_status '"connected"'
-    is_connected
-}
-
 disconnects() {
     modem disconnect usbmodem0
     is_status disconnected
-    no_call_is_left
-}
-
-takes_default_route() {
-    modem profile set usbmodem0 default_gw=true
-    modem connect usbmodem0
-    is_connected
-    default_route_is "default dev ppp0 scope link"
-    reaches $beyond
-    modem disconnect usbmodem0
-    default_route_is "$lan_route" # at once
     no_call_is_left
 }
 
@@ -188,13 +155,10 @@ export DBUS_SESSION_BUS_ADDRESS
 
 scenario "udev finds a modem that is plugged in" finds_modem
 [ "$scenario_status" = 0 ] || exit 0
-scenario "udev forgets it when it is unplugged; the hot-plug script by hand finds the same" forgets_modem
 scenario "the service lists it" lists_modem
 scenario "takes the PIN" takes_pin
 scenario "connects, and leaves the default route alone" connects
-scenario "the connection outlives the service" outlives_service
 scenario "disconnects" disconnects
-scenario "takes the default route, and gives it back" takes_default_route
 scenario "comes back after the network has ended the call" reconnects
 scenario "survives unplugging during a call" survives_unplugging
 scenario "works again when it is plugged in again" works_again

@@ -40,10 +40,6 @@ status_of() {
     wifi status | sed -n "s/^$1  *//p"
 }
 
-is_state() {
-    [ "$(status_of State)" = "$1" ]
-}
-
 # connected_to NETWORK N PROTOCOL SECURITY: by the access point at wlanN, as the status tells it and in fact.
 connected_to() {
     local status
@@ -88,14 +84,6 @@ start_afresh() {
     ip addr flush dev wlan0
     rm -rf /usr/tavi/etc/wpa_supplicant.conf /etc/dhcpc /var/tmp/.wireless* /run/wpa_supplicant*
     cp /run/resolv.conf.before /etc/resolv.conf
-}
-
-no_adapter_yet() {
-    holds "$(wifi status)" "^State +there is no Wi-Fi adapter$"
-    local status=0 error
-    error=$(wifi scan 2>&1) || status=$?
-    same 1 $status
-    same "taviwireless: there is no Wi-Fi adapter: no interface wlan0" "$error"
 }
 
 lists_networks() {
@@ -154,32 +142,6 @@ joins_hidden() {
     holds "$(wifi saved show Unseen)" "^BSSID +02:00:00:00:04:00$"
 }
 
-sets_static_address() {
-    start_afresh
-    wifi connect "My Net" --new-key --static 10.9.1.77/24,10.9.1.1 <<<$key
-    connected_to "My Net" 1 11b/g/n WPA2PSK/AES
-    same 10.9.1.77 "$(status_of Address)"
-    holds "$(ip -4 addr show wlan0)" "inet 10.9.1.77/24 "
-    holds "$(ip route show default)" "^default via 10.9.1.1 dev wlan0"
-    ended udhcpc
-    wifi disconnect
-    nothing_is_left
-}
-
-refuses_wrong_key() {
-    start_afresh
-    local output start=$SECONDS status=0
-    rm /usr/tavi/etc/wireless.conf
-    output=$(wifi connect "My Net" <<<wrong-key-9 2>&1) || status=$?
-    same 1 $status
-    holds "$output" "could not join My Net: the key may be wrong"
-    [ $((SECONDS - start)) -ge 15 ]
-    grep "Time out to connect AP, kill wpa_supplicant." $system_log
-    rm /usr/tavi/etc/wpa_supplicant.conf # stays behind when joining fails
-    nothing_is_left
-    same "No network is saved." "$(wifi saved list)"
-}
-
 # networks_of LIST: the first column, in one line.
 networks_of() {
     sed '1d; s/   *.*//' <<<"$1" | paste -sd, | sed 's/,/, /g'
@@ -199,24 +161,10 @@ joins_automatically() {
     connected_to "My Net" 1 11b/g/n WPA2PSK/AES
 }
 
-survives_loss() {
-    start_afresh
-    wifi connect "My Net" <<<$key
-    connected_to "My Net" 1 11b/g/n WPA2PSK/AES
-    stop_ap wlan1
-    wait_for 10 is_state "not connected"
-    must_fail ping -c 1 -W 2 10.9.1.1
-    start_ap wlan1
-    wait_for 30 is_state connected
-    connected_to "My Net" 1 11b/g/n WPA2PSK/AES
-    leased_address_of 1
-}
-
 mkdir -p /etc.defaults
 echo support_wireless=yes >/etc.defaults/taviinfo.conf
 echo "nameserver 192.0.2.53" | tee /run/resolv.conf.before >/etc/resolv.conf
 
-scenario "says that there is no adapter" no_adapter_yet
 scenario "four access points are on the air" set_up_air
 [ "$scenario_status" = 0 ] || exit 0
 scenario "lists networks with channel, security and signal" lists_networks
@@ -226,6 +174,3 @@ scenario "joins a WPA2 network by DHCP" joins_wpa2
 scenario "disconnects, and joins the saved network without a key" disconnects
 scenario "joins the reachable saved network that was used last" joins_automatically
 scenario "joins a hidden network" joins_hidden
-scenario "joins with a static address" sets_static_address
-scenario "gives up on a wrong key" refuses_wrong_key
-scenario "tells that the access point went away, and came back" survives_loss
