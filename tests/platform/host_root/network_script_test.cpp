@@ -141,7 +141,8 @@ TEST_F(NetworkProgram, AccessPointHasItsGuestsWhileThatIsSwitchedOn) {
 
 // What another tool gave eth0: addresses and routes of which no file of ours knows.
 constexpr char kForeign[] =
-    "ip address add 10.9.0.6/16 dev eth0; ip address add fd00::5/64 dev eth0 nodad;"
+    "ip address add 10.9.0.6/16 dev eth0 valid_lft 4000 preferred_lft 4000; ip address add "
+    "fd00::5/64 dev eth0 nodad;"
     "ip route add default via 10.9.0.1 dev eth0 metric 100;"
     "ip route add 10.99.0.0/24 via 10.9.0.2 dev eth0; ip route add 10.98.0.0/24 dev eth0";
 std::string WhatItHas(const std::string& interface) {
@@ -178,6 +179,7 @@ TEST_F(NetworkProgram, AddressesAndRoutesOfAnotherToolMoveAndComeBack) {
                 EXPECT_THAT(WhatItHas("br0"), HasSubstr(part));
             }
             EXPECT_THAT(Ip("link show master br0"), HasSubstr("wlan0"));
+            EXPECT_THAT(Ip("address show br0"), Not(HasSubstr("dynamic")));
             EXPECT_EQ(ReadFile("/sys/class/net/br0/address"),
                       ReadFile("/sys/class/net/eth0/address"));
         }
@@ -301,7 +303,6 @@ TEST_F(NetworkProgram, FailurePutsBackWhatWas) {
     ASSERT_EQ(Restart("lbr0"), "");
     MakeInterface("eth0", "10.9.0.5/16");
     Shell(kForeign);
-    Ip("address add 10.9.0.7/16 dev eth0 valid_lft 4000 preferred_lft 4000");
     const TAVINetDhcpServer server = {1,     30,    600, "10.9.0.20", "10.9.0.30",
                                       "br0", "br0", "",  "",          "255.255.0.0"};
     WriteFile(kInterfaceFile + "br0", "ONBOOT=yes\nPRIMARY=eth0\n");
