@@ -35,16 +35,6 @@ inline Json::Value Parse(const std::string& text) {
     return document;
 }
 
-// A dialler that does this.
-inline void InstallDialler(const std::string& script) {
-    WriteFile("/etc/ppp/peers/wvdial", "noauth\n");
-    WriteFile("/usr/tavi/bin/wvdial", "#!/bin/sh\n" + script + "\nexec sleep 1000\n");
-    RunProgram({"chmod", "755", "/usr/tavi/bin/wvdial"});
-}
-
-// What the real one says in the end, at once.
-constexpr char kSaysConnected[] = "echo '--> Using interface lo secondary DNS address' >&2";
-
 }  // namespace taviwireless::test
 
 #endif

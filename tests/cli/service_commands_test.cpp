@@ -3,26 +3,12 @@
 
 #include "tests/cli/cli_runs.h"
 #include "tests/support/bus.h"
-#include "tests/support/modem_simulator.h"
 
 namespace taviwireless::test {
 namespace {
 
 using testing::HasSubstr;
 using testing::StartsWith;
-
-// A bus, modems and the service, which is ready with them.
-struct Situation {
-    explicit Situation(const std::string& modem) : Situation({"--modem", modem}, {"usbmodem0"}) {}
-    Situation(const std::vector<std::string>& modems, const std::vector<std::string>& ids)
-        : simulator(modems) {
-        EXPECT_TRUE(service.Lists(ids));
-    }
-
-    PrivateBus bus;
-    ModemSimulator simulator;
-    ModemService service;
-};
 
 struct Step {
     std::string command;  // its words, with a blank between them
@@ -44,9 +30,9 @@ void Take(const std::vector<Step>& steps) {
 }
 
 TEST(ServiceCommands, ListShowsWhatEveryModemSays) {
-    Situation situation(
-        {"--modem", "12d1,operator=Nordnetz,signal=31", "--modem", "2001,id=7,pin=1234"},
-        {"usbmodem0", "usbmodem7"});
+    ServedModems situation({"--modem", "12d1,operator=Nordnetz,signal=31,ports=dial/at", "--modem",
+                            "2001,id=7,pin=1234,ports=dial/at"},
+                           {"usbmodem0", "usbmodem7"});
     WriteFile("/tmp/usbmodem.info9", "");  // a modem that the service cannot use
     const RunResult result = Modem({"list"});
     EXPECT_EQ(result.status, 0);
@@ -64,7 +50,7 @@ TEST(ServiceCommands, ListShowsWhatEveryModemSays) {
 }
 
 TEST(ServiceCommands, FailuresAreOneSentenceAndAnExitStatus) {
-    Situation situation("generic");
+    ServedModems situation("generic");
     WriteFile("/tmp/usbmodem.info9", "");
     Take({
         {"show usbmodem1", "", kNotFound, "taviwireless: there is no modem usbmodem1; "},
@@ -92,7 +78,7 @@ TEST(ServiceCommands, WithoutTheServiceTheyNameWhatStartsIt) {
 }
 
 TEST(ServiceCommands, OnlyAWellFormedPINIsTriedAndNothingElseBeforeItIsRight) {
-    Situation situation("generic,pin=1234");
+    ServedModems situation("generic,pin=1234");
     Take({
         {"unlock usbmodem0", "", kFailure, "standard input ended before there was a line"},
         {"unlock usbmodem0", "12a4\n", kUsage, "a PIN has 4 to 8 digits; nothing was sent"},
@@ -107,7 +93,7 @@ TEST(ServiceCommands, OnlyAWellFormedPINIsTriedAndNothingElseBeforeItIsRight) {
 }
 
 TEST(ServiceCommands, TheLastAttemptIsKeptUnlessForced) {
-    Situation situation("generic,pin=1234,attempts=1,puk=87654321");
+    ServedModems situation("generic,pin=1234,attempts=1,puk=87654321");
     Take({
         {"unlock usbmodem0", "1111\n", kFailure,
          "allows one more PIN, and after a wrong one it wants its PUK; add --force to use it\n"},
@@ -120,7 +106,7 @@ TEST(ServiceCommands, TheLastAttemptIsKeptUnlessForced) {
 }
 
 TEST(ServiceCommands, TheProtectionIsSwitchedAndThePINChanged) {
-    Situation situation("generic,pin=1234,lock=off");
+    ServedModems situation("generic,pin=1234,lock=off");
     Take({
         {"pin set usbmodem0", "", kFailure, "taviwireless modem pin protect usbmodem0"},
         {"pin protect usbmodem0", "1234\n", 0, "is protected by its PIN from now on\n"},
@@ -131,7 +117,7 @@ TEST(ServiceCommands, TheProtectionIsSwitchedAndThePINChanged) {
 }
 
 TEST(ServiceCommands, AProfileIsSetAndShownWithoutItsPassword) {
-    Situation situation("generic,operator=Nordnetz,apn=web.nord");
+    ServedModems situation("generic,operator=Nordnetz,apn=web.nord");
     const Json::Value modem = Parse(Modem({"show", "usbmodem0", "--json"}).out);
     EXPECT_EQ(modem["pin_protected"], false);
     EXPECT_EQ(modem["profile"]["isp"], "Nordnetz - web.nord");
@@ -151,7 +137,7 @@ TEST(ServiceCommands, AProfileIsSetAndShownWithoutItsPassword) {
 
 TEST(ServiceCommands, ConnectShowTheStateAndHangUp) {
     InstallDialler(kSaysConnected);
-    Situation situation("generic");
+    ServedModems situation("generic");
     const Json::Value connected = Parse(Modem({"--json", "connect", "usbmodem0"}).out);
     EXPECT_EQ(connected["net_status"], "connected");
     EXPECT_EQ(connected["ip"], "127.0.0.1");
@@ -163,18 +149,18 @@ TEST(ServiceCommands, ConnectShowTheStateAndHangUp) {
 
 TEST(ServiceCommands, ADiallerThatGivesUpOrTakesTooLongIsAFailure) {
     WriteFile("/etc/ppp/peers/wvdial", "noauth\n");  // there is no dialler
-    Situation situation("generic");
+    ServedModems situation("generic");
     Take({{"connect usbmodem0", "", kFailure, "gave up, or could not be started"}});
-    InstallDialler("");
+    InstallDialler();
     Take({
-        {"connect usbmodem0 --timeout 5", "", kFailure,
-         "usbmodem0 is not connected after 5 s; it goes on"},
+        {"connect usbmodem0 --timeout 3", "", kFailure,
+         "usbmodem0 is not connected after 3 s; it goes on"},
         {"unlock usbmodem0", "", kBusy, ""},
     });
 }
 
 TEST(ServiceCommands, WatchPrintsADocumentAtEachChangeUntilItIsEnded) {
-    Situation situation("generic,signal=31");
+    ServedModems situation("generic,signal=31");
     Process watch({BuiltProgram("taviwireless"), "--json", "modem", "watch", "usbmodem0"});
     EXPECT_EQ(Parse(watch.ReadLine().value_or(""))["signal"], 100);
     situation.simulator.Set("0", "signal", "0");

@@ -83,6 +83,21 @@ bool ModemService::Lists(const std::vector<std::string>& devids) {
     });
 }
 
+bool ModemService::Says(const std::string& text) {
+    while (const auto line = process_.ReadLine()) {
+        log_ += *line + '\n';
+        if (line->find(text) != std::string::npos) {
+            return true;
+        }
+    }
+    return false;
+}
+
+int ModemService::End(int signal) {
+    process_.Signal(signal);
+    return process_.Wait().value_or(-1);
+}
+
 RunResult CallService(std::vector<std::string> methodAndArguments) {
     methodAndArguments[0] = "com.merilond.usbmodem." + methodAndArguments[0];
     std::vector<std::string> command = {"gdbus", "call", "--session", "-d", "com.merilond.usbmodem",

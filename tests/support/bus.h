@@ -1,10 +1,13 @@
 #ifndef TAVIWIRELESS_TESTS_SUPPORT_BUS_H
 #define TAVIWIRELESS_TESTS_SUPPORT_BUS_H
 
+#include <gmock/gmock.h>
+
 #include <optional>
 #include <string>
 #include <vector>
 
+#include "tests/support/modem_simulator.h"
 #include "tests/support/process.h"
 
 namespace taviwireless::test {
@@ -40,10 +43,34 @@ class ModemService {
     // Waits until the service lists exactly these modems, and returns whether it ever does.
     bool Lists(const std::vector<std::string>& devids);
 
+    // Of one with its log on its standard output: reads on until a line holds this; false when
+    // there is none. The lines that were read.
+    bool Says(const std::string& text);
+    const std::string& Log() const { return log_; }
+
+    // Ends it as a person does, and returns its exit status.
+    int End(int signal = SIGTERM);
+
     Process& Daemon() { return process_; }
 
   private:
     Process process_;
+    std::string log_;
+};
+
+// A bus, modems, and a service that is ready with them.
+struct ServedModems {
+    explicit ServedModems(const std::string& modem, const std::vector<std::string>& command = {})
+        : ServedModems({"--modem", modem}, {"usbmodem0"}, command) {}
+    ServedModems(const std::vector<std::string>& modems, const std::vector<std::string>& ids,
+                 const std::vector<std::string>& command = {})
+        : simulator(modems), service(command) {
+        EXPECT_TRUE(service.Lists(ids));
+    }
+
+    PrivateBus bus;
+    ModemSimulator simulator;
+    ModemService service;
 };
 
 // The result of a D-Bus method of the modem service, called by a program that we did not write

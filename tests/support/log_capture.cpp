@@ -4,34 +4,35 @@
 #include <cerrno>
 #include <cstdarg>
 #include <cstdio>
+#include <mutex>
 #include <new>
 
 namespace taviwireless::test {
 namespace {
 
-std::mutex captureMutex;
+std::mutex mutex;
 std::vector<LogCapture*> captures;
 
 }  // namespace
 
 LogCapture::LogCapture() {
-    const std::lock_guard<std::mutex> lock(captureMutex);
+    const std::lock_guard<std::mutex> lock(mutex);
     captures.push_back(this);
 }
 
 LogCapture::~LogCapture() {
-    const std::lock_guard<std::mutex> lock(captureMutex);
+    const std::lock_guard<std::mutex> lock(mutex);
     captures.erase(std::find(captures.begin(), captures.end(), this));
 }
 
 std::vector<LogLine> LogCapture::Lines() const {
-    const std::lock_guard<std::mutex> lock(mutex_);
+    const std::lock_guard<std::mutex> lock(mutex);
     return lines_;
 }
 
 int LogCapture::Count(const std::string& part) const {
-    const std::lock_guard<std::mutex> lock(mutex_);
-    return std::count_if(lines_.begin(), lines_.end(), [&part](const LogLine& line) {
+    const auto lines = Lines();
+    return std::count_if(lines.begin(), lines.end(), [&part](const LogLine& line) {
         return line.text.find(part) != std::string::npos;
     });
 }
@@ -45,14 +46,13 @@ std::string LogCapture::Text() const {
 }
 
 void LogCapture::Clear() {
-    const std::lock_guard<std::mutex> lock(mutex_);
+    const std::lock_guard<std::mutex> lock(mutex);
     lines_.clear();
 }
 
 void LogCapture::Record(int priority, const std::string& text) {
-    const std::lock_guard<std::mutex> lock(captureMutex);
+    const std::lock_guard<std::mutex> lock(mutex);
     for (LogCapture* capture : captures) {
-        const std::lock_guard<std::mutex> linesLock(capture->mutex_);
         capture->lines_.push_back({priority, text});
     }
 }

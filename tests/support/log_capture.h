@@ -1,7 +1,6 @@
 #ifndef TAVIWIRELESS_TESTS_SUPPORT_LOG_CAPTURE_H
 #define TAVIWIRELESS_TESTS_SUPPORT_LOG_CAPTURE_H
 
-#include <mutex>
 #include <string>
 #include <vector>
 
@@ -35,7 +34,6 @@ class LogCapture {
     static void Record(int priority, const std::string& text);
 
   private:
-    mutable std::mutex mutex_;
     std::vector<LogLine> lines_;
 };
 

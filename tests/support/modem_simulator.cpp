@@ -3,8 +3,11 @@
 #include <json/reader.h>
 #include <json/writer.h>
 
+#include <filesystem>
 #include <sstream>
 #include <stdexcept>
+
+#include "tests/support/files.h"
 
 namespace taviwireless::test {
 namespace {
@@ -26,6 +29,13 @@ std::string ToJson(const std::string& text) {
 }
 
 }  // namespace
+
+void InstallDialler(const std::string& script) {
+    WriteFile("/etc/ppp/peers/wvdial", "noauth\n");
+    WriteFile(kDialler, "#!/bin/sh\nprintf '%s\\n' \"$@\" >/tmp/arguments\n" + script +
+                            "\nexec sleep 1000\n");
+    std::filesystem::permissions(kDialler, std::filesystem::perms(0755));
+}
 
 ModemSimulator::ModemSimulator(const std::vector<std::string>& arguments)
     : process_(CommandLine("/dev", "/tmp", arguments)) {

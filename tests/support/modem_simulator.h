@@ -8,6 +8,15 @@
 
 namespace taviwireless::test {
 
+constexpr char kDialler[] = "/usr/tavi/bin/wvdial";
+
+// Puts a shell script in the dialler's place, which writes its arguments to "/tmp/arguments", does
+// this and lives on; and the file that dialling changes.
+void InstallDialler(const std::string& script = "");
+
+// What the real one says in the end.
+constexpr char kSaysConnected[] = "echo '--> Using interface lo secondary DNS address' >&2";
+
 // modemsim beside the test, with its modems plugged in: ports linked as /dev/ttyUSBk, info files as
 // /tmp/usbmodem.infoN. For tests in an appliance root, where both folders are private.
 class ModemSimulator {

@@ -1,10 +1,9 @@
 #include "tests/support/process.h"
 
+#include <gtest/gtest.h>
 #include <poll.h>
-#include <spawn.h>
 #include <sys/auxv.h>
 #include <sys/wait.h>
-#include <unistd.h>
 
 #include <cerrno>
 #include <csignal>
@@ -20,62 +19,39 @@
 namespace taviwireless::test {
 namespace {
 
+using Clock = std::chrono::steady_clock;
+using Milliseconds = Process::Milliseconds;
+
 // Without /proc, which in an appliance root may know the test by another path.
 std::filesystem::path BuiltPrograms() {
     const auto* test = reinterpret_cast<const char*>(getauxval(AT_EXECFN));
     return std::filesystem::canonical(test).parent_path();
 }
 
-using Clock = std::chrono::steady_clock;
-using Milliseconds = Process::Milliseconds;
-
-// A child that no longer reads must show as a failed write, not end the test.
-void IgnoreBrokenPipes() {
-    signal(SIGPIPE, SIG_IGN);
+[[noreturn]] void FailToStart() {
+    throw std::system_error(errno, std::generic_category(), "Cannot start a program");
 }
 
-// Starts `argv` with the given descriptors as 0, 1 and 2; a negative one is inherited.
+// Starts `argv` with these as 0, 1 and, unless it is negative, 2.
 pid_t Spawn(const std::vector<std::string>& argv, int input, int output, int error) {
     std::vector<char*> arguments;
     for (const auto& argument : argv) {
         arguments.push_back(const_cast<char*>(argument.c_str()));
     }
     arguments.push_back(nullptr);
-
-    posix_spawn_file_actions_t actions;
-    posix_spawn_file_actions_init(&actions);
-    const int wanted[] = {input, output, error};
-    for (int number = 0; number < 3; ++number) {
-        if (wanted[number] >= 0) {
-            posix_spawn_file_actions_adddup2(&actions, wanted[number], number);
-        }
+    const pid_t pid = fork();
+    if (pid == 0) {
+        signal(SIGPIPE, SIG_DFL);
+        dup2(input, STDIN_FILENO);
+        dup2(output, STDOUT_FILENO);
+        dup2(error < 0 ? STDERR_FILENO : error, STDERR_FILENO);
+        execvp(arguments[0], arguments.data());
+        _exit(127);
     }
-    posix_spawnattr_t attributes;
-    posix_spawnattr_init(&attributes);
-    sigset_t defaults;
-    sigemptyset(&defaults);
-    sigaddset(&defaults, SIGPIPE);
-    posix_spawnattr_setsigdefault(&attributes, &defaults);
-    posix_spawnattr_setflags(&attributes, POSIX_SPAWN_SETSIGDEF);
-
-    pid_t pid = -1;
-    const int failure =
-        posix_spawnp(&pid, arguments[0], &actions, &attributes, arguments.data(), environ);
-    posix_spawnattr_destroy(&attributes);
-    posix_spawn_file_actions_destroy(&actions);
-    if (failure != 0) {
-        throw std::system_error(failure, std::generic_category(), "Cannot run " + argv[0]);
+    if (pid < 0) {
+        FailToStart();
     }
     return pid;
-}
-
-int ExitStatus(int waitStatus) {
-    return WIFSIGNALED(waitStatus) ? 128 + WTERMSIG(waitStatus) : WEXITSTATUS(waitStatus);
-}
-
-int TimeLeft(Clock::time_point deadline) {
-    const auto left = std::chrono::ceil<Milliseconds>(deadline - Clock::now());
-    return left.count() > 0 ? static_cast<int>(left.count()) : 0;
 }
 
 // Appends what can be read now to `text`; false at the end.
@@ -91,16 +67,14 @@ bool ReadMore(int descriptor, std::string* text) {
 
 // The exit status once the child has ended; nothing when it has not by the deadline.
 std::optional<int> WaitUntil(Clock::time_point deadline, pid_t pid) {
-    for (;;) {
-        int waitStatus = 0;
-        if (waitpid(pid, &waitStatus, WNOHANG) == pid) {
-            return ExitStatus(waitStatus);
-        }
+    int status = 0;
+    while (waitpid(pid, &status, WNOHANG) != pid) {
         if (Clock::now() >= deadline) {
             return std::nullopt;
         }
         std::this_thread::sleep_for(Milliseconds(1));
     }
+    return WIFSIGNALED(status) ? 128 + WTERMSIG(status) : WEXITSTATUS(status);
 }
 
 }  // namespace
@@ -136,11 +110,11 @@ RunResult RunAsNobody(std::vector<std::string> argv) {
 }
 
 Process::Process(const std::vector<std::string>& argv) {
-    IgnoreBrokenPipes();
+    signal(SIGPIPE, SIG_IGN);  // one that no longer reads must show as a failed write
     UniquePipe input;
     UniquePipe output;
     if (!input || !output) {
-        throw std::system_error(errno, std::generic_category(), "Cannot make a pipe");
+        FailToStart();
     }
     pid_ = Spawn(argv, input.readEnd.Get(), output.writeEnd.Get(), -1);
     input_ = std::move(input.writeEnd);
@@ -150,10 +124,8 @@ Process::Process(const std::vector<std::string>& argv) {
 Process::~Process() {
     CloseInput();
     output_.Close();
-    if (!status_) {
-        kill(pid_, SIGKILL);
-        Wait();
-    }
+    Signal(SIGKILL);
+    Wait();
 }
 
 std::optional<std::string> Process::ReadLine(Milliseconds patience) {
@@ -168,8 +140,9 @@ std::optional<std::string> Process::ReadLine(Milliseconds patience) {
         if (atEnd_) {
             return unread_.empty() ? std::nullopt : std::optional(std::exchange(unread_, {}));
         }
+        const auto left = std::chrono::ceil<Milliseconds>(deadline - Clock::now()).count();
         pollfd readable{output_.Get(), POLLIN, 0};
-        if (poll(&readable, 1, TimeLeft(deadline)) > 0) {
+        if (poll(&readable, 1, static_cast<int>(std::max(left, 0L))) > 0) {
             atEnd_ = !ReadMore(output_.Get(), &unread_);
         } else if (Clock::now() >= deadline) {
             return std::nullopt;
@@ -180,10 +153,6 @@ std::optional<std::string> Process::ReadLine(Milliseconds patience) {
 bool Process::WriteLine(const std::string& line) {
     const std::string text = line + "\n";  // far shorter than what a pipe takes in one piece
     return write(input_.Get(), text.data(), text.size()) == static_cast<ssize_t>(text.size());
-}
-
-void Process::CloseInput() {
-    input_.Close();
 }
 
 void Process::Signal(int number) {
@@ -200,21 +169,26 @@ std::optional<int> Process::Wait(Milliseconds patience) {
 }
 
 RunResult RunProgram(const std::vector<std::string>& argv, const std::string& input) {
-    constexpr Milliseconds kRunPatience{50000};
     const UniqueFd in = MemoryFile(input);
     const UniqueFd out = MemoryFile();
     const UniqueFd err = MemoryFile();
     if (!in || !out || !err) {
-        throw std::system_error(errno, std::generic_category(), "Cannot make a file in memory");
+        FailToStart();
     }
     const pid_t pid = Spawn(argv, in.Get(), out.Get(), err.Get());
-    const auto status = WaitUntil(Clock::now() + kRunPatience, pid);
+    const auto status = WaitUntil(Clock::now() + Process::kPatience, pid);
     if (!status) {
         kill(pid, SIGKILL);
         waitpid(pid, nullptr, 0);
         throw std::runtime_error(argv[0] + " has not ended within 50 s");
     }
     return {*status, TextOf(out), TextOf(err)};
+}
+
+std::string Shell(const std::string& script) {
+    const RunResult result = RunProgram({"sh", "-c", script});
+    EXPECT_EQ(result.status, 0) << script << ": " << result.err;
+    return result.out;
 }
 
 }  // namespace taviwireless::test

@@ -25,8 +25,8 @@ class Process {
     using Milliseconds = std::chrono::milliseconds;
     static constexpr Milliseconds kPatience{50000};  // as busy as a machine may be
 
-    // Starts argv[0], found along PATH when it holds no slash. Throws std::system_error when it
-    // cannot be run.
+    // Starts argv[0], found along PATH when it holds no slash. One that cannot be run ends with
+    // 127.
     explicit Process(const std::vector<std::string>& argv);
     ~Process();
     Process(const Process&) = delete;
@@ -41,7 +41,7 @@ class Process {
 
     // Writes `line` and a line's end to its input. False when it no longer reads.
     bool WriteLine(const std::string& line);
-    void CloseInput();
+    void CloseInput() { input_.Close(); }
 
     void Signal(int number);
 
@@ -67,6 +67,9 @@ struct RunResult {
 // Runs a program to its end with `input` on its standard input. One that has not ended within 50 s
 // is killed, and std::runtime_error thrown.
 RunResult RunProgram(const std::vector<std::string>& argv, const std::string& input = "");
+
+// Runs a shell script, whose failure is one of the case, and returns what it printed.
+std::string Shell(const std::string& script);
 
 // RunProgram as a user who is not root, wherever the program lies.
 RunResult RunAsNobody(std::vector<std::string> argv);

@@ -23,10 +23,17 @@ class SleepCapture {
     SleepCapture& operator=(const SleepCapture&) = delete;
 
     // The next sleep returns this, as one that a signal ends so many seconds early.
-    void InterruptNext(unsigned secondsLeft);
+    void InterruptNext(unsigned secondsLeft) { leftByNext_ = secondsLeft; }
 
-    std::vector<unsigned> Calls() const;  // the seconds of each call, in order
-    unsigned Total() const;               // their sum
+    const std::vector<unsigned>& Calls() const { return calls_; }  // the seconds of each, in order
+    unsigned Total() const;                                        // their sum
+
+    unsigned Record(unsigned seconds);  // what sleep() does
+
+  private:
+    Hook atEachSleep_;
+    std::vector<unsigned> calls_;
+    unsigned leftByNext_ = 0;
 };
 
 }  // namespace taviwireless::test

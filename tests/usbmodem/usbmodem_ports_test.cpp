@@ -1,10 +1,4 @@
 // Finding the ports of a modem and making its record usable.
-#include <sys/inotify.h>
-#include <unistd.h>
-
-#include <map>
-#include <set>
-
 #include "tests/support/descriptors.h"
 #include "tests/support/files.h"
 #include "tests/support/sleep_capture.h"
@@ -112,8 +106,6 @@ TEST(Init, TriesThreeTimesForEachPortWithASecondBetween) {
     } kInfos[] = {
         {"", "no respond when get connect node, sleep 1 sec [",
          "failed on parsing connect device node"},
-        {"CONNECTNODE=77\n", "No respond on setting quary device node, wait 1 sec [",
-         "failed on parsing quary device node"},
         {"CONNECTNODE=77\nDEVICENODE=77\n", "No respond on setting quary device node, wait 1 sec [",
          "failed on parsing quary device node"},
     };
@@ -136,42 +128,31 @@ TEST(Init, TriesThreeTimesForEachPortWithASecondBetween) {
     }
 }
 
-TEST(Init, FailsWithAClosedChannelWhenTheModemRefusesASetting) {
+TEST(Init, FailsWithAClosedChannelWhenTheModemRefusesASettingOrDoesNotAnswerIt) {
     const struct {
-        const char* fault;
+        const char* command;
+        const char* refused;
+        const char* notAnswered;
         const char* log;
-    } kFaults[] = {{"error=AT+CFUN=1", "failed on setting hardware function lvl"},
-                   {"error=AT^CURC=0", "failed on disabling Unsolicited Reports"}};
-    for (const auto& row : kFaults) {
-        SCOPED_TRACE(row.fault);
+    } kSettings[] = {{"AT+CFUN=1", "error on setting hardware function lvl, ret: ERROR",
+                      "error on modem cmd: AT+CFUN=1", "failed on setting hardware function lvl"},
+                     {"AT^CURC=0", "error on changing unsolicited reports setting, ret: ERROR",
+                      "error on modem cmd: change unsolicited reports setting",
+                      "failed on disabling Unsolicited Reports"}};
+    for (const auto& row : kSettings) {
+        SCOPED_TRACE(row.command);
         NewModem modem("12d1,ports=dial/at");
-        modem.simulator.Fault("1", row.fault);
         const auto before = OpenDescriptors();
-        EXPECT_EQ(modem.record.InitInfo(), -1);
-        EXPECT_TRUE(modem.log.Has(row.log)) << modem.log.Text();
+        for (const bool isAnswered : {true, false}) {
+            modem.simulator.Fault("1", isAnswered ? "off" : "noecho");
+            modem.simulator.Reply("1", row.command, isAnswered ? Framed({"ERROR"}) : "");
+            EXPECT_EQ(modem.record.InitInfo("/dev/ttyUSB1"), -1);
+            EXPECT_TRUE(modem.log.Has(isAnswered ? row.refused : row.notAnswered));
+            EXPECT_EQ(OpenDescriptors(), before);
+        }
+        EXPECT_EQ(modem.log.Count(row.log), 2) << modem.log.Text();
         EXPECT_FALSE(modem.record.IsInited());
-        EXPECT_EQ(OpenDescriptors(), before);
     }
-}
-
-TEST(Init, OpensNoPortThatTheInfoFileDoesNotName) {
-    // Modem 2 has the ports 3 to 5, which belong to nobody as long as it has no info file.
-    ModemSimulator simulator({"--modem", "12d1,id=1", "--modem", "12d1,id=2"});
-    ASSERT_EQ(unlink("/tmp/usbmodem.info2"), 0);
-    const int watch = inotify_init1(IN_NONBLOCK);
-    std::map<int, int> ports;  // the number of each port by the number of its watch
-    for (int port = 0; port < 6; ++port) {
-        const std::string path = "/dev/ttyUSB" + std::to_string(port);
-        ports[inotify_add_watch(watch, path.c_str(), IN_OPEN)] = port;
-    }
-    ASSERT_EQ(ports.size(), 6u);
-    EXPECT_EQ(USBModem(1, kInfo1).InitInfo(), 0);
-    std::set<int> opened;
-    for (inotify_event event{}; read(watch, &event, sizeof event) > 0;) {
-        opened.insert(ports.at(event.wd));
-    }
-    EXPECT_THAT(opened, ElementsAre(0, 1, 2));
-    close(watch);
 }
 
 }  // namespace
