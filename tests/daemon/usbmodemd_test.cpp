@@ -126,25 +126,6 @@ TEST(Usbmodemd, EndsOnASignalAndReleasesEverything) {
     }
 }
 
-TEST(Usbmodemd, WithoutForegroundGoesToTheBackgroundOnceItServes) {
-    PrivateBus bus;
-    const RunResult first = Usbmodemd({});
-    EXPECT_EQ(first.status, 0);
-    EXPECT_EQ(first.err, "");
-    EXPECT_TRUE(dbus::USBModemClient().IsServerReady());
-    EXPECT_EQ(Usbmodemd({}).status, 1);
-    RunProgram({"pkill", "-x", "usbmodemd"});
-}
-
-TEST(Usbmodemd, IsStartedByTheFirstCall) {
-    WriteFile("/tmp/services/usbmodem.service",
-              "[D-BUS Service]\nName=com.merilond.usbmodem\nExec='" + BuiltProgram("usbmodemd") +
-                  "' --foreground\n");
-    PrivateBus bus("<servicedir>/tmp/services</servicedir>");
-    EXPECT_EQ(CallService({"GetUSBModemList"}).out, "('',)\n");
-    RunProgram({"pkill", "-x", "usbmodemd"});
-}
-
 TEST(Usbmodemd, LivesWithoutStandardDescriptors) {
     PrivateBus bus;
     for (const char* const closed : {"<&-", "<&- >&- 2>&-"}) {

@@ -9,7 +9,6 @@
 namespace taviwireless::test {
 namespace {
 
-using testing::AnyOf;
 using testing::ElementsAre;
 using testing::EndsWith;
 
@@ -117,39 +116,6 @@ TEST(Fault, ChangesTheReplyAndCanBeTakenAway) {
         EXPECT_EQ(client.Ask("AT+CSQ"), kEchoed);
     }
     EXPECT_EQ(client.ReadUntilQuiet(), "");
-}
-
-TEST(Fault, VanishUnplugsTheModemWithinAReply) {
-    const struct {
-        const char* fault;
-        const char* heard;
-    } kFaults[] = {{"vanish", "AT+CSQ\r"}, {"vanish=9", "AT+CSQ\r\r\n+CSQ: 1"}};
-    ModemSimulator simulator;
-    for (const auto& fault : kFaults) {
-        SCOPED_TRACE(fault.fault);
-        simulator.Fault("0.1", fault.fault);
-        Client client(1);
-        client.Write("AT+CSQ\r");
-        // The kernel drops what was not read when the line is hung up.
-        EXPECT_THAT(client.ReadUntilQuiet(Client::kPatience), AnyOf(fault.heard, ""));
-        EXPECT_TRUE(client.IsHungUp());
-        EXPECT_FALSE(Exists("/dev/ttyUSB1"));
-        EXPECT_FALSE(Exists("/tmp/usbmodem.info0"));
-        simulator.Plug("0");
-        EXPECT_EQ(Client(1).Ask("AT+CSQ"), kEchoed);  // it vanishes once
-    }
-}
-
-TEST(Reply, IsWhatWasGivenUntilItIsTakenBack) {
-    const char kText[] = "\r\n+CSQ: \"99\"\r\n\0\x7f tail\r\nOK\r\n";
-    const std::string text(kText, sizeof kText - 1);
-    ModemSimulator simulator;
-    Client client(1);
-    simulator.Reply("0", "at+csq", text);
-    EXPECT_EQ(client.Ask("AT+CSQ"), "AT+CSQ\r" + text);
-    EXPECT_EQ(client.Ask("AT+CSQ"), "AT+CSQ\r" + text);
-    simulator.Command("reply 0 AT+CSQ off");
-    EXPECT_EQ(client.Ask("AT+CSQ"), kEchoed);
 }
 
 // Everything up to these words.

@@ -11,62 +11,34 @@
 
 namespace taviwireless::test {
 
-namespace {
-
-constexpr char kConfigFile[] = "/tmp/session-bus.conf";
-constexpr char kAddress[] = "unix:path=/tmp/session-bus";
-
-std::vector<std::string> DaemonCommand(const std::vector<std::string>& command) {
-    return command.empty() ? WithShortWaits({BuiltProgram("usbmodemd"), "--foreground"}) : command;
-}
-
-}  // namespace
-
 std::vector<std::string> LoggingCommand() {
     return WithShortWaits({"sh", "-c", "exec \"$0\" --foreground 2>&1", BuiltProgram("usbmodemd")});
 }
 
-PrivateBus::PrivateBus(const std::string& config) {
-    WriteFile(kConfigFile,
-              std::string("<busconfig><type>session</type><listen>") + kAddress +
-                  "</listen><auth>EXTERNAL</auth><policy context=\"default\">"
-                  "<allow send_destination=\"*\" eavesdrop=\"true\"/><allow eavesdrop=\"true\"/>"
-                  "<allow own=\"*\"/>"
-                  "</policy>" +
-                  config + "</busconfig>");
-    setenv("DBUS_SESSION_BUS_ADDRESS", kAddress, 1);
-    Start();
+PrivateBus::PrivateBus() {
+    WriteFile("/tmp/bus.conf", R"(<busconfig><type>session</type>
+        <listen>unix:path=/tmp/bus</listen><auth>EXTERNAL</auth><policy context="default">
+        <allow send_destination="*" eavesdrop="true"/><allow eavesdrop="true"/><allow own="*"/>
+        </policy></busconfig>)");
+    setenv("DBUS_SESSION_BUS_ADDRESS", "unix:path=/tmp/bus", 1);
+    Restart();
 }
 
-PrivateBus::~PrivateBus() {
-    Stop();
-    unsetenv("DBUS_SESSION_BUS_ADDRESS");
-}
-
-void PrivateBus::Start() {
-    daemon_.emplace(std::vector<std::string>{"dbus-daemon",
-                                             std::string("--config-file=") + kConfigFile,
-                                             "--nofork", "--nopidfile", "--print-address=1"});
-    if (!daemon_->ReadLine()) {
+void PrivateBus::Restart() {
+    if (daemon_) {
+        daemon_->Signal(SIGTERM);
+        daemon_->Wait();
+    }
+    const std::vector<std::string> command = {"dbus-daemon", "--config-file=/tmp/bus.conf",
+                                              "--nofork", "--nopidfile", "--print-address=1"};
+    if (!daemon_.emplace(command).ReadLine()) {
         throw std::runtime_error("dbus-daemon did not start");
     }
 }
 
-void PrivateBus::Stop() {
-    if (daemon_) {
-        daemon_->Signal(SIGTERM);
-        daemon_->Wait();
-        daemon_.reset();
-    }
-}
-
-void PrivateBus::Restart() {
-    Stop();
-    Start();
-}
-
 ModemService::ModemService(const std::vector<std::string>& command)
-    : process_(DaemonCommand(command)) {
+    : process_(command.empty() ? WithShortWaits({BuiltProgram("usbmodemd"), "--foreground"})
+                               : command) {
     if (!Eventually([] { return dbus::USBModemClient().IsServerReady(); })) {
         throw std::runtime_error("usbmodemd does not own its name");
     }

@@ -16,17 +16,13 @@ namespace taviwireless::test {
 // in an appliance root.
 class PrivateBus {
   public:
-    // Returns when the bus can be reached. `config` is added to its configuration.
-    explicit PrivateBus(const std::string& config = "");
-    ~PrivateBus();
+    PrivateBus();  // returns when the bus can be reached
+    ~PrivateBus() { unsetenv("DBUS_SESSION_BUS_ADDRESS"); }
 
-    // As if the bus was restarted: ends it, and starts another at the same address.
+    // Ends it, and starts another at the same address.
     void Restart();
-    void Stop();
 
   private:
-    void Start();
-
     std::optional<Process> daemon_;
 };
 

@@ -12,16 +12,6 @@
 namespace taviwireless::test {
 namespace {
 
-constexpr Process::Milliseconds kPatience = Process::kPatience;
-
-std::vector<std::string> CommandLine(const std::string& linkDir, const std::string& infoDir,
-                                     const std::vector<std::string>& arguments) {
-    std::vector<std::string> all = {
-        BuiltProgram("modemsim"), "--control", "--link-dir", linkDir, "--info-dir", infoDir};
-    all.insert(all.end(), arguments.begin(), arguments.end());
-    return all;
-}
-
 std::string ToJson(const std::string& text) {
     Json::StreamWriterBuilder builder;
     builder["indentation"] = "";
@@ -37,25 +27,26 @@ void InstallDialler(const std::string& script) {
     std::filesystem::permissions(kDialler, std::filesystem::perms(0755));
 }
 
-ModemSimulator::ModemSimulator(const std::vector<std::string>& arguments)
-    : process_(CommandLine("/dev", "/tmp", arguments)) {
-    ReadUntil("ready");
-}
-
-ModemSimulator::ModemSimulator(const std::string& folder, const std::vector<std::string>& arguments)
-    : process_(CommandLine(folder, folder, arguments)) {
+ModemSimulator::ModemSimulator(const std::vector<std::string>& arguments, const std::string& folder)
+    : process_([&] {
+          std::vector<std::string> command = {
+              BuiltProgram("modemsim"),         "--control",  "--link-dir",
+              folder.empty() ? "/dev" : folder, "--info-dir", folder.empty() ? "/tmp" : folder};
+          command.insert(command.end(), arguments.begin(), arguments.end());
+          return command;
+      }()) {
     ReadUntil("ready");
 }
 
 ModemSimulator::~ModemSimulator() {
     process_.CloseInput();
-    process_.Wait(kPatience);
+    process_.Wait();
 }
 
 std::string ModemSimulator::ReadUntil(const std::string& last) {
     std::string lines;
     for (;;) {
-        const auto line = process_.ReadLine(kPatience);
+        const auto line = process_.ReadLine();
         if (!line) {
             throw std::runtime_error(process_.AtEnd() ? "modemsim ended before it said " + last
                                                       : "modemsim does not say " + last);
@@ -86,10 +77,6 @@ std::vector<std::string> ModemSimulator::Received(const std::string& target) {
     return lines;
 }
 
-void ModemSimulator::Fault(const std::string& target, const std::string& fault) {
-    Command("fault " + target + " " + fault);
-}
-
 void ModemSimulator::Reply(const std::string& id, const std::string& command,
                            const std::string& text) {
     Command("reply " + id + " " + command + " " + ToJson(text));
@@ -100,20 +87,8 @@ void ModemSimulator::ReplyOnce(const std::string& id, const std::string& command
     Command("reply-once " + id + " " + command + " " + ToJson(text));
 }
 
-void ModemSimulator::Set(const std::string& id, const std::string& name, const std::string& value) {
-    Command("set " + id + " " + name + " " + value);
-}
-
 void ModemSimulator::Send(const std::string& target, const std::string& text) {
     Command("send " + target + " " + ToJson(text));
-}
-
-void ModemSimulator::Unplug(const std::string& target) {
-    Command("unplug " + target);
-}
-
-void ModemSimulator::Plug(const std::string& target) {
-    Command("plug " + target);
 }
 
 }  // namespace taviwireless::test

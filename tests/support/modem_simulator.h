@@ -24,10 +24,9 @@ class ModemSimulator {
     // Returns once every port is there. `arguments` are modemsim's own, such as {"--modem",
     // "12d1,pin=1234"}. Every member throws std::runtime_error with what modemsim said, or that it
     // says nothing.
-    explicit ModemSimulator(const std::vector<std::string>& arguments = {});
-
-    // Links and info files lie in this folder, the caller's own, instead of "/dev" and "/tmp".
-    ModemSimulator(const std::string& folder, const std::vector<std::string>& arguments);
+    // Links and info files lie in `folder`, if one is given, instead of "/dev" and "/tmp".
+    explicit ModemSimulator(const std::vector<std::string>& arguments = {},
+                            const std::string& folder = "");
 
     // As if modemsim was told to end, and waits until links and info files are gone.
     ~ModemSimulator();
@@ -40,17 +39,19 @@ class ModemSimulator {
     // The command lines that arrived since the last call; carriage returns alone are none.
     std::vector<std::string> Received(const std::string& target);
     // `fault` is KIND or KIND=ARGUMENT, or "off".
-    void Fault(const std::string& target, const std::string& fault);
+    void Fault(const std::string& target, const std::string& fault) {
+        Command("fault " + target + " " + fault);
+    }
     // From now on the modem answers `command` with `text`, as it stands, behind the echo.
     void Reply(const std::string& id, const std::string& command, const std::string& text);
     // The modem answers `command` with `text` once, and then as before.
     void ReplyOnce(const std::string& id, const std::string& command, const std::string& text);
-    void Set(const std::string& id, const std::string& name, const std::string& value);
+    void Set(const std::string& id, const std::string& name, const std::string& value) {
+        Command("set " + id + " " + name + " " + value);
+    }
     void Send(const std::string& target, const std::string& text);
-    void Unplug(const std::string& target);
-    void Plug(const std::string& target);
-
-    pid_t Pid() const { return process_.Pid(); }
+    void Unplug(const std::string& target) { Command("unplug " + target); }
+    void Plug(const std::string& target) { Command("plug " + target); }
 
   private:
     std::string ReadUntil(const std::string& last);

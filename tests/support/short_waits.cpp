@@ -20,7 +20,7 @@
 namespace {
 
 constexpr suseconds_t kLongestQuietWait = 200000;  // µs
-constexpr suseconds_t kShortWait = 5000;          // µs
+constexpr suseconds_t kShortWait = 5000;           // µs
 constexpr unsigned kShortSecond = 50;              // ms
 
 std::atomic<long long> notWaited{0};  // µs

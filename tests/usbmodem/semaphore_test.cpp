@@ -99,17 +99,5 @@ TEST(Semaphore, IsNotWaitedForForEver) {
     kill(stranger, SIGKILL);
 }
 
-TEST(Semaphore, FailsWhenItIsRemovedUnderAWaiter) {
-    ASSERT_EQ(Semaphore(kKey).Enter(), 0);
-    const pid_t waiting = Start([] {
-        LogCapture log;
-        const bool isRefused = Semaphore(kKey).Enter() == -1;
-        return isRefused && log.Has(" errno " + std::to_string(EIDRM)) ? 0 : 1;
-    });
-    ASSERT_TRUE(Becomes(GETNCNT, 1));
-    ASSERT_EQ(semctl(semget(kKey, 1, 0), 0, IPC_RMID), 0);
-    EXPECT_EQ(ExitStatus(waiting), 0);
-}
-
 }  // namespace
 }  // namespace taviwireless::test

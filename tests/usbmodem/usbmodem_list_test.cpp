@@ -1,11 +1,14 @@
-// Discovery: which files are modems, what an update does with them, and what it opens.
+// The list: which files are modems, what an update does with them, and its records: copies, and what
+// they keep while the list grows and shrinks.
 #include <sys/resource.h>
 #include <sys/stat.h>
 #include <taviwireless/usbmodem_list.h>
 #include <unistd.h>
 
 #include <filesystem>
+#include <type_traits>
 
+#include "tests/support/descriptors.h"
 #include "tests/support/files.h"
 #include "tests/usbmodem/opened_modem.h"
 
@@ -134,15 +137,77 @@ TEST(Update, DropsOneOfTwoNeighboursThatAreGoneAndTheOtherTheNextTime) {
     EXPECT_THAT(DevIds(list), IsEmpty());
 }
 
-TEST(List, DropsTheOneModemThatItIsTold) {
-    for (const std::string id : {"0", "1", "2"}) {
-        WriteFile("/tmp/usbmodem.info" + id, "");
+// A vector that grows moves its elements only if that cannot fail.
+static_assert(std::is_nothrow_move_constructible_v<USBModem>);
+static_assert(std::is_nothrow_move_assignable_v<USBModem>);
+static_assert(std::has_virtual_destructor_v<USBModem>);
+
+std::string AskFor(USBModem& record, const std::string& command) {
+    std::string reply;
+    return record.ModemCmd(command, reply) == 0 ? reply : "no reply";
+}
+
+TEST(Copy, HasTheStateAndOnlyAnAssignedOneTheNames) {
+    OpenedModem modem("generic");
+    ASSERT_EQ(modem.record.UpdateSIMStatus(), 1);
+    bool err = false;
+    modem.record.GetVendorName(err);
+    modem.record.SetNotNewPlugIn();
+    while (modem.record.IncreaseErrorCounter() < 6) {
+        EXPECT_FALSE(modem.record.IsError());
     }
+    USBModem copy(modem.record);
+    USBModem assigned(2, "/tmp/usbmodem.info2");
+    assigned = modem.record;
+    for (USBModem* record : {&copy, &assigned}) {
+        record->CloseFileDevice();  // from here on every query gives what is kept
+        EXPECT_EQ(record->GetDevId(), "usbmodem1");
+        EXPECT_TRUE(record->IsInfoExist());
+        EXPECT_TRUE(record->IsError());
+        EXPECT_FALSE(record->IsNewPlugIn());
+        EXPECT_TRUE(record->IsPINReady(err));
+        EXPECT_EQ(record->GetVendorName(err), record == &copy ? "" : "Generic");
+    }
+}
+
+TEST(Copy, SharesTheChannelUntilTheLastOneIsGone) {
+    OpenedModem modem("generic");
+    const auto open = OpenDescriptors();
+    {
+        USBModem copy(modem.record);
+        USBModem assigned(2, "/tmp/usbmodem.info2");
+        assigned = copy;
+        copy.CloseFileDevice();
+        EXPECT_EQ(AskFor(assigned, "AT+CGMI"), "Generic\nOK\n");
+    }
+    USBModem last(std::move(modem.record));
+    EXPECT_EQ(OpenDescriptors(), open);
+    EXPECT_EQ(AskFor(last, "AT+CGMI"), "Generic\nOK\n");
+    last.CloseFileDevice();
+    EXPECT_EQ(OpenDescriptors().size(), open.size() - 1);
+}
+
+TEST(List, KeepsChannelsAndNamesOfItsRecordsWhileItGrowsAndShrinks) {
+    ModemSimulator simulator({"--modem", "generic,id=1", "--modem", "generic,id=2,product=second"});
+    const auto closed = OpenDescriptors();
     USBModemList list;
-    ASSERT_EQ(list.SearchInfoPath(), 0);
+    ASSERT_EQ(list.Update(), 0);
+    bool err = false;
+    list.FindUSBModem(2).GetIMSI(err);
+    EXPECT_EQ(OpenDescriptors().size(), closed.size() + 2);
+    for (int id = 10; id < 30; ++id) {
+        WriteFile("/tmp/usbmodem.info" + std::to_string(id), "");
+        ASSERT_EQ(list.SearchInfoPath(), 0);
+    }
+    EXPECT_EQ(AskFor(list.FindUSBModem(1), "AT+CGMM"), "3G Modem\nOK\n");
     list.Drop(1);
-    list.Drop(9);
-    EXPECT_THAT(DevIds(list), ElementsAre("usbmodem0", "usbmodem2"));
+    EXPECT_EQ(OpenDescriptors().size(), closed.size() + 1);
+    USBModem& second = list.FindUSBModem("usbmodem2");
+    EXPECT_TRUE(second.IsInited());
+    EXPECT_EQ(AskFor(second, "AT+CGMM"), "second\nOK\n");
+    second.CloseFileDevice();
+    EXPECT_EQ(second.GetIMSI(err), "001010123456789");  // as it was asked before all this
+    EXPECT_EQ(OpenDescriptors(), closed);
 }
 
 }  // namespace

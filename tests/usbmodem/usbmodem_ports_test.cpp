@@ -75,29 +75,6 @@ TEST(Init, AfterAFailedOneAsksForEverythingOnceInItsOrder) {
     EXPECT_EQ(modem.log.Text(), "");
 }
 
-TEST(Init, SucceedsWhateverTheSIMStatus) {
-    const struct {
-        const char* reply;
-        const char* warning;
-    } kReplies[] = {
-        {"+CPIN: SIM PUK", ""},
-        {"+CME ERROR: SIM BUSY", "Warning: sim error or busy detected when init"},
-        {"OK", "Warning: unexpect sim result when init"},
-    };
-    NewModem modem("generic,ports=dial/at");
-    modem.simulator.Fault("1", "error=AT+CFUN?");  // saves one command each time
-    for (const auto& row : kReplies) {
-        SCOPED_TRACE(row.reply);
-        modem.log.Clear();
-        modem.simulator.Reply("1", "AT+CPIN?", Framed({row.reply}));
-        USBModem record(1, kInfo1);
-        EXPECT_EQ(record.InitInfo(), 0);
-        EXPECT_TRUE(record.IsInited());
-        EXPECT_EQ(modem.log.Count("Warning: "), *row.warning == '\0' ? 0 : 1) << modem.log.Text();
-        EXPECT_TRUE(modem.log.Has(row.warning));
-    }
-}
-
 TEST(Init, TriesThreeTimesForEachPortWithASecondBetween) {
     const struct {
         const char* info;

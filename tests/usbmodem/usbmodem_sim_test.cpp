@@ -23,6 +23,8 @@ TEST(SIMStatus, IsNamedByTheReplyOfTheModem) {
         {"+CPIN: READY", "ready", true, true},
         {"+CPIN: SIM PIN", "pin_protect", false, true},
         {"+CPIN: SIM PUK", "puk_protect", false, true},
+        {"ERROR +CPIN: READY", "ready", true, true},
+        {"+CPIN: SIM PUK +CPIN: SIM PIN", "pin_protect", false, true},
         {"+CME ERROR: SIM BUSY", "no_sim", false, false},
         {"ERROR: SIM failure", "no_sim", false, false},
         {"OK", "no_sim", false, false},
