@@ -91,8 +91,11 @@ TEST(Usbmodemd, FollowsPluggingAndUnplugging) {
     PrivateBus bus;
     ModemSimulator simulator({"--modem", "generic,id=0,fault=silent", "--modem",
                               "12d1,id=1,ports=dial/at", "--modem", "2001,id=2,ports=dial/at"});
+    simulator.Unplug("2");
     ModemService service;
     // The dead one, first in the list, does not keep those behind it from being served.
+    EXPECT_TRUE(service.Lists({"usbmodem1"}));
+    simulator.Plug("2");
     EXPECT_TRUE(service.Lists({"usbmodem1", "usbmodem2"}));
     EXPECT_THAT(CallService({"GetUSBModem", "usbmodem1"}).out, HasSubstr("E1752"));
     EXPECT_THAT(CallService({"GetUSBModem", "usbmodem0"}).err,
