@@ -14,6 +14,7 @@
 #include <utility>
 
 #include "base/memory_file.h"
+#include "base/spawn_settings.h"
 #include "base/unique_pipe.h"
 
 namespace taviwireless::test {
@@ -32,22 +33,19 @@ std::filesystem::path BuiltPrograms() {
     throw std::system_error(errno, std::generic_category(), "Cannot start a program");
 }
 
-// Starts `argv` with these as 0, 1 and, unless it is negative, 2.
+// Starts `argv` with these as 0, 1 and, unless it is negative, 2. Returns when the program runs: some
+// cases look at its name.
 pid_t Spawn(const std::vector<std::string>& argv, int input, int output, int error) {
-    std::vector<char*> arguments;
+    std::vector<const char*> arguments;
     for (const auto& argument : argv) {
-        arguments.push_back(const_cast<char*>(argument.c_str()));
+        arguments.push_back(argument.c_str());
     }
     arguments.push_back(nullptr);
-    const pid_t pid = fork();
-    if (pid == 0) {
-        signal(SIGPIPE, SIG_DFL);
-        dup2(input, STDIN_FILENO);
-        dup2(output, STDOUT_FILENO);
-        dup2(error < 0 ? STDERR_FILENO : error, STDERR_FILENO);
-        execvp(arguments[0], arguments.data());
-        _exit(127);
-    }
+    SpawnSettings settings;
+    settings.Duplicate(input, STDIN_FILENO);
+    settings.Duplicate(output, STDOUT_FILENO);
+    settings.Duplicate(error < 0 ? STDERR_FILENO : error, STDERR_FILENO);
+    const pid_t pid = settings.Spawn(arguments[0], arguments.data());
     if (pid < 0) {
         FailToStart();
     }
