@@ -9,12 +9,15 @@
 #include <system_error>
 #include <utility>
 
+#include "usbmodem/rules/paths.h"
+
 namespace taviwireless::daemon {
 
 namespace {
 
-constexpr char kFolder[] = "/tmp/";
-constexpr char kInfoName[] = "usbmodem.info";
+using usbmodem_lib::kInfoDirectory;
+using usbmodem_lib::kInfoName;
+
 constexpr uint32_t kChanges = IN_CLOSE_WRITE | IN_MOVED_TO | IN_MOVED_FROM | IN_DELETE;
 constexpr guint kSettleTime = 100;  // milliseconds
 
@@ -28,7 +31,7 @@ bool Concerns(const inotify_event& event) {
 
 InfoFileWatch::InfoFileWatch(std::function<void()> onChange)
     : onChange_(std::move(onChange)), handle_(inotify_init1(IN_NONBLOCK | IN_CLOEXEC)) {
-    if (!handle_ || inotify_add_watch(handle_.Get(), kFolder, kChanges) < 0) {
+    if (!handle_ || inotify_add_watch(handle_.Get(), kInfoDirectory, kChanges) < 0) {
         throw std::system_error(errno, std::generic_category(), "cannot watch /tmp/");
     }
     source_ = g_unix_fd_add(

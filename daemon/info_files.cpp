@@ -6,18 +6,16 @@
 #include <cstring>
 
 #include "base/trusted_file.h"
+#include "usbmodem/rules/paths.h"
 
 namespace taviwireless::daemon {
 
-std::string InfoPath(int interfaceId) {
-    return "/tmp/usbmodem.info" + std::to_string(interfaceId);
-}
-
 std::optional<std::string> ReadInfoFile(int interfaceId) {
-    auto text = ReadTrusted(InfoPath(interfaceId));
+    const std::string path = usbmodem_lib::InfoPath(interfaceId);
+    auto text = ReadTrusted(path);
     const bool isNone = errno == ENOENT || errno == EPERM || errno == ELOOP || errno == EFBIG;
     if (!text && !isNone) {
-        syslog(LOG_ERR, "cannot read %s: %s", InfoPath(interfaceId).c_str(), strerror(errno));
+        syslog(LOG_ERR, "cannot read %s: %s", path.c_str(), strerror(errno));
         return "";
     }
     return text;

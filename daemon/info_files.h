@@ -6,11 +6,8 @@
 
 namespace taviwireless::daemon {
 
-// The info file of a modem, which hot-plug writes.
-std::string InfoPath(int interfaceId);
-
-// What the info file says; nothing when the modem is not plugged in: there is no such file, or one
-// that does not count (base/trusted_file.h). An empty text when it cannot be read now.
+// What the info file of a modem says; nothing when the modem is not plugged in: there is no such
+// file, or one that does not count (base/trusted_file.h). An empty text when it cannot be read now.
 std::optional<std::string> ReadInfoFile(int interfaceId);
 
 // Whether the text names the ports. A file that is still being written may not.

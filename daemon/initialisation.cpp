@@ -5,8 +5,8 @@
 
 #include <algorithm>
 
-#include "daemon/info_files.h"
 #include "daemon/semaphore_sets.h"
+#include "usbmodem/rules/paths.h"
 
 namespace taviwireless::daemon {
 
@@ -37,7 +37,7 @@ bool KnowsItsSIM(USBModem& modem) {
 }
 
 USBModem NewRecord(int interfaceId) {
-    USBModem modem(static_cast<unsigned int>(interfaceId), InfoPath(interfaceId));
+    USBModem modem(static_cast<unsigned int>(interfaceId), usbmodem_lib::InfoPath(interfaceId));
     modem.RecallConnection();
     return modem;
 }

@@ -5,21 +5,16 @@
 #include <system_error>
 
 #include "base/trusted_file.h"
+#include "usbmodem/rules/paths.h"
 
 namespace taviwireless::daemon {
 
-namespace {
-
-constexpr char kFolder[] = "/var/lock";
-constexpr char kPrefix[] = "LCK..ttyUSB";
-
-}  // namespace
-
 void RemovePortLocks(pid_t process) {
     namespace fs = std::filesystem;
+    const std::string prefix = std::string(usbmodem_lib::kLockName) + "ttyUSB";
     std::error_code ignored;
-    for (const auto& entry : fs::directory_iterator(kFolder, ignored)) {
-        if (entry.path().filename().string().rfind(kPrefix, 0) != 0) {
+    for (const auto& entry : fs::directory_iterator(usbmodem_lib::kLockDirectory, ignored)) {
+        if (entry.path().filename().string().rfind(prefix, 0) != 0) {
             continue;
         }
         const auto owner = ReadTrusted(entry.path());

@@ -19,14 +19,15 @@
 #include "daemon/semaphore_sets.h"
 #include "daemon/session_bus.h"
 #include "daemon/watchdog.h"
+#include "dbus/usbmodem_service.h"
 
 using namespace taviwireless::daemon;
+using taviwireless::dbus::kUSBModemService;
 using taviwireless::dbus::USBModemServer;
 
 namespace {
 
 constexpr char kName[] = "usbmodemd";
-constexpr char kService[] = "com.merilond.usbmodem";
 constexpr char kBusLost[] = "the session bus has gone away; ending";
 constexpr int kUsageError = 2;
 constexpr guint kLookPause = 5;  // seconds between looks at the modems
@@ -96,16 +97,17 @@ void LogToSystem(const gchar* domain, GLogLevelFlags, const gchar* message, gpoi
 
 void TakeName(USBModemServer& server, const SessionBus& bus) {
     const bool isTaken = server.Initialize();
-    const std::string owner = bus.OwnerOf(kService);
+    const std::string owner = bus.OwnerOf(kUSBModemService);
     if (bus.IsLost()) {
         throw std::runtime_error(kBusLost);
     }
     if (!isTaken) {
-        throw std::runtime_error(std::string("the session bus refuses the name ") + kService);
+        throw std::runtime_error(std::string("the session bus refuses the name ") +
+                                 kUSBModemService);
     }
     const char* self = server.GetConnectionName();
     if (self == nullptr || owner != self) {
-        throw std::runtime_error(std::string(kService) +
+        throw std::runtime_error(std::string(kUSBModemService) +
                                  " is served by another process already; end that first");
     }
 }

@@ -8,7 +8,7 @@
 
 #include "common/sz_list.h"
 #include "daemon/info_files.h"
-#include "usbmodem/state_files.h"
+#include "usbmodem/rules/paths.h"
 
 namespace taviwireless::daemon {
 
@@ -36,7 +36,7 @@ void ModemKeeper::EndOrphanedConnections() {
         const int id = std::atoi(files[i] + name.size());
         if (files[i] == name + std::to_string(id) && !ReadInfoFile(id)) {
             syslog(LOG_INFO, "usbmodem%d was unplugged while nobody looked", id);
-            USBModem(static_cast<unsigned int>(id), InfoPath(id)).EndConnection();
+            USBModem(static_cast<unsigned int>(id), usbmodem_lib::InfoPath(id)).EndConnection();
         }
     }
 }

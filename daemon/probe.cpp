@@ -14,6 +14,7 @@
 #include "daemon/info_files.h"
 #include "daemon/lock_files.h"
 #include "daemon/semaphore_sets.h"
+#include "usbmodem/rules/paths.h"
 
 namespace taviwireless::daemon {
 
@@ -119,7 +120,8 @@ void Probe::Ended(bool answers) {
 int Probe::Run(int interfaceId) {
     const std::string info = ReadInfoFile(interfaceId).value_or("");
     alarm(TimeLimit(info));
-    usbmodem_lib::USBModem modem(static_cast<unsigned int>(interfaceId), InfoPath(interfaceId));
+    usbmodem_lib::USBModem modem(static_cast<unsigned int>(interfaceId),
+                                 usbmodem_lib::InfoPath(interfaceId));
     modem.SetATInterface();
     if (modem.AssignConnectNode() != 0 || modem.AssignQuaryNode() != 0) {
         return EXIT_FAILURE;

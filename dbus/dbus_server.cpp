@@ -9,19 +9,13 @@
 
 namespace taviwireless::dbus {
 
-namespace {
-
-constexpr char kBusService[] = "org.freedesktop.DBus";
-constexpr char kBusPath[] = "/org/freedesktop/DBus";
-
-}  // namespace
-
 DBusServer::DBusServer(const char* busName, const char* path, DBusBusType type)
     : busType_(type), busName_(busName), path_(path) {
     g_type_init();
     connection_ = dbus_g_bus_get(busType_, nullptr);
     if (connection_ != nullptr) {
-        proxy_ = dbus_g_proxy_new_for_name(connection_, kBusService, kBusPath, kBusService);
+        proxy_ = dbus_g_proxy_new_for_name(connection_, DBUS_SERVICE_DBUS, DBUS_PATH_DBUS,
+                                           DBUS_INTERFACE_DBUS);
     }
 }
 

@@ -15,130 +15,85 @@ using dbus::USBModemClient;
 constexpr int kNotReady = 0;
 constexpr int kDone = 1;
 
-// Appends the lines of a list reply; returns false when the call failed.
-bool AppendLines(USBModemClient& client, int (USBModemClient::*call)(std::string& out),
-                 std::vector<std::string>& list) {
-    std::string reply;
-    if ((client.*call)(reply) < 0) {
-        return false;
+// Calls the service if it is on the bus. A failure is a line in the log, unless there is no text.
+template <typename Call>
+int Ask(Call call, const std::string& failure) {
+    USBModemClient client;
+    if (!client.IsServerReady()) {
+        return kNotReady;
     }
-    std::istringstream lines(reply);
+    const int result = call(client);
+    if (result < 0 && !failure.empty()) {
+        TAVI_LOG_ERROR("%s", failure.c_str());
+    }
+    return result < 0 ? result : kDone;
+}
+
+// Appends the lines of a list.
+int AppendLines(int (USBModemClient::*get)(std::string& out), std::vector<std::string>& list,
+                const char* failure) {
+    std::string text;
+    const int result = Ask([&](USBModemClient& client) { return (client.*get)(text); }, failure);
+    std::istringstream lines(text);
     for (std::string line; std::getline(lines, line);) {
         list.push_back(line);
     }
-    return true;
+    return result;
 }
 
 }  // namespace
 
 int GetUSBModemIfList(std::vector<std::string>& list) {
-    USBModemClient client;
-    if (!client.IsServerReady()) {
-        return kNotReady;
-    }
-    if (!AppendLines(client, &USBModemClient::GetUSBModemIfList, list)) {
-        TAVI_LOG_ERROR("Failed to get usbmodem interface list");
-        return -1;
-    }
-    return kDone;
+    return AppendLines(&USBModemClient::GetUSBModemIfList, list,
+                       "Failed to get usbmodem interface list");
 }
 
 int GetUSBModemList(std::vector<std::string>& list) {
-    USBModemClient client;
-    if (!client.IsServerReady()) {
-        return kNotReady;
-    }
-    if (!AppendLines(client, &USBModemClient::GetUSBModemList, list)) {
-        TAVI_LOG_ERROR("Failed to get usbmodem list");
-        return -1;
-    }
-    return kDone;
+    return AppendLines(&USBModemClient::GetUSBModemList, list, "Failed to get usbmodem list");
 }
 
 std::string GetUSBModem(const std::string& devid) {
-    USBModemClient client;
     std::string document;
-    if (client.IsServerReady() && client.GetUSBModem(devid, document) < 0) {
-        TAVI_LOG_ERROR("Failed to get %s information", devid.c_str());
-    }
+    Ask([&](USBModemClient& client) { return client.GetUSBModem(devid, document); },
+        "Failed to get " + devid + " information");
     return document;
 }
 
 std::string GetProfile(const std::string& devid) {
-    USBModemClient client;
     std::string document;
-    if (client.IsServerReady() && client.GetProfile(devid, document) < 0) {
-        TAVI_LOG_ERROR("Failed to get %s profile", devid.c_str());
-    }
+    Ask([&](USBModemClient& client) { return client.GetProfile(devid, document); },
+        "Failed to get " + devid + " profile");
     return document;
 }
 
 int SetProfile(const std::string& devid, const std::string& profile) {
-    USBModemClient client;
-    if (!client.IsServerReady()) {
-        return kNotReady;
-    }
-    if (client.SetProfile(devid, profile) < 0) {
-        TAVI_LOG_ERROR("Failed to set profile of device: %s", devid.c_str());
-        return -1;
-    }
-    return kDone;
+    return Ask([&](USBModemClient& client) { return client.SetProfile(devid, profile); },
+               "Failed to set profile of device: " + devid);
 }
 
 int SetPIN(const std::string& devid, const std::string& oldpin, const std::string& newpin,
            bool protection) {
-    USBModemClient client;
-    if (!client.IsServerReady()) {
-        return kNotReady;
-    }
-    const int result = client.SetPIN(devid, oldpin, newpin, protection);
-    if (result < 0) {
-        TAVI_LOG_ERROR("Failed to set SIM's PIN of device: %s", devid.c_str());
-        return result;
-    }
-    return kDone;
+    return Ask(
+        [&](USBModemClient& client) { return client.SetPIN(devid, oldpin, newpin, protection); },
+        "Failed to set SIM's PIN of device: " + devid);
 }
 
 int UnlockPIN(const std::string& devid, const std::string& puk, const std::string& pin) {
-    USBModemClient client;
-    if (!client.IsServerReady()) {
-        return kNotReady;
-    }
-    const int result = client.UnlockPIN(devid, puk, pin);
-    if (result < 0) {
-        TAVI_LOG_ERROR("Failed to unlock PIN of device: %s", devid.c_str());
-        return result;
-    }
-    return kDone;
+    return Ask([&](USBModemClient& client) { return client.UnlockPIN(devid, puk, pin); },
+               "Failed to unlock PIN of device: " + devid);
 }
 
 int UnlockSIM(const std::string& devid, const std::string& pin) {
-    USBModemClient client;
-    if (!client.IsServerReady()) {
-        return kNotReady;
-    }
-    const int result = client.UnlockSIM(devid, pin);
-    if (result < 0) {
-        TAVI_LOG_ERROR("Failed to unlock SIM of device: %s", devid.c_str());
-        return result;
-    }
-    return kDone;
+    return Ask([&](USBModemClient& client) { return client.UnlockSIM(devid, pin); },
+               "Failed to unlock SIM of device: " + devid);
 }
 
 int Connect(const std::string& devid) {
-    USBModemClient client;
-    if (!client.IsServerReady()) {
-        return kNotReady;
-    }
-    return client.Connect(devid) < 0 ? -1 : kDone;
+    return Ask([&](USBModemClient& client) { return client.Connect(devid); }, "");
 }
 
 int Disconnect(const std::string& devid) {
-    USBModemClient client;
-    if (!client.IsServerReady()) {
-        return kNotReady;
-    }
-    return client.Disconnect(devid) < 0 ? -1 : kDone;
+    return Ask([&](USBModemClient& client) { return client.Disconnect(devid); }, "");
 }
 
 }  // namespace taviwireless::usbmodem_ui

@@ -10,8 +10,6 @@ namespace taviwireless::dbus {
 
 namespace {
 
-constexpr char kBusService[] = "org.freedesktop.DBus";
-constexpr char kBusPath[] = "/org/freedesktop/DBus";
 constexpr int kDefaultTimeout = -1;
 constexpr int kNoTimeout =
     0x7FFFFFFF;  // milliseconds; without a reply to wait for it means nothing
@@ -94,7 +92,7 @@ int USBModemClient::Disconnect(const std::string& devid) {
 }
 
 bool USBModemClient::IsServerReady() const {
-    DBusClient bus(kBusService, kBusPath, kBusService, DBUS_BUS_SESSION);
+    DBusClient bus(DBUS_SERVICE_DBUS, DBUS_PATH_DBUS, DBUS_INTERFACE_DBUS, DBUS_BUS_SESSION);
     std::vector<std::string> names;
     return bus.NewMessage("ListNames") == 0 && bus.SendMessage(true, kDefaultTimeout) == 0 &&
            bus.GetReply(names) == 0 &&

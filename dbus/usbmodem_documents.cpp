@@ -4,10 +4,13 @@
 #include <functional>
 #include <sstream>
 
+#include "usbmodem/rules/profile.h"
+
 namespace taviwireless::dbus {
 
 namespace {
 
+namespace profile = usbmodem_lib::profile;
 using usbmodem_lib::USBModem;
 
 // A modem that answers begins to do so long before this time is over; one that does not answer
@@ -29,6 +32,9 @@ class Document {
     template <typename T>
     void Bare(const char* indent, const char* key, const T& value) {
         text_ << indent << '"' << key << "\": " << value << ",\n";
+    }
+    void Last(const char* indent, const char* key, const char* value) {
+        text_ << indent << '"' << key << "\": " << value << '\n';
     }
     void Line(const char* line) { text_ << line << '\n'; }
 
@@ -66,16 +72,15 @@ class Document {
 };
 
 void AddProfile(Document& document, const char* indent) {
-    document.Quoted(indent, "location", document.Ask(&USBModem::GetProfileLocation));
-    document.Quoted(indent, "isp", document.Ask(&USBModem::GetProfileISP));
-    document.Quoted(indent, "apn", document.Ask(&USBModem::GetProfileAPN));
-    document.Quoted(indent, "number", document.Ask(&USBModem::GetProfilePhone));
-    document.Quoted(indent, "user", document.Ask(&USBModem::GetProfileUsername));
-    document.Quoted(indent, "pass", document.Ask(&USBModem::GetProfilePassword));
-    document.Bare(indent, "roaming", document.Ask(&USBModem::GetRoaming));
+    for (const char* key : {profile::kLocation, profile::kISP, profile::kAPN, profile::kNumber,
+                            profile::kUser, profile::kPassword}) {
+        document.Quoted(indent, key, document.Ask([key](USBModem& modem, bool& err) {
+            return modem.GetProfileWithKey(key, err);
+        }));
+    }
+    document.Bare(indent, profile::kRoaming, document.Ask(&USBModem::GetRoaming));
     const bool takesRoute = document.Ask(&USBModem::GetProfileDefaultGW) == "true";
-    document.Line(
-        (std::string(indent) + "\"default_gw\": " + (takesRoute ? "true" : "false")).c_str());
+    document.Last(indent, profile::kDefaultGateway, takesRoute ? "true" : "false");
 }
 
 }  // namespace

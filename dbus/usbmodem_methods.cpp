@@ -7,17 +7,19 @@
 #include <optional>
 #include <sstream>
 #include <string>
-#include <utility>
 #include <vector>
 
 #include "common/log.h"
 #include "dbus/usbmodem_documents.h"
 #include "usbmodem/profile_value.h"
+#include "usbmodem/rules/profile.h"
 
 namespace taviwireless::dbus {
 
 namespace {
 
+namespace profile = usbmodem_lib::profile;
+using profile::Setting;
 using usbmodem_lib::USBModem;
 
 // The quark that clients know the service's errors by: GLib's own third, which no D-Bus name is
@@ -99,30 +101,12 @@ bool SleepOut(unsigned int seconds) {
     return left > 0;
 }
 
-constexpr const char* kProfileKeys[] = {"apn",  "number",   "user", "pass",
-                                        "IMSI", "location", "isp",  "default_gw"};
-
-using Setting = std::pair<std::string, std::string>;  // key and value
-
-// What a line "KEY=VALUE" sets. Compatible with clients that write lines such as "usbmodem_apn=x":
-// the key counts wherever it stands in the line. A line without a key sets nothing.
-std::optional<Setting> ParseSetting(const std::string& line) {
-    for (const char* key : kProfileKeys) {
-        const std::string begin = std::string(key) + '=';
-        const size_t position = line.find(begin);
-        if (position != std::string::npos) {
-            return Setting(key, line.substr(position + begin.size()));
-        }
-    }
-    return std::nullopt;
-}
-
 // The value as it can be shown: a long one is cut, a character that was cut in two made valid.
 std::string Shortened(const std::string& value) {
-    if (value.size() < usbmodem_lib::kProfileValueSize) {
+    if (value.size() < profile::kValueSize) {
         return value;
     }
-    char* begin = ToUTF8(value.substr(0, usbmodem_lib::kProfileValueSize));
+    char* begin = ToUTF8(value.substr(0, profile::kValueSize));
     const std::string shown = std::string(begin) + "...";
     g_free(begin);
     return shown;
@@ -131,7 +115,7 @@ std::string Shortened(const std::string& value) {
 gboolean FailToSet(USBModem& modem, const Setting& setting, GError** error,
                    int line = __builtin_LINE()) {
     const auto& [key, value] = setting;
-    const std::string shown = key == "pass" ? "***" : Shortened(value);
+    const std::string shown = key == profile::kPassword ? "***" : Shortened(value);
     return Fail(error, kModemFailed,
                 "Failed to set " + modem.GetDevId() + ": (key,value) = (" + key + "," + shown + ")",
                 line);
@@ -140,19 +124,19 @@ gboolean FailToSet(USBModem& modem, const Setting& setting, GError** error,
 // Reads what the lines of a profile set, in their order; of a key that stands in several, the last
 // one, so that there is not more to write than there are keys. False with the error set when one
 // of them cannot be set.
-bool ParseProfile(USBModem& modem, const char* profile, std::vector<Setting>& settings,
+bool ParseProfile(USBModem& modem, const char* text, std::vector<Setting>& settings,
                   GError** error) {
-    std::istringstream lines(profile);
+    std::istringstream lines(text);
     for (std::string line; std::getline(lines, line);) {
-        const std::optional<Setting> setting = ParseSetting(line);
+        const std::optional<Setting> setting = profile::ParseSetting(line);
         if (!setting) {
             continue;
         }
-        if (!usbmodem_lib::IsProfileValue(setting->first, setting->second)) {
+        if (!usbmodem_lib::IsProfileValue(setting->key, setting->value)) {
             FailToSet(modem, *setting, error);
             return false;
         }
-        const auto isSameKey = [&](const Setting& other) { return other.first == setting->first; };
+        const auto isSameKey = [&](const Setting& other) { return other.key == setting->key; };
         settings.erase(std::remove_if(settings.begin(), settings.end(), isSameKey), settings.end());
         settings.push_back(*setting);
     }
@@ -232,7 +216,7 @@ gboolean usbmodem_set_profile(USBModemObject* object, char* devid, char* profile
         return Fail(error, kModemFailed, "Failed to disconnect " + id);
     }
     for (const Setting& setting : settings) {
-        if (modem->SetProfileWithKey(setting.first, setting.second) < 0) {
+        if (modem->SetProfileWithKey(setting.key, setting.value) < 0) {
             return FailToSet(*modem, setting, error);
         }
     }

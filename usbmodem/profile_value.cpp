@@ -1,31 +1,29 @@
 #include "usbmodem/profile_value.h"
 
 #include <algorithm>
-#include <string_view>
 
 #include "common/log.h"
+#include "usbmodem/rules/profile.h"
 
 namespace taviwireless::usbmodem_lib {
 
 namespace {
 
-constexpr std::string_view kLineEnds("\r\n\0", 3);
-
 // What ends a quoted APN, a number to dial, and with it the command.
 bool EndsItsPlace(const std::string& key, const std::string& value) {
-    const bool isNumber = key == "number";
+    const bool isNumber = key == profile::kNumber;
     const auto ends = [isNumber](unsigned char c) {
         return c < ' ' || c == 0x7F || c == '"' || (isNumber && c == ';');
     };
-    return (isNumber || key == "apn") && std::any_of(value.begin(), value.end(), ends);
+    return (isNumber || key == profile::kAPN) && std::any_of(value.begin(), value.end(), ends);
 }
 
 // Null when there is none.
 const char* ReasonToRefuse(const std::string& key, const std::string& value) {
-    if (value.size() >= kProfileValueSize) {
+    if (value.size() >= profile::kValueSize) {
         return "it is too long";
     }
-    if (value.find_first_of(kLineEnds) != std::string::npos) {
+    if (value.find_first_of(profile::kLineEnds) != std::string::npos) {
         return "it holds a line break or a zero byte";
     }
     return EndsItsPlace(key, value) ? "it would end its place in the modem's command" : nullptr;

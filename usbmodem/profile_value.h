@@ -1,12 +1,9 @@
 #ifndef TAVIWIRELESS_USBMODEM_PROFILE_VALUE_H
 #define TAVIWIRELESS_USBMODEM_PROFILE_VALUE_H
 
-#include <cstddef>
 #include <string>
 
 namespace taviwireless::usbmodem_lib {
-
-constexpr size_t kProfileValueSize = 1024;  // bytes of a value and the zero behind it
 
 // Whether a profile may hold this value: it comes back from the file as it is, and an APN or a
 // number does not end its place in the modem's command. When not, the log says why.

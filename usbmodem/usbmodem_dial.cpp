@@ -18,6 +18,8 @@
 #include "base/unique_pipe.h"
 #include "common/log.h"
 #include "usbmodem/profile_value.h"
+#include "usbmodem/rules/paths.h"
+#include "usbmodem/rules/profile.h"
 #include "usbmodem/state_files.h"
 
 namespace taviwireless::usbmodem_lib {
@@ -27,8 +29,6 @@ namespace {
 constexpr char kDialler[] = "/usr/tavi/bin/wvdial";
 constexpr char kInit[] = "Init1=ATZ";
 constexpr char kBaud[] = "Baud=460800";
-constexpr char kDefaultNumber[] = "*99#";
-constexpr char kDefaultUser[] = "Unknown";
 
 std::string OrElse(const std::string& value, const char* standard) {
     return value.empty() ? standard : value;
@@ -163,13 +163,14 @@ void USBModem::ReadDialSettings(DialSettings& settings, bool& err) {
     if (apn.empty()) {
         apn = GetDefaultAPN(err);
     }
-    settings.init = "Init2=AT+CGDCONT=1,\"ip\",\"" + checked("apn", apn) + '"';
+    settings.init = "Init2=AT+CGDCONT=1,\"ip\",\"" + checked(profile::kAPN, apn) + '"';
     settings.modem = "Modem=" + connectNode_;
-    settings.phone = "Phone=" + checked("number", OrElse(GetProfilePhone(err), kDefaultNumber));
-    settings.username =
-        "Username=" + checked("user", OrElse(GetProfileUsername(err), kDefaultUser));
-    settings.password =
-        "Password=" + checked("pass", OrElse(GetProfilePassword(err), kDefaultUser));
+    settings.phone =
+        "Phone=" + checked(profile::kNumber, OrElse(GetProfilePhone(err), profile::kDefaultNumber));
+    settings.username = "Username=" + checked(profile::kUser, OrElse(GetProfileUsername(err),
+                                                                     profile::kDefaultUser));
+    settings.password = "Password=" + checked(profile::kPassword, OrElse(GetProfilePassword(err),
+                                                                         profile::kDefaultUser));
     settings.defaultGateway = GetProfileDefaultGW(err);
 }
 

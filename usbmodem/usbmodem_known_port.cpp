@@ -6,6 +6,7 @@
 
 #include "common/log.h"
 #include "usbmodem/info_file.h"
+#include "usbmodem/rules/paths.h"
 
 namespace taviwireless::usbmodem_lib {
 
@@ -15,7 +16,7 @@ std::string USBModem::GetQueryNode() const {
 
 int USBModem::InitInfo(const std::string& queryNode) {
     SetATInterface();
-    connectNode_ = "/dev/ttyUSB" + ReadInfo(infoPath_, "CONNECTNODE");
+    connectNode_ = kPortPrefix + ReadInfo(infoPath_, "CONNECTNODE");
     queryNode_ = queryNode;
     std::string reply;
     return CompleteInit(OpenFileDevice(queryNode) == 0 && QuerySIMStatus(reply) == 0 && Prepare());

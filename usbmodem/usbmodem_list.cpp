@@ -12,13 +12,11 @@
 #include "common/log.h"
 #include "common/sz_list.h"
 #include "usbmodem/info_file.h"
+#include "usbmodem/rules/paths.h"
 
 namespace taviwireless::usbmodem_lib {
 
 namespace {
-
-constexpr char kInfoDirectory[] = "/tmp/";
-constexpr char kInfoName[] = "usbmodem.info";
 
 // Returns the interface id in the name of an info file; nothing for the names of other files, such
 // as backup copies and numbers with leading zeros. -1 is no interface id: compatible with earlier
@@ -33,10 +31,6 @@ std::optional<int> ParseInterfaceId(const std::string& name) {
         return std::nullopt;
     }
     return static_cast<int>(number);
-}
-
-std::string InfoPath(int interfaceId) {
-    return std::string(kInfoDirectory) + kInfoName + std::to_string(interfaceId);
 }
 
 bool IsPluggedIn(const USBModem& modem) {

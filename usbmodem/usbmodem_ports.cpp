@@ -9,14 +9,12 @@
 
 #include "common/log.h"
 #include "usbmodem/info_file.h"
-#include "usbmodem/state_files.h"
+#include "usbmodem/rules/paths.h"
 #include "usbmodem/text.h"
 
 namespace taviwireless::usbmodem_lib {
 
 namespace {
-
-constexpr char kNodePrefix[] = "/dev/ttyUSB";
 
 constexpr char kUsingInterface[] = "Using interface";
 
@@ -58,7 +56,7 @@ int USBModem::AssignConnectNode() {
         CloseFileDevice();
         return -1;
     }
-    const std::string node = kNodePrefix + number;
+    const std::string node = kPortPrefix + number;
     std::string reply;
     if (OpenFileDevice(node) != 0 || QuerySIMStatus(reply) != 0) {
         TAVI_LOG_ERROR("warning: cannot test CONNECTNODE %s", node.c_str());
@@ -77,7 +75,7 @@ int USBModem::AssignQuaryNode() {
     }
     std::istringstream stream(numbers);
     for (std::string number; std::getline(stream, number, ',');) {
-        const std::string node = kNodePrefix + number;
+        const std::string node = kPortPrefix + number;
         if (node == connectNode_ || OpenFileDevice(node) != 0) {
             continue;
         }

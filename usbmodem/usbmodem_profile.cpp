@@ -9,6 +9,8 @@
 #include "common/log.h"
 #include "common/sz_hash.h"
 #include "usbmodem/profile_value.h"
+#include "usbmodem/rules/paths.h"
+#include "usbmodem/rules/profile.h"
 #include "usbmodem/state_files.h"
 
 namespace taviwireless::usbmodem_lib {
@@ -18,9 +20,6 @@ namespace {
 constexpr char kSection[] = "USBModem Profile";
 constexpr char kLineFormat[] = "%s=%s\n";
 constexpr mode_t kDirectoryMode = 0775;
-
-constexpr char kDefaultNumber[] = "*99#";
-constexpr char kDefaultUser[] = "Unknown";
 
 // An empty file counts as missing: a full disk leaves one.
 bool IsMissing(const std::string& path) {
@@ -70,21 +69,21 @@ int USBModem::ResetProfile() {
 
 // Query errors are ignored: an empty value is written as it is, and in the place of what a profile
 // cannot hold, such as an operator's name with a line break.
-void USBModem::FillDefaults(SzHash& profile) {
-    const auto set = [&profile](const char* key, const std::string& value) {
-        profile.Set(key, IsProfileValue(key, value) ? value : "");
+void USBModem::FillDefaults(SzHash& values) {
+    const auto set = [&values](const char* key, const std::string& value) {
+        values.Set(key, IsProfileValue(key, value) ? value : "");
     };
     bool ignored = false;
-    set("number", kDefaultNumber);
-    set("user", kDefaultUser);
-    set("pass", kDefaultUser);
-    set("IMSI", GetIMSI(ignored));
-    set("default_gw", "false");
-    set("location", GetDefaultLocation(ignored));
+    set(profile::kNumber, profile::kDefaultNumber);
+    set(profile::kUser, profile::kDefaultUser);
+    set(profile::kPassword, profile::kDefaultUser);
+    set(profile::kIMSI, GetIMSI(ignored));
+    set(profile::kDefaultGateway, "false");
+    set(profile::kLocation, GetDefaultLocation(ignored));
     const std::string isp = GetDefaultISP(ignored);
     const std::string apn = GetDefaultAPN(ignored);
-    set("apn", apn);
-    set("isp", isp.empty() || apn.empty() ? isp : isp + " - " + apn);
+    set(profile::kAPN, apn);
+    set(profile::kISP, isp.empty() || apn.empty() ? isp : isp + " - " + apn);
 }
 
 int USBModem::SetProfileToDefault() {
@@ -128,7 +127,7 @@ std::string USBModem::GetProfileWithKey(const std::string& key, bool& err) {
         TAVI_LOG_ERROR("sim status is busy or error, cannot get key %s", key.c_str());
         err = true;
     }
-    char value[kProfileValueSize] = {};
+    char value[profile::kValueSize] = {};
     if (InitProfile() == 0 && VEXACFileGetSectionValue(profilePath_.c_str(), kSection, key.c_str(),
                                                        value, sizeof value) != 0) {
         TAVI_LOG_ERROR("failed on get key value %s", key.c_str());
@@ -138,63 +137,63 @@ std::string USBModem::GetProfileWithKey(const std::string& key, bool& err) {
 }
 
 int USBModem::SetProfilePhone(const std::string& number) {
-    return SetProfileWithKey("number", number);
+    return SetProfileWithKey(profile::kNumber, number);
 }
 
 std::string USBModem::GetProfilePhone(bool& err) {
-    return GetProfileWithKey("number", err);
+    return GetProfileWithKey(profile::kNumber, err);
 }
 
 int USBModem::SetProfileUsername(const std::string& user) {
-    return SetProfileWithKey("user", user);
+    return SetProfileWithKey(profile::kUser, user);
 }
 
 std::string USBModem::GetProfileUsername(bool& err) {
-    return GetProfileWithKey("user", err);
+    return GetProfileWithKey(profile::kUser, err);
 }
 
 int USBModem::SetProfilePassword(const std::string& password) {
-    return SetProfileWithKey("pass", password);
+    return SetProfileWithKey(profile::kPassword, password);
 }
 
 std::string USBModem::GetProfilePassword(bool& err) {
-    return GetProfileWithKey("pass", err);
+    return GetProfileWithKey(profile::kPassword, err);
 }
 
 int USBModem::SetProfileAPN(const std::string& apn) {
-    return SetProfileWithKey("apn", apn);
+    return SetProfileWithKey(profile::kAPN, apn);
 }
 
 std::string USBModem::GetProfileAPN(bool& err) {
-    return GetProfileWithKey("apn", err);
+    return GetProfileWithKey(profile::kAPN, err);
 }
 
 int USBModem::SetProfileISP(const std::string& isp) {
-    return SetProfileWithKey("isp", isp);
+    return SetProfileWithKey(profile::kISP, isp);
 }
 
 std::string USBModem::GetProfileISP(bool& err) {
-    return GetProfileWithKey("isp", err);
+    return GetProfileWithKey(profile::kISP, err);
 }
 
 int USBModem::SetProfileLocation(const std::string& location) {
-    return SetProfileWithKey("location", location);
+    return SetProfileWithKey(profile::kLocation, location);
 }
 
 std::string USBModem::GetProfileLocation(bool& err) {
-    return GetProfileWithKey("location", err);
+    return GetProfileWithKey(profile::kLocation, err);
 }
 
 int USBModem::SetProfileDefaultGW(const std::string& flag) {
-    return SetProfileWithKey("default_gw", flag);
+    return SetProfileWithKey(profile::kDefaultGateway, flag);
 }
 
 std::string USBModem::GetProfileDefaultGW(bool& err) {
-    return GetProfileWithKey("default_gw", err);
+    return GetProfileWithKey(profile::kDefaultGateway, err);
 }
 
 std::string USBModem::GetProfileIMSI(bool& err) {
-    return GetProfileWithKey("IMSI", err);
+    return GetProfileWithKey(profile::kIMSI, err);
 }
 
 }  // namespace taviwireless::usbmodem_lib

@@ -8,7 +8,7 @@
 #include <unistd.h>
 
 #include "common/log.h"
-#include "usbmodem/state_files.h"
+#include "usbmodem/rules/paths.h"
 
 namespace taviwireless::usbmodem_lib {
 

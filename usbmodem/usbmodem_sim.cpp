@@ -262,15 +262,10 @@ int USBModem::AttemptRemain(Parser parser, int& cache) {
     if (busy_ || simStatus_ >= kSIMBusy) {
         return cache;
     }
-    const std::string cmd = CommandSet().GetATCommandPINPUKAttempt();
-    std::string reply;
-    if (ModemCmd(cmd, reply) != 0) {
-        TAVI_LOG_ERROR("error on sending commmand %s", cmd.c_str());
-        return -1;
-    }
     std::string count;
-    if ((CommandSet().*parser)(reply, count) != 0) {
-        TAVI_LOG_ERROR("error on parsing AT command ret string: %s", LoggableReply(reply).c_str());
+    if (!Refresh(&USBModem_ATIF::GetATCommandPINPUKAttempt, parser, count, [](const char* reply) {
+            TAVI_LOG_ERROR("error on parsing AT command ret string: %s", reply);
+        })) {
         return -1;
     }
     cache = ToInt(count);

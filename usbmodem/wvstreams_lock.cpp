@@ -15,13 +15,15 @@
 #include <string>
 
 #include "base/trusted_file.h"
+#include "usbmodem/rules/paths.h"
 
 namespace {
 
 using taviwireless::ReadTrusted;
 using taviwireless::UniqueFd;
+using taviwireless::usbmodem_lib::kLockDirectory;
+using taviwireless::usbmodem_lib::kLockName;
 
-constexpr char kLockPrefix[] = "/var/lock/LCK..";
 constexpr mode_t kLockMode = 0644;  // for other programs that use ports
 // How often to try where somebody makes the file anew as often as it is removed.
 constexpr int kAttempts = 3;
@@ -60,7 +62,8 @@ bool IsHeld(const char* path) {
 
 WvLockDev::WvLockDev(WvString device) : devicename(device), lock_count(0) {
     const std::string path = device.cstr();
-    filename = (kLockPrefix + path.substr(path.rfind('/') + 1)).c_str();
+    const std::string name = path.substr(path.rfind('/') + 1);
+    filename = (std::string(kLockDirectory) + kLockName + name).c_str();
 }
 
 WvLockDev::~WvLockDev() {

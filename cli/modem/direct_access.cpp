@@ -14,18 +14,14 @@ namespace {
 using usbmodem_lib::USBModem;
 using usbmodem_lib::USBModemList;
 
-// The texts of a profile; roaming is asked of the modem.
-constexpr const char* kStoredKeys[] = {"location", "isp",  "apn",       "number",
-                                       "user",     "pass", "default_gw"};
-
 Profile ReadStoredProfile(USBModem& modem, bool& failed) {
-    Profile profile;
-    for (const char* key : kStoredKeys) {
-        profile[key] = modem.GetProfileWithKey(key, failed);
+    Profile values;
+    for (const ProfileKey& key : kProfileKeys) {
+        bool ignored = false;
+        values[key.name] =
+            key.isStored ? modem.GetProfileWithKey(key.name, failed) : modem.GetRoaming(ignored);
     }
-    bool ignored = false;
-    profile["roaming"] = modem.GetRoaming(ignored);
-    return profile;
+    return values;
 }
 
 class DirectAccess : public ModemAccess {
@@ -101,9 +97,10 @@ class DirectAccess : public ModemAccess {
         return profile;
     }
 
-    void ChangeProfile(const std::string& id, const std::vector<Setting>& settings) override {
+    void ChangeProfile(const std::string& id,
+                       const std::vector<profile::Setting>& settings) override {
         USBModem& modem = Initialised(id);
-        for (const Setting& setting : settings) {
+        for (const profile::Setting& setting : settings) {
             if (modem.SetProfileWithKey(setting.key, setting.value) != 0) {
                 throw CommandError(kFailure,
                                    "cannot set " + setting.key + " in the profile of " + id +

@@ -8,24 +8,30 @@
 
 #include "cli/command_error.h"
 #include "cli/options.h"
+#include "usbmodem/rules/profile.h"
 
 namespace taviwireless::cli {
+
+namespace profile = usbmodem_lib::profile;
 
 // The connection profile of a SIM: its values by key, all as text.
 using Profile = std::map<std::string, std::string>;
 
-// Its keys, in the order in which they are shown.
+// Its keys, in the order in which they are shown. One that is not stored is asked of the modem.
 struct ProfileKey {
     const char* name;
     const char* title;
-    bool canBeSet;
+    bool isStored = true;
 };
-constexpr char kPassword[] = "pass";
 constexpr ProfileKey kProfileKeys[] = {
-    {"number", "Number", true},    {"user", "User", true},
-    {kPassword, "Password", true}, {"apn", "APN", true},
-    {"isp", "ISP", true},          {"location", "Location", true},
-    {"roaming", "Roaming", false}, {"default_gw", "Default route", true},
+    {profile::kNumber, "Number"},
+    {profile::kUser, "User"},
+    {profile::kPassword, "Password"},
+    {profile::kAPN, "APN"},
+    {profile::kISP, "ISP"},
+    {profile::kLocation, "Location"},
+    {profile::kRoaming, "Roaming", false},
+    {profile::kDefaultGateway, "Default route"},
 };
 
 // Statuses of a SIM. "no_answer" is that of a modem that is plugged in but not ready for use.
@@ -69,11 +75,6 @@ struct Interface {
     std::string name;  // empty when it is not connected
 };
 
-struct Setting {
-    std::string key;
-    std::string value;
-};
-
 // The way to the modems: through the modem service, or without it. All operations throw
 // CommandError; an id that no modem has is kNotFound, whichever operation is asked.
 class ModemAccess {
@@ -103,7 +104,8 @@ class ModemAccess {
                        bool protection) = 0;
 
     virtual Profile ReadProfile(const std::string& id) = 0;
-    virtual void ChangeProfile(const std::string& id, const std::vector<Setting>& settings) = 0;
+    virtual void ChangeProfile(const std::string& id,
+                               const std::vector<profile::Setting>& settings) = 0;
     virtual void ResetProfile(const std::string& id) = 0;
 
     // Start dialling and hanging up; LookAtConnection tells what came of it.

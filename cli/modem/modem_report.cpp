@@ -55,7 +55,7 @@ std::string ProfileValue(const Profile& profile, const std::string& key, bool sh
     if (found == profile.end()) {
         return "";
     }
-    return key == kPassword ? SecretText(found->second, showSecrets) : found->second;
+    return key == profile::kPassword ? SecretText(found->second, showSecrets) : found->second;
 }
 
 }  // namespace
@@ -66,9 +66,10 @@ Report Describe(const Profile& profile, bool showSecrets) {
         const std::string value = ProfileValue(profile, key.name, showSecrets);
         report.Add(key.name, key.title, value, Printable(value));
     }
-    Json::Value& document = report.document;
-    document["default_gw"] = document["default_gw"] == "true";
-    document["roaming"] = document["roaming"] == "" ? Json::Value() : document["roaming"] == "true";
+    Json::Value& isDefault = report.document[profile::kDefaultGateway];
+    isDefault = isDefault == "true";
+    Json::Value& roaming = report.document[profile::kRoaming];
+    roaming = roaming == "" ? Json::Value() : roaming == "true";
     return report;
 }
 

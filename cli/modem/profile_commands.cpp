@@ -12,17 +12,17 @@ namespace taviwireless::cli {
 
 namespace {
 
-constexpr size_t kMaxValue = 1023;  // bytes; what the library reads back
+constexpr size_t kMaxValue = profile::kValueSize - 1;  // bytes; what the library reads back
 
 bool CanBeSet(const std::string& key) {
     return std::any_of(std::begin(kProfileKeys), std::end(kProfileKeys),
-                       [&key](const auto& known) { return known.canBeSet && key == known.name; });
+                       [&key](const auto& known) { return known.isStored && key == known.name; });
 }
 
 std::string SettableKeys() {
     std::string names;
     for (const ProfileKey& key : kProfileKeys) {
-        if (key.canBeSet) {
+        if (key.isStored) {
             AddItem(names, key.name);
         }
     }
@@ -31,16 +31,16 @@ std::string SettableKeys() {
 
 // "KEY=VALUE", or "KEY" alone to read the value from standard input. Everything is checked before
 // anything is set, so that a mistake changes nothing.
-Setting ParseSetting(const std::string& text) {
+profile::Setting ParseSetting(const std::string& text) {
     const size_t equals = text.find('=');
-    Setting setting{text.substr(0, equals), ""};
+    profile::Setting setting{text.substr(0, equals), ""};
     if (!CanBeSet(setting.key)) {
         throw CommandError(kUsage, "a profile has no setting " + Printable(setting.key) +
                                        "; there are " + SettableKeys());
     }
     setting.value = equals == std::string::npos ? ReadSecret("Value of " + setting.key)
                                                 : text.substr(equals + 1);
-    if (setting.value.find_first_of(std::string("\r\n\0", 3)) != std::string::npos) {
+    if (setting.value.find_first_of(profile::kLineEnds) != std::string::npos) {
         throw CommandError(kUsage, "the value of " + setting.key +
                                        " holds a line break, which a profile cannot keep");
     }
@@ -48,7 +48,8 @@ Setting ParseSetting(const std::string& text) {
         throw CommandError(kUsage, "the value of " + setting.key + " is longer than " +
                                        std::to_string(kMaxValue) + " bytes");
     }
-    if (setting.key == "default_gw" && setting.value != "true" && setting.value != "false") {
+    if (setting.key == profile::kDefaultGateway && setting.value != "true" &&
+        setting.value != "false") {
         throw CommandError(kUsage, "default_gw is true or false");
     }
     return setting;
@@ -76,7 +77,7 @@ void ShowProfile(const Options& options) {
 }
 
 void SetProfile(const Options& options) {
-    std::vector<Setting> settings;
+    std::vector<profile::Setting> settings;
     for (const std::string& text : options.settings) {
         settings.push_back(ParseSetting(text));
     }

@@ -12,10 +12,6 @@ namespace taviwireless::cli {
 
 namespace {
 
-// The service takes the first of these, in this order, that stands before a "=" anywhere in a line.
-constexpr const char* kServiceKeys[] = {"apn",  "number",   "user", "pass",
-                                        "IMSI", "location", "isp",  "default_gw"};
-
 // Hands a result of the front-end functions on unless the service could not be reached.
 int Reached(int result) {
     if (result == 0) {
@@ -64,23 +60,18 @@ std::string Document(std::string (*get)(const std::string& id), const std::strin
     return document;
 }
 
-void CheckSetting(const Setting& setting) {
+void CheckSetting(const profile::Setting& setting) {
     const std::string line = setting.key + "=" + setting.value;
     if (!dbus_validate_utf8(line.c_str(), nullptr)) {
         throw CommandError(kUsage, "the value of " + setting.key +
                                        " is not UTF-8, which the modem service takes alone; add "
                                        "--direct to set it");
     }
-    for (const std::string key : kServiceKeys) {
-        const size_t position = line.find(key + "=");
-        if (position == 0) {
-            return;
-        }
-        if (position != std::string::npos) {
-            throw CommandError(kUsage, "the value of " + setting.key + " holds \"" + key +
-                                           "=\", which the modem service would take for a "
-                                           "setting of its own; add --direct to set it");
-        }
+    const std::string key = profile::ParseSetting(line)->key;
+    if (key != setting.key) {
+        throw CommandError(kUsage, "the value of " + setting.key + " holds \"" + key +
+                                       "=\", which the modem service would take for a "
+                                       "setting of its own; add --direct to set it");
     }
 }
 
@@ -134,7 +125,8 @@ class ServiceAccess : public ModemAccess {
     Profile ReadProfile(const std::string& id) override {
         Profile profile = ReadProfileDocument(Document(usbmodem_ui::GetProfile, id));
         const bool isEmpty = std::all_of(profile.begin(), profile.end(), [](const auto& entry) {
-            return entry.second.empty() || entry.first == "default_gw" || entry.first == "roaming";
+            return entry.second.empty() || entry.first == profile::kDefaultGateway ||
+                   entry.first == profile::kRoaming;
         });
         if (isEmpty && Look(id).simStatus != kReady) {
             throw ProfileUnreadableError(id);
@@ -143,9 +135,10 @@ class ServiceAccess : public ModemAccess {
     }
 
     // The service gives no result; the profile read after it tells whether every setting arrived.
-    void ChangeProfile(const std::string& id, const std::vector<Setting>& settings) override {
+    void ChangeProfile(const std::string& id,
+                       const std::vector<profile::Setting>& settings) override {
         std::string lines;
-        for (const Setting& setting : settings) {
+        for (const profile::Setting& setting : settings) {
             CheckSetting(setting);
             lines += setting.key + "=" + setting.value + "\n";
         }
@@ -154,7 +147,7 @@ class ServiceAccess : public ModemAccess {
         Sent(usbmodem_ui::SetProfile(id, lines));
         Profile wanted = ReadProfileDocument(Document(usbmodem_ui::GetProfile, id));
         const Profile now = wanted;
-        for (const Setting& setting : settings) {
+        for (const profile::Setting& setting : settings) {
             wanted[setting.key] = setting.value;
         }
         if (wanted != now) {
