@@ -5,6 +5,7 @@
 
 #include "common/log.h"
 #include "usbmodem/info_file.h"
+#include "usbmodem/rules/status.h"
 
 namespace taviwireless::usbmodem_lib {
 
@@ -15,7 +16,11 @@ constexpr int kMaxErrors = 5;
 }  // namespace
 
 USBModem::USBModem(unsigned int interfaceId, const std::string& infoPath)
-    : interfaceId_(interfaceId), infoPath_(infoPath), semaphore_(interfaceId) {}
+    : interfaceId_(interfaceId),
+      simStatus_(SimStatus::kUnknown),
+      netStatus_(NetStatus::kDisconnected),
+      infoPath_(infoPath),
+      semaphore_(interfaceId) {}
 
 USBModem::USBModem(const USBModem& other)
     : interfaceId_(other.interfaceId_),
@@ -90,11 +95,11 @@ int USBModem::GetConnectFailedAttempt() {
 }
 
 std::string USBModem::GetNetIFName(bool& /*err*/) {
-    return netStatus_ == kConnected ? netIFName_ : "";
+    return netStatus_ == NetStatus::kConnected ? netIFName_ : "";
 }
 
 std::string USBModem::GetNetLocalIP(bool& /*err*/) {
-    return netStatus_ == kConnected ? netLocalIP_ : "";
+    return netStatus_ == NetStatus::kConnected ? netLocalIP_ : "";
 }
 
 void USBModem::SetATInterface() {

@@ -5,6 +5,7 @@
 
 #include "common/log.h"
 #include "usbmodem/loggable.h"
+#include "usbmodem/rules/status.h"
 #include "usbmodem/text.h"
 
 namespace taviwireless::usbmodem_lib {
@@ -96,17 +97,21 @@ int USBModem_ATIF::ParseRetStringQuarySIMStatus(const std::string& reply) {
     // The order matters: a reply may hold more than one of these.
     static constexpr struct {
         const char* text;
-        int status;
+        SimStatus status;
     } kStatuses[] = {
-        {"+CPIN: READY", 0}, {"+CPIN: SIM PIN", 1}, {"+CPIN: SIM PUK", 2},
-        {"BUSY", 3},         {"ERROR", 4},          {"failure", 4},
+        {"+CPIN: READY", SimStatus::kReady},
+        {"+CPIN: SIM PIN", SimStatus::kPINRequired},
+        {"+CPIN: SIM PUK", SimStatus::kPUKRequired},
+        {"BUSY", SimStatus::kBusy},
+        {"ERROR", SimStatus::kError},
+        {"failure", SimStatus::kError},
     };
     for (const auto& candidate : kStatuses) {
         if (Contains(reply, candidate.text)) {
-            return candidate.status;
+            return static_cast<int>(candidate.status);
         }
     }
-    return 5;
+    return static_cast<int>(SimStatus::kUnknown);
 }
 
 int USBModem_ATIF::ParseRetStringGetRSSI(const std::string& reply, std::string& result) {

@@ -20,6 +20,7 @@
 #include "usbmodem/profile_value.h"
 #include "usbmodem/rules/paths.h"
 #include "usbmodem/rules/profile.h"
+#include "usbmodem/rules/status.h"
 #include "usbmodem/state_files.h"
 
 namespace taviwireless::usbmodem_lib {
@@ -263,7 +264,7 @@ int USBModem::TestConfToFile() {
     set("InterfaceID", std::to_string(static_cast<int>(interfaceId_)));
     set("ConnectUSB", connectNode_);
     set("QuaryUSB", queryNode_);
-    set("PINVerified", std::to_string(simStatus_));
+    set("PINVerified", std::to_string(static_cast<int>(simStatus_)));
     set("isConnected", GetNetStatus(err));
     set("PidFile", pidFile_);
     return 0;

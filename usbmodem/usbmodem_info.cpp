@@ -7,6 +7,7 @@
 
 #include "common/log.h"
 #include "usbmodem/loggable.h"
+#include "usbmodem/rules/status.h"
 #include "usbmodem/text.h"
 
 namespace taviwireless::usbmodem_lib {
@@ -78,7 +79,7 @@ std::string USBModem::GetDefaultAPN(bool& err) {
     if (busy_) {
         return defaultAPN_;
     }
-    if (simStatus_ != kReady) {
+    if (simStatus_ != SimStatus::kReady) {
         TAVI_LOG_ERROR("cannot get default APN when PIN is not ready");
         err = true;
     } else if (!Refresh(&USBModem_ATIF::GetATCommandGetDefaultAPN,
@@ -95,7 +96,7 @@ std::string USBModem::GetDefaultISP(bool& err) {
     if (busy_) {
         return defaultISP_;
     }
-    if (simStatus_ != kReady) {
+    if (simStatus_ != SimStatus::kReady) {
         defaultISP_.clear();
     } else if (!Refresh(&USBModem_ATIF::GetATCommandGetDefaultISP,
                         &USBModem_ATIF::ParseRetStringDefaultISP, defaultISP_,
@@ -126,7 +127,7 @@ std::string USBModem::GetDefaultLocation(bool& err) {
 }
 
 std::string USBModem::GetRoaming(bool& err) {
-    if (!busy_ && netStatus_ == kConnected &&
+    if (!busy_ && netStatus_ == NetStatus::kConnected &&
         !Refresh(&USBModem_ATIF::GetATCommandGetRoaming, &USBModem_ATIF::ParseRetStringGetRoaming,
                  roaming_, [](const char*) { TAVI_LOG_ERROR("error on parsing roaming stats"); })) {
         err = true;
@@ -142,7 +143,7 @@ std::string USBModem::GetIMSI(bool& err) {
         TAVI_LOG_ERROR("error on parsing string, ret %s", reply);
     };
     std::string imsi;
-    if (simStatus_ != kReady ||
+    if (simStatus_ != SimStatus::kReady ||
         !Refresh(&USBModem_ATIF::GetATCommandGetIMSI, &USBModem_ATIF::ParseRetStringDefaultFormat,
                  imsi, kLogFailure)) {
         err = true;
@@ -177,7 +178,7 @@ std::string USBModem::GetVendorName(bool& err) {
 }
 
 int USBModem::GetRSSI() {
-    if (busy_ || simStatus_ != kReady) {
+    if (busy_ || simStatus_ != SimStatus::kReady) {
         return 0;
     }
     std::string reply;
@@ -191,7 +192,7 @@ int USBModem::GetRSSI() {
 }
 
 int USBModem::GetSignalQuality(bool& err) {
-    if (simStatus_ != kReady) {
+    if (simStatus_ != SimStatus::kReady) {
         return 0;
     }
     if (GetRSSI() != 0) {

@@ -9,6 +9,7 @@
 
 #include "base/unique_fd.h"
 #include "common/log.h"
+#include "usbmodem/rules/status.h"
 
 namespace taviwireless::usbmodem_lib {
 
@@ -22,7 +23,8 @@ int USBModem::GetLinkStats() {
     }
     file.Close();
     if (VEXACProcAliveByPidFile(pidFile.c_str()) != 1) {
-        netStatus_ = connectFailedAttempts_ < 1 ? kDisconnected : kConnectionLost;
+        netStatus_ =
+            connectFailedAttempts_ < 1 ? NetStatus::kDisconnected : NetStatus::kConnectionLost;
         return 0;
     }
     if (UpdateIP() != 0) {
@@ -30,11 +32,11 @@ int USBModem::GetLinkStats() {
         return 0;
     }
     if (!netIFName_.empty() && !netLocalIP_.empty()) {
-        netStatus_ = kConnected;
-    } else if (netStatus_ == kConnected || netStatus_ == kReconnecting) {
-        netStatus_ = kReconnecting;
+        netStatus_ = NetStatus::kConnected;
+    } else if (netStatus_ == NetStatus::kConnected || netStatus_ == NetStatus::kReconnecting) {
+        netStatus_ = NetStatus::kReconnecting;
     } else {
-        netStatus_ = kConnecting;
+        netStatus_ = NetStatus::kConnecting;
     }
     return 0;
 }
@@ -62,25 +64,17 @@ int USBModem::UpdateNetStatus() {
         TAVI_LOG_ERROR("failed on getting link stats");
         return -1;
     }
-    switch (netStatus_) {
-        case kConnecting:
-            if (AssignConnectInfo() == -1) {
-                NetDisconnect();
-            }
-            return 2;
-        case kConnected:
-            connectFailedAttempts_ = 0;
-            busy_ = false;
-            return 1;
-        case kReconnecting:
-        case kDisconnected:
-        case kConnectionLost:
-            busy_ = false;
-            return 1;
-        default:
-            TAVI_LOG_ERROR("unexpected result of net stats");
-            return -1;
+    if (netStatus_ == NetStatus::kConnecting) {
+        if (AssignConnectInfo() == -1) {
+            NetDisconnect();
+        }
+        return 2;
     }
+    if (netStatus_ == NetStatus::kConnected) {
+        connectFailedAttempts_ = 0;
+    }
+    busy_ = false;
+    return 1;
 }
 
 std::string USBModem::GetNetStatus(bool& err) {
@@ -89,20 +83,7 @@ std::string USBModem::GetNetStatus(bool& err) {
         err = true;
         return "";
     }
-    switch (netStatus_) {
-        case kConnected:
-            return "connected";
-        case kConnecting:
-        case kReconnecting:
-            return "connecting";
-        case kDisconnected:
-            return "disconnected";
-        case kConnectionLost:
-            return "connection_lost";
-        default:
-            err = true;
-            return "";
-    }
+    return NameOf(netStatus_);
 }
 
 bool USBModem::IsNetDisconnected(bool& err) {
@@ -111,10 +92,7 @@ bool USBModem::IsNetDisconnected(bool& err) {
         err = true;
         return false;
     }
-    if (netStatus_ < kConnected || netStatus_ > kConnectionLost) {
-        err = true;
-    }
-    return netStatus_ == kDisconnected || netStatus_ == kConnectionLost;
+    return netStatus_ == NetStatus::kDisconnected || netStatus_ == NetStatus::kConnectionLost;
 }
 
 }  // namespace taviwireless::usbmodem_lib

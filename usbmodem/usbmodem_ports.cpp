@@ -10,6 +10,7 @@
 #include "common/log.h"
 #include "usbmodem/info_file.h"
 #include "usbmodem/rules/paths.h"
+#include "usbmodem/rules/status.h"
 #include "usbmodem/text.h"
 
 namespace taviwireless::usbmodem_lib {
@@ -136,9 +137,9 @@ int USBModem::CompleteInit(bool isPrepared) {
         return -1;
     }
     UpdateSIMStatus();
-    if (simStatus_ == kSIMBusy || simStatus_ == kSIMError) {
+    if (simStatus_ == SimStatus::kBusy || simStatus_ == SimStatus::kError) {
         TAVI_LOG_ERROR("Warning: sim error or busy detected when init");
-    } else if (simStatus_ == kSIMUnknown) {
+    } else if (simStatus_ == SimStatus::kUnknown) {
         TAVI_LOG_ERROR("Warning: unexpect sim result when init");
     }
     initState_ = kInited;

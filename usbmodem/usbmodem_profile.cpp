@@ -11,6 +11,7 @@
 #include "usbmodem/profile_value.h"
 #include "usbmodem/rules/paths.h"
 #include "usbmodem/rules/profile.h"
+#include "usbmodem/rules/status.h"
 #include "usbmodem/state_files.h"
 
 namespace taviwireless::usbmodem_lib {
@@ -120,10 +121,10 @@ int USBModem::SetProfileWithKey(const std::string& key, const std::string& value
 }
 
 std::string USBModem::GetProfileWithKey(const std::string& key, bool& err) {
-    if (simStatus_ == kSIMBusy || simStatus_ == kSIMError) {
+    if (simStatus_ == SimStatus::kBusy || simStatus_ == SimStatus::kError) {
         return "";
     }
-    if (simStatus_ < kReady || simStatus_ > kSIMError) {
+    if (simStatus_ < SimStatus::kReady || simStatus_ > SimStatus::kError) {
         TAVI_LOG_ERROR("sim status is busy or error, cannot get key %s", key.c_str());
         err = true;
     }

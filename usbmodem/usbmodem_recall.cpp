@@ -9,6 +9,7 @@
 
 #include "common/log.h"
 #include "usbmodem/rules/paths.h"
+#include "usbmodem/rules/status.h"
 
 namespace taviwireless::usbmodem_lib {
 
@@ -58,12 +59,13 @@ int USBModem::EndConnection() {
     if (VEXACFileExist(pidFile.c_str()) != 1) {
         return 0;
     }
-    const bool wasConnected = netStatus_ == kConnected;
+    const bool wasConnected = netStatus_ == NetStatus::kConnected;
     RecallConnection();
     if (profilePath_.empty() && !imsi_.empty()) {
         profilePath_ = kProfilePrefix + imsi_;
     }
-    simStatus_ = kReady;  // as it was when it was dialled; of any other the profile is not read
+    // As it was when it was dialled; of any other the profile is not read.
+    simStatus_ = SimStatus::kReady;
     const int result = NetDisconnect();
     if (VEXACFileExist(pidFile.c_str()) != 1) {
         return result;

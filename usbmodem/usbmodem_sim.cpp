@@ -8,6 +8,7 @@
 
 #include "common/log.h"
 #include "usbmodem/loggable.h"
+#include "usbmodem/rules/status.h"
 #include "usbmodem/text.h"
 
 namespace taviwireless::usbmodem_lib {
@@ -44,17 +45,18 @@ int USBModem::QuerySIMStatus(std::string& reply) {
 int USBModem::UpdateSIMStatus() {
     if (!busy_) {
         std::string reply;
-        simStatus_ = QuerySIMStatus(reply) == 0 ? CommandSet().ParseRetStringQuarySIMStatus(reply)
-                                                : static_cast<int>(kSIMUnknown);
+        const bool isKnown = QuerySIMStatus(reply) == 0;
+        simStatus_ = isKnown ? SimStatus(CommandSet().ParseRetStringQuarySIMStatus(reply))
+                             : SimStatus::kUnknown;
     }
     switch (simStatus_) {
-        case kReady:
+        case SimStatus::kReady:
             return 1;
-        case kPINRequired:
-        case kPUKRequired:
+        case SimStatus::kPINRequired:
+        case SimStatus::kPUKRequired:
             return 0;
-        case kSIMBusy:
-        case kSIMError:
+        case SimStatus::kBusy:
+        case SimStatus::kError:
             return 2;
         default:
             TAVI_LOG_ERROR("error on getting PIN status");
@@ -63,30 +65,20 @@ int USBModem::UpdateSIMStatus() {
 }
 
 std::string USBModem::GetPINStatus(bool& err) {
-    UpdateSIMStatus();
-    switch (simStatus_) {
-        case kReady:
-            return "ready";
-        case kPINRequired:
-            return "pin_protect";
-        case kPUKRequired:
-            return "puk_protect";
-        case kSIMBusy:
-        case kSIMError:
-            return "no_sim";
-        default:
-            TAVI_LOG_ERROR("error value on PINStatus, %d", simStatus_);
-            err = true;
-            return "no_sim";
+    if (UpdateSIMStatus() < 0) {
+        TAVI_LOG_ERROR("error value on PINStatus, %d", static_cast<int>(simStatus_));
+        err = true;
     }
+    return NameOf(simStatus_);
 }
 
 bool USBModem::IsPINReady(bool& err) {
-    if (simStatus_ != kReady && simStatus_ != kPINRequired && simStatus_ != kPUKRequired) {
+    if (simStatus_ != SimStatus::kReady && simStatus_ != SimStatus::kPINRequired &&
+        simStatus_ != SimStatus::kPUKRequired) {
         TAVI_LOG_ERROR("error SIM stats, PIN is not ready");
         err = true;
     }
-    return simStatus_ == kReady;
+    return simStatus_ == SimStatus::kReady;
 }
 
 int USBModem::GetPINEnable() {
@@ -116,7 +108,7 @@ int USBModem::ChangePINEnable(const std::string& pin, bool enable) {
     if (busy_) {
         return kBusy;
     }
-    if (simStatus_ != kReady) {
+    if (simStatus_ != SimStatus::kReady) {
         TAVI_LOG_ERROR("Cannot change enable when SIM is not ready");
         return kRefused;
     }
@@ -148,7 +140,7 @@ int USBModem::ChangePIN(const std::string& oldPin, const std::string& newPin) {
     if (busy_) {
         return kBusy;
     }
-    if (simStatus_ != kReady) {
+    if (simStatus_ != SimStatus::kReady) {
         TAVI_LOG_ERROR("Cannot change PIN when SIM is not ready");
         return kRefused;
     }
@@ -226,7 +218,7 @@ int USBModem::ChangePINWithPUK(const std::string& puk, const std::string& newPin
 }
 
 int USBModem::EnterPUK(const std::string& puk, const std::string& newPin) {
-    if (simStatus_ != kPUKRequired) {
+    if (simStatus_ != SimStatus::kPUKRequired) {
         TAVI_LOG_ERROR("Cannot set PUK at this SIM stat");
         return kRefused;
     }
@@ -259,7 +251,7 @@ int USBModem::PUKGetAttemptRemain() {
 }
 
 int USBModem::AttemptRemain(Parser parser, int& cache) {
-    if (busy_ || simStatus_ >= kSIMBusy) {
+    if (busy_ || simStatus_ >= SimStatus::kBusy) {
         return cache;
     }
     std::string count;

@@ -17,7 +17,7 @@ bool Contains(const std::vector<std::string>& ids, const std::string& id) {
 }  // namespace
 
 bool IsDisconnected(const std::string& netStatus) {
-    return netStatus == "disconnected" || netStatus == "connection_lost";
+    return netStatus == kDisconnected || netStatus == kConnectionLost;
 }
 
 std::vector<ModemState> ModemAccess::LookAtAll() {

@@ -9,6 +9,7 @@
 #include "cli/command_error.h"
 #include "cli/options.h"
 #include "usbmodem/rules/profile.h"
+#include "usbmodem/rules/status.h"
 
 namespace taviwireless::cli {
 
@@ -35,15 +36,19 @@ constexpr ProfileKey kProfileKeys[] = {
 };
 
 // Statuses of a SIM. "no_answer" is that of a modem that is plugged in but not ready for use.
-constexpr char kReady[] = "ready";
-constexpr char kWantsPIN[] = "pin_protect";
-constexpr char kWantsPUK[] = "puk_protect";
-constexpr char kNoSIM[] = "no_sim";
+using usbmodem_lib::SimStatus;
+constexpr const char* kReady = NameOf(SimStatus::kReady);
+constexpr const char* kWantsPIN = NameOf(SimStatus::kPINRequired);
+constexpr const char* kWantsPUK = NameOf(SimStatus::kPUKRequired);
+constexpr const char* kNoSIM = NameOf(SimStatus::kError);
 constexpr char kNoAnswer[] = "no_answer";
 
 // Statuses of a connection that commands look for.
-constexpr char kConnected[] = "connected";
-constexpr char kConnecting[] = "connecting";
+using usbmodem_lib::NetStatus;
+constexpr const char* kConnected = NameOf(NetStatus::kConnected);
+constexpr const char* kConnecting = NameOf(NetStatus::kConnecting);
+constexpr const char* kDisconnected = NameOf(NetStatus::kDisconnected);
+constexpr const char* kConnectionLost = NameOf(NetStatus::kConnectionLost);
 
 // What is known of a modem. Texts are as the modem gave them, empty where it gave none.
 struct ModemState {

@@ -47,7 +47,7 @@ std::string SIMCell(const std::string& status) {
 }
 
 std::string NetworkCell(const std::string& status) {
-    return status == "connection_lost" ? "connection lost" : Cell(status);
+    return status == kConnectionLost ? "connection lost" : Cell(status);
 }
 
 std::string ProfileValue(const Profile& profile, const std::string& key, bool showSecrets) {

@@ -21,6 +21,8 @@ class SzHash;
 namespace taviwireless::usbmodem_lib {
 
 class USBModem_ATIF;
+enum class SimStatus : int;
+enum class NetStatus : int;
 
 // One plugged-in USB 3G modem: what its info file says, its serial channel and command set, and the
 // last good answer to everything that was asked.
@@ -358,8 +360,6 @@ class TAVIWIRELESS_API USBModem {
     struct DialSettings;
 
     enum InitState { kNotInited, kInited, kInitFailed };
-    enum SIMStatus { kReady, kPINRequired, kPUKRequired, kSIMBusy, kSIMError, kSIMUnknown };
-    enum NetStatus { kConnected, kConnecting, kReconnecting, kDisconnected, kConnectionLost };
 
     using Command = std::string (USBModem_ATIF::*)();
     using Parser = int (USBModem_ATIF::*)(const std::string& reply, std::string& result);
@@ -384,8 +384,8 @@ class TAVIWIRELESS_API USBModem {
 
     unsigned int interfaceId_;
     int initState_ = kNotInited;
-    int simStatus_ = kSIMUnknown;
-    int netStatus_ = kDisconnected;
+    SimStatus simStatus_;
+    NetStatus netStatus_;
     std::string infoPath_;
     std::string connectNode_;
     std::string queryNode_;
