@@ -3,7 +3,6 @@
 #include <syslog.h>
 #include <tavicore/file.h>
 
-#include <cstdlib>
 #include <vector>
 
 #include "common/sz_list.h"
@@ -33,10 +32,10 @@ void ModemKeeper::EndOrphanedConnections() {
     VEXACFileEnumDir(usbmodem_lib::kStateDirectory, name.c_str(), files.Address(),
                      VEXAC_ENUM_FILES);
     for (int i = 0; i < files.Count(); ++i) {
-        const int id = std::atoi(files[i] + name.size());
-        if (files[i] == name + std::to_string(id) && !ReadInfoFile(id)) {
-            syslog(LOG_INFO, "usbmodem%d was unplugged while nobody looked", id);
-            USBModem(static_cast<unsigned int>(id), usbmodem_lib::InfoPath(id)).EndConnection();
+        const std::optional<int> id = usbmodem_lib::InterfaceIdIn(files[i], name);
+        if (id && !ReadInfoFile(*id)) {
+            syslog(LOG_INFO, "usbmodem%d was unplugged while nobody looked", *id);
+            USBModem(static_cast<unsigned int>(*id), usbmodem_lib::InfoPath(*id)).EndConnection();
         }
     }
 }

@@ -139,7 +139,7 @@ bool USBModem::PrepareToDial(DialSettings& settings) {
         TAVI_LOG_ERROR("Backup default route failed");
         return false;
     }
-    settings.logFile = kDialLogPrefix + GetIMSI(err);
+    settings.logFile = DialLogPath(GetIMSI(err));
     if (err) {
         TAVI_LOG_ERROR("Error on getting IMSI for log file");
         return false;

@@ -3,11 +3,6 @@
 #include <taviwireless/usbmodem_list.h>
 
 #include <algorithm>
-#include <cerrno>
-#include <climits>
-#include <cstdlib>
-#include <cstring>
-#include <optional>
 
 #include "common/log.h"
 #include "common/sz_list.h"
@@ -17,21 +12,6 @@
 namespace taviwireless::usbmodem_lib {
 
 namespace {
-
-// Returns the interface id in the name of an info file; nothing for the names of other files, such
-// as backup copies and numbers with leading zeros. -1 is no interface id: compatible with earlier
-// releases, in which it means that a name has no number.
-std::optional<int> ParseInterfaceId(const std::string& name) {
-    if (name.rfind(kInfoName, 0) != 0) {
-        return std::nullopt;
-    }
-    const long number = std::strtol(name.c_str() + std::strlen(kInfoName), nullptr, 10);
-    if (number < INT_MIN || number > INT_MAX || number == -1 ||
-        name != kInfoName + std::to_string(number)) {
-        return std::nullopt;
-    }
-    return static_cast<int>(number);
-}
 
 bool IsPluggedIn(const USBModem& modem) {
     return modem.IsInfoExist() && IsTrustedInfo(InfoPath(static_cast<int>(modem.GetIfid())));
@@ -61,7 +41,7 @@ int USBModemList::SearchInfoPath() {
         return -1;
     }
     for (int i = 0; i < names.Count(); ++i) {
-        const std::optional<int> interfaceId = ParseInterfaceId(names[i]);
+        const std::optional<int> interfaceId = InterfaceIdIn(names[i], kInfoName);
         if (interfaceId && FindUSBModem(*interfaceId).IsNull() &&
             IsTrustedInfo(InfoPath(*interfaceId))) {
             records_.emplace_back(*interfaceId, InfoPath(*interfaceId));

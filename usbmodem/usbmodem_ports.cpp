@@ -92,7 +92,7 @@ int USBModem::AssignQuaryNode() {
 }
 
 int USBModem::AssignConnectInfo() {
-    const std::string path = kDialLogPrefix + imsi_;
+    const std::string path = DialLogPath(imsi_);
     if (VEXACFileExist(path.c_str()) != 1) {
         TAVI_LOG_ERROR("Error on file %s, not exist", path.c_str());
         return -1;

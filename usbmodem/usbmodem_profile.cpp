@@ -34,7 +34,7 @@ bool USBModem::ComputeProfilePath() {
     bool failed = false;
     const std::string imsi = GetIMSI(failed);
     // While busy, an IMSI that was never asked for is empty without an error.
-    profilePath_ = failed || imsi.empty() ? "" : kProfilePrefix + imsi;
+    profilePath_ = failed || imsi.empty() ? "" : ProfilePath(imsi);
     return !profilePath_.empty();
 }
 

@@ -48,7 +48,7 @@ int USBModem::RecallConnection() {
     }
     pidFile_ = pidFile;
     imsi_ = imsi;
-    profilePath_ = kProfilePrefix + imsi;
+    profilePath_ = ProfilePath(imsi);
     AssignConnectInfo();
     return 1;
 }
@@ -62,7 +62,7 @@ int USBModem::EndConnection() {
     const bool wasConnected = netStatus_ == NetStatus::kConnected;
     RecallConnection();
     if (profilePath_.empty() && !imsi_.empty()) {
-        profilePath_ = kProfilePrefix + imsi_;
+        profilePath_ = ProfilePath(imsi_);
     }
     // As it was when it was dialled; of any other the profile is not read.
     simStatus_ = SimStatus::kReady;
