@@ -2,8 +2,7 @@
 #include <taviwireless/usbmodem_client.h>
 #include <taviwireless/usbmodem_ui.h>
 
-#include <sstream>
-
+#include "base/split.h"
 #include "common/log.h"
 
 namespace taviwireless::usbmodem_ui {
@@ -34,10 +33,8 @@ int AppendLines(int (USBModemClient::*get)(std::string& out), std::vector<std::s
                 const char* failure) {
     std::string text;
     const int result = Ask([&](USBModemClient& client) { return (client.*get)(text); }, failure);
-    std::istringstream lines(text);
-    for (std::string line; std::getline(lines, line);) {
-        list.push_back(line);
-    }
+    const std::vector<std::string> lines = Lines(text);
+    list.insert(list.end(), lines.begin(), lines.end());
     return result;
 }
 

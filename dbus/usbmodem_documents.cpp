@@ -2,7 +2,6 @@
 
 #include <chrono>
 #include <functional>
-#include <sstream>
 
 #include "usbmodem/rules/profile.h"
 
@@ -27,16 +26,15 @@ class Document {
     explicit Document(USBModem& modem) : modem_(&modem) {}
 
     void Quoted(const char* indent, const char* key, const std::string& value) {
-        text_ << indent << '"' << key << "\": \"" << value << "\",\n";
+        Bare(indent, key, '"' + value + '"');
     }
-    template <typename T>
-    void Bare(const char* indent, const char* key, const T& value) {
-        text_ << indent << '"' << key << "\": " << value << ",\n";
+    void Bare(const char* indent, const char* key, const std::string& value) {
+        Last(indent, key, value + ',');
     }
-    void Last(const char* indent, const char* key, const char* value) {
-        text_ << indent << '"' << key << "\": " << value << '\n';
+    void Last(const char* indent, const char* key, const std::string& value) {
+        text_ += std::string(indent) + '"' + key + "\": " + value + '\n';
     }
-    void Line(const char* line) { text_ << line << '\n'; }
+    void Line(const char* line) { text_ += std::string(line) + '\n'; }
 
     // query(modem, err) returns what is asked for.
     template <typename Query>
@@ -60,7 +58,7 @@ class Document {
             return number;
         });
     }
-    std::string Text() const { return text_.str(); }
+    std::string Text() const { return text_; }
 
   private:
     // Some modems leave a command that they do not know unanswered, but every one answers this.
@@ -68,7 +66,7 @@ class Document {
 
     USBModem* modem_;
     USBModem known_{0, ""};
-    std::ostringstream text_;
+    std::string text_;
 };
 
 void AddProfile(Document& document, const char* indent) {
@@ -100,15 +98,17 @@ std::string ModemDocument(USBModem& modem) {
     document.Quoted("\t", "id", modem.GetDevId());
     document.Quoted("\t", "product", document.Ask(&USBModem::GetProductName));
     document.Quoted("\t", "vendor", document.Ask(&USBModem::GetVendorName));
-    document.Bare("\t", "signal", document.Ask(&USBModem::GetSignalQuality));
+    document.Bare("\t", "signal", std::to_string(document.Ask(&USBModem::GetSignalQuality)));
     document.Quoted("\t", "ip", document.Ask(&USBModem::GetNetLocalIP));
     document.Quoted("\t", "carrier", document.Ask(&USBModem::GetDefaultISP));
     document.Quoted("\t", "net_status", document.Ask(&USBModem::GetNetStatus));
     document.Quoted("\t", "sim_status", document.Ask(&USBModem::GetPINStatus));
     const bool isProtected = document.AskNumber(&USBModem::PINGetEnableProtection) != 0;
     document.Bare("\t", "pin_protected", isProtected ? "true" : "false");
-    document.Bare("\t", "pin_remains", document.AskNumber(&USBModem::PINGetAttemptRemain));
-    document.Bare("\t", "puk_remains", document.AskNumber(&USBModem::PUKGetAttemptRemain));
+    document.Bare("\t", "pin_remains",
+                  std::to_string(document.AskNumber(&USBModem::PINGetAttemptRemain)));
+    document.Bare("\t", "puk_remains",
+                  std::to_string(document.AskNumber(&USBModem::PUKGetAttemptRemain)));
     document.Line("\t\"profile\": ");
     document.Line("\t{");
     AddProfile(document, "\t\t");

@@ -5,10 +5,10 @@
 #include <algorithm>
 #include <initializer_list>
 #include <optional>
-#include <sstream>
 #include <string>
 #include <vector>
 
+#include "base/split.h"
 #include "common/log.h"
 #include "dbus/usbmodem_documents.h"
 #include "usbmodem/profile_value.h"
@@ -126,8 +126,7 @@ gboolean FailToSet(USBModem& modem, const Setting& setting, GError** error,
 // of them cannot be set.
 bool ParseProfile(USBModem& modem, const char* text, std::vector<Setting>& settings,
                   GError** error) {
-    std::istringstream lines(text);
-    for (std::string line; std::getline(lines, line);) {
+    for (const std::string& line : Lines(text)) {
         const std::optional<Setting> setting = profile::ParseSetting(line);
         if (!setting) {
             continue;

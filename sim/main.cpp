@@ -8,6 +8,7 @@
 #include <stdexcept>
 
 #include "base/command_line/command_line.h"
+#include "base/split.h"
 #include "sim/control.h"
 #include "sim/simulator.h"
 #include "sim/user_text.h"

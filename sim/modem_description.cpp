@@ -2,6 +2,7 @@
 
 #include <stdexcept>
 
+#include "base/split.h"
 #include "sim/user_text.h"
 
 namespace taviwireless::sim {

@@ -1,8 +1,6 @@
 #ifndef TAVIWIRELESS_SIM_PERSONALITY_H
 #define TAVIWIRELESS_SIM_PERSONALITY_H
 
-#include <json/value.h>
-
 #include <map>
 #include <string>
 #include <vector>

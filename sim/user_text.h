@@ -2,12 +2,9 @@
 #define TAVIWIRELESS_SIM_USER_TEXT_H
 
 #include <string>
-#include <vector>
 
 // What a person writes, on the command line and in control commands.
 namespace taviwireless::sim {
-
-std::vector<std::string> Split(const std::string& text, char separator);
 
 // A decimal number. Throws std::invalid_argument with a sentence that calls it `name`.
 unsigned ParseNumber(const std::string& text, const std::string& name);

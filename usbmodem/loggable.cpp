@@ -6,7 +6,8 @@
 #include <cctype>
 #include <cstring>
 #include <iterator>
-#include <sstream>
+
+#include "base/split.h"
 
 namespace taviwireless::usbmodem_lib {
 
@@ -71,9 +72,8 @@ std::string MaskCodes(std::string line, std::initializer_list<std::string> codes
 // Returns the lines of text, each changed by mask, with separator between them.
 template <typename Mask>
 std::string MaskLines(const std::string& text, char separator, Mask mask) {
-    std::istringstream lines(text);
     std::string masked;
-    for (std::string line; std::getline(lines, line);) {
+    for (std::string line : Lines(text)) {
         line.erase(0, line.find_first_not_of('\r'));  // left over from the end of an echo
         if (!masked.empty()) {
             masked += separator;

@@ -1,8 +1,9 @@
 #include <taviwireless/usbmodem_atif.h>
 
+#include <algorithm>
 #include <mutex>
-#include <sstream>
 
+#include "base/split.h"
 #include "common/log.h"
 #include "usbmodem/loggable.h"
 #include "usbmodem/rules/status.h"
@@ -180,14 +181,10 @@ int USBModem_ATIF::GetLineWithDelim(const std::string& reply, char delim, int fi
         TAVI_LOG_ERROR("error on input string: %s", LoggableReply(reply).c_str());
         return -1;
     }
-    std::istringstream stream(reply);
-    std::string text;
-    std::getline(stream, text, ':');
-    for (int i = 0; i < field; ++i) {
-        text.clear();  // getline leaves it alone once the stream has ended
-        std::getline(stream, text, delim);
-    }
-    result = text;
+    const size_t colon = std::min(reply.find(':'), reply.size() - 1);
+    const std::vector<std::string> fields = Split(reply.substr(colon + 1), delim);
+    const auto index = static_cast<size_t>(field) - 1;
+    result = index < fields.size() ? fields[index] : "";
     return 0;
 }
 

@@ -8,8 +8,8 @@
 #include <chrono>
 #include <cstdio>
 #include <optional>
-#include <sstream>
 
+#include "base/split.h"
 #include "common/log.h"
 #include "usbmodem/loggable.h"
 #include "usbmodem/wvstreams_log.h"
@@ -210,8 +210,7 @@ int USBModem::TestATCmd(const std::string& cmd, const std::string& node) {
         std::printf("Error return on modem cmd: %d\n", result);
     } else {
         std::printf("Get return string as follow:\n");
-        std::istringstream lines(LoggableCommand(reply));
-        for (std::string printed; std::getline(lines, printed);) {
+        for (std::string printed : Lines(LoggableCommand(reply))) {
             MakePrintable(printed.data());
             std::printf("%s\n", printed.c_str());
         }

@@ -7,6 +7,7 @@
 #include <fstream>
 #include <sstream>
 
+#include "base/split.h"
 #include "common/log.h"
 #include "usbmodem/info_file.h"
 #include "usbmodem/rules/paths.h"
@@ -74,8 +75,7 @@ int USBModem::AssignQuaryNode() {
         TAVI_LOG_ERROR("error on parsing DEVICENODE from %s", infoPath_.c_str());
         return -1;
     }
-    std::istringstream stream(numbers);
-    for (std::string number; std::getline(stream, number, ',');) {
+    for (const std::string& number : Split(numbers, ',')) {
         const std::string node = kPortPrefix + number;
         if (node == connectNode_ || OpenFileDevice(node) != 0) {
             continue;

@@ -1,7 +1,8 @@
 #include "cli/modem/service_document.h"
 
 #include <cstdlib>
-#include <sstream>
+
+#include "base/split.h"
 
 namespace taviwireless::cli {
 
@@ -11,8 +12,7 @@ namespace {
 // and of its profile differ, so the nesting need not be followed.
 std::map<std::string, std::string> ReadLines(const std::string& document) {
     std::map<std::string, std::string> values;
-    std::istringstream lines(document);
-    for (std::string line; std::getline(lines, line);) {
+    for (const std::string& line : Lines(document)) {
         const size_t key = line.find_first_not_of('\t');
         const size_t colon = line.find("\": ");
         if (key == std::string::npos || line[key] != '"' || colon == std::string::npos) {

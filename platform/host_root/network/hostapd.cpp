@@ -2,8 +2,7 @@
 
 #include <unistd.h>
 
-#include <sstream>
-
+#include "base/split.h"
 #include "platform/host_root/network/error.h"
 #include "platform/host_root/network/programs.h"
 
@@ -27,8 +26,8 @@ unsigned int Capabilities(const std::string& interface) {
     std::string phy = ReadText("/sys/class/net/" + interface + "/phy80211/name").value_or("");
     phy = phy.substr(0, phy.find('\n'));
     unsigned int capabilities = ~0U;
-    std::istringstream lines(phy.empty() ? "" : Run({"iw", "phy", phy, "info"}, 10).output);
-    for (std::string line; std::getline(lines, line);) {
+    const std::string info = phy.empty() ? "" : Run({"iw", "phy", phy, "info"}, 10).output;
+    for (const std::string& line : Lines(info)) {
         unsigned int bits = 0;
         if (sscanf(line.c_str(), " Capabilities: 0x%x", &bits) == 1) {
             capabilities &= bits;
@@ -67,13 +66,11 @@ void WriteHostapdConf(const std::string& interface, bool withGuests) {
     const std::string source = "/etc/hostapd/hostapd-" + interface;
     const unsigned int capabilities = Capabilities(interface);
     std::string text;
-    std::istringstream main(Read(source + "-host.conf"));
-    for (std::string line; std::getline(main, line);) {
+    for (const std::string& line : Lines(Read(source + "-host.conf"))) {
         text +=
             (line.rfind("ht_capab=", 0) == 0 ? WithoutMissing(line, capabilities) : line) + '\n';
     }
-    std::istringstream guests(withGuests ? Read(source + "-guest.conf") : "");
-    for (std::string line; std::getline(guests, line);) {
+    for (const std::string& line : Lines(withGuests ? Read(source + "-guest.conf") : "")) {
         // Without a BSSID hostapd derives one; an empty one it refuses.
         text += line == "bssid=" ? "" : line + '\n';
     }

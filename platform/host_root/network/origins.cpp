@@ -5,6 +5,7 @@
 #include <fstream>
 #include <sstream>
 
+#include "base/split.h"
 #include "base/trusted_file.h"
 #include "platform/host_root/network/error.h"
 
@@ -19,9 +20,8 @@ std::string FileOf(const std::string& bridge) {
 }  // namespace
 
 Origins ReadOrigins(const std::string& bridge) {
-    std::istringstream lines(ReadTrusted(FileOf(bridge)).value_or(""));
     Origins origins;
-    for (std::string line; std::getline(lines, line);) {
+    for (const std::string& line : Lines(ReadTrusted(FileOf(bridge)).value_or(""))) {
         std::istringstream words(line);
         std::string interface, address;
         words >> interface >> address;

@@ -7,7 +7,6 @@
 #include <netlink/route/link.h>
 #include <netlink/route/route.h>
 
-#include <functional>
 #include <memory>
 #include <string>
 
