@@ -92,6 +92,16 @@ gboolean ListModems(USBModemObject* object, char** list, GError** error, Describ
     return TRUE;
 }
 
+gboolean AnswerDocument(USBModemObject* object, const char* devid, char** document, GError** error,
+                        std::string (*describe)(USBModem& modem), int line = __builtin_LINE()) {
+    USBModem* modem = ReadyModem(object, {devid}, error, line);
+    if (modem == nullptr) {
+        return FALSE;
+    }
+    *document = ToUTF8(describe(*modem));
+    return TRUE;
+}
+
 // Sleeps, through signals. Returns whether there were any.
 bool SleepOut(unsigned int seconds) {
     const unsigned int left = sleep(seconds);
@@ -177,22 +187,12 @@ gboolean usbmodem_get_usbmodem_if_list(USBModemObject* object, char** list, GErr
 
 gboolean usbmodem_get_usbmodem(USBModemObject* object, char* devid, char** document,
                                GError** error) {
-    USBModem* modem = ReadyModem(object, {devid}, error);
-    if (modem == nullptr) {
-        return FALSE;
-    }
-    *document = ToUTF8(ModemDocument(*modem));
-    return TRUE;
+    return AnswerDocument(object, devid, document, error, ModemDocument);
 }
 
 gboolean usbmodem_get_profile(USBModemObject* object, char* devid, char** document,
                               GError** error) {
-    USBModem* modem = ReadyModem(object, {devid}, error);
-    if (modem == nullptr) {
-        return FALSE;
-    }
-    *document = ToUTF8(ProfileDocument(*modem));
-    return TRUE;
+    return AnswerDocument(object, devid, document, error, ProfileDocument);
 }
 
 gboolean usbmodem_set_profile(USBModemObject* object, char* devid, char* profile, GError** error) {

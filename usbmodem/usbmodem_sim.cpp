@@ -36,6 +36,21 @@ bool FitInCommand(const std::string& first, const std::string& second = "") {
     return isFit;
 }
 
+// Sends a command with these codes, which the modem is to answer with OK.
+int Send(USBModem& modem, USBModem_ATIF& commands, const std::string& cmd,
+         std::initializer_list<std::string> codes, const char* what, const char* doing) {
+    std::string reply;
+    if (modem.ModemCmd(cmd, reply) != 0) {
+        TAVI_LOG_ERROR("error on modem cmd: %s", what);
+        return kRefused;
+    }
+    if (commands.ParseRetStringIsOK(reply) != 0) {
+        TAVI_LOG_ERROR("error on %s, ret: %s", doing, LoggableReply(reply, codes).c_str());
+        return kNotOK;
+    }
+    return 0;
+}
+
 }  // namespace
 
 int USBModem::QuerySIMStatus(std::string& reply) {
@@ -123,17 +138,9 @@ int USBModem::ChangePINEnable(const std::string& pin, bool enable) {
     if ((current == 1) == enable) {
         return 0;
     }
-    std::string reply;
-    if (ModemCmd(CommandSet().GetATCommandChangePINEnable(enable ? "1" : "0", pin), reply) != 0) {
-        TAVI_LOG_ERROR("error on modem cmd: enable pin protection");
-        return kRefused;
-    }
-    if (CommandSet().ParseRetStringIsOK(reply) != 0) {
-        TAVI_LOG_ERROR("error on enable PIN protection, ret: %s",
-                       LoggableReply(reply, {pin}).c_str());
-        return kNotOK;
-    }
-    return 0;
+    return Send(*this, CommandSet(),
+                CommandSet().GetATCommandChangePINEnable(enable ? "1" : "0", pin), {pin},
+                "enable pin protection", "enable PIN protection");
 }
 
 int USBModem::ChangePIN(const std::string& oldPin, const std::string& newPin) {
@@ -151,17 +158,8 @@ int USBModem::ChangePIN(const std::string& oldPin, const std::string& newPin) {
     if (!FitInCommand(oldPin, newPin)) {
         return kRefused;
     }
-    std::string reply;
-    if (ModemCmd(CommandSet().GetATCommandChangePINCode(oldPin, newPin), reply) != 0) {
-        TAVI_LOG_ERROR("error on modem cmd: change pin");
-        return kRefused;
-    }
-    if (CommandSet().ParseRetStringIsOK(reply) != 0) {
-        TAVI_LOG_ERROR("error on changing PIN, ret: %s",
-                       LoggableReply(reply, {oldPin, newPin}).c_str());
-        return kNotOK;
-    }
-    return 0;
+    return Send(*this, CommandSet(), CommandSet().GetATCommandChangePINCode(oldPin, newPin),
+                {oldPin, newPin}, "change pin", "changing PIN");
 }
 
 int USBModem::PINSet(const std::string& pin, const std::string& newPin, bool enable) {
@@ -225,17 +223,8 @@ int USBModem::EnterPUK(const std::string& puk, const std::string& newPin) {
     if (!FitInCommand(puk, newPin)) {
         return kRefused;
     }
-    std::string reply;
-    if (ModemCmd(CommandSet().GetATCommandSetSIMPUK(puk, newPin), reply) != 0) {
-        TAVI_LOG_ERROR("error on modem cmd: change pin with puk");
-        return kRefused;
-    }
-    if (CommandSet().ParseRetStringIsOK(reply) != 0) {
-        TAVI_LOG_ERROR("error on changing pin with puk, ret: %s",
-                       LoggableReply(reply, {puk, newPin}).c_str());
-        return kNotOK;
-    }
-    return 0;
+    return Send(*this, CommandSet(), CommandSet().GetATCommandSetSIMPUK(puk, newPin), {puk, newPin},
+                "change pin with puk", "changing pin with puk");
 }
 
 int USBModem::PUKSet(const std::string& puk, const std::string& newPin) {
