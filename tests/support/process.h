@@ -25,8 +25,8 @@ class Process {
     using Milliseconds = std::chrono::milliseconds;
     static constexpr Milliseconds kPatience{50000};  // as busy as a machine may be
 
-    // Starts argv[0], found along PATH when it holds no slash. One that cannot be run ends with
-    // 127.
+    // Starts argv[0], found along PATH when it holds no slash. Throws std::system_error when it
+    // cannot be run.
     explicit Process(const std::vector<std::string>& argv);
     ~Process();
     Process(const Process&) = delete;
