@@ -61,7 +61,7 @@ void Require(int result, const std::string& doing) {
     }
 }
 
-void ForEach(nl_cache* cache, FunctionRef<void(nl_object*)> visit) {
+void ForEach(nl_cache* cache, const std::function<void(nl_object*)>& visit) {
     for (nl_object* object = nl_cache_get_first(cache); object != nullptr;
          object = nl_cache_get_next(object)) {
         visit(object);

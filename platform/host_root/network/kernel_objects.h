@@ -1,10 +1,10 @@
 #ifndef TAVIWIRELESS_PLATFORM_HOST_ROOT_NETWORK_KERNEL_OBJECTS_H
 #define TAVIWIRELESS_PLATFORM_HOST_ROOT_NETWORK_KERNEL_OBJECTS_H
 
+#include <functional>
 #include <memory>
 #include <string>
 
-#include "base/function_ref.h"
 #include "sdk/netlink.h"
 
 // Addresses and routes with all that the kernel knows of them, so that they can be given to another
@@ -27,7 +27,7 @@ struct Route {
 // Throws Error with what was being done and the kernel's own words, unless result is a success.
 void Require(int result, const std::string& doing);
 
-void ForEach(nl_cache* cache, FunctionRef<void(nl_object*)> visit);
+void ForEach(nl_cache* cache, const std::function<void(nl_object*)>& visit);
 
 // Whether somebody gave it to the interface, and not the kernel itself or a router of IPv6.
 bool WasGiven(rtnl_addr* address);

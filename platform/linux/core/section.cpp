@@ -124,7 +124,7 @@ void SetPair(Lines& lines, std::string_view key, const std::string& newLine) {
 
 // Lets `change` have the lines of a section. False when the text has no such section.
 bool ChangeSection(std::string* text, const char* name,
-                   taviwireless::FunctionRef<void(Lines& lines)> change) {
+                   const std::function<void(Lines& lines)>& change) {
     const SectionIndex index(*text);
     const Section* section = index.Find(name);
     if (section == nullptr) {

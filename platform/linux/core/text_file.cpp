@@ -160,7 +160,7 @@ std::string ReadText(const char* path) {
 }
 
 void ChangeText(const char* path, IfMissing ifMissing,
-                taviwireless::FunctionRef<void(std::string* text)> change) {
+                const std::function<void(std::string* text)>& change) {
     const LockedPlace place(path, ifMissing);
     const auto old = place.Read();
     if (!old && ifMissing == IfMissing::kFail) {

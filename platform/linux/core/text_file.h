@@ -3,9 +3,9 @@
 
 #include <sys/stat.h>
 
+#include <functional>
 #include <string>
 
-#include "base/function_ref.h"
 #include "place.h"
 
 // Whole text files: read, and replaced in one step. Everything here throws Failure.
@@ -43,7 +43,7 @@ enum class IfMissing { kFail, kCreate };
 // the path names the old or the new text. What a killed writer leaves of ".NAME.new", the next one
 // removes.
 void ChangeText(const char* path, IfMissing ifMissing,
-                taviwireless::FunctionRef<void(std::string* text)> change);
+                const std::function<void(std::string* text)>& change);
 
 // Puts a new file with this text in the place of what regular file stands there.
 void ReplaceFile(const char* path, const std::string& text);
