@@ -55,10 +55,6 @@ constexpr char kMachine[] =
     "ip link add eth7 type veth peer name far-eth7; ip address add 10.7.0.2/24 dev eth7;"
     "ip link set eth7 up; ip link set far-eth7 up; ip route add default via 10.7.0.1";
 
-std::string Shell(const std::string& script) {
-    return RunProgram({"sh", "-c", script}).out;
-}
-
 struct Modem {
     bool isPlugged = true;
     bool isBabbling = false;
@@ -70,8 +66,7 @@ class Life {
     explicit Life(unsigned seed) : random_(seed), simulator_(Modems()) {
         Shell(kMachine);
         WriteFile("/etc/ppp/peers/wvdial", "noauth\n");
-        WriteFile("/usr/tavi/bin/wvdial", kDialler);
-        chmod("/usr/tavi/bin/wvdial", 0755);
+        WriteProgram("/usr/tavi/bin/wvdial", kDialler);
         StartService();
         Settle();
         // One modem takes the default route.
@@ -238,7 +233,9 @@ class Life {
         mostMemory_ = std::max(mostMemory_, Memory());
         Expect(mostMemory_ <= Memory() + 1024 && mostMemory_ < 8192, "memory grows");
     }
-    static long Number(const std::string& command) { return std::stol(Shell(command)); }
+    static long Number(const std::string& command) {
+        return std::stol(RunProgram({"sh", "-c", command}).out);
+    }
     std::string ProcFile(const std::string& name) const {
         return "/proc/" + std::to_string(service_->Daemon().Pid()) + "/" + name;
     }

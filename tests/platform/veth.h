@@ -1,8 +1,6 @@
 #ifndef TAVIWIRELESS_TESTS_PLATFORM_VETH_H
 #define TAVIWIRELESS_TESTS_PLATFORM_VETH_H
 
-#include <gmock/gmock.h>
-
 #include <string>
 
 #include "tests/support/process.h"
@@ -12,9 +10,7 @@ namespace taviwireless::test {
 
 // Runs "ip ARGUMENTS" and returns what it prints.
 inline std::string Ip(const std::string& arguments) {
-    const RunResult result = RunProgram({"sh", "-c", "ip " + arguments});
-    EXPECT_EQ(result.status, 0) << "ip " << arguments << ": " << result.err;
-    return result.out;
+    return Shell("ip " + arguments);
 }
 
 inline void MakeInterface(const std::string& name, const std::string& address) {

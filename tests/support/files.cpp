@@ -40,6 +40,12 @@ void WriteFile(const std::string& path, const std::string& text) {
     Write(path, text, std::ios::trunc);
 }
 
+void WriteProgram(const std::string& path, const std::string& text) {
+    std::filesystem::remove(path);
+    WriteFile(path, text);
+    chmod(path.c_str(), 0755);
+}
+
 void AppendFile(const std::string& path, const std::string& text) {
     Write(path, text, std::ios::app);
 }

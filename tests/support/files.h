@@ -12,6 +12,10 @@ namespace taviwireless::test {
 // Writes `text` as the whole content of `path`, creating the file and the directories above it.
 void WriteFile(const std::string& path, const std::string& text);
 
+// Writes a program for everybody. What stands at `path` is replaced: it may be a link to one that
+// others need.
+void WriteProgram(const std::string& path, const std::string& text);
+
 // Appends `text` to `path`; the file is created when it is not there, its directory is not.
 void AppendFile(const std::string& path, const std::string& text);
 

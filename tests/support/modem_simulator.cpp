@@ -22,9 +22,8 @@ std::string ToJson(const std::string& text) {
 
 void InstallDialler(const std::string& script) {
     WriteFile("/etc/ppp/peers/wvdial", "noauth\n");
-    WriteFile(kDialler, "#!/bin/sh\nprintf '%s\\n' \"$@\" >/tmp/arguments\n" + script +
-                            "\nexec sleep 1000\n");
-    std::filesystem::permissions(kDialler, std::filesystem::perms(0755));
+    WriteProgram(kDialler, "#!/bin/sh\nprintf '%s\\n' \"$@\" >/tmp/arguments\n" + script +
+                               "\nexec sleep 1000\n");
 }
 
 ModemSimulator::ModemSimulator(const std::vector<std::string>& arguments, const std::string& folder)

@@ -92,10 +92,10 @@ TEST(SetAPConfig, WritesEveryKeyInOrder) {
     settings.enabled = 1;
     settings.ap.security = WIRELESS_AP_WPA_ENTERPRISE;
     settings.ap.secret = {};
-    SetField(settings.ap.secret.enterprise.radiusAddr, "10.0.0.9");
+    CopyField(settings.ap.secret.enterprise.radiusAddr, "10.0.0.9");
     settings.ap.guestSecurity = WIRELESS_AP_WPA;
-    SetField(settings.ap.guestSecret.wpa.passphrase, "for guests");
-    SetField(settings.ap.guestBssid, "02:00:00:00:00:01");
+    CopyField(settings.ap.guestSecret.wpa.passphrase, "for guests");
+    CopyField(settings.ap.guestBssid, "02:00:00:00:00:01");
     EXPECT_EQ(TAVIWirelessSetAPConfig(&settings), 1);
     EXPECT_EQ(ReadFile(kFile),
               "[Stick 2000]\n\tenable=yes\n\tunblock=yes\n\ttxpower=10\n\tssid=Merilond\n"
@@ -127,7 +127,7 @@ TEST(SetAPConfig, SwitchingOffChangesOneLine) {
     std::string after = before;
     after.replace(after.find("=yes"), 4, "=no");
     EXPECT_EQ(ReadFile(kFile), after);
-    SetField(settings.name, "a\nb");
+    CopyField(settings.name, "a\nb");
     EXPECT_EQ(TAVIWirelessSetAPConfig(&settings), 0);
     EXPECT_TRUE(here.log.Has("Failed to set key[enable] of sec[a?b] in file[" + kFile + "]."));
 }
@@ -153,7 +153,7 @@ TEST(SetAPConfig, RefusesWhatCannotBeStoredAndLeavesTheFile) {
         settings.enabled = 1;
         settings.ap.security = c.security;
         settings.ap.guestSecurity = c.guestSecurity;
-        SetField(settings.ap.ssid, c.ssid);
+        CopyField(settings.ap.ssid, c.ssid);
         EXPECT_EQ(TAVIWirelessSetAPConfig(&settings), 0);
         EXPECT_THAT(here.log.Text(), EndsWith(c.log + "\n"));
         EXPECT_EQ(ReadFile(kFile), before);
@@ -210,14 +210,14 @@ TEST(SetAPConfig, AProductNameFindsItsOwnSectionAndRunsNothing) {
 WirelessAPSecret MakeSecret(int kind, const std::string& text) {
     WirelessAPSecret secret{};
     if (kind == WIRELESS_AP_WEP) {
-        SetField(secret.wepKey, text);
+        CopyField(secret.wepKey, text);
     } else if (kind == WIRELESS_AP_WPA) {
         secret.wpa.wpaVersion = secret.wpa.cipher = -1;
-        SetField(secret.wpa.passphrase, text);
+        CopyField(secret.wpa.passphrase, text);
     } else if (kind == WIRELESS_AP_WPA_ENTERPRISE) {
         secret.enterprise.radiusPort = -1;
-        SetField(secret.enterprise.radiusAddr, text);
-        SetField(secret.enterprise.radiusSecret, text);
+        CopyField(secret.enterprise.radiusAddr, text);
+        CopyField(secret.enterprise.radiusSecret, text);
     }
     return secret;
 }
@@ -230,9 +230,9 @@ TEST(SetAPConfig, StoresSettingsSoThatTheyReadBackTheSame) {
             WirelessAPSettings settings{};
             settings.enabled = 1;
             settings.txPower = settings.ap.channel = settings.guestLanBlock = INT32_MIN;
-            SetField(settings.name, "a" + text);
-            SetField(settings.ap.ssid, text);
-            SetField(settings.guestSchedule, text);
+            CopyField(settings.name, "a" + text);
+            CopyField(settings.ap.ssid, text);
+            CopyField(settings.guestSchedule, text);
             settings.ap.security = kind;
             settings.ap.secret = MakeSecret(kind, text);
             settings.ap.guestSecurity = kind % WIRELESS_AP_WPA_ENTERPRISE;

@@ -25,13 +25,13 @@ WirelessAPSecret MakeSecret(int kind, int32_t cipher) {
     if (kind == WIRELESS_AP_WPA) {
         secret.wpa.wpaVersion = 3;
         secret.wpa.cipher = cipher;
-        SetField(secret.wpa.passphrase, "pass = phrase");
+        CopyField(secret.wpa.passphrase, "pass = phrase");
     } else if (kind == WIRELESS_AP_WPA_ENTERPRISE) {
         secret.enterprise.wpaVersion = 2;
         secret.enterprise.cipher = cipher;
         secret.enterprise.radiusPort = 1812;
-        SetField(secret.enterprise.radiusAddr, "10.0.0.9");
-        SetField(secret.enterprise.radiusSecret, "radius secret");
+        CopyField(secret.enterprise.radiusAddr, "10.0.0.9");
+        CopyField(secret.enterprise.radiusSecret, "radius secret");
     }
     return secret;
 }
@@ -39,15 +39,15 @@ WirelessAPSecret MakeSecret(int kind, int32_t cipher) {
 // Open, at 2.4 GHz with 802.11n, for guests as well.
 WirelessAPConf MakeConf() {
     WirelessAPConf conf{};
-    SetField(conf.ssid, "My \"Net\" #1");
-    SetField(conf.bridge, "lbr0");
+    CopyField(conf.ssid, "My \"Net\" #1");
+    CopyField(conf.bridge, "lbr0");
     conf.band = WIRELESS_AP_G;
     conf.ieee80211n = 1;
     conf.channel = 11;
     conf.wmm = 7;
     conf.guestEnabled = 1;
-    SetField(conf.guestSsid, "Guests");
-    SetField(conf.guestBssid, "02:00:00:00:00:01");
+    CopyField(conf.guestSsid, "Guests");
+    CopyField(conf.guestBssid, "02:00:00:00:00:01");
     return conf;
 }
 
@@ -141,8 +141,8 @@ TEST(HostConf, QuotesAWepKeyByItsLength) {
     for (const auto& [key, line] : kCases) {
         WirelessAPConf conf = MakeConf();
         conf.security = conf.guestSecurity = WIRELESS_AP_WEP;
-        SetField(conf.secret.wepKey, key);
-        SetField(conf.guestSecret.wepKey, key);
+        CopyField(conf.secret.wepKey, key);
+        CopyField(conf.guestSecret.wepKey, key);
         EXPECT_THAT(HostText(conf),
                     EndsWith("eap_server=1\nauth_algs=3\nwep_default_key=0\n" + line));
         EXPECT_THAT(RenderGuestConf(conf).Text(),
@@ -227,7 +227,7 @@ TEST_F(SetHostAPConf, AnInterfaceNameRunsNothingAndMatchesOnlyItself) {
 TEST_F(SetHostAPConf, RefusesLineBreaksBeforeAnythingIsDone) {
     EXPECT_EQ(TAVIWirelessSetHostAPConf("wlan0", nullptr), 0);
     EXPECT_EQ(log.Count(" Bad parameter."), 1);
-    SetField(conf.guestSsid, "a\nb");  // which this model does not write
+    CopyField(conf.guestSsid, "a\nb");  // which this model does not write
     EXPECT_EQ(TAVIWirelessSetHostAPConf("wlan0", &conf), 1);
     adapter.Up();
     Shell("rm -r /etc/hostapd");
@@ -235,7 +235,7 @@ TEST_F(SetHostAPConf, RefusesLineBreaksBeforeAnythingIsDone) {
     EXPECT_EQ(TAVIWirelessSetHostAPConf("wlan0", &conf), 0);
     conf = MakeConf();
     conf.security = WIRELESS_AP_WPA;
-    SetField(conf.secret.wpa.passphrase, "secret\rauth_algs=1");
+    CopyField(conf.secret.wpa.passphrase, "secret\rauth_algs=1");
     EXPECT_EQ(TAVIWirelessSetHostAPConf("wlan0", &conf), 0);
     EXPECT_EQ(log.Count("holds a line break"), 2);
     EXPECT_FALSE(log.Has("secret"));

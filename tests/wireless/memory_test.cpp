@@ -3,7 +3,7 @@
 
 #include <functional>
 
-#include "tests/platform/linux/failing_memory.h"
+#include "tests/support/failing_memory.h"
 #include "tests/support/sleep_capture.h"
 #include "tests/wireless/station_fixture.h"
 #include "wireless/system/queue.h"
@@ -31,11 +31,11 @@ void FailEach(
 WirelessAPSettings Encrypted(const char* ssid) {
     WirelessAPSettings settings{};
     settings.enabled = settings.unblock = 1;
-    SetField(settings.name, "a stick with a long name");
-    SetField(settings.ap.ssid, ssid);
-    SetField(settings.ap.bridge, "lbr0");
+    CopyField(settings.name, "a stick with a long name");
+    CopyField(settings.ap.ssid, ssid);
+    CopyField(settings.ap.bridge, "lbr0");
     settings.ap.security = WIRELESS_AP_WPA;
-    SetField(settings.ap.secret.wpa.passphrase, "a pass phrase of some length");
+    CopyField(settings.ap.secret.wpa.passphrase, "a pass phrase of some length");
     return settings;
 }
 
@@ -54,11 +54,11 @@ TEST(Memory, SettingsAreStoredAllOrNotAtAll) {
     ASSERT_EQ(TAVIWirelessConfSet(&conf), 0);
     const auto keys = [] { return Shell("grep -v ACCESS_TIME " + std::string(kSavedFile)); };
     const std::string saved = keys();
-    SetField(conf.key, "another secret");
+    CopyField(conf.key, "another secret");
     ASSERT_EQ(TAVIWirelessConfSet(&conf), 0);
     const std::string savedAnew = keys();
     const std::string file = ReadFile(kSavedFile);
-    SetField(conf.key, kKey);
+    CopyField(conf.key, kKey);
     FailEach([&] { WriteFile(kSavedFile, file); }, [&] { result = TAVIWirelessConfSet(&conf); },
              [&] { EXPECT_EQ(keys(), result == 0 ? saved : savedAnew); });
 }

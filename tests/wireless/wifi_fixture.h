@@ -10,26 +10,12 @@
 #include <string>
 #include <vector>
 
+#include "base/fixed_field.h"
 #include "tests/support/files.h"
 #include "tests/support/process.h"
 
 // The Wi-Fi adapter and the system's tools as tests in an appliance root see them.
 namespace taviwireless::test {
-
-// Runs a script that must succeed, and returns what it prints.
-inline std::string Shell(const std::string& script) {
-    const RunResult result = RunProgram({"sh", "-c", script});
-    if (result.status != 0) {
-        throw std::runtime_error(script + ": " + result.err);
-    }
-    return result.out;
-}
-
-// Puts a text into a record's field, which it may not fill up.
-template <size_t kSize>
-void SetField(char (&field)[kSize], const std::string& text) {
-    snprintf(field, kSize, "%s", text.c_str());
-}
 
 // What the model's settings say of Wi-Fi: "yes" or "no".
 inline void SetSupport(const std::string& support) {
@@ -54,9 +40,7 @@ class ToolStandIns {
     ToolStandIns() { ForgetCommands(); }
 
     void Add(const std::string& path, const std::string& script = "") {
-        std::filesystem::remove(path);  // it may be a link to a program that others need
-        WriteFile(path, "#!/bin/sh\necho \"$0 $*\" >> /tmp/commands\n" + script + "\n");
-        chmod(path.c_str(), 0755);
+        WriteProgram(path, "#!/bin/sh\necho \"$0 $*\" >> /tmp/commands\n" + script + "\n");
     }
 
     std::vector<std::string> Commands() const {

@@ -68,8 +68,7 @@ int Running(const std::string& name) {
 
 // The lease that a station, at the far end of wlan0, gets: "ADDRESS ROUTER DNS LEASETIME".
 std::string LeaseOfStation() {
-    WriteFile("/tmp/station", "#!/bin/sh\n[ $1 != bound ] || echo $ip $router $dns $lease\n");
-    chmod("/tmp/station", 0755);
+    WriteProgram("/tmp/station", "#!/bin/sh\n[ $1 != bound ] || echo $ip $router $dns $lease\n");
     return RunProgram({"udhcpc", "-f", "-n", "-q", "-t", "4", "-T", "1", "-i", "wlan0-far", "-s",
                        "/tmp/station"})
         .out;
@@ -266,11 +265,10 @@ TEST_F(NetworkProgram, LeaseOfTheWiredInterfaceBecomesTheBridges) {
 
 // A client takes all addresses away before it asks. Here nobody answers.
 TEST_F(NetworkProgram, BridgeWithoutALeaseKeepsWhatItsInterfaceHad) {
-    WriteFile("/usr/sbin/udhcpc",
-              "#!/bin/sh\nif [ \"$1\" = stay ]; then while :; do sleep 0.1; done; fi\n"
-              "ip -4 address flush dev br0; \"$0\" stay >/dev/null 2>&1 &\n"
-              "echo $! >/etc/dhcpc/dhcpcd-br0.pid\n");
-    chmod("/usr/sbin/udhcpc", 0755);
+    WriteProgram("/usr/sbin/udhcpc",
+                 "#!/bin/sh\nif [ \"$1\" = stay ]; then while :; do sleep 0.1; done; fi\n"
+                 "ip -4 address flush dev br0; \"$0\" stay >/dev/null 2>&1 &\n"
+                 "echo $! >/etc/dhcpc/dhcpcd-br0.pid\n");
     MakeInterface("eth0", "10.9.0.5/16");
     Shell(kForeign);
     const std::string all = WhatItHas("eth0");

@@ -1,8 +1,6 @@
 #ifndef TAVIWIRELESS_TESTS_PLATFORM_HOST_ROOT_ROOT_SCRIPTS_H
 #define TAVIWIRELESS_TESTS_PLATFORM_HOST_ROOT_ROOT_SCRIPTS_H
 
-#include <sys/stat.h>
-
 #include <string>
 
 #include "tests/support/files.h"
@@ -12,8 +10,7 @@
 namespace taviwireless::test {
 
 inline void InstallScript(const std::string& from, const std::string& path) {
-    WriteFile(path, ReadFile(from));
-    chmod(path.c_str(), 0755);
+    WriteProgram(path, ReadFile(from));
 }
 
 inline void InstallRootScripts() {

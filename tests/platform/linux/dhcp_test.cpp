@@ -15,11 +15,6 @@ namespace {
 constexpr char kPidFile[] = "/etc/dhcpc/dhcpcd-eth7.pid";
 constexpr char kLease[] = "/etc/dhcpc/dhcpcd-eth7.info";
 
-void WriteProgram(const std::string& path, const std::string& text) {
-    WriteFile(path, text);
-    chmod(path.c_str(), 0755);
-}
-
 void InstallLeaseScript() {
     WriteProgram("/usr/tavi/bin/dhcp-lease",
                  ReadFile(TAVI_SOURCE_DIR "/platform/host_root/dhcp-lease"));

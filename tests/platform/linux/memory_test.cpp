@@ -13,7 +13,7 @@
 
 #include "common/sz_hash.h"
 #include "common/sz_list.h"
-#include "tests/platform/linux/failing_memory.h"
+#include "tests/support/failing_memory.h"
 #include "tests/support/files.h"
 
 namespace taviwireless::test {

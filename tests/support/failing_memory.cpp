@@ -1,4 +1,4 @@
-#include "tests/platform/linux/failing_memory.h"
+#include "tests/support/failing_memory.h"
 
 #include <cstdlib>
 #include <new>
@@ -37,6 +37,14 @@ TAKEN_OVER void* operator new(size_t size) {
         throw std::bad_alloc();
     }
     return memory;
+}
+
+TAKEN_OVER void* operator new(size_t size, const std::nothrow_t&) noexcept {
+    try {
+        return operator new(size);
+    } catch (const std::bad_alloc&) {
+        return nullptr;
+    }
 }
 
 TAKEN_OVER void operator delete(void* memory) noexcept {
