@@ -69,7 +69,7 @@ Report Describe(const Profile& profile, bool showSecrets) {
     Json::Value& isDefault = report.document[profile::kDefaultGateway];
     isDefault = isDefault == "true";
     Json::Value& roaming = report.document[profile::kRoaming];
-    roaming = roaming == "" ? Json::Value() : roaming == "true";
+    roaming = roaming.asString().empty() ? Json::Value() : roaming == "true";
     return report;
 }
 
