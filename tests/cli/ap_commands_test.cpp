@@ -297,7 +297,7 @@ TEST_F(APCommands, ADryRunShowsThePlanAndSwitchesNothing) {
 
 // When the machine starts.
 TEST_F(APCommands, WhatWasSwitchedOnIsOnAgainAfterARestart) {
-    const std::string program = "/usr/local/bin/taviwireless";
+    const std::string program = "/usr/bin/taviwireless";
     tools.Add(program, "[ \"$*\" = 'wifi auto' ] || exec '" +
                            BuiltProgram("taviwireless_with_wifi") + "' \"$@\"");
     tools.Add("/usr/tavi/hotplug/usb.plug");
