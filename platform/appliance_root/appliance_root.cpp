@@ -54,6 +54,7 @@ void WriteMap(const char* path, const std::string& text) {
 // the caller: unshare(1) reads /etc/subuid and asks newuidmap(1), which alone may give them away.
 constexpr const char* kAmongLentUsers[] = {"unshare", "--user", "--map-root-user", "--map-auto"};
 
+// Puts that before the command, and returns the whole as execvp() takes it, which points into it.
 std::vector<char*> AmongLentUsers(std::vector<std::string>& command) {
     command.insert(command.begin(), std::begin(kAmongLentUsers), std::end(kAmongLentUsers));
     std::vector<char*> arguments;
@@ -101,13 +102,13 @@ void LeaveNamespaces(const fs::path& program) {
     if (unshare(kNamespaces) == 0) {
         return;
     }
+    if (errno != EPERM) {
+        Fail(kNamespacesRefused);
+    }
+    BecomeRootAmongLentUsers(program);
     const std::string user = std::to_string(geteuid());
     const std::string group = std::to_string(getegid());
-    const bool isRefused = errno == EPERM;
-    if (isRefused) {
-        BecomeRootAmongLentUsers(program);
-    }
-    if (!isRefused || unshare(kNamespaces | CLONE_NEWUSER) != 0) {
+    if (unshare(kNamespaces | CLONE_NEWUSER) != 0) {
         Fail(kNamespacesRefused);
     }
     WriteMap("/proc/self/setgroups", "deny");  // the kernel's condition for mapping the group
