@@ -39,6 +39,11 @@ void Demand(bool isTrue, const std::string& sentence, const std::string& seen) {
 
 // What comes out of the root, such as new inputs, goes to the folder that TAVI_TEST_OUTPUT names.
 extern "C" int LLVMFuzzerInitialize(int*, char***) {
+    constexpr char kIsInside[] = "TAVI_FUZZ_IS_INSIDE";  // libFuzzer starts the program in itself
+    if (getenv(kIsInside) != nullptr) {
+        return 0;
+    }
+    setenv(kIsInside, "", 1);
     try {
         const char* output = getenv("TAVI_TEST_OUTPUT");
         taviwireless::EnterApplianceRoot(output != nullptr ? output : "");
