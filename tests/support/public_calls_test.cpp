@@ -1,0 +1,91 @@
+// The table of public calls itself: nothing is missing, and every call does its work when nobody
+// disturbs it.
+#include "tests/support/public_calls.h"
+
+#include <gmock/gmock.h>
+
+#include <set>
+
+#include "base/split.h"
+
+namespace taviwireless::test {
+namespace {
+
+using testing::AnyOf;
+using testing::HasSubstr;
+using testing::Not;
+using testing::StartsWith;
+using Names = std::multiset<std::string>;
+
+// What no caller calls: data, destructors, and private members of classes, which stand at the end.
+const char kNotCalled[] =
+    "^(vtable|typeinfo|gWireless)|~|::nullObject$|::vendorTable|Semaphore::Change\\(|USBModem::("
+    "AttemptRemain|CommandSet|CompleteInit|ComputeProfilePath|EnterP[IU][NK]|Exchange|FillDefaults|"
+    "FindPortsAndPrepare|Open|PidFilePath|Prepare|PrepareToDial|QuerySIMStatus|ReadDialSettings|"
+    "Refresh)[[(]";
+
+// The names of the commands that the help of this command lists, and of those in them.
+void AddCommands(const std::string& command, std::set<std::string>& names) {
+    std::vector<std::string> argv = Split(command, ' ');
+    argv.insert(argv.begin(), BuiltProgram("taviwireless"));
+    argv.emplace_back("--help");
+    const std::string help = RunProgram(argv).out;
+    const size_t list = help.find("\nSubcommands:\n");
+    if (list == std::string::npos) {
+        names.insert(command);
+        return;
+    }
+    std::istringstream lines(help.substr(help.find('\n', list + 1) + 1));
+    for (std::string line; std::getline(lines, line) && line.rfind("  ", 0) == 0;) {
+        if (line[2] != ' ') {  // else more of the description
+            const std::string name = line.substr(2, line.find(' ', 2) - 2);
+            AddCommands(command.empty() ? name : command + ' ' + name, names);
+        }
+    }
+}
+
+TEST(PublicCalls, HaveARowForEveryFunctionThatIsExported) {
+    const std::string list = Shell(
+        "grep -Ev '" + std::string(kNotCalled) +
+        "' '" TAVI_EXPORTS "' | sed -E 's/^taviwireless:://; s/\\[abi:[a-z0-9]*\\]//; s/\\(.*//'");
+    const std::vector<std::string> exported = Lines(list);
+    Names rows;
+    for (const PublicCall& call : PublicCalls()) {
+        rows.insert(call.name);
+    }
+    EXPECT_EQ(rows, Names(exported.begin(), exported.end()));
+}
+
+TEST(PublicCalls, HaveARowForEveryCommand) {
+    std::set<std::string> commands, rows;
+    AddCommands("", commands);
+    for (const CommandCall& command : CommandCalls()) {
+        rows.insert(command.name);
+    }
+    EXPECT_EQ(rows, commands);
+}
+
+struct EveryCall : testing::TestWithParam<Needs> {};
+
+TEST_P(EveryCall, DoesItsWork) {
+    Surroundings around(GetParam());
+    for (const PublicCall& call : PublicCalls()) {
+        if (call.needs == GetParam()) {
+            around.Arrange(call.sim);
+            const ChildResult result = InChild([&] { return call.run(around); });
+            EXPECT_EQ(result.status, 0) << call.name;
+            EXPECT_THAT(result.text, Not(AnyOf(StartsWith("-"), HasSubstr("(err)")))) << call.name;
+        }
+    }
+    for (const CommandCall& command : CommandCalls()) {
+        if (command.needs == GetParam()) {
+            around.Arrange(command.sim);
+            const RunResult result = RunProgram(command.Argv(), command.input);
+            EXPECT_EQ(result.status, 0) << command.name << ": " << result.out << result.err;
+        }
+    }
+}
+INSTANTIATE_TEST_SUITE_P(All, EveryCall, testing::ValuesIn(kAllNeeds));
+
+}  // namespace
+}  // namespace taviwireless::test
