@@ -1,0 +1,257 @@
+#include "tests/support/system_calls.h"
+
+#include <elf.h>
+#include <poll.h>
+#include <seccomp.h>
+#include <signal.h>
+#include <sys/stat.h>
+#include <sys/syscall.h>
+#include <sys/uio.h>
+#include <unistd.h>
+
+#include <atomic>
+#include <climits>
+#include <exception>
+#include <filesystem>
+#include <fstream>
+#include <future>
+#include <map>
+#include <set>
+#include <sstream>
+#include <system_error>
+#include <thread>
+
+#include "base/unique_fd.h"
+#include "tests/support/files.h"
+
+namespace taviwireless::test {
+namespace {
+
+// The calls that are counted, by what their first or second argument is.
+constexpr char kOfPaths[] =
+    "open stat lstat access readlink mkdir mknod rename unlink rmdir link symlink chmod chown "
+    "lchown "
+    "truncate execve chdir statfs utime utimes";
+constexpr char kOfPathsInFolders[] =
+    "openat openat2 newfstatat statx faccessat faccessat2 readlinkat mkdirat mknodat renameat "
+    "renameat2 unlinkat linkat symlinkat fchmodat fchownat utimensat inotify_add_watch";
+constexpr char kOfDescriptors[] =
+    "read pread64 readv write pwrite64 writev fstat fstatfs getdents64 fsync fdatasync ftruncate "
+    "fchmod fchown flock fcntl ioctl close dup dup2 dup3 fchdir lseek connect bind listen accept4 "
+    "sendto sendmsg recvfrom recvmsg setsockopt getsockopt getsockname sendfile";
+constexpr char kOfOthers[] =
+    "fork vfork clone clone3 pipe pipe2 socket socketpair memfd_create inotify_init1 eventfd2 kill "
+    "tgkill wait4 waitid setsid setpgid semget semop semtimedop semctl poll ppoll select pselect6 "
+    "clock_nanosleep getrandom uname setns unshare mount umount2 pidfd_open prctl";
+
+enum class Subject { kPath, kPathInFolder, kDescriptor, kNone };
+
+const std::map<int, std::pair<std::string, Subject>>& CountedCalls() {
+    static const auto kCalls = [] {
+        std::map<int, std::pair<std::string, Subject>> calls;
+        const std::pair<const char*, Subject> kGroups[] = {
+            {kOfPaths, Subject::kPath},
+            {kOfPathsInFolders, Subject::kPathInFolder},
+            {kOfDescriptors, Subject::kDescriptor},
+            {kOfOthers, Subject::kNone}};
+        for (const auto& [names, subject] : kGroups) {
+            std::istringstream words(names);
+            for (std::string name; words >> name;) {
+                const int number = seccomp_syscall_resolve_name(name.c_str());
+                if (number >= 0) {  // some machines lack some
+                    calls[number] = {name, subject};
+                }
+            }
+        }
+        return calls;
+    }();
+    return kCalls;
+}
+
+// From now on, the counted calls of this thread and of what it starts wait for the owner of the
+// descriptor. Without one, errno tells why.
+UniqueFd ReportCalls() {
+    seccomp_reset(nullptr, 0);  // the library keeps the descriptor of the thread before
+    const std::unique_ptr<void, decltype(&seccomp_release)> filter(seccomp_init(SCMP_ACT_ALLOW),
+                                                                   seccomp_release);
+    for (const auto& call : CountedCalls()) {
+        seccomp_rule_add(filter.get(), SCMP_ACT_NOTIFY, call.first, 0);
+    }
+    errno = -seccomp_load(filter.get());
+    return UniqueFd(errno == 0 ? seccomp_notify_fd(filter.get()) : -1);
+}
+
+std::string ProcessFile(pid_t process, const std::string& name) {
+    return "/proc/" + std::to_string(process) + "/" + name;
+}
+
+std::string LinkTarget(const std::string& path) {
+    std::error_code gone;
+    return std::filesystem::read_symlink(path, gone);
+}
+
+std::string TextAt(pid_t process, uint64_t address) {
+    char text[PATH_MAX + 1] = "";
+    // In two parts: the page behind the text may be no memory.
+    const size_t first = PATH_MAX - address % PATH_MAX;
+    const iovec to{text, PATH_MAX};
+    const iovec from[] = {{reinterpret_cast<void*>(address), first},
+                          {reinterpret_cast<void*>(address + first), PATH_MAX - first}};
+    process_vm_readv(process, &to, 1, from, 2, 0);
+    return text;
+}
+
+std::string SubjectOf(const seccomp_notif& request, Subject subject) {
+    const pid_t process = static_cast<pid_t>(request.pid);
+    const auto& arguments = request.data.args;
+    std::string path;
+    if (subject == Subject::kPath || subject == Subject::kPathInFolder) {
+        path = TextAt(process, arguments[subject == Subject::kPath ? 0 : 1]);
+    }
+    const bool isOfDescriptor = subject == Subject::kPathInFolder && path.empty();  // fstat() is
+    if (subject == Subject::kDescriptor || isOfDescriptor) {
+        path = LinkTarget(ProcessFile(process, "fd/" + std::to_string(arguments[0])));
+    }
+    return path;
+}
+
+// Where the loader of a process begins; 0 if there is none.
+uint64_t LoaderOf(pid_t process) {
+    std::ifstream entries(ProcessFile(process, "auxv"));
+    for (Elf64_auxv_t entry; entries.read(reinterpret_cast<char*>(&entry), sizeof entry);) {
+        if (entry.a_type == AT_BASE) {
+            return entry.a_un.a_val;
+        }
+    }
+    return 0;
+}
+
+class Watch {
+  public:
+    Watch(const std::optional<Fault>& fault, const std::string& program) : fault_(fault) {
+        stat(program.c_str(), &program_);
+    }
+
+    // Answers until nobody is left who could ask, or those who are left were killed.
+    void Serve(const UniqueFd& listener, const std::atomic<bool>& isDone) {
+        constexpr int kStep = 10;  // ms
+        int patience = 500;        // steps
+        for (;;) {
+            pollfd asked{listener.Get(), POLLIN, 0};
+            if (poll(&asked, 1, kStep) > 0 && (asked.revents & POLLIN) == 0) {
+                return;
+            }
+            if ((asked.revents & POLLIN) != 0) {
+                AnswerNext(listener);
+            } else if (isDone && --patience == 0) {
+                KillLeft();
+            }
+        }
+    }
+
+    WatchedRun run;
+
+  private:
+    void AnswerNext(const UniqueFd& listener) {
+        seccomp_notif request{};
+        if (seccomp_notify_receive(listener.Get(), &request) != 0) {
+            return;  // its process was killed meanwhile
+        }
+        seen_.insert(static_cast<pid_t>(request.pid));
+        seccomp_notif_resp answer{request.id, 0, 0, SECCOMP_USER_NOTIF_FLAG_CONTINUE};
+        if (IsCounted(request) && IsStruck(request)) {
+            answer.flags = 0;
+            answer.error = -fault_->error;
+            // One that fails closes the descriptor all the same.
+            if (fault_->call == "close" &&
+                Exists(ProcessFile(getpid(), "task/" + std::to_string(request.pid)))) {
+                close(static_cast<int>(request.data.args[0]));
+            }
+        }
+        seccomp_notify_respond(listener.Get(), &answer);
+    }
+
+    bool IsCounted(const seccomp_notif& request) {
+        struct stat program {};
+        const auto process = static_cast<pid_t>(request.pid);
+        if (stat(ProcessFile(process, "exe").c_str(), &program) != 0 ||
+            program.st_ino != program_.st_ino || program.st_dev != program_.st_dev) {
+            loaders_.erase(process);
+            return false;
+        }
+        const auto [loader, isNew] = loaders_.try_emplace(process, 0);
+        if (isNew) {
+            loader->second = LoaderOf(process);
+        }
+        constexpr uint64_t kLoaderSize = 0x38000;
+        return request.data.instruction_pointer - loader->second >= kLoaderSize;
+    }
+
+    // Notes the call, and whether the fault is to befall it.
+    bool IsStruck(const seccomp_notif& request) {
+        const auto& [name, subject] = CountedCalls().at(request.data.nr);
+        const int number = ++counts_[name];
+        run.calls.push_back({name, number, SubjectOf(request, subject)});
+        if (!fault_ || name != fault_->call || number != fault_->number) {
+            return false;
+        }
+        run.isStruck = true;
+        if (fault_->error == kKill) {
+            kill(static_cast<pid_t>(request.pid), SIGKILL);
+        }
+        return true;
+    }
+
+    void KillLeft() {
+        for (const pid_t process : seen_) {
+            std::ifstream file(ProcessFile(process, "comm"));
+            std::string name;
+            if (std::getline(file, name) && process != gettid()) {
+                kill(process, SIGKILL);
+                run.left.push_back(name);
+            }
+        }
+    }
+
+    std::optional<Fault> fault_;
+    struct stat program_ {};
+    std::map<std::string, int> counts_;
+    std::map<pid_t, uint64_t> loaders_;
+    std::set<pid_t> seen_;
+};
+
+}  // namespace
+
+WatchedRun WatchCalls(const std::function<void()>& work, const std::optional<Fault>& fault,
+                      const std::string& program) {
+    Watch watch(fault, program);
+    std::promise<UniqueFd> listener;
+    std::atomic<bool> isDone = false;
+    std::exception_ptr failure;
+    std::thread worker([&] {
+        try {
+            UniqueFd reported = ReportCalls();
+            const bool isWatched = static_cast<bool>(reported);
+            listener.set_value(std::move(reported));
+            if (!isWatched) {
+                throw std::system_error(errno, std::generic_category(),
+                                        "Cannot watch system calls");
+            }
+            work();
+        } catch (...) {
+            failure = std::current_exception();
+        }
+        isDone = true;
+    });
+    const UniqueFd reports = listener.get_future().get();
+    if (reports) {
+        watch.Serve(reports, isDone);
+    }
+    worker.join();
+    if (failure) {
+        std::rethrow_exception(failure);
+    }
+    return watch.run;
+}
+
+}  // namespace taviwireless::test
