@@ -4,6 +4,7 @@
 #include <poll.h>
 #include <seccomp.h>
 #include <signal.h>
+#include <sys/prctl.h>
 #include <sys/stat.h>
 #include <sys/syscall.h>
 #include <sys/uio.h>
@@ -16,13 +17,11 @@
 #include <fstream>
 #include <future>
 #include <map>
-#include <set>
 #include <sstream>
 #include <system_error>
 #include <thread>
 
 #include "base/unique_fd.h"
-#include "tests/support/files.h"
 
 namespace taviwireless::test {
 namespace {
@@ -37,12 +36,13 @@ constexpr char kOfPathsInFolders[] =
     "renameat2 unlinkat linkat symlinkat fchmodat fchownat utimensat inotify_add_watch";
 constexpr char kOfDescriptors[] =
     "read pread64 readv write pwrite64 writev fstat fstatfs getdents64 fsync fdatasync ftruncate "
-    "fchmod fchown flock fcntl ioctl close dup dup2 dup3 fchdir lseek connect bind listen accept4 "
-    "sendto sendmsg recvfrom recvmsg setsockopt getsockopt getsockname sendfile";
+    "fchmod fchown flock fcntl ioctl close dup dup2 dup3 fchdir connect bind listen accept4 "
+    "sendto sendmsg recvfrom recvmsg setsockopt getsockopt";
 constexpr char kOfOthers[] =
     "fork vfork clone clone3 pipe pipe2 socket socketpair memfd_create inotify_init1 eventfd2 kill "
-    "tgkill wait4 waitid setsid setpgid semget semop semtimedop semctl poll ppoll select pselect6 "
-    "clock_nanosleep getrandom uname setns unshare mount umount2 pidfd_open prctl";
+    "wait4 waitid semget semop semtimedop semctl poll ppoll select pselect6";
+
+constexpr unsigned kMark = 0x7461766b;  // an option that prctl() does not know
 
 enum class Subject { kPath, kPathInFolder, kDescriptor, kNone };
 
@@ -77,6 +77,7 @@ UniqueFd ReportCalls() {
     for (const auto& call : CountedCalls()) {
         seccomp_rule_add(filter.get(), SCMP_ACT_NOTIFY, call.first, 0);
     }
+    seccomp_rule_add(filter.get(), SCMP_ACT_NOTIFY, SYS_prctl, 1, SCMP_A0(SCMP_CMP_EQ, kMark));
     errno = -seccomp_load(filter.get());
     return UniqueFd(errno == 0 ? seccomp_notify_fd(filter.get()) : -1);
 }
@@ -115,6 +116,16 @@ std::string SubjectOf(const seccomp_notif& request, Subject subject) {
     return path;
 }
 
+pid_t ParentOf(pid_t process) {
+    std::ifstream file(ProcessFile(process, "stat"));
+    std::string text;
+    std::getline(file, text, '\0');
+    char state = 0;
+    pid_t parent = 0;
+    std::istringstream(text.substr(text.rfind(')') + 1)) >> state >> parent;
+    return parent;
+}
+
 // Where the loader of a process begins; 0 if there is none.
 uint64_t LoaderOf(pid_t process) {
     std::ifstream entries(ProcessFile(process, "auxv"));
@@ -129,7 +140,10 @@ uint64_t LoaderOf(pid_t process) {
 class Watch {
   public:
     Watch(const std::optional<Fault>& fault, const std::string& program) : fault_(fault) {
+        struct stat test {};
         stat(program.c_str(), &program_);
+        stat("/proc/self/exe", &test);
+        isOfTest_ = test.st_ino == program_.st_ino && test.st_dev == program_.st_dev;
     }
 
     // Answers until nobody is left who could ask, or those who are left were killed.
@@ -157,23 +171,37 @@ class Watch {
         if (seccomp_notify_receive(listener.Get(), &request) != 0) {
             return;  // its process was killed meanwhile
         }
-        seen_.insert(static_cast<pid_t>(request.pid));
         seccomp_notif_resp answer{request.id, 0, 0, SECCOMP_USER_NOTIF_FLAG_CONTINUE};
         if (IsCounted(request) && IsStruck(request)) {
             answer.flags = 0;
             answer.error = -fault_->error;
-            // One that fails closes the descriptor all the same.
-            if (fault_->call == "close" &&
-                Exists(ProcessFile(getpid(), "task/" + std::to_string(request.pid)))) {
-                close(static_cast<int>(request.data.args[0]));
-            }
         }
         seccomp_notify_respond(listener.Get(), &answer);
     }
 
     bool IsCounted(const seccomp_notif& request) {
-        struct stat program {};
         const auto process = static_cast<pid_t>(request.pid);
+        bool& counts = Counts(process);
+        if (request.data.nr == SYS_prctl) {
+            worker_ = worker_ == 0 ? process : worker_;  // it makes the first call
+            counts = request.data.args[1] != 0;
+            return false;
+        }
+        return counts && IsOfProgram(process, request.data.instruction_pointer);
+    }
+
+    // As its parent's do at first.
+    bool& Counts(pid_t process) {
+        const auto [counts, isNew] = counts_.try_emplace(process, !isOfTest_);
+        if (isNew && isOfTest_) {
+            const pid_t parent = ParentOf(process);
+            counts->second = counts_[parent == getpid() ? worker_ : parent];
+        }
+        return counts->second;
+    }
+
+    bool IsOfProgram(pid_t process, uint64_t instruction) {
+        struct stat program {};
         if (stat(ProcessFile(process, "exe").c_str(), &program) != 0 ||
             program.st_ino != program_.st_ino || program.st_dev != program_.st_dev) {
             loaders_.erase(process);
@@ -184,13 +212,13 @@ class Watch {
             loader->second = LoaderOf(process);
         }
         constexpr uint64_t kLoaderSize = 0x38000;
-        return request.data.instruction_pointer - loader->second >= kLoaderSize;
+        return instruction - loader->second >= kLoaderSize;
     }
 
     // Notes the call, and whether the fault is to befall it.
     bool IsStruck(const seccomp_notif& request) {
         const auto& [name, subject] = CountedCalls().at(request.data.nr);
-        const int number = ++counts_[name];
+        const int number = ++numbers_[name];
         run.calls.push_back({name, number, SubjectOf(request, subject)});
         if (!fault_ || name != fault_->call || number != fault_->number) {
             return false;
@@ -203,10 +231,10 @@ class Watch {
     }
 
     void KillLeft() {
-        for (const pid_t process : seen_) {
+        for (const auto& [process, counts] : counts_) {
             std::ifstream file(ProcessFile(process, "comm"));
             std::string name;
-            if (std::getline(file, name) && process != gettid()) {
+            if (std::getline(file, name) && process != worker_) {
                 kill(process, SIGKILL);
                 run.left.push_back(name);
             }
@@ -215,9 +243,11 @@ class Watch {
 
     std::optional<Fault> fault_;
     struct stat program_ {};
-    std::map<std::string, int> counts_;
+    bool isOfTest_;
+    pid_t worker_ = 0;
+    std::map<std::string, int> numbers_;
     std::map<pid_t, uint64_t> loaders_;
-    std::set<pid_t> seen_;
+    std::map<pid_t, bool> counts_;  // whether its calls do; all processes that were seen
 };
 
 }  // namespace
@@ -233,6 +263,7 @@ WatchedRun WatchCalls(const std::function<void()>& work, const std::optional<Fau
             UniqueFd reported = ReportCalls();
             const bool isWatched = static_cast<bool>(reported);
             listener.set_value(std::move(reported));
+            CountMyCalls(false);
             if (!isWatched) {
                 throw std::system_error(errno, std::generic_category(),
                                         "Cannot watch system calls");
@@ -252,6 +283,10 @@ WatchedRun WatchCalls(const std::function<void()>& work, const std::optional<Fau
         std::rethrow_exception(failure);
     }
     return watch.run;
+}
+
+void CountMyCalls(bool on) {
+    prctl(kMark, on);
 }
 
 }  // namespace taviwireless::test

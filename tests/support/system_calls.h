@@ -33,14 +33,17 @@ struct WatchedRun {
 // (seccomp's notifications), and so those of every process that is started.
 //
 // Counted are the calls that can fail and touch more than the process itself (see the table in the
-// source), of processes that run the program of this path, the test itself if none is given, and
-// that have not become another program, in the order in which they are made. Calls of the loader
-// are not counted. Memory is not among them.
+// source), in the order in which they are made, of processes that run the program of this path, the
+// test itself if none is given, and have not become another program. Calls of the loader are not
+// counted, nor, until it asks for it, those of the thread itself. Memory is not among them.
 //
 // An exception of the work is thrown again.
 WatchedRun WatchCalls(const std::function<void()>& work,
                       const std::optional<Fault>& fault = std::nullopt,
                       const std::string& program = "/proc/self/exe");
+
+// Within the work: whether calls of this thread, or forked process, are counted from now on.
+void CountMyCalls(bool on);
 
 }  // namespace taviwireless::test
 
