@@ -24,9 +24,9 @@ struct Fault {
 constexpr int kKill = 0;  // as an error
 
 struct WatchedRun {
-    std::vector<SystemCall> calls;  // up to the fault and after it
-    bool isStruck = false;          // the fault came about
-    std::vector<std::string> left;  // programs that were left running, and were killed
+    std::vector<SystemCall> calls;     // up to the fault and after it
+    std::optional<SystemCall> struck;  // what the fault befell
+    std::vector<std::string> left;     // programs that were left running, and were killed
 };
 
 // Does the work in a thread of its own, whose system calls the kernel reports to this function first
