@@ -1,13 +1,12 @@
 #include "dbus/usbmodem_methods.h"
 
-#include <unistd.h>
-
 #include <algorithm>
 #include <initializer_list>
 #include <optional>
 #include <string>
 #include <vector>
 
+#include "base/sleep_out.h"
 #include "base/split.h"
 #include "common/log.h"
 #include "dbus/usbmodem_documents.h"
@@ -100,15 +99,6 @@ gboolean AnswerDocument(USBModemObject* object, const char* devid, char** docume
     }
     *document = ToUTF8(describe(*modem));
     return TRUE;
-}
-
-// Sleeps, through signals. Returns whether there were any.
-bool SleepOut(unsigned int seconds) {
-    const unsigned int left = sleep(seconds);
-    for (unsigned int rest = left; rest > 0;) {
-        rest = sleep(rest);
-    }
-    return left > 0;
 }
 
 // The value as it can be shown: a long one is cut, a character that was cut in two made valid.

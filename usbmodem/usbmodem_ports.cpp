@@ -2,11 +2,11 @@
 #include <tavicore/file.h>
 #include <taviwireless/usbmodem.h>
 #include <taviwireless/usbmodem_atif.h>
-#include <unistd.h>
 
 #include <fstream>
 #include <sstream>
 
+#include "base/sleep_out.h"
 #include "base/split.h"
 #include "common/log.h"
 #include "usbmodem/info_file.h"
@@ -29,7 +29,7 @@ template <typename Assign, typename LogFailure>
 void Retry(Assign assign, LogFailure logFailure) {
     for (int attempt = 0; attempt < kAttempts && assign() != 0; ++attempt) {
         logFailure(attempt);
-        sleep(kAttemptPause);
+        SleepOut(kAttemptPause);
     }
 }
 

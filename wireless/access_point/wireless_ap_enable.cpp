@@ -4,13 +4,13 @@
 #include <tavicore/keyvalue.h>
 #include <tavicore/process.h>
 #include <taviwireless/wireless.h>
-#include <unistd.h>
 
 #include <cstdio>
 #include <optional>
 #include <utility>
 
 #include "base/fixed_field.h"
+#include "base/sleep_out.h"
 #include "common/log.h"
 #include "wireless/rules/bridge_names.h"
 #include "wireless/rules/dhcp.h"
@@ -192,7 +192,7 @@ bool WaitForChannels(const char* interface) {
             return true;
         }
         TAVI_LOG_ERROR("Wait for wireless interface '%s' ready (%d)", interface, i);
-        sleep(1);
+        SleepOut(1);
     }
     return false;
 }

@@ -3,11 +3,11 @@
 #include <tavicore/keyvalue.h>
 #include <tavisdk/service.h>
 #include <taviwireless/wireless.h>
-#include <unistd.h>
 
 #include <cstring>
 #include <string>
 
+#include "base/sleep_out.h"
 #include "base/trusted_file.h"
 #include "common/log.h"
 #include "wireless/rules/paths.h"
@@ -70,7 +70,7 @@ bool IsAssociated() {
 
 bool WaitForAssociation() {
     for (int i = 0; i < kPolls; ++i) {
-        sleep(1);
+        SleepOut(1);
         if (IsAssociated()) {
             return true;
         }

@@ -4,11 +4,11 @@
 #include <tavicore/process.h>
 #include <tavisdk/network.h>
 #include <taviwireless/wireless.h>
-#include <unistd.h>
 
 #include <cerrno>
 #include <string>
 
+#include "base/sleep_out.h"
 #include "common/log.h"
 #include "wireless/rules/paths.h"
 #include "wireless/rules/supplicant.h"
@@ -57,7 +57,7 @@ void StopDhcpClient(const std::string& interface) {
             break;
         }
         TAVI_LOG_ERROR("dhcpcd pid[%d] still exists, wait 1 second", pid);
-        sleep(1);
+        SleepOut(1);
     }
     if (pid >= 0) {
         VEXACSysUnlink(pidFile.c_str());

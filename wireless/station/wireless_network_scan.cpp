@@ -1,7 +1,6 @@
 // The networks in range, as this system's "iwlist" lists them: a table with one network per line.
 #include <tavisdk/network.h>
 #include <taviwireless/wireless.h>
-#include <unistd.h>
 
 #include <algorithm>
 #include <cctype>
@@ -12,6 +11,7 @@
 #include <string>
 #include <string_view>
 
+#include "base/sleep_out.h"
 #include "common/log.h"
 #include "wireless/system/guarded.h"
 #include "wireless/system/interface.h"
@@ -44,7 +44,7 @@ bool WaitForAdapter() {
             return false;
         }
         TAVI_LOG_ERROR("Wait for wlan0 ready, %d", tries);
-        sleep(1);
+        SleepOut(1);
     }
     return true;
 }
@@ -208,7 +208,7 @@ int Scan(int trigger, WirelessLink* networks) {
         TAVI_LOG_ERROR("Failed to activate network interface %s", interface);
         return -1;
     }
-    sleep(1);  // the adapter hears nothing before
+    SleepOut(1);  // the adapter hears nothing before
     if (trigger == 1) {
         const Command command(kCommandSize,
                               {"/sbin/iwlist ", interface, " scanning > /dev/null 2>&1"});

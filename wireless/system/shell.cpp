@@ -5,6 +5,7 @@
 #include <unistd.h>
 
 #include <cerrno>
+#include <memory>
 #include <utility>
 
 #include "base/spawn_settings.h"
@@ -32,6 +33,28 @@ int Wait(pid_t process) {
     while (waitpid(process, &status, 0) < 0 && errno == EINTR) {
     }
     return status;
+}
+
+// A stream that reads through signals: one of fdopen() takes a caught signal for the end.
+UniqueFile OpenForReading(UniqueFd descriptor) {
+    cookie_io_functions_t functions{};
+    functions.read = [](void* cookie, char* buffer, size_t size) {
+        ssize_t count = -1;
+        do {
+            count = read(static_cast<UniqueFd*>(cookie)->Get(), buffer, size);
+        } while (count < 0 && errno == EINTR);
+        return count;
+    };
+    functions.close = [](void* cookie) {
+        delete static_cast<UniqueFd*>(cookie);
+        return 0;
+    };
+    auto cookie = std::make_unique<UniqueFd>(std::move(descriptor));
+    UniqueFile file(fopencookie(cookie.get(), "r", functions));
+    if (file) {
+        cookie.release();
+    }
+    return file;
 }
 
 }  // namespace
@@ -82,9 +105,8 @@ Pipe::Pipe(const Command& command) {
     }
     UniquePipe ends;
     process_ = ends ? command.Start(Output::kShown, ends.writeEnd.Get()) : -1;
-    file_.reset(process_ >= 0 ? fdopen(ends.readEnd.Get(), "r") : nullptr);
-    if (file_) {
-        ends.readEnd.Release();
+    if (process_ >= 0) {
+        file_ = OpenForReading(std::move(ends.readEnd));
     }
 }
 

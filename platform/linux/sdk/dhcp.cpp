@@ -5,11 +5,12 @@
 #include <tavicore/keyvalue.h>
 #include <tavicore/process.h>
 #include <tavisdk/network.h>
-#include <unistd.h>
 
+#include <chrono>
 #include <csignal>
 #include <fstream>
 #include <string>
+#include <thread>
 
 #include "core/failure.h"
 #include "core/pid_file.h"
@@ -53,7 +54,7 @@ bool ClientRuns(const char* interface) {
 bool ClientSettles(const char* interface) {
     constexpr int kMostLooks = 200;
     for (int i = 0; i < kMostLooks && !ClientRuns(interface); ++i) {
-        usleep(10000);
+        std::this_thread::sleep_for(std::chrono::milliseconds(10));
     }
     return ClientRuns(interface);
 }
