@@ -1,7 +1,6 @@
 // The serial channel: opening, one command and its reply, and modems that misbehave.
 #include <sys/prctl.h>
 #include <sys/sem.h>
-#include <sys/time.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -274,27 +273,6 @@ TEST(Babble, ThatACommandSetsOffIsCutOffInItsReply) {
     std::string reply;
     EXPECT_TRUE(EndsWithin(8, [&] { EXPECT_EQ(modem.record.ModemCmd("AT+CSQ", reply), 0); }));
     EXPECT_TRUE(IsUnlocked());
-}
-
-TEST(Reply, IsWaitedForThroughSignals) {
-    const WholeWaits waits;
-    OpenedModem modem;
-    std::string reply;
-    struct sigaction caught {};
-    caught.sa_handler = [](int) {};
-    sigaction(SIGALRM, &caught, nullptr);
-    const itimerval never{};
-    const itimerval often{{0, 20000}, {0, 20000}};
-    for (const char* fault : {"slow=300", "pieces=9/60"}) {
-        SCOPED_TRACE(fault);
-        modem.simulator.Fault("1", "off");
-        modem.simulator.Fault("1", "noecho");
-        modem.simulator.Fault("1", fault);
-        setitimer(ITIMER_REAL, &often, nullptr);
-        EXPECT_EQ(modem.record.ModemCmd("AT+CSQ", reply), 0);
-        setitimer(ITIMER_REAL, &never, nullptr);
-        EXPECT_EQ(reply, "+CSQ: 17,99\nOK\n");
-    }
 }
 
 TEST(Unplugging, BetweenCommandsFailsThemQuicklyUntilThePortIsOpenedAnew) {
