@@ -3,6 +3,7 @@
 #include <fcntl.h>
 #include <sys/file.h>
 #include <sys/stat.h>
+#include <sys/time.h>
 #include <unistd.h>
 
 #include <cerrno>
@@ -17,16 +18,19 @@ namespace taviwireless::network {
 namespace {
 
 constexpr char kLockFile[] = "/var/run/rc.network.lock";
-constexpr unsigned int kPatience = 60;  // s; a restart takes a few
+constexpr time_t kPatience = 60;  // s; a restart takes a few
 
 bool LockInTime(int file) {
     struct sigaction action {};
     action.sa_handler = [](int) {};  // without SA_RESTART: it ends the wait
     sigaction(SIGALRM, &action, nullptr);
-    alarm(kPatience);
+    // And again every second: this process may be held up before it waits.
+    const itimerval patience{{1, 0}, {kPatience, 0}};
+    setitimer(ITIMER_REAL, &patience, nullptr);
     const bool isLocked = flock(file, LOCK_EX) == 0;
     const int reason = errno;
-    alarm(0);
+    const itimerval never{};
+    setitimer(ITIMER_REAL, &never, nullptr);
     errno = reason;
     return isLocked;
 }

@@ -27,7 +27,7 @@ constexpr int kUsage = 2;
 void KeepFromBeingInterrupted() {
     sigset_t signals;
     sigemptyset(&signals);
-    for (const int number : {SIGHUP, SIGINT, SIGTERM}) {
+    for (const int number : {SIGHUP, SIGINT, SIGTERM, SIGALRM}) {
         sigaddset(&signals, number);
     }
     sigprocmask(SIG_BLOCK, &signals, nullptr);
