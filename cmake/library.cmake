@@ -1,5 +1,5 @@
 # libtaviwireless.so.4: the product, linked from the object libraries of its folders.
-add_library(taviwireless SHARED)
+add_library(taviwireless SHARED cmake/record_layouts.cpp)
 target_link_libraries(taviwireless PRIVATE
   tavi_usbmodem tavi_dbus
   tavi_wireless_names tavi_wireless_adapter tavi_wireless_station tavi_wireless_access_point)

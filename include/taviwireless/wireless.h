@@ -10,7 +10,9 @@
  * - The name of an interface has 1 to 15 letters, digits, "_", "." and "-", of which the first is a
  *   letter or a digit; another text is a bad parameter. So is a null that the SDK gives for the
  *   wireless interface.
- * - Records are plain and may be zeroed with memset. Texts in them end in a zero byte.
+ * - Records are plain and may be zeroed with memset. Texts in them end in a zero byte. Their sizes
+ *   and the offsets of their members are given in bytes; of two numbers the first is for 32-bit
+ *   processors, the second for 64-bit ones. The library is not built where they are others.
  * - Lists are circular queues of links, as insque() knows them. The caller owns the head, which the
  *   functions make empty first, and the members: unlink each and free() it. Members are records of
  *   which `link` is a part; WIRELESS_RECORD gives the record.
@@ -81,7 +83,7 @@ typedef enum WirelessProtocol {
     WIRELESS_PROTOCOL_BN = 12
 } WirelessProtocol;
 
-/* An entry of the tables below. */
+/* An entry of the tables below. Size 8 or 16: name 0, value 4 or 8. */
 typedef struct WirelessNameValue {
     const char* name;
     int32_t value; /* of the enumeration that the table is for */
@@ -140,7 +142,10 @@ TAVIWIRELESS_API char* TAVIWirelessBssidStringGet(const unsigned char bssid[6], 
 
 /* ---- Records ---- */
 
-/* A place in a circular list: the list's head, or a part of a record that is in the list. */
+/*
+ * A place in a circular list: the list's head, or a part of a record that is in the list.
+ * Size 8 or 16: next 0, previous 4 or 8.
+ */
 typedef struct WirelessLink {
     struct WirelessLink* next;
     struct WirelessLink* previous;
@@ -157,7 +162,11 @@ typedef struct WirelessLink {
 /* Sizes of texts, their zero byte counted: an ESSID has 32 bytes at most. */
 enum { WIRELESS_ESSID_SIZE = 33, WIRELESS_KEY_SIZE = 257, WIRELESS_ADDRESS_SIZE = 20 };
 
-/* A network in range, or the network part of a saved one. */
+/*
+ * A network in range, or the network part of a saved one.
+ * Size 72 or 80: essid 0, bssid 33, channel 40, signal 44, opmode 48, protocol 52, auth 56,
+ * encrypt 60, link 64.
+ */
 typedef struct WirelessNetwork {
     char essid[WIRELESS_ESSID_SIZE];
     unsigned char bssid[6]; /* the access point's address; all zero: not known */
@@ -170,7 +179,11 @@ typedef struct WirelessNetwork {
     WirelessLink link;      /* in a list of networks */
 } WirelessNetwork;
 
-/* A saved network, and what connecting needs to know. */
+/*
+ * A saved network, and what connecting needs to know.
+ * Size 668 or 688: key 0, ipAddr 257, netmask 277, gateway 297, accessTime 320, network 324 or 328,
+ * link 396 or 408, anyBssid 404 or 424, user 408 or 428.
+ */
 typedef struct WirelessConf {
     char key[WIRELESS_KEY_SIZE];         /* pass phrase, WEP key or EAP password */
     char ipAddr[WIRELESS_ADDRESS_SIZE];  /* IPv4 address, or exactly "DHCP" */
@@ -195,7 +208,7 @@ enum {
     WIRELESS_STATUS_MASTER = 7 /* or monitor */
 };
 
-/* What TAVIWirelessStatusGet fills. */
+/* What TAVIWirelessStatusGet fills. Size 76 or 88: status 0, network 4 or 8. */
 typedef struct WirelessStatus {
     int32_t status;          /* WIRELESS_STATUS_... */
     WirelessNetwork network; /* of status 5 and 6, else zero */
@@ -302,7 +315,7 @@ enum {
     WIRELESS_INFO_OPMODE = 3,     /* WirelessOpmode */
     WIRELESS_INFO_CONN_STATUS = 4 /* WIRELESS_STATUS_... */
 };
-/* Room for any of them. */
+/* Room for any of them. Size 36, both members at 0. */
 typedef union WirelessInfo {
     char essid[WIRELESS_ESSID_SIZE];
     int32_t value;
@@ -408,7 +421,11 @@ enum { WIRELESS_AP_40_MHZ = 2 }; /* the bit of htFlags that allows channels of 4
 /* Sizes of texts, their zero byte counted. */
 enum { WIRELESS_AP_SSID_SIZE = 128, WIRELESS_AP_PASSPHRASE_SIZE = 256 };
 
-/* What a security kind needs; the kind says which member holds. */
+/*
+ * What a security kind needs; the kind says which member holds.
+ * Size 288, wepKey, wpa and enterprise at 0. wpa: wpaVersion 0, passphrase 4, cipher 260.
+ * enterprise: wpaVersion 0, cipher 4, radiusAddr 8, radiusPort 28, radiusSecret 32.
+ */
 typedef union WirelessAPSecret {
     char wepKey[27]; /* 5 or 13 characters, or 10 or 26 hexadecimal digits */
     struct {
@@ -425,7 +442,13 @@ typedef union WirelessAPSecret {
     } enterprise;
 } WirelessAPSecret;
 
-/* What hostapd is to serve: the main network, and on some models a second one for guests. */
+/*
+ * What hostapd is to serve: the main network, and on some models a second one for guests.
+ * Size 1028: ssid 0, bridge 128, hidden 144, band 148, ieee80211n 152, htFlags 156, channel 160,
+ * maxStations 164, wmm 168, security 172, secret 176, guestEnabled 464, guestSsid 468,
+ * guestBssid 596, guestHidden 724, guestMaxStations 728, guestIsolate 732, guestSecurity 736,
+ * guestSecret 740.
+ */
 typedef struct WirelessAPConf {
     char ssid[WIRELESS_AP_SSID_SIZE];
     char bridge[16];     /* interface that the access point joins */
@@ -461,7 +484,12 @@ TAVIWIRELESS_API int TAVIWirelessSetHostAPConf(const char* interface, const Wire
 
 enum { WIRELESS_AP_SCHEDULE_SIZE = 169 }; /* a character per hour of a week, '1' is on */
 
-/* The settings of one adapter; the file's keys are in quotes where they are not clear. */
+/*
+ * The settings of one adapter; the file's keys are in quotes where they are not clear.
+ * Size 1440: enabled 0, txPower 4, name 8, ap 40, unblock 1068, schedule 1072,
+ * scheduleEnabled 1244, guestSchedule 1248, guestScheduleEnabled 1420, guestLanBlock 1424,
+ * guestAccessServer 1428, guestInternetBlock 1432, guestAllowHttp 1436.
+ */
 typedef struct WirelessAPSettings {
     int32_t enabled; /* "enable": non-zero when the access point is switched on */
     int32_t txPower; /* stored only */

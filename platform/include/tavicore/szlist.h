@@ -13,6 +13,7 @@
 extern "C" {
 #endif
 
+/* Size 4: count 0. An implementation may keep more behind it. */
 typedef struct VEXACSzList {
     int count; /* number of strings; read only */
 } VEXACSzList;

@@ -3,6 +3,8 @@
  *
  * A failure sets the error code of <tavicore/error.h>: VEXAC_ERR_NOT_FOUND alone says that there
  * are no such settings; with any other code, they may be there and could not be read or written.
+ *
+ * Sizes of records and offsets of their members are in bytes, the same on every processor.
  */
 #ifndef TAVIWIRELESS_PLATFORM_INCLUDE_TAVISDK_BRIDGE_H
 #define TAVIWIRELESS_PLATFORM_INCLUDE_TAVISDK_BRIDGE_H
@@ -15,7 +17,7 @@
 extern "C" {
 #endif
 
-/* A bridge. */
+/* A bridge. Size 60: isLocal 0, name 4, address 20, netmask 40. */
 typedef struct TAVINetBridge {
     int isLocal; /* 1: a network of its own, with address and netmask; 0: part of the wired one */
     char name[TAVI_NET_IF_NAME_SIZE];
@@ -26,7 +28,10 @@ typedef struct TAVINetBridge {
 /* Kinds of members. */
 enum { TAVI_NET_MEMBER_WIRED = 2, TAVI_NET_MEMBER_WIRELESS = 3 };
 
-/* The first member of a bridge, which decides what kind of bridge it is. */
+/*
+ * The first member of a bridge, which decides what kind of bridge it is.
+ * Size 20: kind 0, interface 4.
+ */
 typedef struct TAVINetBridgeMember {
     int kind; /* TAVI_NET_MEMBER_... */
     char interface[TAVI_NET_IF_NAME_SIZE];
@@ -56,7 +61,11 @@ TAVI_SDK_API int TAVINetSetBridgeConfig(const TAVINetBridge* config,
  */
 TAVI_SDK_API int VEXANetBridgeSlaveEnum(const char* bridge, VEXACSzList** list);
 
-/* The DHCP service on a bridge. */
+/*
+ * The DHCP service on a bridge.
+ * Size 144: enabled 0, reserved 4, leaseTime 8, rangeStart 12, rangeEnd 32, interface 52,
+ * bridge 68, gateway 84, nameServer 104, netmask 124.
+ */
 typedef struct TAVINetDhcpServer {
     int enabled;   /* 1: the network script runs it */
     int reserved;  /* the appliance stores 30 here; it means nothing to the host edition */

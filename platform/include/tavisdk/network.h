@@ -4,6 +4,8 @@
  * A failure sets the error code of <tavicore/error.h>: VEXAC_ERR_BAD_PARAMETER for a null argument
  * or text that is no address, VEXAC_ERR_NOT_FOUND when there is nothing to give, VEXAC_ERR_TOO_LONG
  * when it does not fit, otherwise VEXAC_ERR_IO.
+ *
+ * Sizes of records and offsets of their members are in bytes, the same on every processor.
  */
 #ifndef TAVIWIRELESS_PLATFORM_INCLUDE_TAVISDK_NETWORK_H
 #define TAVIWIRELESS_PLATFORM_INCLUDE_TAVISDK_NETWORK_H
@@ -17,6 +19,7 @@ extern "C" {
 
 enum { TAVI_NET_ADDRESS_SIZE = 20 }; /* an IPv4 address as text, and its zero byte */
 
+/* Size 20: address 0. */
 typedef struct TAVINetIFInfo {
     char address[TAVI_NET_ADDRESS_SIZE]; /* the local one, also of a point-to-point link */
 } TAVINetIFInfo;
@@ -71,6 +74,7 @@ enum {
     VEXA_NET_LINK_CONNECTED = 2   /* up, with a carrier */
 };
 
+/* Size 20: name 0, linkState 16. */
 typedef struct VEXANetInterfaceInfo {
     char name[TAVI_NET_IF_NAME_SIZE];
     int linkState; /* VEXA_NET_LINK_... */
@@ -82,7 +86,7 @@ typedef struct VEXANetInterfaceInfo {
  */
 TAVI_SDK_API int VEXANetGetInterfaceInfo(VEXANetInterfaceInfo* interfaces, int max, int kind);
 
-/* The IPv4 settings of an interface. */
+/* The IPv4 settings of an interface. Size 60: interface 0, isStatic 16, address 20, netmask 40. */
 typedef struct TAVINetCard {
     char interface[TAVI_NET_IF_NAME_SIZE];
     int isStatic; /* 0: by DHCP */
