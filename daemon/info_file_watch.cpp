@@ -54,7 +54,7 @@ bool InfoFileWatch::ReadEvents() {
     bool hasChanged = false;
     for (ssize_t size; (size = read(handle_.Get(), buffer, sizeof buffer)) > 0;) {
         for (const char* next = buffer; next < buffer + size;) {
-            const auto& event = *reinterpret_cast<const inotify_event*>(next);
+            const auto& event = *static_cast<const inotify_event*>(static_cast<const void*>(next));
             hasChanged = hasChanged || Concerns(event);
             next += sizeof event + event.len;
         }

@@ -149,7 +149,7 @@ void RunControl(Simulator& simulator, int stop) {
         if (count <= 0) {
             return;
         }
-        typed.append(buffer, count);
+        typed.append(buffer, static_cast<size_t>(count));
         for (size_t end; (end = typed.find('\n')) != std::string::npos;) {
             std::cout << control.Execute(typed.substr(0, end)) << std::flush;
             typed.erase(0, end + 1);

@@ -121,7 +121,7 @@ void ReadSettings(const Json::Value& settings, const std::string& place, Command
     for (const auto& name : Object(settings, place).getMemberNames()) {
         const Json::Value& value = settings[name];
         if (value.isInt() && value.asInt() > 0) {
-            rule->setToArgument[name] = value.asInt();
+            rule->setToArgument[name] = value.asUInt();
         } else if (value.isString()) {
             rule->setToText[name] = value.asString();
         } else {

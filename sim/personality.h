@@ -17,7 +17,7 @@ struct CommandRule {
     SimNeed needs = SimNeed::kNothing;
     Effect effect = Effect::kNone;
     // Variables that the command sets, each to the argument of that number (from 1) ...
-    std::map<std::string, int> setToArgument;
+    std::map<std::string, size_t> setToArgument;
     std::map<std::string, std::string> setToText;  // ... or to this text
 };
 

@@ -45,7 +45,8 @@ void OpenWatch::ReadEvents() {
     alignas(inotify_event) char buffer[4096];
     for (ssize_t size; (size = read(inotify_.Get(), buffer, sizeof buffer)) > 0;) {
         for (ssize_t at = 0; at < size;) {
-            const auto* event = reinterpret_cast<const inotify_event*>(buffer + at);
+            const void* const next = buffer + at;
+            const auto* event = static_cast<const inotify_event*>(next);
             const auto file = files_.find(event->wd);
             if (file != files_.end()) {
                 file->second.news = true;
@@ -168,7 +169,7 @@ SerialLine::Input SerialLine::Read() {
     char buffer[4096];
     ssize_t count;
     while ((count = read(modemEnd_.Get(), buffer, sizeof buffer)) > 0) {
-        input.bytes.append(buffer, count);
+        input.bytes.append(buffer, static_cast<size_t>(count));
     }
     if (isGiven_) {
         input.isHungUp = count == 0 || (errno != EAGAIN && errno != EINTR);
@@ -211,7 +212,7 @@ void SerialLine::Restart() {
 
 size_t SerialLine::Write(const std::string& bytes) {
     const ssize_t count = write(modemEnd_.Get(), bytes.data(), bytes.size());
-    return count > 0 ? count : 0;
+    return count > 0 ? static_cast<size_t>(count) : 0;
 }
 
 }  // namespace taviwireless::sim

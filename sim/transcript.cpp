@@ -14,7 +14,8 @@ namespace {
 
 std::string Visible(const std::string& bytes) {
     std::string visible;
-    for (const unsigned char c : bytes) {
+    for (const char byte : bytes) {
+        const auto c = static_cast<unsigned char>(byte);
         char code[5];
         if (c == '\r' || c == '\n') {
             visible += c == '\r' ? "\\r" : "\\n";

@@ -38,7 +38,7 @@ Input Receive(WvModem& modem, milliseconds patience, std::string& text) {
     const auto deadline = Clock::now() + patience;
     while (modem.isok()) {
         const auto left = std::chrono::ceil<milliseconds>(deadline - Clock::now());
-        const time_t wait = std::max(left, milliseconds::zero()).count();
+        const auto wait = static_cast<time_t>(std::max(left, milliseconds::zero()).count());
         if (modem.select(wait, /*readable=*/true, /*writable=*/false)) {
             char buffer[kMaxReply];
             const size_t count = modem.read(buffer, kMaxReply - text.size());

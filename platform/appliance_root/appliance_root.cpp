@@ -45,7 +45,7 @@ constexpr char kNamespacesRefused[] =
 
 void WriteMap(const char* path, const std::string& text) {
     std::ofstream file(path);
-    if (!file.write(text.data(), text.size()).flush()) {
+    if (!(file << text << std::flush)) {
         Fail(std::string("cannot write ") + path);
     }
 }

@@ -138,9 +138,10 @@ std::optional<std::string> Process::ReadLine(Milliseconds patience) {
         if (atEnd_) {
             return unread_.empty() ? std::nullopt : std::optional(std::exchange(unread_, {}));
         }
-        const auto left = std::chrono::ceil<Milliseconds>(deadline - Clock::now()).count();
+        const auto left = std::chrono::ceil<Milliseconds>(deadline - Clock::now());
         pollfd readable{output_.Get(), POLLIN, 0};
-        if (poll(&readable, 1, static_cast<int>(std::max(left, 0L))) > 0) {
+        if (poll(&readable, 1, static_cast<int>(std::max(left, Milliseconds::zero()).count())) >
+            0) {
             atEnd_ = !ReadMore(output_.Get(), &unread_);
         } else if (Clock::now() >= deadline) {
             return std::nullopt;

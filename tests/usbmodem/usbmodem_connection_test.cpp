@@ -149,7 +149,8 @@ TEST(Dialling, TheDiallerHasNothingOfItsCallersAndLeavesNoZombie) {
     EXPECT_THAT(descriptors, testing::Not(HasSubstr("pipe:")));
     EXPECT_EQ(FileMode(kLog), 0600u);  // from the start, not changed to it
     char events[4096] = {};
-    const std::string_view changed(events, std::max(read(changes, events, sizeof events), 0L));
+    const std::string_view changed(events,
+                                   std::max<ssize_t>(read(changes, events, sizeof events), 0));
     EXPECT_THAT(changed, HasSubstr("usbmodem.profile"));
     EXPECT_THAT(changed, testing::Not(HasSubstr("wvdial.log")));
     close(changes);

@@ -49,8 +49,8 @@ std::optional<std::string> WepKeyValue(const std::string& key) {
 }
 
 bool IsKey(Security security, const std::string& key) {
-    const bool isText =
-        std::all_of(key.begin(), key.end(), [security](char c) { return IsAllowed(security, c); });
+    const bool isText = std::all_of(key.begin(), key.end(),
+                                    [security](unsigned char c) { return IsAllowed(security, c); });
     switch (security) {
         case Security::kWEP:
             return isText && (IsWepText(key) || (IsWepHexadecimal(key) &&

@@ -48,7 +48,8 @@ std::optional<ScanResult> ReadScanResult(nlattr* described) {
     network.signalPercent = ValueOr<uint8_t>(bss[NL80211_BSS_SIGNAL_UNSPEC], 0);
     network.isPrivate = (ValueOr<uint16_t>(bss[NL80211_BSS_CAPABILITY], 0) & kPrivacy) != 0;
     if (const nlattr* elements = bss[NL80211_BSS_INFORMATION_ELEMENTS]) {
-        network.elements.assign(static_cast<const char*>(nla_data(elements)), nla_len(elements));
+        network.elements.assign(static_cast<const char*>(nla_data(elements)),
+                                static_cast<size_t>(nla_len(elements)));
     }
     return network;
 }

@@ -130,7 +130,8 @@ bool FileLock::Open() {
     file_ = UniqueFd(openat(folder, name_.c_str(), O_CREAT | O_EXCL | kCarefully, 0600));
     if (file_) {
         // So that the owner of the folder can take over what a killed root leaves; only root can.
-        [[maybe_unused]] const int result = fchown(file_.Get(), place_.owner, -1);
+        constexpr gid_t kSameGroup = static_cast<gid_t>(-1);
+        [[maybe_unused]] const int result = fchown(file_.Get(), place_.owner, kSameGroup);
         return true;
     }
     const bool isThere = errno == EEXIST;

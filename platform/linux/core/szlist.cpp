@@ -51,7 +51,7 @@ const char* VEXACSzListGet(const VEXACSzList* list, int index) {
         if (index < 0 || index >= list->count) {
             throw Failure{VEXAC_ERR_NOT_FOUND};
         }
-        return Whole(list).strings[index].c_str();
+        return Whole(list).strings[static_cast<size_t>(index)].c_str();
     });
 }
 

@@ -22,7 +22,7 @@ void WriteAll(int descriptor, std::string_view text) {
         if (count < 0 && errno != EINTR) {
             throw Failure{VEXAC_ERR_IO};
         }
-        text.remove_prefix(count > 0 ? count : 0);
+        text.remove_prefix(count > 0 ? static_cast<size_t>(count) : 0);
     }
 }
 
@@ -127,7 +127,8 @@ TextFile::TextFile(const Place& place)
 
 std::string TextFile::Read() const {
     std::string text;
-    size_t end = status_.st_size + 1;  // one byte more than expected, so that the end shows
+    // One byte more than expected, so that the end shows.
+    size_t end = static_cast<size_t>(status_.st_size) + 1;
     for (;;) {
         text += Read(text.size(), end);
         if (text.size() < end) {
@@ -149,7 +150,7 @@ std::string TextFile::Read(size_t begin, size_t end) const {
         if (count == 0) {
             break;
         }
-        length += count > 0 ? count : 0;
+        length += count > 0 ? static_cast<size_t>(count) : 0;
     }
     text.resize(length);
     return text;

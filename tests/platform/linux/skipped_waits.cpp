@@ -48,7 +48,8 @@ TAKEN_OVER int usleep(useconds_t microseconds) {
         skipped += nanoseconds;
         return 0;
     }
-    const timespec time{nanoseconds / kNanosecondsPerSecond, nanoseconds % kNanosecondsPerSecond};
+    const timespec time{static_cast<time_t>(nanoseconds / kNanosecondsPerSecond),
+                        static_cast<long>(nanoseconds % kNanosecondsPerSecond)};
     return nanosleep(&time, nullptr);
 }
 
