@@ -31,7 +31,7 @@ int TAVIUSBModemEnumIf(VEXACSzList** list) {
     for (const char* path : paths) {
         const char* number = path + std::strlen(kInterfaces) - 1;
         char* end = nullptr;
-        const long unit = std::strtol(number, &end, 10);
+        const long long unit = std::strtoll(number, &end, 10);
         if (end == number) {
             TAVI_LOG_DEBUG("Failed to parse usbmodem id [%s], errno=%s", path, strerror(errno));
         } else if (unit >= kFirstModemUnit) {

@@ -10,12 +10,12 @@
 #include <cerrno>
 #include <csignal>
 #include <cstdio>
-#include <cstdlib>
 #include <optional>
 #include <string>
 
 #include "base/trusted_file.h"
 #include "usbmodem/rules/paths.h"
+#include "usbmodem/text.h"
 
 namespace {
 
@@ -44,7 +44,7 @@ std::optional<pid_t> Holder(const char* path) {
     if (!text) {
         return std::nullopt;
     }
-    return static_cast<pid_t>(std::strtol(text->c_str(), nullptr, 10));
+    return taviwireless::usbmodem_lib::ToInt(*text);
 }
 
 // Whether the lock file is there and counts. One that names no process may still be in the making,

@@ -28,7 +28,7 @@ class Reader {
     }
     void Number(const std::string& key, int32_t& field, int32_t otherwise) const {
         const char* value = values_[key.c_str()];
-        field = value != nullptr ? static_cast<int32_t>(strtol(value, nullptr, 10)) : otherwise;
+        field = value != nullptr ? static_cast<int32_t>(strtoll(value, nullptr, 10)) : otherwise;
     }
     template <size_t kSize>
     void Text(const std::string& key, char (&field)[kSize], const std::string& otherwise) const {
