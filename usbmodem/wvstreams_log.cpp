@@ -1,30 +1,30 @@
-// A file of its own because clang cannot read the header that it includes.
 #include "usbmodem/wvstreams_log.h"
 
 #include <syslog.h>
-#include <wvlogrcv.h>
+#include <wvlog.h>
 
 #include <string>
 
+#include "base/split.h"
 #include "common/log.h"
 
 namespace taviwireless::usbmodem_lib {
 
 namespace {
 
-// WvStreams has a receiver for the system log, but that one opens the log anew for each line, and
-// so changes where the messages of the whole program go.
-class ToSystemLog : public WvLogRcv {
+// WvStreams has receivers of its own: the one for the system log opens that anew for each line, and
+// so changes where the messages of the whole program go; clang cannot read the header of the others.
+class ToSystemLog : public WvLogRcvBase {
   protected:
-    void _mid_line(const char* text, size_t size) override { line_.append(text, size); }
-    void _end_line() override {
-        MakePrintable(line_.data());
-        syslog(LOG_DEBUG, "WvStreams: %s", line_.c_str());
-        line_.clear();
+    void log(WvStringParm, int level, const char* text, size_t size) override {
+        if (level >= WvLog::Debug) {
+            return;  // about settings of a serial port that no pseudo-terminal has, for example
+        }
+        for (std::string line : Lines(std::string(text, size))) {
+            MakePrintable(line.data());
+            syslog(LOG_DEBUG, "WvStreams: %s", line.c_str());
+        }
     }
-
-  private:
-    std::string line_;
 };
 
 }  // namespace
