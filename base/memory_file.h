@@ -1,20 +1,30 @@
 #ifndef TAVIWIRELESS_BASE_MEMORY_FILE_H
 #define TAVIWIRELESS_BASE_MEMORY_FILE_H
 
-#include <sys/mman.h>
+#include <fcntl.h>
+#include <linux/memfd.h>
 #include <unistd.h>
 
+#include <cstdlib>
 #include <string>
 
+#include "base/kernel_calls.h"
 #include "base/unique_fd.h"
 
 namespace taviwireless {
 
 // Makes a file that is in no folder, so that nobody else can open it and it is gone with its last
 // descriptor. It holds this text and is read from its beginning. Without a descriptor, errno tells
-// why.
+// why. Before Linux 3.17 it is a file of "/tmp/" that was removed at once.
 inline UniqueFd MemoryFile(const std::string& text = "") {
-    UniqueFd file(memfd_create("memory file", MFD_CLOEXEC));
+    UniqueFd file(static_cast<int>(syscall(kMemfdCreate, "memory file", MFD_CLOEXEC)));
+    if (!file) {
+        char path[] = "/tmp/.memory-file-XXXXXX";
+        file = UniqueFd(mkostemp(path, O_CLOEXEC));
+        if (file) {
+            unlink(path);
+        }
+    }
     const auto size = static_cast<ssize_t>(text.size());
     if (file && pwrite(file.Get(), text.data(), text.size(), 0) != size) {
         file.Close();

@@ -8,7 +8,10 @@
 #include <unistd.h>
 
 #include <cerrno>
+#include <filesystem>
 #include <new>
+#include <string>
+#include <system_error>
 
 namespace taviwireless {
 
@@ -43,11 +46,10 @@ class SpawnSettings {
     void OpenNothing(int descriptor) {
         Require(posix_spawn_file_actions_addopen(&actions_, descriptor, "/dev/null", O_RDWR, 0));
     }
-    void StartInRootFolder() { Require(posix_spawn_file_actions_addchdir_np(&actions_, "/")); }
+    // Where the C library cannot do that (glibc before 2.29), it starts where the caller is.
+    void StartInRootFolder() { Require(AddChdir(&actions_, "/", 0)); }
     // Comes last.
-    void InheritNothingElse() {
-        Require(posix_spawn_file_actions_addclosefrom_np(&actions_, STDERR_FILENO + 1));
-    }
+    void InheritNothingElse() { Require(AddCloseFrom(&actions_, STDERR_FILENO + 1, 0)); }
 
     // Runs a program, which is looked for along PATH when it has no slash, with these arguments,
     // the first of which is its name. Returns the process; negative, with errno, when there is
@@ -57,6 +59,36 @@ class SpawnSettings {
         errno = posix_spawnp(&process, program, &actions_, &attributes_,
                              const_cast<char* const*>(arguments), environ);
         return errno == 0 ? process : -1;
+    }
+
+    // Each of these calls is the C library's where that has it, and else what does for it. The last
+    // argument, which is 0, prefers the former; 0L asks for the latter.
+    template <class Actions>
+    static auto AddChdir(Actions* actions, const char* folder, int)
+        -> decltype(posix_spawn_file_actions_addchdir_np(actions, folder)) {
+        return posix_spawn_file_actions_addchdir_np(actions, folder);
+    }
+    template <class Actions>
+    static int AddChdir(Actions*, const char*, long) {
+        return 0;
+    }
+    template <class Actions>
+    static auto AddCloseFrom(Actions* actions, int first, int)
+        -> decltype(posix_spawn_file_actions_addclosefrom_np(actions, first)) {
+        return posix_spawn_file_actions_addclosefrom_np(actions, first);
+    }
+    // Closes what is open now: what another thread opens meanwhile has to close itself.
+    template <class Actions>
+    static int AddCloseFrom(Actions* actions, int first, long) {
+        std::error_code none;  // without "/proc" nothing is closed
+        int error = 0;
+        for (const auto& entry : std::filesystem::directory_iterator("/proc/self/fd", none)) {
+            const int descriptor = std::stoi(entry.path().filename());
+            if (descriptor >= first && error == 0) {
+                error = posix_spawn_file_actions_addclose(actions, descriptor);
+            }
+        }
+        return error;
     }
 
   private:

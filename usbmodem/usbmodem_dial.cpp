@@ -12,9 +12,9 @@
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
-#include <filesystem>
 #include <vector>
 
+#include "base/close_all_from.h"
 #include "base/unique_pipe.h"
 #include "common/log.h"
 #include "usbmodem/profile_value.h"
@@ -33,20 +33,6 @@ constexpr char kBaud[] = "Baud=460800";
 
 std::string OrElse(const std::string& value, const char* standard) {
     return value.empty() ? standard : value;
-}
-
-// As close_range does, which older kernels lack.
-void CloseAllFrom(int first) {
-    std::vector<int> descriptors;
-    std::error_code none;  // without "/proc" nothing can be closed
-    for (const auto& entry : std::filesystem::directory_iterator("/proc/self/fd", none)) {
-        descriptors.push_back(std::stoi(entry.path().filename()));
-    }
-    for (const int descriptor : descriptors) {
-        if (descriptor >= first) {
-            close(descriptor);
-        }
-    }
 }
 
 // In the child of BackgroundExec: becomes the dialler, or aborts. Closing hasPidFile tells the

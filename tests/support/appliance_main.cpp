@@ -1,5 +1,6 @@
 // main() of the test programs that touch system paths: every case runs in an appliance root. What
-// has to come out of it, such as a report, goes to the folder that TAVI_TEST_OUTPUT names.
+// has to come out of it, such as a report, goes to the folder that TAVI_TEST_OUTPUT names. With
+// TAVI_TEST_OLD_KERNEL in the environment the cases run on a kernel as old as Linux 3.10.
 #include <gmock/gmock.h>
 
 #include <cstdio>
@@ -8,6 +9,7 @@
 #include <exception>
 
 #include "platform/appliance_root/appliance_root.h"
+#include "tests/support/old_kernel.h"
 
 namespace {
 
@@ -28,6 +30,9 @@ int main(int argc, char** argv) {
         try {
             const char* output = getenv("TAVI_TEST_OUTPUT");
             taviwireless::EnterApplianceRoot(output != nullptr ? output : "");
+            if (getenv("TAVI_TEST_OLD_KERNEL") != nullptr) {
+                taviwireless::test::RefuseNewerCalls();
+            }
         } catch (const std::exception& error) {
             fprintf(stderr, "%s\n", error.what());
             return taviwireless::kApplianceRootFailed;

@@ -1,6 +1,5 @@
 #include "tests/support/files.h"
 
-#include <sys/mman.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
@@ -10,7 +9,7 @@
 #include <iterator>
 #include <system_error>
 
-#include "base/unique_fd.h"
+#include "base/memory_file.h"
 
 namespace taviwireless::test {
 namespace {
@@ -75,7 +74,7 @@ bool Exists(const std::string& path) {
 }
 
 bool HasStranger() {
-    const UniqueFd file(memfd_create("", 0));
+    const UniqueFd file = MemoryFile();
     return fchown(file.Get(), 65534, -1) == 0;
 }
 

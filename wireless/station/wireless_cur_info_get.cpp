@@ -60,7 +60,7 @@ std::optional<int> KeyState() {
         TAVI_LOG_ERROR("Failed to request auth.");
         return std::nullopt;
     }
-    explicit_bzero(key, sizeof key);
+    std::fill_n(static_cast<volatile char*>(key), sizeof key, '\0');  // for certain
     const iw_point& encoding = argument.u.encoding;
     const bool isOff = (encoding.flags & IW_ENCODE_DISABLED) != 0 || encoding.length == 0;
     return isOff ? kNoKey : kKeyIsSet;

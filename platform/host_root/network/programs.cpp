@@ -1,23 +1,20 @@
 #include "platform/host_root/network/programs.h"
 
 #include <fcntl.h>
-#include <poll.h>
 #include <sys/stat.h>
 #include <sys/wait.h>
 #include <tavicore/process.h>
 #include <unistd.h>
 
-extern "C" {  // its declarations forget that
-#include <sys/pidfd.h>
-}
-
 #include <cerrno>
+#include <chrono>
 #include <csignal>
 #include <cstring>
 #include <fstream>
 #include <iterator>
 
 #include "base/memory_file.h"
+#include "base/process_handle.h"
 #include "base/spawn_settings.h"
 #include "platform/host_root/network/error.h"
 
@@ -47,9 +44,7 @@ pid_t Spawn(const std::vector<std::string>& argv, int output) {
 
 // Whether it ends in time, with exit status 0.
 bool EndsWell(pid_t pid, int limit) {
-    const UniqueFd process(pidfd_open(pid, 0));
-    pollfd end{process.Get(), POLLIN, 0};
-    const bool inTime = process && poll(&end, 1, limit * 1000) == 1;
+    const bool inTime = ProcessHandle(pid).AwaitEnd(std::chrono::seconds(limit));
     if (!inTime) {
         kill(-pid, SIGKILL);
     }

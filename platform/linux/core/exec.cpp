@@ -1,3 +1,4 @@
+#include <fcntl.h>
 #include <signal.h>
 #include <sys/wait.h>
 #include <tavicore/process.h>
@@ -7,6 +8,7 @@
 #include <cstdarg>
 #include <vector>
 
+#include "base/close_all_from.h"
 #include "base/spawn_settings.h"
 #include "child_report.h"
 #include "failure.h"
@@ -14,6 +16,7 @@
 namespace {
 
 using namespace tavicore;
+using taviwireless::CloseAllFrom;
 using taviwireless::SpawnSettings;
 
 constexpr int kFirstPrivateDescriptor = 3;
@@ -31,8 +34,10 @@ constexpr int kKilled = -2;
     sigprocmask(SIG_SETMASK, &all,
                 nullptr);  // the caller's handlers are not meant for this process
     signal(SIGCHLD, SIG_DFL);
+    // Nothing of the caller's is kept open, by this process or by the program.
     dup2(writeEnd, kFirstPrivateDescriptor);
-    closefrom(kFirstPrivateDescriptor + 1);  // nothing of the caller's is kept open by this process
+    fcntl(kFirstPrivateDescriptor, F_SETFD, FD_CLOEXEC);
+    CloseAllFrom(kFirstPrivateDescriptor + 1);
 
     int told = kNotRun;
     const pid_t child = settings.Spawn(program, arguments);
@@ -58,7 +63,6 @@ int VEXACExec(const char* program, ...) {
 
         SpawnSettings settings;
         settings.OpenNothing(STDIN_FILENO);
-        settings.InheritNothingElse();
         ChildReport report;
         const pid_t between = fork();
         if (between == 0) {

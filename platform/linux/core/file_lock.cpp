@@ -56,9 +56,10 @@ void PutWaiterMark(int file) {
     fcntl(file, F_OFD_SETLK, &mark);
 }
 
+// Always true where the kernel has no such marks (before Linux 3.15).
 bool IsAwaited(int file) {
     struct flock mark = Mark(kWaiterMark, F_WRLCK);
-    return fcntl(file, F_OFD_GETLK, &mark) == 0 && mark.l_type != F_UNLCK;
+    return fcntl(file, F_OFD_GETLK, &mark) != 0 || mark.l_type != F_UNLCK;
 }
 
 std::string ProgramOf(pid_t pid) {

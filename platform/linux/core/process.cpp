@@ -2,18 +2,13 @@
 #include <sys/wait.h>
 #include <tavicore/process.h>
 
-#include "base/unique_fd.h"
+#include "base/process_handle.h"
 #include "child_report.h"
 #include "failure.h"
 #include "pid_file.h"
 
-// glibc 2.36 does not declare these as C functions itself.
-extern "C" {
-#include <sys/pidfd.h>
-}
-
 using namespace tavicore;
-using taviwireless::UniqueFd;
+using taviwireless::ProcessHandle;
 
 pid_t VEXACProcForkChildNoWait() {
     return Guarded(-1, [] {
@@ -56,14 +51,12 @@ int VEXACProcAliveByPidFile(const char* file) {
 int VEXACProcSignalByPidFile(const char* file, int signal) {
     return Guarded(-1, [&] {
         const PidFile process = ReadPidFile(file);
-        // Opened before it is looked at: from here on the descriptor means this very process, even
-        // when that ends and its number is used again.
-        const UniqueFd descriptor(process.pid > 0 ? pidfd_open(process.pid, 0) : -1);
-        if (!descriptor) {
+        const ProcessHandle handle(process.pid);  // before it is looked at
+        if (!handle) {
             throw Failure{VEXAC_ERR_NOT_FOUND};
         }
         RequireAlive(process);
-        if (pidfd_send_signal(descriptor.Get(), signal, nullptr, 0) != 0) {
+        if (handle.Signal(signal) != 0) {
             throw Failure{errno == ESRCH ? VEXAC_ERR_NOT_FOUND : VEXAC_ERR_IO};
         }
         return 0;

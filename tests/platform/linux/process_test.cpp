@@ -6,6 +6,7 @@
 #include <tavicore/process.h>
 #include <unistd.h>
 
+#include "base/spawn_settings.h"
 #include "tests/support/descriptors.h"
 #include "tests/support/files.h"
 #include "tests/support/wait.h"
@@ -96,6 +97,17 @@ TEST(Exec, TheProgramInheritsNoDescriptorAndNoIgnoredSignal) {
               -1);
     signal(SIGTERM, SIG_DFL);
     EXPECT_EQ(ReadFile("/tmp/fds"), "0\n1\n2\n3\n");  // 3 is the one that ls reads
+
+    posix_spawn_file_actions_t actions;  // the same where the C library cannot close them all
+    posix_spawn_file_actions_init(&actions);
+    ASSERT_EQ(SpawnSettings::AddCloseFrom(&actions, STDERR_FILENO + 1, 0L), 0);
+    const char* command[] = {"sh", "-c", "ls /proc/self/fd > /tmp/fds-of-old", nullptr};
+    pid_t child = -1;
+    ASSERT_EQ(posix_spawnp(&child, "sh", &actions, nullptr, const_cast<char**>(command), environ),
+              0);
+    posix_spawn_file_actions_destroy(&actions);
+    EXPECT_EQ(waitpid(child, nullptr, 0), child);
+    EXPECT_EQ(ReadFile("/tmp/fds-of-old"), ReadFile("/tmp/fds"));
     close(leak);
 }
 
