@@ -5,6 +5,7 @@
 
 #include "cli/command_error.h"
 #include "wireless/rules/paths.h"
+#include "wireless/system/flag_file.h"
 #include "wireless/system/interface.h"
 
 namespace taviwireless::cli {
@@ -49,6 +50,15 @@ void RequireRadio() {
                                          " does not name the adapter, or its section in " +
                                          wireless::kAPSettings + " has no unblock");
     }
+}
+
+void RequireNobodyJoins() {
+    if (!wireless::FlagFile::IsRaised(wireless::kConnectingFlag)) {
+        return;
+    }
+    const wireless::FlagFile lowered(wireless::kConnectingFlag);
+    throw CommandError(kBusy,
+                       "a network is being joined already; if that was interrupted, try again");
 }
 
 }  // namespace taviwireless::cli

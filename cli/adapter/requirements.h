@@ -17,6 +17,9 @@ void RequireAdapter();
 // Throws unless the radio may be used: if it may not, the library's functions succeed and do
 // nothing.
 void RequireRadio();
+// Throws when somebody joins a network, and lets the next one pass: an attempt that was killed
+// cannot be told from one that goes on, and the library refuses once as well.
+void RequireNobodyJoins();
 
 }  // namespace taviwireless::cli
 

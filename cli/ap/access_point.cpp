@@ -15,6 +15,7 @@
 #include "cli/terminal.h"
 #include "wireless/rules/ap_settings.h"
 #include "wireless/rules/paths.h"
+#include "wireless/system/ap_store.h"
 #include "wireless/system/bridge.h"
 #include "wireless/system/shell.h"
 
@@ -59,10 +60,6 @@ void RequireStored(bool isDone) {
         throw CommandError(kFailure, std::string("cannot store the settings in ") + kAPSettings +
                                          "; the system log tells why");
     }
-}
-
-void Store(const WirelessAPSettings& settings) {
-    RequireStored(TAVIWirelessSetAPConfig(&settings) == 1);
 }
 
 // Stores whether the access point is on, and changes nothing else in the file.
@@ -151,13 +148,10 @@ void StoreAPSettings(WirelessAPSettings settings) {
     // The library does not read the guests' BSSID back, and would store an empty one.
     VEXACFileGetSectionValue(kAPSettings, settings.name, "bssid", settings.ap.guestBssid,
                              sizeof settings.ap.guestBssid);
-    const int32_t enabled = settings.enabled;
-    settings.enabled = 1;  // the library stores of settings that are off nothing but that
-    Store(settings);
-    if (enabled == 0) {
-        settings.enabled = 0;
-        Store(settings);
-    }
+    // Not by TAVIWirelessSetAPConfig, which would switch on what is off until a second call.
+    RequireStored(wireless::SaveAPSettings(
+        settings, wireless::FindAPSection(settings.name, __FILE_NAME__, __LINE__), __FILE_NAME__,
+        __LINE__));
 }
 
 void SwitchAPOn() {

@@ -52,6 +52,7 @@ void DisconnectWifi(const Options& options) {
 void ConnectAutomatically(const Options& options) {
     RequireAdapter();
     RequireRadio();
+    RequireNobodyJoins();
     // The library would end the connection that exists.
     if (IsInNetwork(TAVIWirelessConnStatusGet())) {
         throw CommandError(kBusy, WifiInterface() +

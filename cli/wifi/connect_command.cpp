@@ -189,6 +189,7 @@ void ConnectWifi(const Options& options) {
     CheckUser(options.user);
     RequireAdapter();
     RequireRadio();
+    RequireNobodyJoins();
     Joining(options).Run();
     PrintConnection(options);
 }
