@@ -85,19 +85,22 @@ bool TakeDown(const char* interface, char (&bridge)[kSize]) {
         TAVI_LOG_ERROR("File[%s] does not exist.", file.c_str());
         return false;
     }
-    if (VEXACFileGetKeyValue(file.c_str(), "BRIDGE", bridge, kSize) > 0) {
+    const bool hasBridge = VEXACFileGetKeyValue(file.c_str(), "BRIDGE", bridge, kSize) > 0;
+    if (hasBridge) {
         if (IsInterfaceName(bridge)) {
             LeaveBridge(interface, bridge);
         } else {
             TAVI_LOG_ERROR("Failed to get number of slave for bridge [%s].", bridge);
             bridge[0] = '\0';
         }
-        if (!RemoveKey(file, "BRIDGE")) {
-            TAVI_LOG_ERROR("Failed to remove key %s in [%s].", "BRIDGE", file.c_str());
-        }
+    }
+    const bool isDone = bridge[0] == '\0' || PutDhcpServerAside(bridge);
+    // Last, since a call that is killed before lets the next one find the bridge.
+    if (!RemoveKey(file, "BRIDGE") && hasBridge) {
+        TAVI_LOG_ERROR("Failed to remove key %s in [%s].", "BRIDGE", file.c_str());
     }
     RemoveKey(file, "LOCAL_LAN");
-    return bridge[0] == '\0' || PutDhcpServerAside(bridge);
+    return isDone;
 }
 
 int Disable() {

@@ -3,8 +3,8 @@
 //   rc.network --dry-run restart INTERFACE BRIDGE
 //   rc.network --dry-run enable INTERFACE BRIDGE GUESTS MEMBER ADDRESS LEASES
 // Makes the bridge, the access point on the interface and the bridge's DHCP server what the saved
-// settings say, whatever they were before. An empty BRIDGE leaves bridges alone. --dry-run prints
-// what would be done.
+// settings say, whatever they were before. An empty BRIDGE is the one that the interface is in, if
+// any. --dry-run prints what would be done.
 #include <core/failure.h>
 #include <sys/stat.h>
 

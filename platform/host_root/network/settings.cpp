@@ -6,6 +6,7 @@
 #include <tavisdk/bridge.h>
 
 #include <algorithm>
+#include <filesystem>
 #include <memory>
 
 #include "platform/host_root/network/error.h"
@@ -137,6 +138,13 @@ void Add(const Enabled& enabled, const std::string& interface, BridgeSettings& b
     bridge.servesLeases = bridge.servesLeases || enabled.leases;
 }
 
+// The bridge that the interface is in; empty when it is in none.
+std::string MasterOf(const std::string& interface) {
+    std::error_code none;
+    return std::filesystem::read_symlink("/sys/class/net/" + interface + "/master", none)
+        .filename();
+}
+
 void CheckNames(const std::string& interface, const std::string& bridge) {
     if (!IsName(interface)) {
         throw Error('"' + interface + "\" is not an interface's name");
@@ -161,9 +169,10 @@ Settings ReadSettings(const std::string& interface, const std::string& bridge,
     // A model that has no guests any more keeps the file that says it has some.
     settings.guests = settings.accessPoint && Says(kModelInfo, "support_pci_wifi", "yes") &&
                       (enabled ? enabled->guests : Says(hostapd + "-guest.info", "enable", "yes"));
-    if (!bridge.empty()) {
-        const bool isOn = enabled || Says(FileOf(bridge), "ONBOOT", "yes");
-        settings.bridges.push_back(ReadBridge(bridge, isOn, interface));
+    const std::string name = bridge.empty() ? MasterOf(interface) : bridge;
+    if (!name.empty() && name != kGuestBridge) {
+        const bool isOn = enabled || Says(FileOf(name), "ONBOOT", "yes");
+        settings.bridges.push_back(ReadBridge(name, isOn, interface));
     }
     settings.bridges.push_back(ReadBridge(kGuestBridge, settings.guests, interface));
     if (enabled) {

@@ -44,7 +44,8 @@ struct Enabled {
 };
 
 // Throws Error when the names are none, or the settings cannot be made sense of. An empty bridge
-// asks for none.
+// is the one that the interface is in, if it is in one: whoever took its name from the settings may
+// have been killed before the network followed.
 Settings ReadSettings(const std::string& interface, const std::string& bridge,
                       const std::optional<Enabled>& enabled = std::nullopt);
 
