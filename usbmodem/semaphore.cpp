@@ -45,6 +45,20 @@ int ChangeUntil(Clock::time_point deadline, int semid, sembuf operation) {
     }
 }
 
+bool SetFree(int semid) {
+    SemaphoreArgument initial{};
+    initial.val = 1;
+    return semctl(semid, 0, SETVAL, initial) == 0;
+}
+
+// Whether nobody ever took the lock: who made it was killed before it had its value.
+bool WasNeverUsed(int semid) {
+    semid_ds description{};
+    SemaphoreArgument status{};
+    status.buf = &description;
+    return semctl(semid, 0, IPC_STAT, status) == 0 && description.sem_otime == 0;
+}
+
 }  // namespace
 
 Semaphore::Semaphore(unsigned int key) : key_(key) {}
@@ -56,9 +70,7 @@ int Semaphore::Get(int* semid) {
     const key_t key = static_cast<key_t>(key_);
     int id = semget(key, 1, IPC_CREAT | IPC_EXCL | kPermissions);
     if (id >= 0) {
-        SemaphoreArgument initial{};
-        initial.val = 1;
-        if (semctl(id, 0, SETVAL, initial) < 0) {
+        if (!SetFree(id)) {
             TAVI_LOG_ERROR("semctl fail semid %d errno %d", id, errno);
             return -1;
         }
@@ -84,7 +96,12 @@ int Semaphore::Change(short by) {
     int semid = -1;
     // The result is not looked at: with semid -1, semop fails and says why.
     Get(&semid);
-    if (ChangeUntil(Clock::now() + kLongestWait, semid, sembuf{0, by, SEM_UNDO}) != 0) {
+    const sembuf operation{0, by, SEM_UNDO};
+    int result = ChangeUntil(Clock::now() + kLongestWait, semid, operation);
+    if (result != 0 && errno == EAGAIN && WasNeverUsed(semid) && SetFree(semid)) {
+        result = ChangeUntil(Clock::now(), semid, operation);
+    }
+    if (result != 0) {
         TAVI_LOG_ERROR("semop fail semid %d errno %d", semid, errno);
         return -1;
     }

@@ -13,6 +13,7 @@
 #include <optional>
 #include <string>
 
+#include "base/sleep_out.h"
 #include "base/trusted_file.h"
 #include "usbmodem/rules/paths.h"
 #include "usbmodem/text.h"
@@ -20,6 +21,7 @@
 namespace {
 
 using taviwireless::ReadTrusted;
+using taviwireless::SleepOut;
 using taviwireless::UniqueFd;
 using taviwireless::usbmodem_lib::kLockDirectory;
 using taviwireless::usbmodem_lib::kLockName;
@@ -37,25 +39,25 @@ bool MakeLockFile(const char* path) {
     return static_cast<bool>(file);
 }
 
-// Returns the process that a lock file which counts names: 0 when it names none. Nothing, with
-// errno, when there is no such file.
-std::optional<pid_t> Holder(const char* path) {
-    const std::optional<std::string> text = ReadTrusted(path);
-    if (!text) {
-        return std::nullopt;
-    }
-    return taviwireless::usbmodem_lib::ToInt(*text);
+// The process that the text of a lock file names: 0 when it names none.
+pid_t HolderIn(const std::optional<std::string>& text) {
+    return text ? taviwireless::usbmodem_lib::ToInt(*text) : 0;
 }
 
-// Whether the lock file is there and counts. One that names no process may still be in the making,
-// and one that cannot be read is not ours to judge.
+// Whether the lock file is there and counts. One that is empty may still be in the making; if it is
+// so for long, who made it was killed. One that cannot be read is not ours to judge.
 bool IsHeld(const char* path) {
-    const std::optional<pid_t> holder = Holder(path);
-    if (!holder) {
+    std::optional<std::string> text = ReadTrusted(path);
+    if (text == "") {
+        SleepOut(1);
+        text = ReadTrusted(path);
+    }
+    if (!text) {
         const bool isMissingOrAStrangers = errno == ENOENT || errno == EPERM || errno == ELOOP;
         return !isMissingOrAStrangers;
     }
-    return *holder <= 0 || kill(*holder, 0) == 0 || errno != ESRCH;
+    const pid_t holder = HolderIn(text);
+    return !text->empty() && (holder <= 0 || kill(holder, 0) == 0 || errno != ESRCH);
 }
 
 }  // namespace
@@ -90,7 +92,7 @@ bool WvLockDev::lock() {
 }
 
 void WvLockDev::unlock() {
-    if (lock_count > 0 && --lock_count == 0 && Holder(filename) == getpid()) {
+    if (lock_count > 0 && --lock_count == 0 && HolderIn(ReadTrusted(filename.cstr())) == getpid()) {
         unlink(filename);
     }
 }

@@ -78,7 +78,8 @@ TEST(Channel, IsNotKeptFromItsPortByWhatStrangersPutAtItsLockFile) {
         {"true", false},
         {"echo 4194305 >$f", false},  // no process has a number that high
         {"echo $PPID >$f", true},
-        {"touch $f", true},  // nobody's yet
+        {"touch $f", false},  // by who was killed before he wrote
+        {"echo x >$f", true},
         {"echo $PPID >$f; chown 1 $f", false},
         {"mkfifo $f; chown 1 $f", false},
         {"ln -s /etc/passwd $f; chown -h 1 $f", false},
