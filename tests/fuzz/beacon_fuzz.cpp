@@ -1,0 +1,106 @@
+// A beacon of any kind in the table of the host root's iwlist, as a scan reads that: it is one
+// network of the name, channel, signal, protocol and protection that it tells, or none if it hides
+// its name, and its neighbours stay what they are.
+#include <algorithm>
+
+#include "platform/host_root/iwlist/scan_table.h"
+#include "tests/fuzz/fuzz.h"
+#include "tests/fuzz/played_tool.h"
+
+namespace taviwireless::fuzz {
+namespace {
+
+using namespace std::string_literals;
+using iwlist::TableLine;
+
+std::string Element(int number, const std::string& body) {
+    return static_cast<char>(number) + (static_cast<char>(body.size()) + body);
+}
+
+// The elements that are whole. isOdd tells whether one of them is of what else the beacon tells.
+std::string Whole(const std::string& bytes, bool& isOdd) {
+    size_t end = 0, next = 0;
+    while (end + 2 <= bytes.size() &&
+           (next = end + 2 + static_cast<unsigned char>(bytes[end + 1])) <= bytes.size()) {
+        isOdd = isOdd || "\x01\x2d\x30\x32\xdd"s.find(bytes[end]) != std::string::npos;
+        end = next;
+    }
+    return bytes.substr(0, end);
+}
+
+// WPA or WPA2, which have each their author, with a set of ciphers and a kind of key management.
+std::string Protection(const std::string& author, unsigned ciphers, char keyManagement) {
+    const std::string tkip = (ciphers & 4) != 0 ? author + '\2' : "";
+    const std::string pairwise = (ciphers & 8) != 0 ? tkip + author + '\4' : tkip;
+    return "\1\0"s + author + '\2' + static_cast<char>(pairwise.size() / 4) + '\0' + pairwise +
+           "\1\0"s + author + keyManagement;
+}
+
+constexpr struct {
+    int frequency, channel, slow, fast, highThroughput;  // the last three are protocols
+} kChannels[] = {{2412, 1, 2, 1, 10},  {2484, 14, 2, 1, 10}, {5180, 36, 3, 3, 9},
+                 {5825, 165, 3, 3, 9}, {5955, 1, 0, 0, 0},   {58320, 10474, 0, 0, 0}};
+
+// Key management that cannot be joined, EAP and PSK; and what that is of WPA2 and of WPA.
+constexpr char kKeyManagement[] = {'\x08', '\1', '\2'};
+constexpr int kAuths[][3] = {{0, 7, 4}, {8, 8, 8}, {5, 5, 5}};
+
+}  // namespace
+
+void Fuzz(Input input) {
+    std::string essid = input.Text();
+    std::replace(essid.begin(), essid.end(), '\xff', '\0');
+    essid.resize(std::min<size_t>(essid.size(), 255));
+    const auto& channel = kChannels[input.Choice(6)];
+    const int dBm = 50 - static_cast<int>(input.Choice(256));
+    const bool isPrivate = input.Flag(), isFast = input.Flag(), isWide = input.Flag();
+    const bool hasWpa = input.Flag(), hasRsn = input.Flag();
+    const unsigned wpa = input.Choice(3), rsn = input.Choice(3), ciphers = input.Choice(4) * 4;
+    bool isOdd = false;
+    std::string elements = Whole(input.Rest(), isOdd) + Element(0, essid) +
+                           Element(1, isFast ? "\x6c" : "\x02") + (isWide ? Element(45, "") : "");
+    if (hasRsn) {
+        elements += Element(48, Protection("\0\x0f\xac"s, ciphers, kKeyManagement[rsn]));
+    }
+    if (hasWpa) {
+        const std::string author = "\0\x50\xf2"s;
+        elements += Element(221, author + '\1' + Protection(author, ciphers, kKeyManagement[wpa]));
+    }
+    const std::string neighbour = TableLine({{}, 2412, -40, 0, false, Element(0, "near")});
+    const auto networks =
+        Scanned(neighbour + TableLine({{1, 2, 3}, channel.frequency, dBm, 0, isPrivate, elements}) +
+                neighbour);
+
+    const bool isNamed = essid.find_first_not_of('\0') != essid.npos;
+    std::replace_if(
+        essid.begin(), essid.end(), [](unsigned char byte) { return byte < ' ' || byte == 0x7f; },
+        '?');
+    essid = isNamed ? essid.substr(0, 32) : "";
+    essid.resize(essid.find_last_not_of(' ') + 1);
+    Demand(networks.size() == (essid.empty() ? 2 : 3), "it is one network", essid);
+    for (const WirelessNetwork& network : {networks.front(), networks.back()}) {
+        Demand(network.essid == "near"s && network.auth == 1, "others stay what they are", essid);
+    }
+    const WirelessNetwork& network = networks[1];
+    if (!essid.empty()) {
+        const int signal = (std::clamp(dBm, -110, -40) + 110) * 10 / 7;
+        Demand(network.essid == essid && network.bssid[2] == 3, "it has its name", essid);
+        Demand(network.channel == channel.channel && network.signal == signal, "it is there",
+               essid);
+    }
+    if (!essid.empty() && !isOdd) {
+        const int unprotected = isPrivate ? 3 : 1;
+        const bool isProtected = hasWpa || hasRsn;
+        Demand(network.auth ==
+                   (isProtected ? kAuths[hasRsn ? rsn : 0][hasWpa ? wpa : 0] : unprotected),
+               "it is joined as it tells", essid);
+        Demand(network.encrypt == (isProtected ? static_cast<int>(ciphers) : (unprotected + 1) / 2),
+               "it is protected as it tells", essid);
+        Demand(network.protocol == (isWide   ? channel.highThroughput
+                                    : isFast ? channel.fast
+                                             : channel.slow),
+               "it has its protocol", essid);
+    }
+}
+
+}  // namespace taviwireless::fuzz
