@@ -31,8 +31,9 @@ TAVI_TAKEN_OVER int posix_spawnp(pid_t* process, const char*, const posix_spawn_
     return 0;
 }
 
-TAVI_TAKEN_OVER FILE* fdopen(int handle, const char* mode) {
-    close(handle);
+TAVI_TAKEN_OVER FILE* fopencookie(void* cookie, const char* mode,
+                                  cookie_io_functions_t functions) noexcept {
+    functions.close(cookie);
     return fmemopen(printedByTheTool.data(), printedByTheTool.size(), mode);
 }
 
