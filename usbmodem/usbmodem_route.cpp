@@ -9,6 +9,7 @@
 
 #include "base/trusted_file.h"
 #include "common/log.h"
+#include "usbmodem/rules/paths.h"
 #include "usbmodem/state_files.h"
 
 namespace taviwireless::usbmodem_lib {
@@ -18,15 +19,13 @@ namespace {
 constexpr char kPeerOptions[] = "/etc/ppp/peers/wvdial";
 constexpr char kNoDefaultRoute[] = "nodefaultroute";
 constexpr char kBackup[] = "/etc/ppp/usbmodem_backup_gw";
-constexpr char kOtherBackup[] =
-    "/tmp/pppoe_gw_backup";  // of another part of the system; goes first
 
-// The first line of the backup that counts.
+// The first line of the backup that counts: the other part of the system goes first.
 std::string SavedGateway() {
-    std::optional<std::string> text = ReadTrusted(kOtherBackup);
+    std::optional<std::string> text = ReadTrusted(kOtherGatewayBackup);
     if (!text) {
         if (errno != ENOENT) {
-            TAVI_LOG_ERROR("%s does not count: %s", kOtherBackup, strerror(errno));
+            TAVI_LOG_ERROR("%s does not count: %s", kOtherGatewayBackup, strerror(errno));
         }
         text = ReadTrusted(kBackup);
     }

@@ -23,8 +23,7 @@ namespace {
 using taviwireless::ReadTrusted;
 using taviwireless::SleepOut;
 using taviwireless::UniqueFd;
-using taviwireless::usbmodem_lib::kLockDirectory;
-using taviwireless::usbmodem_lib::kLockName;
+using taviwireless::usbmodem_lib::LockPath;
 
 constexpr mode_t kLockMode = 0644;  // for other programs that use ports
 // How often to try where somebody makes the file anew as often as it is removed.
@@ -64,8 +63,7 @@ bool IsHeld(const char* path) {
 
 WvLockDev::WvLockDev(WvString device) : devicename(device), lock_count(0) {
     const std::string path = device.cstr();
-    const std::string name = path.substr(path.rfind('/') + 1);
-    filename = (std::string(kLockDirectory) + kLockName + name).c_str();
+    filename = LockPath(path.substr(path.rfind('/') + 1)).c_str();
 }
 
 WvLockDev::~WvLockDev() {

@@ -19,7 +19,10 @@ PrivateBus::PrivateBus() {
     WriteFile("/tmp/bus.conf", R"(<busconfig><type>session</type>
         <listen>unix:path=/tmp/bus</listen><auth>EXTERNAL</auth><policy context="default">
         <allow send_destination="*" eavesdrop="true"/><allow eavesdrop="true"/><allow own="*"/>
-        </policy></busconfig>)");
+        </policy><limit name="max_message_size">1000000000</limit>
+        <limit name="max_incoming_bytes">1000000000</limit>
+        <limit name="max_outgoing_bytes">1000000000</limit>
+        <limit name="max_replies_per_connection">50000</limit></busconfig>)");
     setenv("DBUS_SESSION_BUS_ADDRESS", "unix:path=/tmp/bus", 1);
     Restart();
 }

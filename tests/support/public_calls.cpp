@@ -22,7 +22,7 @@ using namespace dbus;
 using namespace usbmodem_lib;
 using semaphore::Semaphore;
 
-constexpr char kId[] = "usbmodem0";
+constexpr char kId[] = "usbmodem1";
 constexpr char kPin[] = "1234";
 constexpr char kPuk[] = "12345678";
 constexpr char kPins[] = "1234\n1234\n";
@@ -93,7 +93,7 @@ std::string NameIn(const std::string& call) {
 
 #define MODEM(call) CALL("usbmodem_lib::USBModem::", kModem, around.Modem()., call)
 #define FRESH(call) \
-    CALL("usbmodem_lib::USBModem::", kPlugged, USBModem(0, "/tmp/usbmodem.info0")., call)
+    CALL("usbmodem_lib::USBModem::", kPlugged, USBModem(1, "/tmp/usbmodem.info1")., call)
 #define LINK(call) CALL("usbmodem_lib::USBModem::", kConnection, around.Modem()., call)
 #define NO_MODEM(call) CALL("usbmodem_lib::USBModemNull::", kNothing, USBModemNull()., call)
 #define LIST(name, result)                                                                       \
@@ -164,7 +164,7 @@ const PublicCall kCalls[] = {
     ROW("usbmodem_lib::USBModemNull::USBModemNull", kNothing, out << USBModemNull()),
     LIST("USBModemList", ""), LIST("SearchInfoPath", list.SearchInfoPath()),
     LIST("Update", list.Update()), LIST("DropUnplugged", (list.DropUnplugged(), "")),
-    LIST("Drop", (list.Drop(0), "")), LIST("FindUSBModem", list.FindUSBModem(0)),
+    LIST("Drop", (list.Drop(1), "")), LIST("FindUSBModem", list.FindUSBModem(1)),
     LIST("FindUSBModem", list.FindUSBModem(kId)),
     CALL("semaphore::Semaphore::", kNothing, Semaphore(1)., Enter()),
     CALL("semaphore::Semaphore::", kNothing, Semaphore(1)., Release()),
@@ -209,7 +209,7 @@ const PublicCall kCalls[] = {
     BEGUN(BegunCall("Connect"), Append(kId)), BEGUN(BegunCall("SetPIN"), Append(true)),
     BEGUN(BegunCall("GetUSBModemList", true), GetReply(text)),
     ROW("dbus::DBusClient::GetReply", kService, std::vector<std::string> list;
-        out << BegunCall("ListNames", true, DBUS_SERVICE_DBUS).GetReply(list); Print(out, list)),
+        out << BegunCall("ListActivatableNames", true, DBUS_SERVICE_DBUS).GetReply(list); Print(out, list)),
     BEGUN(BegunCall("Connect"), NewMessage("GetUSBModemList")),
     BEGUN(BegunCall("GetUSBModemList"), SendMessage(true, -1)), SERVER("DBusServer", (void)0),
     SERVER("GetBusName", out << server.GetBusName()),

@@ -13,8 +13,8 @@ namespace {
 
 using usbmodem_lib::USBModem;
 
-constexpr char kId[] = "usbmodem0";
-constexpr char kInfo[] = "/tmp/usbmodem.info0";
+constexpr char kId[] = "usbmodem1";
+constexpr char kInfo[] = "/tmp/usbmodem.info1";
 constexpr char kQueryPort[] = "/dev/ttyUSB1";
 
 // The folders that calls change, and a copy of what was in them at the start.
@@ -67,7 +67,7 @@ void PrepareModem() {
     WriteFile("/etc/ppp/usbmodem_backup_gw", "192.168.9.1\n");
     WriteFile("/usr/tavi/etc/usbmodem/wcdma_list.json", "[]");
     Shell("ip address replace 192.168.9.2/24 dev lo");
-    USBModem modem(0, kInfo);
+    USBModem modem(1, kInfo);
     EXPECT_EQ(modem.InitInfo(kQueryPort), 0);
     EXPECT_EQ(modem.PINUnlock("1234"), 0);
     EXPECT_EQ(modem.InitProfile(), 0);
@@ -96,12 +96,12 @@ Surroundings::Surroundings(Needs needs) : needs_(needs) {
         station_.emplace();
         PrepareAdapter(station_->tools);
     } else if (needs != Needs::kNothing) {
-        const char* kModem = "12d1,ports=dial/at,pin=1234,puk=12345678";
+        const char* kModem = "12d1,id=1,ports=dial/at,pin=1234,puk=12345678";
         simulator_.emplace(std::vector<std::string>{"--modem", kModem});
         PrepareModem();
     }
     if (needs == Needs::kModem) {
-        modem_.emplace(0, kInfo);
+        modem_.emplace(1, kInfo);
         EXPECT_EQ(modem_->InitInfo(kQueryPort), 0);
     } else if (needs == Needs::kService || needs == Needs::kServedConnection) {
         bus_.emplace();
@@ -129,17 +129,17 @@ void Surroundings::Arrange(const std::string& sim) {
         Shell("ip route replace default via 192.168.9.1 dev lo");
         for (const std::string& setting : {std::string("pin 1234"), std::string("pin_attempts 3"),
                                            std::string("lock on"), sim}) {
-            simulator_->Command("set 0 " + setting);
+            simulator_->Command("set 1 " + setting);
         }
     }
     if (needs_ == Needs::kModem) {
         modem_->UpdateSIMStatus();
     } else if (needs_ == Needs::kConnection) {
         modem_.reset();
-        EXPECT_EQ(Dial(modem_.emplace(0, kInfo)), "connected");
+        EXPECT_EQ(Dial(modem_.emplace(1, kInfo)), "connected");
     } else if (needs_ == Needs::kDialled) {
         const auto dial = [] {
-            USBModem modem(0, kInfo);
+            USBModem modem(1, kInfo);
             return Dial(modem);
         };
         EXPECT_EQ(InChild(dial).text, "connected");

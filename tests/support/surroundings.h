@@ -16,11 +16,11 @@ namespace taviwireless::test {
 // What has to be around a call of a public function. For tests in an appliance root.
 enum class Needs {
     kNothing,
-    kModem,             // modem 0, and a record of it that is initialised
+    kModem,             // modem 1, and a record of it that is initialised
     kConnection,        // the same with a dialler that runs and a link that is up
-    kPlugged,           // modem 0, of which this process knows nothing yet
+    kPlugged,           // modem 1, of which this process knows nothing yet
     kDialled,           // the same with a dialler of another process
-    kService,           // usbmodemd on a bus of its own, with modem 0
+    kService,           // usbmodemd on a bus of its own, with modem 1
     kServedConnection,  // the same, connected
     kAdapter,           // the Wi-Fi adapter, a network in range, saved; settings of an access point
     kJoined,            // the same, connected to that network
@@ -48,7 +48,7 @@ class Surroundings {
     usbmodem_lib::USBModem& Modem() { return *modem_; }
     Station& Adapter() { return *station_; }
     ModemSimulator& Simulator() { return *simulator_; }
-    Process& Service() { return *service_; }
+    Process* Service() { return service_ ? &*service_ : nullptr; }
 
   private:
     const Needs needs_;

@@ -5,6 +5,7 @@
 #include <cstdlib>
 #include <optional>
 #include <string>
+#include <vector>
 
 // Where modems are found, and where the state of modems and SIM cards is kept.
 namespace taviwireless::usbmodem_lib {
@@ -17,6 +18,9 @@ inline constexpr char kPortPrefix[] = "/dev/ttyUSB";  // and a number
 inline constexpr char kLockDirectory[] = "/var/lock/";
 inline constexpr char kLockName[] = "LCK..";  // and the name of a port
 
+// The gateway that another part of the system has saved.
+inline constexpr char kOtherGatewayBackup[] = "/tmp/pppoe_gw_backup";
+
 inline constexpr char kStateDirectory[] = "/var/lib/usbmodem";
 inline constexpr char kDialLogPrefix[] = "/var/lib/usbmodem/wvdial.log.";    // and the IMSI
 inline constexpr char kPidFilePrefix[] = "/var/lib/usbmodem/usbmodem.pid.";  // and the interface id
@@ -24,6 +28,13 @@ inline constexpr char kStateFilePrefix[] = "/var/lib/usbmodem/usbmodem.conf.";  
 
 inline std::string InfoPath(int interfaceId) {
     return std::string(kInfoDirectory) + kInfoName + std::to_string(interfaceId);
+}
+inline std::string LockPath(const std::string& port) {
+    return std::string(kLockDirectory) + kLockName + port;
+}
+// All that a modem has in folders that others may use too, whether they can write there or not.
+inline std::vector<std::string> PathsAmongOthers(int interfaceId, const std::string& port) {
+    return {InfoPath(interfaceId), LockPath(port), kOtherGatewayBackup};
 }
 inline std::string ProfilePath(const std::string& imsi) {
     return "/var/lib/usbmodem/usbmodem.profile." + imsi;

@@ -4,6 +4,7 @@
 
 #include "wireless/rules/bridge_names.h"
 #include "wireless/rules/line_break.h"
+#include "wireless/rules/paths.h"
 #include "wireless/rules/radio.h"
 #include "wireless/rules/security.h"
 
@@ -15,7 +16,6 @@ namespace {
 constexpr int kOpenSystem = 1;
 constexpr int kOpenSystemOrSharedKey = 3;
 
-constexpr char kControlSockets[] = "/var/run/hostapd";
 
 void AddIfPositive(HostapdConf& lines, const char* key, int32_t value) {
     if (value > 0) {
@@ -142,7 +142,7 @@ HostapdConf RenderHostConf(const std::string& interface, const WirelessAPConf& c
     lines.Add("wpa_psk_file", "/etc/hostapd.psk");
     lines.Add("wps_state", 2);
     lines.Add("ap_setup_locked", 1);
-    lines.Add("ctrl_interface", kControlSockets);
+    lines.Add("ctrl_interface", kHostapdSockets);
     lines.Add("config_methods", "label display push_button keypad");
     AddIfPositive(lines, "max_num_sta", conf.maxStations);
     lines.Add("bridge", conf.bridge);
@@ -165,7 +165,7 @@ HostapdConf RenderGuestConf(const WirelessAPConf& conf) {
     lines.Add("bssid", conf.guestBssid);
     lines.Add("ssid", conf.guestSsid);
     lines.Add("bridge", kGuestBridge);
-    lines.Add("ctrl_interface", kControlSockets);
+    lines.Add("ctrl_interface", kHostapdSockets);
     AddIfPositive(lines, "max_num_sta", conf.guestMaxStations);
     if (conf.guestIsolate != 0) {
         lines.Add("ap_isolate", 1);

@@ -24,6 +24,7 @@ constexpr char kNetworkScript[] = "/etc/rc.network";  // restart INTERFACE BRIDG
 
 // Station
 constexpr char kSupplicantConf[] = "/usr/tavi/etc/wpa_supplicant.conf";
+constexpr char kSupplicantSockets[] = "/var/run/wpa_supplicant";
 constexpr char kSupplicantPidFile[] = "/var/run/wpa_supplicant.pid";
 constexpr char kConnectingFlag[] = "/var/tmp/.wireless_connecting";
 constexpr char kCurrentConnection[] = "/var/tmp/.wireless_current_connection";
@@ -33,7 +34,13 @@ constexpr char kDhcpClientPrefix[] = "/etc/dhcpc/dhcpcd-";  // the interface and
 
 // Access point
 constexpr char kAPFlag[] = "/var/tmp/.wireless_ap_connecting";
+constexpr char kHostapdSockets[] = "/var/run/hostapd";
 constexpr char kHostapdFolder[] = "/etc/hostapd";
+
+// All of these in folders that others may use too, whether they can write there or not.
+constexpr const char* kPathsAmongOthers[] = {
+    kAdapterInfo,       kConnectingFlag, kCurrentConnection, kAPFlag,
+    kSupplicantPidFile, kHostapdSockets, kSupplicantSockets};
 
 // The settings of an interface or a bridge.
 inline std::string InterfaceFile(const std::string& name) {

@@ -4,6 +4,7 @@
 #include <optional>
 
 #include "wireless/rules/line_break.h"
+#include "wireless/rules/paths.h"
 #include "wireless/rules/security.h"
 
 namespace taviwireless::wireless {
@@ -68,7 +69,7 @@ void AddOpenOrWep(SupplicantConf& rendered, const WirelessConf& conf) {
 
 SupplicantConf RenderSupplicantConf(const WirelessConf& conf) {
     SupplicantConf rendered;
-    rendered.text = "ctrl_interface=/var/run/wpa_supplicant\nnetwork={\n";
+    rendered.text = std::string("ctrl_interface=") + kSupplicantSockets + "\nnetwork={\n";
     Add(rendered, "ssid", Quoted(conf.network.essid));
     AddBssid(rendered, conf);
     Add(rendered, "scan_ssid", "1");  // hidden networks are found, too

@@ -12,12 +12,12 @@
 #include <string>
 
 #include "platform/host_root/network/error.h"
+#include "platform/host_root/network/paths.h"
 
 namespace taviwireless::network {
 
 namespace {
 
-constexpr char kLockFile[] = "/var/run/rc.network.lock";
 constexpr time_t kPatience = 60;  // s; a restart takes a few
 
 bool LockInTime(int file) {

@@ -8,20 +8,13 @@
 #include "base/split.h"
 #include "base/trusted_file.h"
 #include "platform/host_root/network/error.h"
+#include "platform/host_root/network/paths.h"
 
 namespace taviwireless::network {
 
-namespace {
-
-std::string FileOf(const std::string& bridge) {
-    return "/var/run/rc.network-" + bridge + ".origins";
-}
-
-}  // namespace
-
 Origins ReadOrigins(const std::string& bridge) {
     Origins origins;
-    for (const std::string& line : Lines(ReadTrusted(FileOf(bridge)).value_or(""))) {
+    for (const std::string& line : Lines(ReadTrusted(OriginsFile(bridge)).value_or(""))) {
         std::istringstream words(line);
         std::string interface, address;
         words >> interface >> address;
@@ -31,7 +24,7 @@ Origins ReadOrigins(const std::string& bridge) {
 }
 
 void WriteOrigins(const std::string& bridge, const Origins& origins) {
-    const std::string file = FileOf(bridge);
+    const std::string file = OriginsFile(bridge);
     unlink(file.c_str());
     if (origins.empty()) {
         return;

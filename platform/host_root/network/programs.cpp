@@ -17,6 +17,7 @@
 #include "base/process_handle.h"
 #include "base/spawn_settings.h"
 #include "platform/host_root/network/error.h"
+#include "platform/host_root/network/paths.h"
 
 namespace taviwireless::network {
 
@@ -80,14 +81,14 @@ Outcome Run(const std::vector<std::string>& argv, int limit) {
 }
 
 Program Hostapd(const std::string& interface) {
-    const std::string pidFile = "/var/run/hostapd-" + interface + ".pid";
-    const std::string conf = "/var/run/hostapd-" + interface + ".conf";
+    const std::string pidFile = HostapdPidFile(interface);
+    const std::string conf = HostapdConf(interface);
     return {"hostapd", interface, pidFile, conf, {"hostapd", "-B", "-P", pidFile, conf}};
 }
 
 Program DhcpServer(const std::string& bridge) {
     const std::string conf = "/etc/dhcpd/dhcpd-" + bridge + '-' + bridge + ".conf";
-    return {"udhcpd", bridge, "/var/run/udhcpd-" + bridge + ".pid", conf, {"udhcpd", "-S", conf}};
+    return {"udhcpd", bridge, DhcpServerPidFile(bridge), conf, {"udhcpd", "-S", conf}};
 }
 
 // The DHCP client. Without an answer after 12 s it goes on asking in the background.
