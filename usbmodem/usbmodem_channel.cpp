@@ -26,6 +26,8 @@ constexpr milliseconds kFirstByteWait{1000};  // until a reply begins
 constexpr milliseconds kReplyQuiet{200};      // without input: the reply has ended
 constexpr milliseconds kDrainQuiet{100};      // without input: the modem is quiet
 constexpr size_t kMaxReply = 1024;            // bytes
+// Bytes. What the line does not take at once would be kept, and sent for hours.
+constexpr size_t kMaxCommand = 1024;
 // A modem that never stops talking must not hold the lock, and its caller, for longer.
 constexpr milliseconds kDrainLimit{1000};
 constexpr milliseconds kReplyLimit{2000};
@@ -176,6 +178,10 @@ int USBModem::ModemCmd(const std::string& cmd, std::string& reply) {
 int USBModem::Exchange(const std::string& cmd, std::string& reply) {
     if (!device_ || cmd.empty()) {
         TAVI_LOG_ERROR("Error on executing modem cmd with a null modem or null command");
+        return -1;
+    }
+    if (cmd.size() > kMaxCommand) {
+        TAVI_LOG_ERROR("Error on executing modem cmd of %zu bytes", cmd.size());
         return -1;
     }
     if (DrainDeviceBuffer() != 0) {

@@ -142,7 +142,8 @@ class TAVIWIRELESS_API USBModem {
     int DrainDeviceBuffer();
     // Sends one AT command and collects the reply, under the modem's semaphore.
     //
-    // cmd: the command, without its end; a carriage return is sent behind it. Not empty.
+    // cmd: the command, without its end; a carriage return is sent behind it. Not empty, and not
+    //   longer than 1024 bytes.
     // reply: set on success only: the lines of the reply, each ended by a line feed, without blank
     //   lines and lines that repeat cmd, and without a line that was cut off before its end.
     //   Whether the modem reported an error is for the caller to see: that is a reply too.
