@@ -36,8 +36,9 @@ void KeepFromBeingInterrupted() {
 
 void Restart(const std::string& interface, const std::string& bridge) {
     const UniqueFd lock = TakeLock();
-    const Plan plan = MakePlan(ReadSettings(interface, bridge));
     KeepFromBeingInterrupted();
+    FinishKilledRestart();
+    const Plan plan = MakePlan(ReadSettings(interface, bridge));
     BringAbout(plan);
 }
 

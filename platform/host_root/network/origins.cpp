@@ -2,13 +2,12 @@
 
 #include <unistd.h>
 
-#include <fstream>
 #include <sstream>
 
 #include "base/split.h"
 #include "base/trusted_file.h"
-#include "platform/host_root/network/error.h"
 #include "platform/host_root/network/paths.h"
+#include "platform/host_root/network/programs.h"
 
 namespace taviwireless::network {
 
@@ -25,17 +24,15 @@ Origins ReadOrigins(const std::string& bridge) {
 
 void WriteOrigins(const std::string& bridge, const Origins& origins) {
     const std::string file = OriginsFile(bridge);
-    unlink(file.c_str());
     if (origins.empty()) {
+        unlink(file.c_str());
         return;
     }
-    std::ofstream lines(file);
+    std::ostringstream lines;
     for (const auto& [interface, address] : origins) {
         lines << interface << ' ' << address << '\n';
     }
-    if (!lines.flush()) {
-        throw Error("cannot write " + file);
-    }
+    ReplaceText(file, lines.str());
 }
 
 }  // namespace taviwireless::network

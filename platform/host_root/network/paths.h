@@ -9,6 +9,7 @@
 namespace taviwireless::network {
 
 inline constexpr char kLockFile[] = "/var/run/rc.network.lock";
+inline constexpr char kJournalFile[] = "/var/run/rc.network.before";
 
 inline std::string OriginsFile(const std::string& bridge) {
     return "/var/run/rc.network-" + bridge + ".origins";
@@ -25,7 +26,11 @@ inline std::string DhcpServerPidFile(const std::string& bridge) {
 
 inline std::vector<std::string> PathsAmongOthers(const std::string& interface,
                                                  const std::string& bridge) {
-    return {kLockFile, OriginsFile(bridge), HostapdPidFile(interface), HostapdConf(interface),
+    return {kLockFile,
+            kJournalFile,
+            OriginsFile(bridge),
+            HostapdPidFile(interface),
+            HostapdConf(interface),
             DhcpServerPidFile(bridge)};
 }
 

@@ -157,4 +157,12 @@ void WriteText(const std::string& path, const std::string& text) {
     }
 }
 
+void ReplaceText(const std::string& path, const std::string& text) {
+    const std::string draft = path + ".new";
+    WriteText(draft, text);
+    if (rename(draft.c_str(), path.c_str()) != 0) {
+        throw Error("cannot write " + path);
+    }
+}
+
 }  // namespace taviwireless::network

@@ -50,6 +50,8 @@ void PutBack(const Kept& kept);
 std::optional<std::string> ReadText(const std::string& path);
 // Makes the file anew, for the own user alone.
 void WriteText(const std::string& path, const std::string& text);
+// The same in one step: at any moment there is the old file or the new one.
+void ReplaceText(const std::string& path, const std::string& text);
 
 }  // namespace taviwireless::network
 

@@ -10,6 +10,7 @@
 
 #include "platform/host_root/network/error.h"
 #include "platform/host_root/network/hostapd.h"
+#include "platform/host_root/network/journal.h"
 #include "platform/host_root/network/programs.h"
 
 namespace taviwireless::network {
@@ -212,7 +213,30 @@ void PutBack(const Plan& plan, const std::vector<Kept>& programs) {
 
 }  // namespace
 
+void FinishKilledRestart() {
+    Try([] {
+        const std::optional<Journal> before = ReadJournal();
+        if (!before) {
+            return;
+        }
+        for (const std::string& name : before->names) {
+            if (before->clients.count(name) == 0) {
+                Stop(DhcpClient(name));  // it would take what is put back
+            }
+        }
+        BringAbout(before->now, before->names);
+        for (const std::string& name : before->clients) {
+            if (!Runs(DhcpClient(name))) {
+                Start(DhcpClient(name));
+            }
+        }
+        BringAbout(before->now, before->names);
+    });
+    RemoveJournal();
+}
+
 void BringAbout(const Plan& plan) {
+    WriteJournal({plan.now, plan.names, plan.clients});
     std::vector<Kept> before;
     for (const Program& program : ProgramsOf(plan)) {
         before.push_back(Keep(program));
@@ -221,8 +245,10 @@ void BringAbout(const Plan& plan) {
         Apply(plan);
     } catch (...) {
         PutBack(plan, before);
+        RemoveJournal();
         throw;
     }
+    RemoveJournal();
 }
 
 }  // namespace taviwireless::network

@@ -9,6 +9,9 @@ namespace taviwireless::network {
 // before is in force again: bridges, members, addresses, routes and the programs that ran.
 void BringAbout(const Plan& plan);
 
+// If the last BringAbout was killed, puts back what was before it, as far as that goes.
+void FinishKilledRestart();
+
 }  // namespace taviwireless::network
 
 #endif
