@@ -31,6 +31,11 @@ TEST(Semaphore, IsOneSetOfOneSemaphoreWithValueOneForEverybody) {
     EXPECT_EQ(semctl(first, 0, GETVAL), 1);
 }
 
+TEST(Semaphore, IsFreeWhenItsMakerWasKilledBeforeItHadAValue) {
+    ASSERT_GE(semget(8, 1, IPC_CREAT | 0666), 0);
+    EXPECT_EQ(Semaphore(8).Enter(), 0);
+}
+
 TEST(Semaphore, IsNotWaitedForForEver) {
     ASSERT_EQ(Semaphore(kKey).Enter(), 0);
     LogCapture log;

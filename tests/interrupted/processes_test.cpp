@@ -1,5 +1,10 @@
 // Programs that are killed at any of their system calls: stores are the old ones or the new ones
-// whole, and the next command works.
+// whole, and the next command works. Programs that stop with a lock: others end with a sentence.
+#include <fcntl.h>
+#include <sys/file.h>
+#include <sys/prctl.h>
+#include <sys/wait.h>
+#include <taviwireless/usbmodem.h>
 #include <taviwireless/usbmodem_client.h>
 
 #include <set>
@@ -74,8 +79,10 @@ constexpr char kState[] =
     "'*.pid.*' -not -name 'dhcpd*.conf' 2>/dev/null); ip -oneline address show scope global;"
     "ip route; } | sed '/ACCESS_TIME/d; s/\"//g; s/^[0-9]*: //; s/valid_lft.*//' | sort";
 
-struct Killed : testing::TestWithParam<Command> {
-    void SetUp() override {
+// An appliance with an adapter that joins whatever it is asked to, and a modem.
+struct Appliance {
+    explicit Appliance(const std::string& modem = "")
+        : simulator({"--modem", "12d1,id=1,ports=dial/at" + modem}) {
         setenv("files", kFiles, 1);
         interface.Up();
         WriteFile("/etc.defaults/taviinfo.conf", "support_wireless=yes\nsupport_pci_wifi=yes\n");
@@ -92,6 +99,15 @@ struct Killed : testing::TestWithParam<Command> {
         tools.Add("/etc/rc.network");
         InstallDialler(kSaysConnected);
     }
+
+    ToolStandIns tools;
+    WirelessInterface interface;
+    ModemSimulator simulator;
+};
+
+struct Killed : testing::TestWithParam<Command>, Appliance {
+    Killed() : Appliance(GetParam().name == "Unlocking" ? ",pin=1234" : "") {}
+
     static std::string Text(const std::string& store) {
         return RunProgram({"sed", "/ACCESS_TIME/d", store}).out;
     }
@@ -113,10 +129,6 @@ struct Killed : testing::TestWithParam<Command> {
 
     std::string program;
     RunResult result;
-    ToolStandIns tools;
-    WirelessInterface interface;
-    ModemSimulator simulator{{"--modem", std::string("12d1,id=1,ports=dial/at") +
-                                             (GetParam().name == "Unlocking" ? ",pin=1234" : "")}};
 };
 
 TEST_P(Killed, NextCommandWorks) {
@@ -219,6 +231,64 @@ TEST(KilledService, LeavesItsModemsToTheNextOne) {
         SCOPED_TRACE("killed at " + name + ' ' + std::to_string(number) + ' ' + subject);
         WatchCalls(serve, Fault{name, number, kKill}, program);
         EXPECT_TRUE(ModemService().Lists({"usbmodem1"}));
+    }
+}
+
+// A process that took a lock and stopped.
+class Stopped {
+  public:
+    explicit Stopped(const std::function<void()>& take) : pid_(fork()) {
+        if (pid_ == 0) {
+            prctl(PR_SET_PDEATHSIG, SIGKILL);
+            take();
+            raise(SIGSTOP);
+            _exit(0);
+        }
+        waitpid(pid_, nullptr, WUNTRACED);
+    }
+    ~Stopped() {
+        kill(pid_, SIGKILL);
+        waitpid(pid_, nullptr, 0);
+    }
+    Stopped(const Stopped&) = delete;
+    Stopped& operator=(const Stopped&) = delete;
+
+  private:
+    pid_t pid_;
+};
+
+void Lock(const std::string& file) {
+    flock(open(file.c_str(), O_RDWR | O_CREAT, 0600), LOCK_EX);
+}
+
+TEST(StoppedHolder, KeepsOthersNoLongerThanASentenceTakes) {
+    Appliance appliance;
+    usbmodem_lib::USBModem modem(1, "/tmp/usbmodem.info1");
+    const std::string cli = BuiltProgram(kCli);
+    const struct {
+        std::function<void()> take;
+        std::string command, sentence;
+    } kRows[] = {
+        {[] { Lock("/usr/tavi/etc/.wireless_ap.conf.lock"); }, cli + " ap set ssid=New",
+         "cannot store the settings in /usr/tavi/etc/wireless_ap.conf; the system log tells why"},
+        {[] { Lock("/usr/tavi/etc/.wireless.conf.lock"); }, cli + ' ' + kJoin,
+         "connected to Home but could not save it; the system log tells why"},
+        {[] { Lock("/var/lib/usbmodem/.usbmodem.profile.001010123456789.lock"); },
+         cli + " modem --direct profile set usbmodem1 apn=new",
+         "cannot set apn in the profile of usbmodem1"},
+        {[&] { modem.OpenFileDevice("/dev/ttyUSB1"); }, cli + " modem --direct show usbmodem1",
+         "is not ready"},
+        {[] { Lock("/var/run/usb.plug.lock"); }, "/usr/tavi/hotplug/usb.plug",
+         "another usb.plug has had /var/run/usb.plug.lock for a minute"},
+    };
+    Shell(kForget);
+    RunProgram(WithShortWaits({cli, "modem", "--direct", "profile", "show", "usbmodem1"}));
+    appliance.tools.Add("/usr/local/bin/flock", "exec /usr/bin/flock -n 9");  // instead of a minute
+    for (const auto& row : kRows) {
+        const Stopped holder(row.take);
+        const RunResult result = RunProgram(WithShortWaits(Split(row.command, ' ')), "right key\n");
+        EXPECT_EQ(result.status, 1) << row.command;
+        EXPECT_THAT(result.err, testing::HasSubstr(row.sentence));
     }
 }
 
