@@ -148,7 +148,7 @@ std::string USBModem::GetIMSI(bool& err) {
                  imsi, kLogFailure)) {
         err = true;
     } else if (!IsIMSI(imsi)) {
-        kLogFailure(imsi.c_str());
+        kLogFailure(LoggableReply(imsi).c_str());  // may be the late echo of another command
         err = true;
     } else {
         imsi_ = imsi;
