@@ -6,6 +6,7 @@
 #include <fstream>
 #include <sstream>
 
+#include "base/interface_name.h"
 #include "base/sleep_out.h"
 #include "base/split.h"
 #include "common/log.h"
@@ -122,6 +123,9 @@ int USBModem::AssignConnectInfo() {
     std::istringstream rest(log.substr(named + sizeof kUsingInterface - 1));
     netIFName_.clear();
     rest >> netIFName_;
+    if (!IsInterfaceName(netIFName_)) {
+        netIFName_.clear();  // it would become an argument and a line of others
+    }
     return 1;
 }
 
