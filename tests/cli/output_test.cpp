@@ -12,13 +12,6 @@ TEST(Output, AlignsColumnsByCharactersNotBytes) {
               "NAME    X\nZürich  1\nA\n");
 }
 
-TEST(Output, TextOfAModemCannotSteerTheTerminal) {
-    EXPECT_EQ(Printable("a\x1b[2Jb\r\n\x7f ü"), "a?[2Jb??? ü");
-    EXPECT_EQ(Printable("\xC2\x9B"
-                        "2J\xC2\xA0\xC2"),
-              "?2J\xC2\xA0\xC2");
-}
-
 TEST(Output, JsonStaysJsonWhateverTheModemSays) {
     Report report;
     report.document["text"] = std::string("a\"\n\x1b\xff");

@@ -1,5 +1,5 @@
-// What is sent to a modem for codes that may be anything, and what is logged of them whatever the
-// modem answers.
+// What is sent to a modem for codes that may be anything, what comes of it, and what is logged of the
+// codes whatever the modem answers.
 #include <algorithm>
 #include <cstring>
 
@@ -12,9 +12,11 @@ namespace {
 
 using usbmodem_lib::USBModem;
 
-const std::string kQuery = "AT+CPIN?";
-const std::string kLockQuery = "AT+CLCK=\"SC\",2";
-constexpr const char* kStatuses[] = {"READY", "SIM PIN", "SIM PUK"};
+constexpr char kQuery[] = "AT+CPIN?";
+constexpr char kLockQuery[] = "AT+CLCK=\"SC\",2";
+enum Status { kReady, kPIN, kPUK, kBusy };
+constexpr const char* kStatuses[] = {"+CPIN: READY", "+CPIN: SIM PIN", "+CPIN: SIM PUK", "BUSY"};
+constexpr const char* kLocks[] = {"+CLCK: 0", "+CLCK: 1", "+CME ERROR: SIM PIN required"};
 
 enum Operation { kUnlock, kUnlockWithPUK, kChange, kSwitch, kSet, kOperations };
 
@@ -45,59 +47,71 @@ void Fuzz(Input input) {
     const unsigned vendor = input.Choice(std::size(ModemLine::kVendors));
     const unsigned operation = input.Choice(kOperations);
     const unsigned status = input.Choice(std::size(kStatuses));
-    const bool isOn = input.Flag();
+    const unsigned lock = input.Choice(std::size(kLocks));
+    const bool enable = input.Flag();
     const std::string first = input.Text();
     const std::string second = input.Text();
     const std::string reply = input.Text();
-    std::string sent;
-    bool isSent = false;
+    std::vector<std::string> sent;
+    bool isOver = false;
     ModemLine line(vendor, [&](const std::string& command) {
-        if (command == kQuery) {
-            return std::string("+CPIN: ") + kStatuses[status] + "\r\nOK\r\n";
+        if (command == kQuery || command == kLockQuery) {
+            return std::string(command == kQuery ? kStatuses[status] : kLocks[lock]) + "\r\n";
         }
-        if (command == kLockQuery) {
-            return std::string(isOn ? "+CLCK: 1\r\n" : "+CLCK: 0\r\n");
+        if (!isOver) {
+            sent.push_back(command);
         }
-        sent += isSent ? "" : command;
-        return Filled(reply, isSent ? "" : first, sent);
+        return Filled(reply, isOver ? "" : first, sent.empty() ? "" : sent.back());
     });
     USBModem& modem = line.record;
     modem.UpdateSIMStatus();
+    Demand(modem.GetPINEnable() == (lock == 0 ? 0 : 1), "the protection is read");
     const test::LogCapture log;
     const int result = operation == kUnlock          ? modem.PINUnlock(first)
                        : operation == kUnlockWithPUK ? modem.PUKSet(first, second)
                        : operation == kChange        ? modem.ChangePIN(first, second)
-                       : operation == kSwitch        ? modem.ChangePINEnable(first, !isOn)
-                                                     : modem.PINSet(first, second, isOn);
-    isSent = true;
-    const bool isQuoted = ModemLine::kVendors[vendor] == std::string("2001");
-    const std::string asSet = "AT+CPIN=" + Quoted(first, isQuoted);
-    const std::string change = "AT+CPWD=\"SC\"," + Quoted(first) + "," + Quoted(second);
-    const struct {
-        bool isPossible;
-        std::string command;
-    } kWanted[] = {
-        {status != 0, asSet},
-        {status == 2, asSet + "," + Quoted(second, isQuoted)},
-        {status == 0 && !first.empty() && !second.empty(), change},
-        {status == 0, "AT+CLCK=\"SC\"," + std::string(isOn ? "0" : "1") + "," + Quoted(first)},
-        {status == 0 && !first.empty() && !second.empty(), change}};
-    const bool isFit =
-        IsFit(first) && (operation == kUnlock || operation == kSwitch || IsFit(second));
-    Demand(sent == (isFit && kWanted[operation].isPossible ? kWanted[operation].command : ""),
-           "the command is sent, or none", sent);
-    Demand(isFit || result < 0, "a code that does not fit is refused", first);
-    for (const std::string& text : line.written) {
-        Demand(text.find('\r') == text.size() - 1 || text.find_first_not_of('\r') == text.npos,
-               "it is one line", text);
+                       : operation == kSwitch        ? modem.ChangePINEnable(first, enable)
+                                                     : modem.PINSet(first, second, enable);
+    isOver = true;
+    const bool hasSecond = operation != kUnlock && operation != kSwitch;
+    std::vector<std::string> wanted;
+    if (IsFit(first) && (!hasSecond || IsFit(second))) {
+        const bool isQuoted = ModemLine::kVendors[vendor] == std::string("2001");
+        if (operation == kUnlock && status != kReady) {
+            wanted = {"AT+CPIN=" + Quoted(first, isQuoted)};
+        } else if (operation == kUnlockWithPUK && status == kPUK) {
+            wanted = {"AT+CPIN=" + Quoted(first, isQuoted) + "," + Quoted(second, isQuoted)};
+        }
+        if (operation >= kSwitch && status == kReady && enable == (lock == 0)) {
+            wanted = {"AT+CLCK=\"SC\"," + std::string(enable ? "1," : "0,") + Quoted(first)};
+        }
+        const bool isRefused = !wanted.empty() && result < 0 && sent.size() == 1;
+        if ((operation == kChange || operation == kSet) && status == kReady && !isRefused &&
+            !first.empty() && !second.empty()) {
+            wanted.push_back("AT+CPWD=\"SC\"," + Quoted(first) + "," + Quoted(second));
+        }
+    } else {
+        Demand(result == -1, "a code that does not fit is refused", first);
     }
+    Demand(sent == wanted, "this is sent and nothing else", sent.empty() ? "" : sent.back());
+    Demand(sent.empty() || reply != "OK\r\n" || result == 0, "what is done is done", reply);
+    Demand(sent.empty() || result < 0 || (reply + first + second).find("OK") != reply.npos,
+           "what is not answered with OK is a failure", reply);
+    Demand(operation == kChange || operation == kSwitch || !modem.IsNewPlugIn(), "it is known now");
+
     bool err = false;
-    for (const auto ask : {&USBModem::GetIMSI, &USBModem::GetVendorName, &USBModem::GetProductName,
-                           &USBModem::GetDefaultISP, &USBModem::GetDefaultAPN}) {
-        (modem.*ask)(err);
-    }
+    line.coming.clear();
+    modem.UpdateSIMStatus();
+    line.written.clear();
+    modem.GetIMSI(err);
+    modem.GetDefaultISP(err);
+    modem.GetDefaultAPN(err);
     modem.GetSignalQuality(err);
+    Demand(line.written.empty() == (status != kReady), "only a usable SIM is asked for");
+    line.written.clear();
     modem.PINGetAttemptRemain();
+    Demand(line.written.empty() == (status == kBusy), "only a SIM that is there has attempts");
+    modem.GetProductName(err);
     modem.SetHardwareFuncLvl("1");
     modem.SetUnsolicitedReports(true);
     const bool isPIN = first.size() >= 4 && first.find_first_not_of("0123456789") == first.npos;

@@ -37,8 +37,10 @@ void Fuzz(Input input) {
     const std::string value = input.Text();
     const std::string other = input.Text();
     const std::string reply = input.Rest();
+    const test::LogCapture log;
     const std::unique_ptr<Set, void (*)(Set*)> set(Set::CreateATIF(vendor), Set::DeleteATIF);
     const bool isHuawei = vendor == "12d1";
+    Demand(log.Has("Unknown vendor id") == (!isHuawei && vendor != "2001"), "others are logged");
     Demand(isHuawei == (set->GetATCommandPINPUKAttempt() == "AT^CPIN?") &&
                (vendor == "2001") == (set->GetATCommandSetSIMPIN("1") == "AT+CPIN=\"1\""),
            "the vendor has its set", vendor);

@@ -40,9 +40,10 @@ std::string WithoutMarks(std::string text) {
 
 void CheckPrinting(const std::string& text) {
     const test::LogCapture log;
-    WriteLog(LOG_ERR, "file.cpp", 7, "%s", text.c_str());
+    TAVI_LOG_ERROR("%s", text.c_str());
+    const std::string place = "log_line_fuzz.cpp:" + std::to_string(__LINE__ - 1) + " ";
     const std::string form = PrintableForm(text.substr(0, 2047));
-    Demand(log.Text() == "file.cpp:7 " + form + "\n", "a line is the text in print", text);
+    Demand(log.Text() == place + form + "\n", "a line is the text in print", text);
     std::string again = form;
     MakePrintable(again.data());
     Demand(again == form, "what is printable stays", form);

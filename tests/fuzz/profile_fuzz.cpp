@@ -8,6 +8,7 @@
 #include <cstring>
 #include <map>
 
+#include "base/split.h"
 #include "tests/fuzz/fuzz.h"
 #include "tests/fuzz/modem_line.h"
 #include "tests/support/files.h"
@@ -77,6 +78,7 @@ void Fuzz(Input input) {
         return (command == "AT+CIMI"       ? "262019876543210"
                 : command == "AT+CPIN?"    ? "+CPIN: READY"
                 : command == "AT+CGDCONT?" ? "+CGDCONT: 1,\"IP\",\"" + apn + "\""
+                : command == "AT+COPS?"    ? "+COPS: 0,0,\"" + apn + "\",2"
                                            : std::string()) +
                "\r\nOK\r\n";
     });
@@ -85,6 +87,7 @@ void Fuzz(Input input) {
     Demand(line.record.InitProfile() == 0 && test::FileMode(kProfile) == 0600, "it is ours alone");
     const std::string text = test::ReadFile(kProfile);
     Demand(text == input.Rest() || input.Rest().empty(), "only an empty one is made anew", text);
+    Demand(!input.Rest().empty() || Lines(text).size() == 9, "a new one is whole", text);
     Values values = Read(line.record);
     const bool isSet = line.record.SetProfileWithKey(key, value) == 0;
     const std::string changed = test::ReadFile(kProfile);

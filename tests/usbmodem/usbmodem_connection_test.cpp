@@ -113,24 +113,6 @@ TEST(Connection, LivesItsLifeWithTheRealDialler) {
     EXPECT_FALSE(Exists(kPidFile));
 }
 
-TEST(Dialling, GivesTheDiallerItsSettingsInOrder) {
-    DialledModem modem;
-    ASSERT_EQ(modem.record.SetProfileUsername("$(touch /tmp/ran) a"), 0);
-    ASSERT_EQ(modem.record.SetProfileAPN(""), 0);
-    ASSERT_EQ(modem.record.SetProfilePhone(""), 0);
-    EXPECT_EQ(modem.record.NetConnect(), 1);
-    EXPECT_TRUE(Eventually([] {
-        return Exists("/tmp/arguments") &&
-               ReadFile("/tmp/arguments").find("Stupid Mode") != std::string::npos;
-    }));
-    EXPECT_EQ(ReadFile("/tmp/arguments"),
-              "Init1=ATZ\nInit2=AT+CGDCONT=1,\"ip\",\"internet\"\nBaud=460800\nPhone=*99#\n"
-              "Modem=/dev/ttyUSB0\nUsername=$(touch /tmp/ran) a\nPassword=Unknown\n"
-              "Dial Attempts=1\nAuto Reconnect=1\nStupid Mode=1\n");
-    EXPECT_FALSE(Exists("/tmp/ran"));
-    EXPECT_EQ(ReadFile(kPeer), "noauth\nnodefaultroute\n");
-}
-
 TEST(Dialling, TheDiallerHasNothingOfItsCallersAndLeavesNoZombie) {
     DialledModem modem("ls -l /proc/self/fd > /tmp/fds");
     ASSERT_EQ(modem.record.InitProfile(), 0);
@@ -183,9 +165,6 @@ TEST(Dialling, FailsWithTheReasonAndCountsTheAttempt) {
         std::string message;
     } kRows[] = {
         {"no gateway to save", "", "Get default gateway failed"},
-        {"an APN that dials another number",
-         "sed -i 's/^apn=.*/apn=x\";D0900666;/' /var/lib/usbmodem/usbmodem.profile.*",
-         "refused a value for apn of the profile: it would end its place in the modem's command"},
         {"no peer file", std::string("rm ") + kPeer, "failed on set default route"},
     };
     ASSERT_EQ(modem.record.SetProfileDefaultGW("true"), 0);
@@ -223,40 +202,6 @@ struct LiveModem : DialledModem {
 
     Process dialler{{"sleep", "1000"}};
 };
-
-TEST(Link, HasTheInterfaceThatTheDiallerNames) {
-    const std::string mark = "--> ";
-    const std::string named = "Using interface lo\n";
-    const std::string forged = "Using interface eth0\n";
-    const std::string last = "secondary DNS address 10.64.64.3\n";
-    const struct {
-        std::string log;
-        int result;
-        const char* interface;
-    } kLogs[] = {
-        {"", 2, ""},
-        {named, 2, ""},
-        {std::string(2, '\0') + named + last, 1, "lo"},
-        {mark + "Sending: ATZ\n" + forged + "OK\n" + mark + named + mark + last, 1, "lo"},
-        {mark + "Sending: ATZ\n" + named + last, 2, ""},
-        {mark + "Sending: ATZ\n" + mark + forged + mark + last + "OK\n" + mark + "Sending: ATDT\n",
-         2, ""},
-        {mark + "Sending: ATZ\n" + mark + forged + mark + last + "OK\n" + mark + "Sending: ATDT\n" +
-             mark + named,
-         1, "lo"},
-    };
-    LiveModem modem;
-    for (const auto& row : kLogs) {
-        SCOPED_TRACE(row.log);
-        WriteFile(kLog, row.log);
-        USBModem record = modem.record;
-        bool err = false;
-        record.GetIMSI(err);
-        EXPECT_EQ(record.AssignConnectInfo(), row.result);
-        record.GetLinkStats();
-        EXPECT_EQ(record.GetNetIFName(err), row.interface);
-    }
-}
 
 TEST(Link, ThatCannotBeLookedAtIsNotLost) {
     LiveModem modem;

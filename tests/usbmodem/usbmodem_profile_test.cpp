@@ -38,51 +38,6 @@ TEST(Profile, OfANewSIMHoldsTheDefaultsOfTheModem) {
     EXPECT_EQ(FileMode(kProfile), 0600u);
 }
 
-TEST(Profile, ValuesComeBackAsTheyWentIn) {
-    ReadyModem modem;
-    bool err = false;
-    for (const std::string& value :
-         std::vector<std::string>{" a b ", "\"quoted\"", "[USBModem Profile]", "\xc3\xbc\xff", "",
-                                  "%s%n", std::string(1023, 'p')}) {
-        EXPECT_EQ(modem.record.SetProfilePassword(value), 0);
-        EXPECT_EQ(modem.record.GetProfilePassword(err), value);
-    }
-    EXPECT_FALSE(err);
-}
-
-TEST(Profile, RefusesWhatWouldNotComeBackOrWouldEndItsPlaceInACommand) {
-    ReadyModem modem;
-    ASSERT_EQ(modem.record.InitProfile(), 0);
-    const std::string before = ReadFile(kProfile);
-    const struct {
-        const char* key;
-        std::string value;
-        const char* reason;
-    } kValues[] = {
-        {"apn", "x\npass=forged", "it holds a line break or a zero byte"},
-        {"isp", std::string(1, '\0'), "it holds a line break or a zero byte"},
-        {"user", std::string(1024, 'u'), "it is too long"},
-        {"apn", "x\";D0900666;", "it would end its place in the modem's command"},
-        {"apn", "x\x1a", "it would end its place in the modem's command"},
-        {"number", "*99#;D0900666", "it would end its place in the modem's command"},
-    };
-    for (const auto& row : kValues) {
-        SCOPED_TRACE(std::string(row.key) + "=" + row.value.substr(0, 20));
-        modem.log.Clear();
-        EXPECT_EQ(modem.record.SetProfileWithKey(row.key, row.value), -1);
-        EXPECT_TRUE(modem.log.Has(row.reason)) << modem.log.Text();
-        EXPECT_TRUE(modem.log.Has(std::string("failed on get key value ") + row.key));
-        EXPECT_EQ(ReadFile(kProfile), before);
-    }
-}
-
-TEST(Profile, OfAModemWithAnOddOperatorIsMadeWithoutItsName) {
-    ReadyModem modem;
-    modem.Answer("AT+COPS?", {"+COPS: 0,0,\"Nord", "netz\",2", "OK"});
-    EXPECT_EQ(modem.record.InitProfile(), 0);
-    EXPECT_THAT(ReadFile(kProfile), testing::EndsWith("\napn=internet\nisp=\n"));
-}
-
 TEST(Profile, TwoSIMsNeverTouchEachOthersFile) {
     ReadyModem modem;
     ASSERT_EQ(modem.record.SetProfileUsername("first"), 0);
