@@ -126,7 +126,7 @@ class TAVIWIRELESS_API USBModem {
     // "/var/lib/usbmodem/wvdial.log." and the IMSI that this record knows. Returns 1 when it was
     // read, 2 while the link is still coming up, -1 when the log cannot be read or the dialler is
     // disconnecting. What the modem answered to the dialler's commands ("--> Sending: ") names no
-    // interface.
+    // interface, and neither does a word that is more than letters, digits, "_", "." and "-".
     int AssignConnectInfo();
 
     // Opens the serial port at the device path node: 9600 baud, hardware flow control. Fails when
@@ -146,7 +146,8 @@ class TAVIWIRELESS_API USBModem {
     //   longer than 1024 bytes.
     // reply: set on success only: the lines of the reply, each ended by a line feed, without blank
     //   lines and lines that repeat cmd, and without a line that was cut off before its end.
-    //   Whether the modem reported an error is for the caller to see: that is a reply too.
+    //   What a modem sends behind a carriage return without a line feed stands in front of the
+    //   next line. Whether it reported an error is for the caller to see: that is a reply too.
     //
     // The modem is drained first. A reply ends when 200 ms pass without input, after 2 s or 1024
     // bytes. Returns -1 when no reply begins within 1000 ms, when the modem is not quiet before it,
