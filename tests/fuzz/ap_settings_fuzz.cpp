@@ -44,6 +44,9 @@ void Fuzz(Input input) {
     filler.Text("", settings.name, "");
     wireless::VisitMainNetwork(filler, settings);
     wireless::VisitGuestNetwork(filler, settings);
+    if (settings.ap.security == WIRELESS_AP_WEP && settings.ap.secret.wepKey[0] == '\0') {
+        filler.Text("", settings.ap.secret.wepKey, "");  // whatever the table of keys says
+    }
     const bool isOn = settings.enabled != 0;
     test::WriteFile(kStore, input.Rest());
     const bool isNewFile = input.Rest().empty() && unlink(kStore) == 0;
@@ -55,6 +58,7 @@ void Fuzz(Input input) {
     Demand(isDone ? isSound : !isSound || settings.name[0] == '\0' || !isNewFile,
            "what can be stored is stored", filler.texts);
     Demand(isDone || text == input.Rest(), "what is refused changes nothing", text);
+    Demand(!test::Exists("/tmp/x"), "a name runs nothing", settings.name);
     Demand(!isNewFile || test::FileMode(kStore) == 0600, "others cannot read it");
     if (isDone && (isOn || wasStored)) {
         WirelessAPSettings expected = isOn ? settings : stored;

@@ -17,21 +17,26 @@ std::string Element(int number, const std::string& body) {
     return static_cast<char>(number) + (static_cast<char>(body.size()) + body);
 }
 
-// The elements that are whole. isOdd tells whether one of them is of what else the beacon tells.
-std::string Whole(const std::string& bytes, bool& isOdd) {
+// Takes the elements that are whole off the bytes. isOdd tells whether one of them is of what else
+// the beacon tells.
+std::string TakeWhole(std::string& bytes, bool& isOdd) {
     size_t end = 0, next = 0;
     while (end + 2 <= bytes.size() &&
            (next = end + 2 + static_cast<unsigned char>(bytes[end + 1])) <= bytes.size()) {
         isOdd = isOdd || "\x01\x2d\x30\x32\xdd"s.find(bytes[end]) != std::string::npos;
         end = next;
     }
-    return bytes.substr(0, end);
+    const std::string whole = bytes.substr(0, end);
+    bytes.erase(0, end);
+    return whole;
 }
 
 // WPA or WPA2, which have each their author, with a set of ciphers and a kind of key management.
-std::string Protection(const std::string& author, unsigned ciphers, char keyManagement) {
-    const std::string tkip = (ciphers & 4) != 0 ? author + '\2' : "";
-    const std::string pairwise = (ciphers & 8) != 0 ? tkip + author + '\4' : tkip;
+// TKIP is the group's cipher, for which there is a suite, too.
+std::string Protection(const std::string& author, unsigned ciphers, bool byGroup,
+                       char keyManagement) {
+    std::string pairwise = (ciphers & 4) != 0 ? author + (byGroup ? '\0' : '\2') : "";
+    pairwise += (ciphers & 8) != 0 ? author + '\4' : "";
     return "\1\0"s + author + '\2' + static_cast<char>(pairwise.size() / 4) + '\0' + pairwise +
            "\1\0"s + author + keyManagement;
 }
@@ -54,22 +59,24 @@ void Fuzz(Input input) {
     const auto& channel = kChannels[input.Choice(6)];
     const int dBm = 50 - static_cast<int>(input.Choice(256));
     const bool isPrivate = input.Flag(), isFast = input.Flag(), isWide = input.Flag();
-    const bool hasWpa = input.Flag(), hasRsn = input.Flag();
+    const bool hasWpa = input.Flag(), hasRsn = input.Flag(), byGroup = input.Flag();
     const unsigned wpa = input.Choice(3), rsn = input.Choice(3), ciphers = input.Choice(4) * 4;
     bool isOdd = false;
-    std::string elements = Whole(input.Rest(), isOdd) + Element(0, essid) +
+    std::string rest = input.Rest();
+    std::string elements = TakeWhole(rest, isOdd) + Element(0, essid) +
                            Element(1, isFast ? "\x6c" : "\x02") + (isWide ? Element(45, "") : "");
     if (hasRsn) {
-        elements += Element(48, Protection("\0\x0f\xac"s, ciphers, kKeyManagement[rsn]));
+        elements += Element(48, Protection("\0\x0f\xac"s, ciphers, byGroup, kKeyManagement[rsn]));
     }
     if (hasWpa) {
         const std::string author = "\0\x50\xf2"s;
-        elements += Element(221, author + '\1' + Protection(author, ciphers, kKeyManagement[wpa]));
+        elements +=
+            Element(221, author + '\1' + Protection(author, ciphers, byGroup, kKeyManagement[wpa]));
     }
     const std::string neighbour = TableLine({{}, 2412, -40, 0, false, Element(0, "near")});
-    const auto networks =
-        Scanned(neighbour + TableLine({{1, 2, 3}, channel.frequency, dBm, 0, isPrivate, elements}) +
-                neighbour);
+    const auto networks = Scanned(
+        neighbour + TableLine({{1, 2, 3}, channel.frequency, dBm, 0, isPrivate, elements + rest}) +
+        neighbour);
 
     const bool isNamed = essid.find_first_not_of('\0') != essid.npos;
     std::replace_if(

@@ -1,50 +1,35 @@
-// What hostapd is given, read again by its own rules: two networks with the values that the
-// settings have, and nothing else; or it is said that a line break stands in it.
+// What hostapd is given: it has the texts of the settings and nothing else of them, each as the
+// whole value of a line, and shows no secret; or it is said that a line break stands in it.
 #include <cstring>
-#include <map>
 
-#include "base/fixed_field.h"
 #include "base/split.h"
-#include "tests/fuzz/fuzz.h"
+#include "tests/fuzz/foreign_texts.h"
 #include "wireless/rules/hostapd_conf.h"
 
 namespace taviwireless::fuzz {
 namespace {
 
-using Values = std::map<std::string, std::string>;
-
-// The values, by keys that tell which network's they are; "bss" begins the second one.
-Values Read(const std::string& text) {
-    Values values;
-    std::string network;
-    for (const std::string& line : Lines(text)) {
-        const size_t equals = line.find('=');
-        network += line.substr(0, equals) == "bss" ? "guests' " : "";
-        const bool isNew =
-            values.emplace(network + line.substr(0, equals), line.substr(equals + 1)).second;
-        Demand(isNew && line[0] != '#', "a key has one value", text);
+struct Printed {
+    explicit Printed(const WirelessAPConf& conf) {
+        for (const auto& part :
+             {wireless::RenderHostConf("wlan0", conf), wireless::RenderGuestConf(conf)}) {
+            text += part.Text();
+            shown += part.Shown();
+            holdsLineBreak = holdsLineBreak || part.HoldsLineBreak();
+        }
     }
-    return values;
-}
+    std::string text, shown;
+    bool holdsLineBreak = false;
+};
 
-// Fills in a text, and `tame` with a harmless one of its length, of the next letter.
-template <size_t kSize>
-void Take(Input& input, char (&text)[kSize], char (&tame)[kSize], Values& texts) {
-    CopyField(text, input.Text());
-    const std::string harmless(strlen(text), static_cast<char>('A' + texts.size()));
-    CopyField(tame, harmless);
-    texts[harmless] = text;
-}
-
-void Take(Input& input, int32_t security, WirelessAPSecret& secret, WirelessAPSecret& tame,
-          Values& texts) {
+void Take(Input& input, int32_t security, WirelessAPSecret& secret, WirelessAPSecret& harmless,
+          ForeignTexts& texts) {
     if (security == WIRELESS_AP_WEP) {
-        Take(input, secret.wepKey, tame.wepKey, texts);
+        texts.Take(input, secret.wepKey, harmless.wepKey);
     } else if (security == WIRELESS_AP_WPA) {
-        Take(input, secret.wpa.passphrase, tame.wpa.passphrase, texts);
+        texts.Take(input, secret.wpa.passphrase, harmless.wpa.passphrase);
     } else if (security == WIRELESS_AP_WPA_ENTERPRISE) {
-        Take(input, secret.enterprise.radiusAddr, tame.enterprise.radiusAddr, texts);
-        Take(input, secret.enterprise.radiusSecret, tame.enterprise.radiusSecret, texts);
+        texts.Take(input, secret.enterprise.radiusSecret, harmless.enterprise.radiusSecret);
     }
 }
 
@@ -54,37 +39,26 @@ void Fuzz(Input input) {
     WirelessAPConf conf{};
     conf.security = static_cast<int>(input.Choice(5));
     conf.guestSecurity = static_cast<int>(input.Choice(5));
-    WirelessAPConf tame = conf;
-    Values texts;
-    Take(input, conf.ssid, tame.ssid, texts);
-    Take(input, conf.bridge, tame.bridge, texts);
-    Take(input, conf.guestSsid, tame.guestSsid, texts);
-    Take(input, conf.guestBssid, tame.guestBssid, texts);
-    Take(input, conf.security, conf.secret, tame.secret, texts);
-    Take(input, conf.guestSecurity, conf.guestSecret, tame.guestSecret, texts);
-    const auto host = wireless::RenderHostConf("wlan0", conf);
-    const auto guests = wireless::RenderGuestConf(conf);
-    const std::string text = host.Text() + guests.Text();
-    Values expected = Read(wireless::RenderHostConf("wlan0", tame).Text() +
-                           wireless::RenderGuestConf(tame).Text());
-    Values shown = expected;
-    bool holdsLineBreak = false;
-    for (auto& [key, value] : expected) {
-        const size_t quote = value[0] == '"' ? 1 : 0;
-        const auto found = texts.find(value.substr(quote, value.size() - 2 * quote));
-        if (!value.empty() && found != texts.end()) {
-            value.replace(quote, found->second.size(), found->second);
-            holdsLineBreak = holdsLineBreak || value.find_first_of("\r\n") != value.npos;
-        }
-        const bool isSecret = key.find("pass") != key.npos || key.find("secret") != key.npos ||
-                              key.find("wep_key0") != key.npos;
-        shown[key] = isSecret ? "********" : value;
-    }
-    Demand((host.HoldsLineBreak() || guests.HoldsLineBreak()) == holdsLineBreak,
-           "a line break is noticed", text);
-    if (!holdsLineBreak) {
-        Demand(Read(text) == expected, "it reads back", text);
-        Demand(Read(host.Shown() + guests.Shown()) == shown, "no secret is shown", text);
+    WirelessAPConf harmless = conf;
+    ForeignTexts texts;
+    texts.Take(input, conf.ssid, harmless.ssid);
+    texts.Take(input, conf.bridge, harmless.bridge);
+    texts.Take(input, conf.guestSsid, harmless.guestSsid);
+    texts.Take(input, conf.guestBssid, harmless.guestBssid);
+    Take(input, conf.security, conf.secret, harmless.secret, texts);
+    Take(input, conf.guestSecurity, conf.guestSecret, harmless.guestSecret, texts);
+    const Printed printed(conf), pattern(harmless);
+    const std::string& text = printed.text;
+    Demand(text == texts.PutInto(pattern.text), "texts stand where they belong", text);
+    Demand(printed.shown == texts.PutInto(pattern.shown), "as they do for others", printed.shown);
+    Demand(pattern.shown.find_first_of("\x12\x13") == text.npos, "no secret is shown", text);
+    const bool holdsLineBreak =
+        text.find('\r') != text.npos || Lines(text).size() > Lines(pattern.text).size();
+    Demand(printed.holdsLineBreak == holdsLineBreak, "a line break is noticed", text);
+    if (conf.security == WIRELESS_AP_WEP) {
+        const size_t size = strlen(conf.secret.wepKey);
+        const bool isQuoted = pattern.text.find("wep_key0=\"") < pattern.text.find("bss=");
+        Demand(isQuoted == (size == 5 || size == 13), "a WEP key's length tells its form", text);
     }
 }
 

@@ -45,7 +45,9 @@ std::vector<Section> Read(const std::string& text) {
 }
 
 // Takes the lines of the key, or of all keys, out of the section, which is made if there is none.
-void Forget(std::vector<Section>& sections, const std::string& name, const std::string* key) {
+// Returns the value of the first.
+std::string Forget(std::vector<Section>& sections, const std::string& name,
+                   const std::string* key) {
     auto found = sections.end();
     for (auto* compare : {strcmp, strcasecmp}) {
         if (found == sections.end()) {
@@ -56,7 +58,7 @@ void Forget(std::vector<Section>& sections, const std::string& name, const std::
     }
     if (found == sections.end()) {
         sections.push_back({name, {"[" + name + "]"}});
-        return;
+        return "";
     }
     const auto isOfKey = [&](const std::string& line) {
         const std::string shown = Trimmed(line);
@@ -65,7 +67,17 @@ void Forget(std::vector<Section>& sections, const std::string& name, const std::
                (key == nullptr || Trimmed(shown.substr(0, equals)) == *key);
     };
     auto& lines = found->second;
-    lines.erase(std::remove_if(lines.begin() + 1, lines.end(), isOfKey), lines.end());
+    const auto first = std::find_if(lines.begin() + 1, lines.end(), isOfKey);
+    std::string value = first == lines.end() ? "" : first->substr(first->find('=') + 1);
+    value.resize(value.size() - (!value.empty() && value.back() == '\r' ? 1 : 0));
+    lines.erase(std::remove_if(first, lines.end(), isOfKey), lines.end());
+    return value.substr(0, value.find('\0'));
+}
+
+std::string Value(const std::string& name, const std::string& key) {
+    char value[8192];
+    VEXACFileGetSectionValue(kFile, name.c_str(), key.c_str(), value, sizeof value);
+    return value;
 }
 
 }  // namespace
@@ -77,7 +89,8 @@ void Fuzz(Input input) {
     SzHash hash(8);
     hash.Set(k, value);
     test::WriteFile(kFile, input.Rest());
-    auto before = Read(input.Rest());
+    auto before = Read(input.Rest()), copy = before;
+    Demand(Value(name, key) == Forget(copy, name, &key), "the first line counts", input.Rest());
     const bool isDone = how == 0 ? VEXACFileSetSectionValue(kFile, n, k, v, kFormat) == 0
                         : how == 1
                             ? VEXACFileSetSection(kFile, n, nullptr, hash.Get(), kFormat) == 1
@@ -86,9 +99,7 @@ void Fuzz(Input input) {
     Demand(isDone || text == input.Rest(), "what is refused changes nothing", text);
     auto after = Read(text);
     if (isDone) {
-        std::string read(value.size() + 1, '#');
-        VEXACFileGetSectionValue(kFile, n, k, read.data(), read.size());
-        Demand(read.c_str() == value, "the value reads back", text);
+        Demand(Value(name, key) == value, "the value reads back", text);
         Forget(before, name, how == 1 ? nullptr : &key);
         Forget(after, name, how == 1 ? nullptr : &key);
         Demand(before == after, "everything else is as it was", text);

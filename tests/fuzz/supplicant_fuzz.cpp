@@ -1,43 +1,21 @@
-// What the supplicant is given, read again by its own rules: one network with the values that the
-// saved one has, and nothing else; or it is said that a line break stands in it.
+// What the supplicant is given: it has the texts of the saved network and nothing else of it, and
+// its own rules read them as they are; or it is said that a line break stands in it.
 #include <cstring>
-#include <map>
 
-#include "base/fixed_field.h"
 #include "base/split.h"
-#include "tests/fuzz/fuzz.h"
+#include "tests/fuzz/foreign_texts.h"
 #include "wireless/rules/supplicant.h"
 
 namespace taviwireless::fuzz {
 namespace {
 
-using Values = std::map<std::string, std::string>;
-
-// A line without its comment and the blanks around it. From its first quote to the last one
-// nothing is a comment.
+// A line as the supplicant takes it: without blanks around it and its comment, which nothing is
+// that stands between its first quote and its last one.
 std::string WithoutComment(std::string line) {
     const size_t first = line.find('"'), last = line.rfind('"');
     line = line.substr(0, line.find('#', first == last ? 0 : last));
     line.erase(0, line.find_first_not_of(" \t\r"));
     return line.substr(0, line.find_last_not_of(" \t\r") + 1);
-}
-
-// The values of the only network.
-Values Read(const std::string& text) {
-    Values values;
-    std::string around;
-    for (const std::string& each : Lines(text)) {
-        const std::string line = WithoutComment(each);
-        const size_t equals = line.find('=');
-        if (around.empty() || around.back() != '{' || line == "}") {
-            around += line;
-        } else {
-            Demand(values.emplace(line.substr(0, equals), line.substr(equals + 1)).second,
-                   "a key has one value", text);
-        }
-    }
-    Demand(around == "ctrl_interface=/var/run/wpa_supplicantnetwork={}", "one network", text);
-    return values;
 }
 
 }  // namespace
@@ -46,30 +24,32 @@ void Fuzz(Input input) {
     WirelessConf conf{};
     conf.network.auth = static_cast<int>(input.Choice(10));
     conf.network.encrypt = static_cast<int>(input.Choice(14));
-    CopyField(conf.network.essid, input.Text());
-    CopyField(conf.key, input.Text());
-    CopyField(conf.user, input.Text());
-    WirelessConf tame = conf;
-    for (char* text : {tame.network.essid, tame.key, tame.user}) {
-        memset(text, 'x', strlen(text));
-    }
+    WirelessConf harmless = conf;
+    ForeignTexts texts;
+    texts.Take(input, conf.network.essid, harmless.network.essid);
+    texts.Take(input, conf.key, harmless.key);
+    texts.Take(input, conf.user, harmless.user);
     const auto rendered = wireless::RenderSupplicantConf(conf);
-    if (rendered.isAuthUnknown) {
-        return;
+    const std::string pattern = wireless::RenderSupplicantConf(harmless).text,
+                      &text = rendered.text;
+    Demand(text == texts.PutInto(pattern), "texts stand where they belong", text);
+    const auto lines = Lines(text);
+    const bool holdsLineBreak =
+        text.find('\r') != text.npos || lines.size() > Lines(pattern).size();
+    Demand(rendered.holdsLineBreak == holdsLineBreak, "a line break is noticed", text);
+    for (const std::string& line : holdsLineBreak ? std::vector<std::string>() : lines) {
+        const std::string value = line.substr(line.find('=') + 1);
+        const bool isText = value[0] == '"';  // else it is of our own, or a WEP key of digits
+        Demand(!isText || WithoutComment(line) == line.substr(1), "a text is read whole", text);
+        Demand(!isText || (value.size() > 1 && value.back() == '"'), "a text has an end", text);
     }
-    Values expected = Read(wireless::RenderSupplicantConf(tame).text);
-    bool holdsLineBreak = false;
-    for (auto& [key, value] : expected) {
-        const char* text = key == "ssid"       ? conf.network.essid
-                           : key == "identity" ? conf.user
-                                               : conf.key;
-        const bool isText = value[0] == '"', isForeign = isText || key == "wep_key0";
-        value = isText ? std::string("\"") + text + "\"" : isForeign ? text : value;
-        holdsLineBreak = holdsLineBreak || value.find_first_of("\r\n") != value.npos;
-        value = WithoutComment("=" + value).substr(1);  // of a WEP key that is no digits
-    }
-    Demand(rendered.holdsLineBreak == holdsLineBreak, "a line break is noticed", rendered.text);
-    Demand(holdsLineBreak || Read(rendered.text) == expected, "it reads back", rendered.text);
+    const bool isClosed = text.size() > 2 && text.substr(text.size() - 3) == "\n}\n";
+    Demand(isClosed != rendered.isAuthUnknown, "the network is closed", text);
+    const size_t key = strlen(conf.key);
+    const bool isWep = text.find("\n\twep_tx_keyidx=0\n") != text.npos;
+    const bool isQuoted = pattern.find("\twep_key0=\"") != text.npos;
+    Demand(!isWep || isQuoted == (key == 5 || key == 13), "a WEP key's length tells its form",
+           text);
 }
 
 }  // namespace taviwireless::fuzz
