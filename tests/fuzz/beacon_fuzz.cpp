@@ -34,11 +34,11 @@ std::string TakeWhole(std::string& bytes, bool& isOdd) {
 // WPA or WPA2, which have each their author, with a set of ciphers and a kind of key management.
 // TKIP is the group's cipher, for which there is a suite, too.
 std::string Protection(const std::string& author, unsigned ciphers, bool byGroup,
-                       char keyManagement) {
+                       int keyManagement) {
     std::string pairwise = (ciphers & 4) != 0 ? author + (byGroup ? '\0' : '\2') : "";
     pairwise += (ciphers & 8) != 0 ? author + '\4' : "";
     return "\1\0"s + author + '\2' + static_cast<char>(pairwise.size() / 4) + '\0' + pairwise +
-           "\1\0"s + author + keyManagement;
+           "\1\0"s + author + static_cast<char>(keyManagement);
 }
 
 constexpr struct {
@@ -46,9 +46,9 @@ constexpr struct {
 } kChannels[] = {{2412, 1, 2, 1, 10},  {2484, 14, 2, 1, 10}, {5180, 36, 3, 3, 9},
                  {5825, 165, 3, 3, 9}, {5955, 1, 0, 0, 0},   {58320, 10474, 0, 0, 0}};
 
-// Key management that cannot be joined, EAP and PSK; and what that is of WPA2 and of WPA.
-constexpr char kKeyManagement[] = {'\x08', '\1', '\2'};
-constexpr int kAuths[][3] = {{0, 7, 4}, {8, 8, 8}, {5, 5, 5}};
+// Key management that cannot be joined, EAP, PSK and none; and what that is of WPA2 and of WPA.
+constexpr int kKeyManagement[] = {8, 1, 2, 0};
+constexpr int kAuths[][4] = {{0, 7, 4, 6}, {8, 8, 8, 8}, {5, 5, 5, 5}};
 
 }  // namespace
 
@@ -60,13 +60,15 @@ void Fuzz(Input input) {
     const int dBm = 50 - static_cast<int>(input.Choice(256));
     const bool isPrivate = input.Flag(), isFast = input.Flag(), isWide = input.Flag();
     const bool hasWpa = input.Flag(), hasRsn = input.Flag(), byGroup = input.Flag();
-    const unsigned wpa = input.Choice(3), rsn = input.Choice(3), ciphers = input.Choice(4) * 4;
+    const unsigned wpa = input.Choice(4), rsn = input.Choice(3), ciphers = input.Choice(4) * 4;
     bool isOdd = false;
     std::string rest = input.Rest();
     std::string elements = TakeWhole(rest, isOdd) + Element(0, essid) +
                            Element(1, isFast ? "\x6c" : "\x02") + (isWide ? Element(45, "") : "");
     if (hasRsn) {
-        elements += Element(48, Protection("\0\x0f\xac"s, ciphers, byGroup, kKeyManagement[rsn]));
+        const int withSha256 = byGroup && rsn > 0 ? 4 : 0;
+        elements += Element(
+            48, Protection("\0\x0f\xac"s, ciphers, byGroup, kKeyManagement[rsn] + withSha256));
     }
     if (hasWpa) {
         const std::string author = "\0\x50\xf2"s;

@@ -57,8 +57,11 @@ void Fuzz(Input input) {
     Demand(printed.holdsLineBreak == holdsLineBreak, "a line break is noticed", text);
     if (conf.security == WIRELESS_AP_WEP) {
         const size_t size = strlen(conf.secret.wepKey);
-        const bool isQuoted = pattern.text.find("wep_key0=\"") < pattern.text.find("bss=");
-        Demand(isQuoted == (size == 5 || size == 13), "a WEP key's length tells its form", text);
+        const std::string host = pattern.text.substr(0, pattern.text.find("bss="));
+        const bool isText = size == 5 || size == 13, isNumber = size == 10 || size == 26;
+        Demand((host.find("\nwep_key0=\"") != host.npos) == isText, "a text has quotes", text);
+        Demand((host.find("\nwep_key0=") != host.npos) == (isText || isNumber), "a key is one",
+               text);
     }
 }
 

@@ -45,11 +45,14 @@ void Fuzz(Input input) {
     }
     const bool isClosed = text.size() > 2 && text.substr(text.size() - 3) == "\n}\n";
     Demand(isClosed != rendered.isAuthUnknown, "the network is closed", text);
-    const size_t key = strlen(conf.key);
-    const bool isWep = text.find("\n\twep_tx_keyidx=0\n") != text.npos;
-    const bool isQuoted = pattern.find("\twep_key0=\"") != text.npos;
-    Demand(!isWep || isQuoted == (key == 5 || key == 13), "a WEP key's length tells its form",
-           text);
+    if (pattern.find("\n\twep_tx_keyidx=0\n") != pattern.npos) {
+        const size_t size = strlen(conf.key);
+        const bool isText = size == 5 || size == 13, isNumber = size == 10 || size == 26;
+        Demand((pattern.find("\twep_key0=\"") != text.npos) == isText, "a text has quotes", text);
+        Demand((pattern.find("\twep_key0=") != text.npos) == (isText || isNumber) &&
+                   rendered.isWepKeyLeftOut != (isText || isNumber),
+               "what is no key is left out", text);
+    }
 }
 
 }  // namespace taviwireless::fuzz

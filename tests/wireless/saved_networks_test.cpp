@@ -49,24 +49,6 @@ TEST(Saving, WritesASectionThatOnlyTheOwnerCanRead) {
     EXPECT_EQ(station.log.Text(), "");
 }
 
-TEST(Saving, AgainKeepsOneSectionAndWhatIsNotWritten) {
-    Station station;
-    WirelessConf conf = MakeConf("Old", kKey, WIRELESS_AUTH_WPA2_EAP, WIRELESS_ENCRYPT_TKIP_AES);
-    EXPECT_EQ(TAVIWirelessConfSet(&conf), 0);
-    Shell("sed -i 's/ACCESS_TIME=.*/ACCESS_TIME=1/' " + std::string(kSavedFile));
-    AppendFile(kSavedFile, "\tNOTE=mine\n[02:00:00:00:00:01]\n\tESSID=Other\n");
-    EXPECT_EQ(Saved().network.auth, WIRELESS_AUTH_WPA2_EAP);
-    EXPECT_EQ(Saved().network.encrypt, WIRELESS_ENCRYPT_TKIP_AES);
-    conf = MakeConf("New");
-    strcpy(conf.user, "nobody");
-    EXPECT_EQ(TAVIWirelessConfSet(&conf), 0);
-    const WirelessConf read = Saved();
-    EXPECT_STREQ(read.user, "me@home");
-    EXPECT_GT(read.accessTime, 1);
-    EXPECT_THAT(ReadFile(kSavedFile), HasSubstr("\tNOTE=mine\n"));
-    EXPECT_THAT(Essids(TAVIWirelessConfEnum), ElementsAre("New", "Other"));
-}
-
 TEST(Saving, FailuresAreLogged) {
     const std::string path = kSavedFile;
     const std::pair<const char*, std::string> kCases[] = {
