@@ -56,7 +56,7 @@ void Fuzz(Input input) {
     wireless::VisitMainNetwork(filler, settings);
     wireless::VisitGuestNetwork(filler, settings);
     if (settings.ap.security == WIRELESS_AP_WEP && settings.ap.secret.wepKey[0] == '\0') {
-        filler.Text("", settings.ap.secret.wepKey, "");  // whatever the table of keys says
+        CopyField(settings.ap.secret.wepKey, "abcde");  // whatever the table of keys says
     }
     const bool isOn = settings.enabled != 0;
     test::WriteFile(kStore, input.Rest());

@@ -145,6 +145,12 @@ TEST(KeyValue, AValueThatDoesNotFitIsRefusedAndNothingIsOverrun) {
     }
 }
 
+TEST(KeyValue, AWriteLeavesOneLineOfItsKey) {
+    WriteFile(kSettings, "KEY=old\n#\nKEY=again\nlast line");
+    EXPECT_EQ(VEXACFileSetKeyValue(kSettings, "KEY", "new", nullptr), 1);
+    EXPECT_EQ(ReadFile(kSettings), "KEY=\"new\"\n#\nlast line");
+}
+
 TEST(KeyValue, RefusesWhatIsNoFormat) {
     WriteFile(kSettings, "KEY=1\n");
     for (const char* format : {"%s=%s", "%s=%s %n\n", "%s=%s\n%s\n"}) {
