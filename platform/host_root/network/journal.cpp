@@ -3,6 +3,7 @@
 #include <netlink/msg.h>
 #include <unistd.h>
 
+#include <cstring>
 #include <sstream>
 
 #include "base/split.h"
@@ -41,10 +42,10 @@ std::shared_ptr<Object> ObjectIn(const std::string& digits, void (*release)(Obje
     for (size_t i = 0; i + 2 <= digits.size(); i += 2) {
         bytes.push_back(static_cast<char>(std::stoi(digits.substr(i, 2), nullptr, 16)));
     }
-    bytes.resize(std::max(bytes.size(), sizeof(nlmsghdr)));
-    auto* header = reinterpret_cast<nlmsghdr*>(bytes.data());
-    const Message message(header->nlmsg_len <= bytes.size() ? nlmsg_convert(header) : nullptr,
-                          nlmsg_free);
+    std::vector<nlmsghdr> aligned(bytes.size() / sizeof(nlmsghdr) + 1);
+    memcpy(aligned.data(), bytes.data(), bytes.size());
+    const bool isWhole = aligned[0].nlmsg_len <= bytes.size();
+    const Message message(isWhole ? nlmsg_convert(aligned.data()) : nullptr, nlmsg_free);
     nl_object* object = nullptr;
     const auto keep = [](nl_object* parsed, void* place) {
         nl_object_get(parsed);
