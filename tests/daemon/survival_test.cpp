@@ -3,7 +3,6 @@
 
 #include <algorithm>
 #include <chrono>
-#include <filesystem>
 #include <future>
 #include <thread>
 
@@ -13,7 +12,6 @@
 namespace taviwireless::test {
 namespace {
 
-using dbus::USBModemClient;
 using testing::HasSubstr;
 
 // Short waits for silence would take a modem that babbles for a quiet one.
@@ -24,12 +22,6 @@ std::vector<std::string> WithQuietWaits() {
 
 struct RunningService : ServedModems {
     RunningService() : ServedModems("12d1,ports=dial/at") {}
-
-    long Descriptors() {
-        using Iterator = std::filesystem::directory_iterator;
-        return std::distance(Iterator("/proc/" + std::to_string(service.Daemon().Pid()) + "/fd"),
-                             Iterator());
-    }
 };
 
 TEST(Survival, AModemThatVanishesWithinACall) {
@@ -118,26 +110,6 @@ TEST(Survival, ABusThatIsRestartedEndsItWithAMessage) {
     bus.Restart();
     EXPECT_TRUE(service.Says("the session bus has gone away; ending"));
     EXPECT_EQ(service.Daemon().Wait(), 1);
-}
-
-// While a connection comes up nothing is sent to the modem, so requests cost no waiting.
-TEST(Survival, HundredsOfStatusRequestsWithoutMoreDescriptors) {
-    InstallDialler();
-    RunningService running;
-    USBModemClient client;
-    std::string document;
-    ASSERT_EQ(client.Connect("usbmodem0"), 0);
-    const auto ask = [&](int times) {
-        for (int i = 0; i < times; ++i) {
-            ASSERT_EQ(client.GetUSBModem("usbmodem0", document), 0);
-        }
-    };
-    ask(10);
-    ASSERT_THAT(document, HasSubstr("\"net_status\": \"connecting\""));
-    const long descriptors = running.Descriptors();
-    ask(500);
-    EXPECT_EQ(running.Descriptors(), descriptors);
-    EXPECT_EQ(running.service.End(), 0);
 }
 
 // The sets are removed even while calls are waiting all the time.

@@ -1,5 +1,4 @@
-// The table of public calls itself: nothing is missing, and every call does its work when nobody
-// disturbs it.
+// Nothing is missing in the table of public calls.
 #include "tests/support/public_calls.h"
 
 #include <gmock/gmock.h>
@@ -11,10 +10,6 @@
 namespace taviwireless::test {
 namespace {
 
-using testing::AnyOf;
-using testing::HasSubstr;
-using testing::Not;
-using testing::StartsWith;
 using Names = std::multiset<std::string>;
 
 // What no caller calls: data, destructors, and private members of classes, which stand at the end.
@@ -64,28 +59,6 @@ TEST(PublicCalls, HaveARowForEveryCommand) {
     }
     EXPECT_EQ(rows, commands);
 }
-
-struct EveryCall : testing::TestWithParam<Needs> {};
-
-TEST_P(EveryCall, DoesItsWork) {
-    Surroundings around(GetParam());
-    for (const PublicCall& call : PublicCalls()) {
-        if (call.needs == GetParam()) {
-            around.Arrange(call.sim);
-            const ChildResult result = InChild([&] { return call.run(around); });
-            EXPECT_EQ(result.status, 0) << call.name;
-            EXPECT_THAT(result.text, Not(AnyOf(StartsWith("-"), HasSubstr("(err)")))) << call.name;
-        }
-    }
-    for (const CommandCall& command : CommandCalls()) {
-        if (command.needs == GetParam()) {
-            around.Arrange(command.sim);
-            const RunResult result = RunProgram(command.Argv(), command.input);
-            EXPECT_EQ(result.status, 0) << command.name << ": " << result.out << result.err;
-        }
-    }
-}
-INSTANTIATE_TEST_SUITE_P(All, EveryCall, testing::ValuesIn(kAllNeeds));
 
 }  // namespace
 }  // namespace taviwireless::test

@@ -24,7 +24,7 @@ constexpr char kCopy[] = "/var/copy.tar";
 
 // What calls leave elsewhere.
 constexpr char kTraces[] =
-    " /tmp/associated /tmp/started /tmp/master /var/run/wpa_supplicant.pid"
+    " /tmp/associated /tmp/master /var/run/wpa_supplicant.pid"
     " /var/tmp/.wireless_connecting /var/tmp/.wireless_ap_connecting"
     " /var/tmp/.wireless_current_connection ";
 
@@ -41,7 +41,10 @@ void PrepareAdapter(ToolStandIns& tools) {
     WriteFile("/tmp/table",
               "\n\n" + ScanLine(1, "My Net", "00:11:22:aa:bb:cc", 70, "11b/g/n", "WPA2PSK/AES"));
     tools.Add("/sbin/iwlist", "[ \"$3\" = tavi ] && cat /tmp/table || echo '11 channels'");
-    tools.Add("/usr/sbin/wpa_supplicant", "touch /tmp/associated /tmp/started");
+    tools.Add("/usr/sbin/wpa_supplicant", "touch /tmp/associated");
+    tools.Add("/usr/sbin/wpa_cli",
+              "[ $1 = status ] || { rm -f /var/run/wpa_supplicant.pid; exit; }\n"
+              "until [ -e /tmp/associated ]; do sleep 0.01; done; echo wpa_state=COMPLETED");
     tools.Add("/sbin/iwconfig", "[ \"$*\" != 'wlan0 essid off' ] || rm -f /tmp/associated");
     Shell("cp --remove-destination /bin/sleep /tmp/udhcpc");
     tools.Add("/usr/sbin/udhcpc",

@@ -216,27 +216,6 @@ TEST(Connect, GivesTheSupplicantNothingOfItsCaller) {
     EXPECT_THAT(inherited, testing::ContainsRegex("SigIgn:\t0000000[01][08]0000006\n/\n"));
 }
 
-// What strangers put into the folder of the flag and of the record.
-TEST(Connect, IsKeptFromNothingByWhatStandsInAFolderOfEverybody) {
-    TAVI_NEEDS_A_STRANGER()
-    for (const std::string arrange :
-         {"ln -s /etc/nologin $1", "mkdir -p $1/full", "mkfifo $1", "touch $1; chown 65534 $1"}) {
-        for (const char* place : {kFlag, kRecord}) {
-            SCOPED_TRACE(arrange + ' ' + place);
-            Station station;
-            Shell("set -- " + std::string(place) + "; " + arrange + "; chown -h 65534 $1");
-            WirelessConf conf = MakeConf();
-            const SleepCapture sleeps([](unsigned) {
-                EXPECT_TRUE(
-                    std::filesystem::is_regular_file(std::filesystem::symlink_status(kFlag)));
-            });
-            EXPECT_EQ(TAVIWirelessNetworkConnect(&conf), 0) << station.log.Text();
-            EXPECT_THAT(ReadFile(kRecord), HasSubstr("My Net\n"));
-            EXPECT_FALSE(Exists(kFlag) || Exists("/etc/nologin"));
-        }
-    }
-}
-
 TEST(CheckBlock, TellsWhetherTheUserBlockedTheRadio) {
     const struct {
         const char *settings, *info;
