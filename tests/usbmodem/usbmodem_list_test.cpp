@@ -43,11 +43,12 @@ TEST(Search, TakesExactlyTheNamesOfInfoFiles) {
                 testing::UnorderedElementsAre("usbmodem0", "usbmodem12", "usbmodem4294967291"));
 }
 
-TEST(Search, DropsWhatIsAStrangersNow) {
-    WriteFile(kInfo1, "");
+TEST(Search, DropsWhatIsALinkNow) {
+    WriteFile(kInfo1, "CONNECTNODE=0\nDEVICENODE=0,1\n");
     USBModemList list;
     ASSERT_EQ(list.SearchInfoPath(), 0);
     Shell("mv /tmp/usbmodem.info1 /tmp/elsewhere; ln -s elsewhere /tmp/usbmodem.info1");
+    EXPECT_EQ(list.FindUSBModem(1).AssignConnectNode(), -1);
     list.DropUnplugged();
     EXPECT_THAT(DevIds(list), IsEmpty());
 }
