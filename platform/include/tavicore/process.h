@@ -53,7 +53,8 @@ TAVI_SDK_API int VEXACProcSignalByPidFile(const char* file, int signal);
 
 /*
  * Returns the process id in the pid file; 0 when the file holds no positive number, or has a start
- * time and its process is not there any more; -1 when it cannot be read.
+ * time and its process is not there any more; -1 when that cannot be told (VEXAC_ERR_NOT_FOUND
+ * without a file).
  */
 TAVI_SDK_API pid_t VEXACReadPidFile(const char* file);
 

@@ -43,7 +43,10 @@ constexpr int kKilled = -2;
     const pid_t child = settings.Spawn(program, arguments);
     if (child > 0) {
         int status = 0;
-        const bool isKnown = waitpid(child, &status, 0) == child;
+        pid_t ended;
+        while ((ended = waitpid(child, &status, 0)) < 0 && errno == EINTR) {
+        }
+        const bool isKnown = ended == child;
         told = isKnown && WIFEXITED(status) ? WEXITSTATUS(status) : kKilled;
     }
     _exit(ChildReport::Tell(kFirstPrivateDescriptor, told) ? 0 : 1);

@@ -110,6 +110,9 @@ bool FileLock::Try() {
     }
     if (flock(file_.Get(), LOCK_EX | LOCK_NB) != 0) {
         if (errno != EWOULDBLOCK) {
+            if (isNew_) {  // where files cannot be locked, nobody else has it
+                unlinkat(place_.directory.Get(), name_.c_str(), 0);
+            }
             throw Failure{VEXAC_ERR_IO};
         }
         PutWaiterMark(file_.Get());
@@ -129,7 +132,8 @@ bool FileLock::Try() {
 bool FileLock::Open() {
     const int folder = place_.directory.Get();
     file_ = UniqueFd(openat(folder, name_.c_str(), O_CREAT | O_EXCL | kCarefully, 0600));
-    if (file_) {
+    isNew_ = static_cast<bool>(file_);
+    if (isNew_) {
         // So that the owner of the folder can take over what a killed root leaves; only root can.
         constexpr gid_t kSameGroup = static_cast<gid_t>(-1);
         [[maybe_unused]] const int result = fchown(file_.Get(), place_.owner, kSameGroup);

@@ -39,6 +39,7 @@ class FileLock {
     const Place& place_;
     std::string name_;
     UniqueFd file_;
+    bool isNew_ = false;  // the file was not there before
     bool isTaken_ = false;
 };
 

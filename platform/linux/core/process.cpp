@@ -70,7 +70,10 @@ pid_t VEXACReadPidFile(const char* file) {
             if (!process.startTime.empty()) {
                 RequireAlive(process);
             }
-        } catch (const Failure&) {
+        } catch (const Failure& failure) {
+            if (failure.code != VEXAC_ERR_NOT_FOUND) {
+                throw;
+            }
             return 0;
         }
         return process.pid;

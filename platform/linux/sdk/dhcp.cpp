@@ -79,6 +79,15 @@ void ReadLease(const char* file, const char* key, char (&value)[TAVI_NET_ADDRESS
     }
 }
 
+void GetLease(TAVINetCard& card) {
+    if (!RunClient(card.interface)) {
+        throw Failure{VEXAC_ERR_NOT_FOUND};
+    }
+    const std::string lease = FileOf(card.interface, ".info");
+    ReadLease(lease.c_str(), "IPADDR", card.address);
+    ReadLease(lease.c_str(), "NETMASK", card.netmask);
+}
+
 }  // namespace
 
 void tavisdk::StopDhcpClient(const char* interface) {
@@ -96,12 +105,13 @@ int TAVIIGetDHCPTestNetInfo(TAVINetCard* card) {
         card->isStatic = 0;
         card->address[0] = card->netmask[0] = '\0';
         StopDhcpClient(card->interface);
-        if (!RunClient(card->interface)) {
-            throw Failure{VEXAC_ERR_NOT_FOUND};
+        try {
+            GetLease(*card);
+        } catch (...) {
+            StopDhcpClient(card->interface);  // it would change the address one day
+            card->address[0] = card->netmask[0] = '\0';
+            throw;
         }
-        const std::string lease = FileOf(card->interface, ".info");
-        ReadLease(lease.c_str(), "IPADDR", card->address);
-        ReadLease(lease.c_str(), "NETMASK", card->netmask);
         return 0;
     });
 }

@@ -25,6 +25,7 @@ constexpr char kFilePrefix[] = "dhcpd-";
 
 // Settings in use, and those of a service that was put aside.
 constexpr const char* kSuffixes[] = {".info", ".info.manual"};
+constexpr char kConfiguration[] = ".conf";  // of the server
 
 std::string PathOf(const char* interface, const char* bridge, const char* suffix) {
     return std::string(kFolder) + '/' + kFilePrefix + interface + '-' + bridge + suffix;
@@ -131,7 +132,8 @@ std::string NameOf(const std::string& file, const char* suffix) {
 // served from it any more.
 void WriteConfiguration(const std::string& file, const char* suffix) {
     const std::string name = NameOf(file, suffix);
-    const std::string configuration = std::string(kFolder) + '/' + kFilePrefix + name + ".conf";
+    const std::string configuration =
+        std::string(kFolder) + '/' + kFilePrefix + name + kConfiguration;
     TAVINetDhcpServer server{};
     const bool isValid = Guarded(-1, [&] {
                              server = ReadServer(std::string(kFolder) + '/' + file);
@@ -155,6 +157,12 @@ void WriteConfigurations() {
                 WriteConfiguration(name, suffix);
             }
         }
+    }
+}
+
+void RequireConfiguration(const char* interface, const char* bridge) {
+    if (VEXACFileExist(PathOf(interface, bridge, kConfiguration).c_str()) == 0) {
+        throw Failure{VEXAC_ERR_IO};
     }
 }
 
@@ -190,6 +198,9 @@ int TAVINetSetDhcpServerConfigFiles(const TAVINetDhcpServer* server, int save) {
                         Settings(*server));
         }
         WriteConfigurations();
+        if (save != 0) {  // not passed over, since these are valid
+            RequireConfiguration(server->interface, server->bridge);
+        }
         return 1;
     });
 }

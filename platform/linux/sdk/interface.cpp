@@ -16,6 +16,7 @@ int TAVINetIFGetInfo(const char* interface, TAVINetIFInfo* info) {
         *info = TAVINetIFInfo{};
         const unsigned int index = if_nametoindex(interface);
         if (index == 0) {
+            Require(errno == ENODEV ? 0 : -1);
             return 0;
         }
         const Socket socket = OpenRouteSocket();

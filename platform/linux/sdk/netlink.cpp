@@ -25,7 +25,7 @@ Socket OpenRouteSocket() {
 int FindInterface(const char* name) {
     const unsigned int index = if_nametoindex(name);
     if (index == 0) {
-        throw tavicore::Failure{VEXAC_ERR_NOT_FOUND};
+        throw tavicore::Failure{errno == ENODEV ? VEXAC_ERR_NOT_FOUND : VEXAC_ERR_IO};
     }
     return static_cast<int>(index);
 }
