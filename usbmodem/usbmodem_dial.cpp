@@ -36,11 +36,14 @@ std::string OrElse(const std::string& value, const char* standard) {
 }
 
 // In the child of BackgroundExec: becomes the dialler, or aborts. Closing hasPidFile tells the
-// parent that the pid file is written.
+// parent that the pid file is written. Without one nobody could end the dialler, so there is none
+// then.
 [[noreturn]] void BecomeDialler(char* const arguments[], const char* pidFile, const char* logFile,
                                 int hasPidFile) {
     const int log = open(logFile, O_RDWR | O_CREAT, kStateFileMode);
-    VEXACProcPidFileCreate(pidFile);
+    if (VEXACProcPidFileCreate(pidFile) < 0) {
+        _exit(EXIT_FAILURE);
+    }
     close(hasPidFile);
     VEXACFileCloseLock(dup2(log, STDERR_FILENO));
     // The caller's descriptors are not the dialler's: the AT channel must close with its owner, and

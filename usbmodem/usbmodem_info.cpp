@@ -275,8 +275,8 @@ bool USBModem::ReadAPNData(Json::Value& out) {
             out = root;
             return true;
         }
-    } catch (const Json::Exception&) {
-        // nested too deeply
+    } catch (const std::exception&) {
+        // nested too deeply, or cannot be read
     }
     TAVI_LOG_ERROR("Failed to parse json file [%s]", kAPNDatabase);
     return false;

@@ -3,6 +3,7 @@
 #include <tavicore/file.h>
 #include <tavicore/section.h>
 #include <taviwireless/usbmodem.h>
+#include <unistd.h>
 
 #include <cerrno>
 
@@ -28,6 +29,12 @@ bool IsMissing(const std::string& path) {
     return stat(path.c_str(), &status) == 0 ? status.st_size == 0 : errno == ENOENT;
 }
 
+// Removed in the end, however that comes, unless it was given another name.
+struct RemovedFile {
+    const std::string& path;
+    ~RemovedFile() { unlink(path.c_str()); }
+};
+
 }  // namespace
 
 bool USBModem::ComputeProfilePath() {
@@ -50,6 +57,7 @@ int USBModem::ResetProfile() {
     // Made beside the old one, which stays until this one is whole. Closed to others before the
     // first byte is in it; every later write keeps the mode.
     const std::string newPath = profilePath_ + ".new";
+    const RemovedFile removed{newPath};
     if (!MakeEmptyFile(newPath)) {
         TAVI_LOG_ERROR("Error on reset profile: touch profile %s", path);
     }
@@ -58,21 +66,22 @@ int USBModem::ResetProfile() {
         TAVI_LOG_ERROR("Error on reset profile: hash alloc");
         return -1;
     }
-    FillDefaults(profile);
-    if (VEXACFileAddSection(newPath.c_str(), kSection, profile.Get(), kLineFormat) != 1 ||
+    if (!FillDefaults(profile) ||
+        VEXACFileAddSection(newPath.c_str(), kSection, profile.Get(), kLineFormat) != 1 ||
+        chmod(newPath.c_str(), kStateFileMode) != 0 ||  // it may be made only here
         VEXACSysRename(newPath.c_str(), path) != 0) {
         TAVI_LOG_ERROR("Error on reset profile: section %s in profile %s", kSection, path);
-        VEXACSysUnlink(newPath.c_str());
         return -1;
     }
     return 0;
 }
 
 // Query errors are ignored: an empty value is written as it is, and in the place of what a profile
-// cannot hold, such as an operator's name with a line break.
-void USBModem::FillDefaults(SzHash& values) {
-    const auto set = [&values](const char* key, const std::string& value) {
-        values.Set(key, IsProfileValue(key, value) ? value : "");
+// cannot hold, such as an operator's name with a line break. False when there is no memory for them.
+bool USBModem::FillDefaults(SzHash& values) {
+    bool isFilled = true;
+    const auto set = [&](const char* key, const std::string& value) {
+        isFilled = values.Set(key, IsProfileValue(key, value) ? value : "") && isFilled;
     };
     bool ignored = false;
     set(profile::kNumber, profile::kDefaultNumber);
@@ -85,6 +94,7 @@ void USBModem::FillDefaults(SzHash& values) {
     const std::string apn = GetDefaultAPN(ignored);
     set(profile::kAPN, apn);
     set(profile::kISP, isp.empty() || apn.empty() ? isp : isp + " - " + apn);
+    return isFilled;
 }
 
 int USBModem::SetProfileToDefault() {

@@ -347,7 +347,7 @@ class TAVIWIRELESS_API USBModem {
     // caller. Its arguments are init1, init2, baud, phone, modem, username and password, each in
     // the dialler's form "Key=value", and "Dial Attempts=1", "Auto Reconnect=1", "Stupid Mode=1".
     // Returns 1 once the pid file is written, -1 when there is no process. A program that cannot be
-    // run says so in the log.
+    // run says so in the log; without a pid file, by which it could be ended, it is not run.
     int BackgroundExec(const std::string& program, const std::string& init1,
                        const std::string& init2, const std::string& baud, const std::string& modem,
                        const std::string& phone, const std::string& username,
@@ -377,7 +377,7 @@ class TAVIWIRELESS_API USBModem {
     int EnterPUK(const std::string& puk, const std::string& newPin);
     int AttemptRemain(Parser parser, int& cache);
     bool ComputeProfilePath();
-    void FillDefaults(SzHash& profile);
+    bool FillDefaults(SzHash& profile);
     std::string PidFilePath() const;
     bool PrepareToDial(DialSettings& settings);
     void ReadDialSettings(DialSettings& settings, bool& err);
