@@ -222,5 +222,8 @@ int main(int argc, char** argv) {
     } catch (const CommandError& error) {
         PrintFailure(options, error.what());
         return error.Status();
+    } catch (const std::exception& error) {  // no memory, above all
+        PrintFailure(options, std::string("failed: ") + error.what());
+        return kFailure;
     }
 }

@@ -17,6 +17,7 @@
 #include "wireless/rules/paths.h"
 #include "wireless/system/ap_store.h"
 #include "wireless/system/bridge.h"
+#include "wireless/system/files.h"
 #include "wireless/system/shell.h"
 
 namespace taviwireless::cli {
@@ -192,10 +193,21 @@ void SwitchAPOff() {
         throw CommandError(kFailure,
                            "the access point could not be switched off; the system log tells why");
     }
-    // The settings of an adapter that was pulled out cannot be found; its network goes all the
-    // same.
-    if (const auto settings = FindSettings(); settings && settings->enabled != 0) {
+    // By this file it would come back; the library goes on when it cannot be removed.
+    if (const std::string info = wireless::HostapdInfo(TAVIWirelessAPInterfaceGet());
+        !wireless::IsMissing(info.c_str())) {
+        throw CommandError(kFailure,
+                           "switched off, but not after a restart: cannot remove " + info);
+    }
+    const auto settings = FindSettings();
+    if (settings && settings->enabled != 0) {
         StoreEnabled(*settings, "no");
+    }
+    // Those of an adapter that was pulled out cannot be found; its network goes all the same.
+    if (!settings && !wireless::IsMissing(wireless::kAdapterInfo)) {
+        throw CommandError(kFailure,
+                           std::string("switched off, but not after a restart: cannot read ") +
+                               wireless::kAdapterInfo + " or " + kAPSettings);
     }
 }
 

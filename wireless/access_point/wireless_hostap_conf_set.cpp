@@ -49,18 +49,9 @@ bool MakeFolder() {
     return true;
 }
 
-// Nothing is left of a file that could not be written whole: the security stands at its end, and
-// half of it would be an open network.
 bool Write(const std::string& path, const HostapdConf& conf) {
     const UniqueFile file = CreateAnew(path.c_str(), kMode);
-    if (!file) {
-        return false;
-    }
-    const bool isWhole = fputs(conf.Text().c_str(), file.get()) >= 0 && fflush(file.get()) == 0;
-    if (!isWhole) {
-        VEXACSysUnlink(path.c_str());
-    }
-    return isWhole;
+    return file && WriteWhole(file, path.c_str(), conf.Text());
 }
 
 bool WriteForGuests(const std::string& path, const HostapdConf& conf) {

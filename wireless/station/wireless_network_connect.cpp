@@ -5,6 +5,7 @@
 #include <taviwireless/wireless.h>
 
 #include <cstring>
+#include <sstream>
 #include <string>
 
 #include "base/sleep_out.h"
@@ -45,8 +46,7 @@ bool WriteSupplicantConf(const WirelessConf& conf) {
     if (rendered.isAuthUnknown) {
         TAVI_LOG_ERROR("Failed to detect authentication/encryption type");
     }
-    const bool isWritten = fputs(rendered.text.c_str(), file.get()) >= 0 && fflush(file.get()) == 0;
-    return isWritten && !rendered.isAuthUnknown;
+    return WriteWhole(file, kSupplicantConf, rendered.text) && !rendered.isAuthUnknown;
 }
 
 bool StopSupplicant() {
@@ -89,11 +89,13 @@ bool RecordConnection(const WirelessNetwork& network) {
     }
     const UniqueFile file = CreateAnew(kCurrentConnection, kRecordMode);
     char bssid[18];
-    return file &&
-           fprintf(file.get(), "%s\n%d\n%d\n%d\n%s\n", network.essid, network.protocol,
-                   network.auth, network.encrypt,
-                   TAVIWirelessBssidStringGet(network.bssid, bssid, sizeof bssid)) > 0 &&
-           fflush(file.get()) == 0;
+    std::ostringstream record;
+    record << network.essid << '\n'
+           << network.protocol << '\n'
+           << network.auth << '\n'
+           << network.encrypt << '\n'
+           << TAVIWirelessBssidStringGet(network.bssid, bssid, sizeof bssid) << '\n';
+    return file && WriteWhole(file, kCurrentConnection, record.str());
 }
 
 int Connect(const std::string& interface, const WirelessConf* conf) {
