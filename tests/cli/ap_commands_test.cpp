@@ -43,7 +43,7 @@ struct APCommands : testing::Test {
 
 TEST_F(APCommands, SettingsAreInTheWordsOfAPerson) {
     const RunResult set =
-        Set({"ssid=Our Home", "security=wpa2", "passphrase", "cipher=both", "band=5", "channel=36",
+        Set({"ssid=Our Home", "security=wpa2", "passphrase", "cipher=both", "band=5", "channel=64",
              "width=40", "hidden=yes", "max-stations=20", "bridge=lbr1", "guest=yes",
              "guest-ssid=Visitors", "guest-security=wep", "guest-wep-key", "guest-isolate=no"},
             "the phrase\n0123456789\n");
@@ -59,7 +59,7 @@ TEST_F(APCommands, SettingsAreInTheWordsOfAPerson) {
               "Passphrase                ********\n"
               "Bridge                    lbr1\n"
               "Mode                      802.11an at 5 GHz\n"
-              "Channel                   36, 40 MHz\n"
+              "Channel                   64, 40 MHz\n"
               "Guest network             yes\n"
               "Guests: Network           Visitors\n"
               "Guests: Hidden            no\n"
@@ -75,7 +75,7 @@ TEST_F(APCommands, SettingsAreInTheWordsOfAPerson) {
 }
 
 TEST_F(APCommands, WhatIsNotSetKeepsItsDefaultOrItsStoredValue) {
-    ASSERT_EQ(Set({"ssid=First"}).status, 0);
+    ASSERT_EQ(Set({"ssid=First", "mode=an", "channel=149", "width=20"}).status, 0);
     EXPECT_THAT(ReadFile(kStored), HasSubstr("\tguest_net_lan_block=1\n"));
     EXPECT_THAT(ReadFile(kStored), HasSubstr("\tenable=no\n"));
     Shell(
@@ -136,34 +136,10 @@ TEST_F(APCommands, AWrongSettingChangesNothing) {
     EXPECT_FALSE(Exists(kStored));
 }
 
-TEST_F(APCommands, EverySettingThatIsAllowedIsUnderstoodByHostapd) {
-    const std::vector<std::vector<std::string>> kRadios = {{"mode=b", "channel=14"},
-                                                           {"mode=bgn", "channel=13", "width=40"},
-                                                           {"mode=n", "channel=auto", "width=40"},
-                                                           {"mode=a", "channel=165"},
-                                                           {"mode=an", "channel=64", "width=40"},
-                                                           {"mode=an", "channel=149", "width=20"}};
-    const std::vector<std::pair<std::vector<std::string>, std::string>> kSecurities = {
-        {{"security=open"}, ""},
-        {{"security=wpa-mixed", "cipher=both", "passphrase"}, std::string(63, 'p') + "\n"},
-        {{"security=wpa2-eap", "radius-server=10.0.0.9", "radius-port=65535", "radius-secret"},
-         "s\n"}};
-    for (const auto& radio : kRadios) {
-        for (const auto& [security, input] : kSecurities) {
-            std::vector<std::string> all = radio;
-            all.insert(all.end(), security.begin(), security.end());
-            SCOPED_TRACE(testing::PrintToString(all));
-            EXPECT_EQ(Set(all, input).err, "");
-            const RunResult check = AP({"check"});
-            EXPECT_EQ(check.status, 0) << check.err;
-            EXPECT_THAT(check.out, HasSubstr("hostapd understands all of it.\n"));
-        }
-    }
-}
-
 TEST_F(APCommands, ACheckShowsTheFilesWithoutSecretsAndSwitchesNothing) {
     interface.Up();
-    ASSERT_EQ(Set({"security=wpa2", "passphrase"}, "the phrase\n").status, 0);
+    ASSERT_EQ(Set({"security=wpa2", "mode=b", "channel=14", "passphrase"}, "the phrase\n").status,
+              0);
     const RunResult check = AP({"check"});
     EXPECT_THAT(check.out, StartsWith("# /etc/hostapd/hostapd-wlan0-host.conf\ninterface=wlan0\n"));
     EXPECT_THAT(check.out, HasSubstr("\nwpa_passphrase=********\n"));
@@ -178,7 +154,7 @@ TEST_F(APCommands, ACheckShowsTheFilesWithoutSecretsAndSwitchesNothing) {
 
 TEST_F(APCommands, ACheckNamesWhatHostapdRefusesAndIncludesTheGuestsWhereTheModelHasThem) {
     const std::string guests = "# /etc/hostapd/hostapd-wlan0-guest.conf\nbss=gwlan\n";
-    ASSERT_EQ(Set({"guest=yes"}).status, 0);
+    ASSERT_EQ(Set({"guest=yes", "mode=a", "channel=165"}).status, 0);
     EXPECT_THAT(AP({"check"}).out, HasSubstr(guests));
     SetSupport("yes");
     EXPECT_THAT(AP({"check"}).out, Not(HasSubstr(guests)));

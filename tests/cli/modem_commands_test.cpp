@@ -47,13 +47,6 @@ TEST(DirectCommands, FailuresAreOneSentenceAndAnExitStatus) {
     }
 }
 
-TEST(DirectCommands, TellWhatTheModemSaysToThePIN) {
-    ModemSimulator simulator({"--modem", "generic,pin=1234"});
-    EXPECT_EQ(DirectModem({"unlock", "usbmodem0"}, "1234\n").out, "usbmodem0: the SIM is ready\n");
-    EXPECT_EQ(DirectModem({"pin", "unprotect", "usbmodem0"}, "4321\n").err,
-              "taviwireless: usbmodem0 refused the PIN; 2 attempts are left\n");
-}
-
 TEST(DirectCommands, SetShowAndResetAProfile) {
     ModemSimulator simulator({"--modem", "generic"});
     // The service would take the user's name for a setting.

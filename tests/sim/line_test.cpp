@@ -52,19 +52,6 @@ TEST(Line, IsFramedAndEchoedLikeAModems) {
     EXPECT_EQ(client.ReadUntilQuiet(), "");
 }
 
-TEST(Line, OutlivesItsClientsAndKeepsNothingForTheNext) {
-    ModemSimulator simulator;
-    for (int round = 0; round < 20; ++round) {
-        Client(1).Write("AT+CGMM\r");  // leaves before the reply
-        std::vector<std::string> received;
-        Eventually([&] { return !(received = simulator.Received("0")).empty(); });
-        ASSERT_THAT(received, ElementsAre("AT+CGMM"));
-        Client client(1);
-        ASSERT_EQ(client.Ask("AT+CSQ"), "AT+CSQ\r\r\n+CSQ: 17,99\r\n\r\nOK\r\n");
-        simulator.Received("0");
-    }
-}
-
 TEST(Line, DialledPortCarriesDataUntilItIsEscapedFromOrReopened) {
     ModemSimulator simulator;
     {

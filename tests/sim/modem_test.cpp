@@ -77,17 +77,6 @@ std::vector<std::string> Names(const std::string& folder, const std::string& par
     return names;
 }
 
-TEST(Plug, WritesAnInfoFilePerModemAndCountsPortsOverAll) {
-    ModemSimulator simulator({"--modem", "2001,id=7", "--modem", "12d1", "--first-port", "3"});
-    EXPECT_EQ(ReadFile("/tmp/usbmodem.info7"),
-              "USB_ID_VENDOR=2001\nCONNECTNODE=5\nDEVICENODE=3,4,5\n");
-    EXPECT_EQ(ReadFile("/tmp/usbmodem.info0"),
-              "USB_ID_VENDOR=12d1\nCONNECTNODE=6\nDEVICENODE=6,7,8\n");
-    EXPECT_THAT(Names("/dev", "ttyUSB"), UnorderedElementsAre("ttyUSB3", "ttyUSB4", "ttyUSB5",
-                                                              "ttyUSB6", "ttyUSB7", "ttyUSB8"));
-    EXPECT_THAT(Names("/tmp", "info"), UnorderedElementsAre("usbmodem.info0", "usbmodem.info7"));
-}
-
 TEST(Plug, UnpluggingHangsClientsUpAndPluggingStartsAfresh) {
     ModemSimulator simulator({"--modem", "generic", "--modem", "generic"});
     Client client(1);

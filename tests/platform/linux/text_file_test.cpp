@@ -83,26 +83,6 @@ TEST(Replacing, FourWritersLoseNothing) {
     EXPECT_EQ(std::count(text.begin(), text.end(), '\n'), kWriters * kWrites);
 }
 
-TEST(Replacing, AKilledWriterNeverLeavesATornFile) {
-    const std::string old = "A=0\nFILLER=" + std::string(20000, 'x') + "\n";
-    WriteFile(kFile, old);
-    for (int sync = 1; sync <= 2; ++sync) {  // of the new file, and of its folder
-        int status = 0;
-        waitpid(Fork([sync] {
-                    int left = sync;
-                    AtEachSync([&left] { --left > 0 || raise(SIGKILL) != 0; });
-                    VEXACFileSetKeyValue(kFile, "A", "1", "%s=%s\n");
-                }),
-                &status, 0);
-        EXPECT_TRUE(WIFSIGNALED(status));
-        std::string text = old;
-        text[2] = sync == 1 ? '0' : '1';
-        EXPECT_EQ(ReadFile(kFile), text);
-    }
-    EXPECT_EQ(VEXACFileSetKeyValue(kFile, "A", "2", "%s=%s\n"), 1);
-    EXPECT_FALSE(Exists("/tmp/state/.file.new"));  // what the first killed one left
-}
-
 constexpr char kLock[] = "/tmp/state/.file.lock";
 constexpr uid_t kStranger = 65534;
 
