@@ -47,7 +47,8 @@ void CheckReply(ModemLine& line, const std::string& command) {
     Demand(reply.size() <= 1024 && reply.find('\0') == reply.npos, "it is a text", reply);
     const std::string answer = line.answer(command);
     std::string inTime = answer.substr(0, answer.find(ModemLine::kPause));
-    if (result != 0 || std::regex_search(inTime, std::regex("\r+[^\r\n]"))) {
+    const auto isOdd = [](char c, char next) { return c == '\r' && next != '\r' && next != '\n'; };
+    if (result != 0 || std::adjacent_find(inTime.begin(), inTime.end(), isOdd) != inTime.end()) {
         return;  // what stands behind a carriage return in a line comes before the next line
     }
     std::replace(inTime.begin(), inTime.end(), '\r', '\n');
