@@ -1,6 +1,7 @@
 // The profile of a SIM: a file that may hold anything, values that may be anything, and what of them
 // reaches the dialler.
 #include <sys/mman.h>
+#include <sys/stat.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -84,6 +85,7 @@ void Fuzz(Input input) {
     });
     test::WriteFile("/etc/ppp/peers/wvdial", "noauth\n");
     test::WriteFile(kProfile, input.Rest());
+    chmod(kProfile, 0644);  // as others may have left it
     Demand(line.record.InitProfile() == 0 && test::FileMode(kProfile) == 0600, "it is ours alone");
     const std::string text = test::ReadFile(kProfile);
     Demand(text == input.Rest() || input.Rest().empty(), "only an empty one is made anew", text);

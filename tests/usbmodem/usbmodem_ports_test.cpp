@@ -22,24 +22,6 @@ struct NewModem {
     USBModem record;
 };
 
-TEST(ConnectNode, ThatDoesNotAnswerOrIsNotThereIsTakenWithAWarning) {
-    NewModem modem("generic,ports=dial/at");
-    modem.simulator.Fault("1.0", "silent");
-    for (const char* number : {"0", "77"}) {
-        SCOPED_TRACE(number);
-        modem.log.Clear();
-        WriteFile(kInfo1, "CONNECTNODE=" + std::string(number) + "\nDEVICENODE=" + number + ",1\n");
-        EXPECT_EQ(modem.record.AssignConnectNode(), 0);
-        EXPECT_TRUE(
-            modem.log.Has(std::string("warning: cannot test CONNECTNODE /dev/ttyUSB") + number))
-            << modem.log.Text();
-        EXPECT_EQ(modem.record.AssignQuaryNode(), 0);  // which passes the dial port over
-        EXPECT_THAT(modem.simulator.Received("1.1"), ElementsAre("AT+CPIN?"));
-        modem.simulator.Received("1.0");
-        modem.record.CloseFileDevice();
-    }
-}
-
 TEST(QueryNode, IsTheFirstPortThatAnswersAndOnlyItStaysOpen) {
     NewModem modem("generic,ports=dial/mute/at/at");
     ASSERT_EQ(modem.record.AssignConnectNode(), 0);
