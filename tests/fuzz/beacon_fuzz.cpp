@@ -2,6 +2,7 @@
 // network of the name, channel, signal, protocol and protection that it tells, or none if it hides
 // its name, and its neighbours stay what they are.
 #include <algorithm>
+#include <cctype>
 
 #include "platform/host_root/iwlist/scan_table.h"
 #include "tests/fuzz/fuzz.h"
@@ -39,6 +40,16 @@ std::string Protection(const std::string& author, unsigned ciphers, bool byGroup
     pairwise += (ciphers & 8) != 0 ? author + '\4' : "";
     return "\1\0"s + author + '\2' + static_cast<char>(pairwise.size() / 4) + '\0' + pairwise +
            "\1\0"s + author + static_cast<char>(keyManagement);
+}
+
+// The ESSID as the table has it; empty when it is hidden.
+std::string Shown(std::string essid) {
+    const bool isNamed = essid.find_first_not_of('\0') != essid.npos;
+    for (char& byte : essid) {
+        byte = iscntrl(static_cast<unsigned char>(byte)) != 0 ? '?' : byte;
+    }
+    essid = isNamed ? essid.substr(0, 32) : "";
+    return essid.substr(0, essid.find_last_not_of(' ') + 1);
 }
 
 constexpr struct {
@@ -80,12 +91,7 @@ void Fuzz(Input input) {
         neighbour + TableLine({{1, 2, 3}, channel.frequency, dBm, 0, isPrivate, elements + rest}) +
         neighbour);
 
-    const bool isNamed = essid.find_first_not_of('\0') != essid.npos;
-    std::replace_if(
-        essid.begin(), essid.end(), [](unsigned char byte) { return byte < ' ' || byte == 0x7f; },
-        '?');
-    essid = isNamed ? essid.substr(0, 32) : "";
-    essid.resize(essid.find_last_not_of(' ') + 1);
+    essid = Shown(essid);
     Demand(networks.size() == (essid.empty() ? 2 : 3), "it is one network", essid);
     for (const WirelessNetwork& network : {networks.front(), networks.back()}) {
         Demand(network.essid == "near"s && network.auth == 1, "others stay what they are", essid);
@@ -94,21 +100,19 @@ void Fuzz(Input input) {
     if (!essid.empty()) {
         const int signal = (std::clamp(dBm, -110, -40) + 110) * 10 / 7;
         Demand(network.essid == essid && network.bssid[2] == 3, "it has its name", essid);
-        Demand(network.channel == channel.channel && network.signal == signal, "it is there",
-               essid);
+        Demand(network.channel == channel.channel, "it has its channel", essid);
+        Demand(network.signal == signal, "it has its signal", essid);
     }
     if (!essid.empty() && !isOdd) {
-        const int unprotected = isPrivate ? 3 : 1;
         const bool isProtected = hasWpa || hasRsn;
-        Demand(network.auth ==
-                   (isProtected ? kAuths[hasRsn ? rsn : 0][hasWpa ? wpa : 0] : unprotected),
-               "it is joined as it tells", essid);
-        Demand(network.encrypt == (isProtected ? static_cast<int>(ciphers) : (unprotected + 1) / 2),
-               "it is protected as it tells", essid);
-        Demand(network.protocol == (isWide   ? channel.highThroughput
-                                    : isFast ? channel.fast
-                                             : channel.slow),
-               "it has its protocol", essid);
+        const int auth = isProtected ? kAuths[hasRsn ? rsn : 0][hasWpa ? wpa : 0]
+                         : isPrivate ? 3
+                                     : 1;
+        const int encrypt = isProtected ? static_cast<int>(ciphers) : isPrivate ? 2 : 1;
+        const int protocol = isWide ? channel.highThroughput : isFast ? channel.fast : channel.slow;
+        Demand(network.auth == auth, "it is joined as it tells", essid);
+        Demand(network.encrypt == encrypt, "it is protected as it tells", essid);
+        Demand(network.protocol == protocol, "it has its protocol", essid);
     }
 }
 
