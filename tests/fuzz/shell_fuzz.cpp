@@ -37,6 +37,9 @@ void Fuzz(Input input) {
     const std::string others = " " + first.text + " x" + second.text + "y";
     const std::string described = "printf '%s\\0' " + std::string(secret.text.size(), '*') + others;
     Demand(command.Described() == described.substr(0, size - 1), "secrets are hidden", described);
+    if (secret.text.empty() && first.text.empty() && second.text.empty()) {
+        return;  // so many short inputs need no shell each
+    }
     const auto before = Files();
     wireless::Pipe pipe(command);
     const bool fits = described.size() < size;
