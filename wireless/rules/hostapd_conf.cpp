@@ -16,7 +16,6 @@ namespace {
 constexpr int kOpenSystem = 1;
 constexpr int kOpenSystemOrSharedKey = 3;
 
-
 void AddIfPositive(HostapdConf& lines, const char* key, int32_t value) {
     if (value > 0) {
         lines.Add(key, value);
