@@ -29,7 +29,7 @@ namespace fs = std::filesystem;
 constexpr uid_t kNeighbour = 65534;
 constexpr key_t kKey = 1;          // of the lock of modem 1
 constexpr char kSeconds[] = "15";  // that a call may take, as busy as the machine may be
-constexpr size_t kParts = 2;       // of the calls, tried beside each other
+constexpr size_t kParts = 3;       // of the calls, tried beside each other
 constexpr char kNowhere[] = "/etc/nowhere";
 constexpr char kVictim[] = "/etc/victim";
 
