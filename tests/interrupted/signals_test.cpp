@@ -3,8 +3,8 @@
 #include <sys/file.h>
 #include <sys/prctl.h>
 #include <sys/time.h>
-#include <tavicore/keyvalue.h>
 #include <tavicore/process.h>
+#include <tavisdk/network.h>
 #include <taviwireless/semaphore.h>
 #include <taviwireless/usbmodem_client.h>
 #include <taviwireless/wireless.h>
@@ -202,6 +202,16 @@ TEST(Signals, ChangeNothingOfTheWifiAdapter) {
              return Results({TAVIWirelessAPEnable(), TAVIWirelessAPDisable()});
          },
          "{ 1, 1 }"},
+        {"what the kernel tells",
+         [] {
+             VEXANetInterfaceInfo interfaces[4];
+             int count = 0;
+             for (int i = 0; i < 200; ++i) {
+                 count += VEXANetGetInterfaceInfo(interfaces, 4, VEXA_NET_ALL_INTERFACES);
+             }
+             return Results({count});
+         },
+         "{ 400 }"},
         {"a program's end",
          [] { return Results({VEXACExec("sh", "-c", "sleep 0.03; exit 7", nullptr)}); }, "{ 7 }"},
     });

@@ -9,7 +9,6 @@
 namespace taviwireless::test {
 namespace {
 
-using testing::ElementsAre;
 using testing::EndsWith;
 
 struct Exchange {
