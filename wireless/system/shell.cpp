@@ -5,7 +5,6 @@
 #include <unistd.h>
 
 #include <cerrno>
-#include <memory>
 #include <utility>
 
 #include "base/spawn_settings.h"
@@ -35,26 +34,13 @@ int Wait(pid_t process) {
     return status;
 }
 
-// A stream that reads through signals: one of fdopen() takes a caught signal for the end.
-UniqueFile OpenForReading(UniqueFd descriptor) {
-    cookie_io_functions_t functions{};
-    functions.read = [](void* cookie, char* buffer, size_t size) {
-        ssize_t count = -1;
-        do {
-            count = read(static_cast<UniqueFd*>(cookie)->Get(), buffer, size);
-        } while (count < 0 && errno == EINTR);
-        return count;
-    };
-    functions.close = [](void* cookie) {
-        delete static_cast<UniqueFd*>(cookie);
-        return 0;
-    };
-    auto cookie = std::make_unique<UniqueFd>(std::move(descriptor));
-    UniqueFile file(fopencookie(cookie.get(), "r", functions));
-    if (file) {
-        cookie.release();
-    }
-    return file;
+// For a stream that reads through signals: one of fdopen() takes a caught signal for the end.
+ssize_t ReadOn(void* descriptor, char* buffer, size_t size) {
+    ssize_t count = -1;
+    do {
+        count = read(static_cast<UniqueFd*>(descriptor)->Get(), buffer, size);
+    } while (count < 0 && errno == EINTR);
+    return count;
 }
 
 }  // namespace
@@ -106,12 +92,16 @@ Pipe::Pipe(const Command& command) {
     UniquePipe ends;
     process_ = ends ? command.Start(Output::kShown, ends.writeEnd.Get()) : -1;
     if (process_ >= 0) {
-        file_ = OpenForReading(std::move(ends.readEnd));
+        readEnd_ = std::move(ends.readEnd);
+        cookie_io_functions_t functions{};
+        functions.read = ReadOn;
+        file_.reset(fopencookie(&readEnd_, "r", functions));
     }
 }
 
 int Pipe::Close() {
     file_.reset();
+    readEnd_.Close();
     const int status = process_ >= 0 ? Wait(std::exchange(process_, -1)) : -1;
     return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
 }

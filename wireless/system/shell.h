@@ -7,6 +7,7 @@
 #include <initializer_list>
 #include <string>
 
+#include "base/unique_fd.h"
 #include "base/unique_file.h"
 
 namespace taviwireless::wireless {
@@ -74,6 +75,7 @@ class Pipe {
     int Close();
 
   private:
+    UniqueFd readEnd_;
     UniqueFile file_;
     pid_t process_ = -1;
 };
