@@ -16,7 +16,7 @@ namespace taviwireless::network {
 
 namespace {
 
-constexpr off_t kLimit = 16 * 1024 * 1024;  // a router has many routes
+constexpr off_t kLimit = 16'777'216;  // bytes; a router has many routes
 constexpr char kNone[] = "-";
 
 using Message = std::unique_ptr<nl_msg, decltype(&nlmsg_free)>;
