@@ -6,6 +6,7 @@
 #include <unistd.h>
 
 #include <algorithm>
+#include <cerrno>
 #include <cstring>
 #include <map>
 
@@ -53,7 +54,8 @@ void CheckDialler(usbmodem_lib::USBModem& modem, Values values) {
     if (modem.NetConnect() != 1) {
         return;
     }
-    waitpid(dialler, nullptr, 0);
+    while (waitpid(dialler, nullptr, 0) < 0 && errno == EINTR) {  // libFuzzer has a timer
+    }
     unlink("/var/lib/usbmodem/usbmodem.pid.1");
     for (const auto& [key, standard] :
          {std::pair("apn", apn.c_str()), std::pair("number", "*99#"), std::pair("user", "Unknown"),
