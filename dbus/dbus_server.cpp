@@ -65,7 +65,7 @@ void DBusServer::StartLoop() {
 void DBusServer::QuitLoop() {
     // The loop object is not released, since StartLoop is still running it; it is small, and one
     // per process. This reference tells leak checkers so.
-    [[gnu::used]] static GMainLoop* ended = nullptr;
+    [[maybe_unused, gnu::used]] static GMainLoop* ended = nullptr;
     if (loop_ != nullptr) {
         ended = loop_;
         g_main_loop_quit(loop_);

@@ -25,7 +25,7 @@ inline Failure FileFailure() {
 // Throws when one of the pointers is null.
 template <typename... Pointers>
 void RequireAll(const Pointers*... pointers) {
-    if ((... || (pointers == nullptr))) {
+    if (!(... && (pointers != nullptr))) {
         throw Failure{VEXAC_ERR_BAD_PARAMETER};
     }
 }
