@@ -31,5 +31,6 @@ function(tavi_add_test)
   if(tavi_modem_simulator IN_LIST TEST_LIBS)
     set(cost COST 10)
   endif()
-  gtest_discover_tests(${TEST_NAME} TEST_PREFIX ${TEST_NAME}. PROPERTIES TIMEOUT 120 ${cost})
+  # An emulated program on a busy machine takes its time to list its cases.
+  gtest_discover_tests(${TEST_NAME} TEST_PREFIX ${TEST_NAME}. DISCOVERY_TIMEOUT 60 PROPERTIES TIMEOUT 120 ${cost})
 endfunction()
