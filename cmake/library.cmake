@@ -8,5 +8,7 @@ target_include_directories(taviwireless PUBLIC
   $<BUILD_INTERFACE:${PROJECT_SOURCE_DIR}/include>
   $<INSTALL_INTERFACE:${CMAKE_INSTALL_INCLUDEDIR}>)
 set_target_properties(taviwireless PROPERTIES VERSION ${PROJECT_VERSION} SOVERSION ${PROJECT_VERSION_MAJOR})
-target_link_options(taviwireless PRIVATE LINKER:--version-script=${PROJECT_SOURCE_DIR}/cmake/exports.map)
+target_link_options(taviwireless PRIVATE
+  LINKER:--version-script=${PROJECT_SOURCE_DIR}/cmake/exports.map
+  LINKER:--as-needed) # of what pkg-config names, nothing that is not called
 set_property(TARGET taviwireless PROPERTY LINK_DEPENDS ${PROJECT_SOURCE_DIR}/cmake/exports.map)
