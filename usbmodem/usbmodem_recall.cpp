@@ -1,6 +1,7 @@
 // A connection that another process dialled: what is known of it without asking the modem, and its
 // end when the modem is gone.
 #include <limits.h>
+#include <tavicore/error.h>
 #include <tavicore/file.h>
 #include <tavicore/process.h>
 #include <tavisdk/network.h>
@@ -57,7 +58,7 @@ int USBModem::EndConnection() {
     CloseFileDevice();  // nothing of what follows can be asked of the modem
     const std::string pidFile = PidFilePath();
     if (VEXACFileExist(pidFile.c_str()) != 1) {
-        return 0;
+        return VEXACErrGet() == VEXAC_ERR_NOT_FOUND ? 0 : -1;
     }
     const bool wasConnected = netStatus_ == NetStatus::kConnected;
     RecallConnection();

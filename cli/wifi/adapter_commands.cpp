@@ -63,7 +63,8 @@ void ConnectAutomatically(const Options& options) {
         throw CommandError(kNotFound, "no network is saved; taviwireless wifi connect saves one");
     }
     ShowProgress("Joining a saved network ...");
-    if (TAVIWirelessAutoConnect() != 0) {
+    // The library reports success, too, when it cannot tell whether the radio may be used.
+    if (TAVIWirelessAutoConnect() != 0 || !IsInNetwork(TAVIWirelessConnStatusGet())) {
         throw CommandError(kFailure,
                            "none of the saved networks could be joined; is one in range, and its "
                            "key still right?");
