@@ -1,13 +1,38 @@
 #include "tests/support/failing_memory.h"
 
+#include <dlfcn.h>
+#include <execinfo.h>
+
+#include <algorithm>
 #include <cstdlib>
+#include <cstring>
 #include <new>
+#include <utility>
 
 namespace taviwireless::test {
 namespace {
 
 thread_local int allocationsLeft = -1;  // negative: no end
 thread_local bool hasFailed = false;
+thread_local int allocated = 0;
+
+// Whether the nearest caller that is no system library is code of this project.
+bool IsForUs() {
+    void* callers[64];
+    const int count = backtrace(callers, 64);
+    Dl_info self{}, caller{};
+    dladdr(reinterpret_cast<void*>(&HasAllocationFailed), &self);
+    for (int i = 2; i < count && dladdr(callers[i], &caller) != 0; ++i) {
+        const char* name = strrchr(caller.dli_fname, '/');
+        if (strstr(name != nullptr ? name : caller.dli_fname, "tavi") != nullptr) {
+            return true;
+        }
+        if (caller.dli_fbase == self.dli_fbase) {  // the test's stand-in
+            return false;
+        }
+    }
+    return false;
+}
 
 }  // namespace
 
@@ -21,17 +46,22 @@ bool HasAllocationFailed() {
     return hasFailed;
 }
 
+int AllocationsLeft() {
+    return std::exchange(allocated, 0);
+}
+
 }  // namespace taviwireless::test
 
 #define TAKEN_OVER __attribute__((visibility("default")))
 
 TAKEN_OVER void* operator new(size_t size) {
     using namespace taviwireless::test;
-    if (allocationsLeft == 0 && !hasFailed) {
+    if (allocationsLeft == 0 && !hasFailed && IsForUs()) {
         hasFailed = true;
         throw std::bad_alloc();
     }
     allocationsLeft -= allocationsLeft > 0 ? 1 : 0;
+    ++allocated;
     void* memory = malloc(size > 0 ? size : 1);
     if (memory == nullptr) {
         throw std::bad_alloc();
@@ -48,9 +78,11 @@ TAKEN_OVER void* operator new(size_t size, const std::nothrow_t&) noexcept {
 }
 
 TAKEN_OVER void operator delete(void* memory) noexcept {
+    taviwireless::test::allocated -= memory != nullptr ? 1 : 0;
     free(memory);
 }
 
 TAKEN_OVER void operator delete(void* memory, size_t) noexcept {
+    taviwireless::test::allocated -= memory != nullptr ? 1 : 0;
     free(memory);
 }

@@ -274,10 +274,11 @@ const PublicCall kCalls[] = {
     WITH(kAdapter, TAVIWirelessNetworkScan, wireless::OwnedList<WirelessNetwork> networks; out
         << TAVIWirelessNetworkScan(0, networks.Head()); Print(out, networks)),
     WITH(kAdapter, TAVIWirelessSetAPConfig, WirelessAPSettings settings{};
-        TAVIWirelessGetAPConfig("stick", &settings); out << TAVIWirelessSetAPConfig(&settings)),
+        out << (TAVIWirelessGetAPConfig("stick", &settings) == 1 ?
+        TAVIWirelessSetAPConfig(&settings) : -1)),
     WITH(kAdapter, TAVIWirelessSetHostAPConf, WirelessAPSettings settings{};
-        TAVIWirelessGetAPConfig("stick", &settings); out << TAVIWirelessSetHostAPConf("wlan0",
-        &settings.ap)),
+        out << (TAVIWirelessGetAPConfig("stick", &settings) == 1 ?
+        TAVIWirelessSetHostAPConf("wlan0", &settings.ap) : -1)),
     WITH(kJoined, TAVIWirelessStatusGet, WirelessStatus status{};
         TAVIWirelessStatusGet(&status); out << status.status << status.network),
 };

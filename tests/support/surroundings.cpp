@@ -36,7 +36,7 @@ constexpr char kServe[] =
     "touch /tmp/master; echo enable=yes > /etc/hostapd/hostapd-wlan0.info";
 
 void PrepareAdapter(ToolStandIns& tools) {
-    SetSupport("yes");
+    SetSupport("yes\nsupport_pci_wifi=yes");  // the model serves guests, too
     WriteFile("/tmp/wireless.info", "PRODUCT=stick\nAP_SUPPORT=yes\n");
     WriteFile("/tmp/table",
               "\n\n" + ScanLine(1, "My Net", "00:11:22:aa:bb:cc", 70, "11b/g/n", "WPA2PSK/AES"));
@@ -61,6 +61,12 @@ void PrepareAdapter(ToolStandIns& tools) {
     TAVIWirelessGetAPConfig("stick", &settings);
     settings.enabled = 1;
     CopyField(settings.name, "stick");
+    settings.ap.security = settings.ap.guestSecurity = WIRELESS_AP_WPA;
+    settings.ap.secret.wpa = {2, {}, WIRELESS_AP_CCMP};
+    CopyField(settings.ap.secret.wpa.passphrase, "a pass phrase");
+    CopyField(settings.ap.guestSsid, "Guests");
+    settings.ap.guestSecret = settings.ap.secret;
+    settings.ap.guestEnabled = 1;
     EXPECT_EQ(TAVIWirelessSetAPConfig(&settings), 1);
 }
 
@@ -138,14 +144,16 @@ void Surroundings::Arrange(const std::string& sim) {
     if (needs_ == Needs::kModem) {
         modem_->UpdateSIMStatus();
     } else if (needs_ == Needs::kConnection) {
-        modem_.reset();
-        EXPECT_EQ(Dial(modem_.emplace(1, kInfo)), "connected");
+        EXPECT_TRUE(Eventually([&] {
+            modem_.reset();
+            return Dial(modem_.emplace(1, kInfo)) == "connected";
+        }));
     } else if (needs_ == Needs::kDialled) {
         const auto dial = [] {
             USBModem modem(1, kInfo);
             return Dial(modem);
         };
-        EXPECT_EQ(InChild(dial).text, "connected");
+        EXPECT_TRUE(Eventually([&] { return InChild(dial).text == "connected"; }));
     } else if (service_) {
         EXPECT_TRUE(ServiceSays({"GetUSBModem", kId}, kId));
     }

@@ -13,6 +13,7 @@
 #include <sys/uio.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <atomic>
 #include <climits>
 #include <exception>
@@ -20,6 +21,7 @@
 #include <fstream>
 #include <future>
 #include <map>
+#include <set>
 #include <sstream>
 #include <system_error>
 #include <thread>
@@ -39,10 +41,10 @@ constexpr char kOfPathsInFolders[] =
     "renameat2 unlinkat linkat symlinkat fchmodat fchownat utimensat inotify_add_watch";
 constexpr char kOfDescriptors[] =
     "read pread64 readv write pwrite64 writev fstat fstatfs getdents64 fsync fdatasync ftruncate "
-    "fchmod fchown flock fcntl ioctl close dup dup2 dup3 fchdir connect bind listen accept4 "
+    "fchmod fchown flock fcntl ioctl close dup fchdir connect bind listen accept4 "
     "sendto sendmsg recvfrom recvmsg setsockopt getsockopt";
 constexpr char kOfOthers[] =
-    "fork vfork clone clone3 pipe pipe2 socket socketpair memfd_create inotify_init1 eventfd2 kill "
+    "fork vfork clone clone3 pipe pipe2 socket socketpair memfd_create inotify_init1 kill "
     "wait4 waitid semget semop semtimedop semctl poll ppoll select pselect6";
 
 constexpr unsigned kMark = 0x7461766b;  // an option that prctl() does not know
@@ -119,14 +121,27 @@ std::string SubjectOf(const seccomp_notif& request, Subject subject) {
     return path;
 }
 
-pid_t ParentOf(pid_t process) {
+// What "/proc" says of a process; an empty name when it has ended.
+struct ProcessStatus {
+    std::string name;
+    pid_t parent = 0;
+};
+
+ProcessStatus StatusOf(pid_t process) {
     std::ifstream file(ProcessFile(process, "stat"));
     std::string text;
     std::getline(file, text, '\0');
-    char state = 0;
-    pid_t parent = 0;
-    std::istringstream(text.substr(text.rfind(')') + 1)) >> state >> parent;
-    return parent;
+    const size_t name = text.find('(') + 1;
+    const size_t end = text.rfind(')');
+    char state = 'Z';
+    ProcessStatus status;
+    if (end != std::string::npos) {
+        std::istringstream(text.substr(end + 1)) >> state >> status.parent;
+    }
+    if (state != 'Z') {
+        status.name = text.substr(name, end - name);
+    }
+    return status;
 }
 
 // Where the loader of a process begins; 0 if there is none.
@@ -142,7 +157,9 @@ uint64_t LoaderOf(pid_t process) {
 
 class Watch {
   public:
-    Watch(const std::optional<Fault>& fault, const std::string& program) : fault_(fault) {
+    Watch(const std::optional<Fault>& fault, const std::string& program,
+          const std::set<std::string>& mayStay)
+        : fault_(fault), mayStay_(mayStay) {
         struct stat test {};
         stat(program.c_str(), &program_);
         stat("/proc/self/exe", &test);
@@ -151,8 +168,8 @@ class Watch {
 
     // Answers until nobody is left who could ask, or those who are left were killed.
     void Serve(const UniqueFd& listener, const std::atomic<bool>& isDone) {
-        constexpr int kStep = 10;  // ms
-        int patience = 500;        // steps
+        constexpr int kStep = 5;  // ms
+        int patience = 2000;      // steps
         for (;;) {
             pollfd asked{listener.Get(), POLLIN, 0};
             if (poll(&asked, 1, kStep) > 0 && (asked.revents & POLLIN) == 0) {
@@ -160,8 +177,8 @@ class Watch {
             }
             if ((asked.revents & POLLIN) != 0) {
                 AnswerNext(listener);
-            } else if (isDone && --patience == 0) {
-                KillLeft();
+            } else if (isDone) {
+                EndThoseLeft(--patience == 0);
             }
         }
     }
@@ -209,8 +226,9 @@ class Watch {
     bool& Counts(pid_t process) {
         const auto [counts, isNew] = counts_.try_emplace(process, !isOfTest_);
         if (isNew && isOfTest_) {
-            const pid_t parent = ParentOf(process);
-            counts->second = counts_[parent == getpid() ? worker_ : parent];
+            const pid_t parent = StatusOf(process).parent;
+            const auto known = counts_.find(parent == getpid() ? worker_ : parent);
+            counts->second = known != counts_.end() && known->second;
         }
         return counts->second;
     }
@@ -245,18 +263,31 @@ class Watch {
         return true;
     }
 
-    void KillLeft() {
-        for (const auto& [process, counts] : counts_) {
-            std::ifstream file(ProcessFile(process, "comm"));
-            std::string name;
-            if (std::getline(file, name) && process != worker_) {
-                kill(process, SIGKILL);
-                run.left.push_back(name);
+    // Kills what may stay, once nothing else runs; in the end everything.
+    void EndThoseLeft(bool isEnd) {
+        std::map<pid_t, std::string> left;
+        for (const auto& process : counts_) {
+            const std::string name = StatusOf(process.first).name;
+            if (!name.empty() && process.first != worker_) {
+                left[process.first] = name;
+            }
+        }
+        const auto mayStay = [this](const auto& process) {
+            return mayStay_.count(process.second) > 0;
+        };
+        if (!isEnd && !std::all_of(left.begin(), left.end(), mayStay)) {
+            return;
+        }
+        for (const auto& process : left) {
+            kill(process.first, SIGKILL);
+            if (!mayStay(process)) {
+                run.left.push_back(process.second);
             }
         }
     }
 
-    std::optional<Fault> fault_;
+    const std::optional<Fault> fault_;
+    const std::set<std::string> mayStay_;
     struct stat program_ {};
     bool isOfTest_;
     pid_t worker_ = 0;
@@ -268,8 +299,8 @@ class Watch {
 }  // namespace
 
 WatchedRun WatchCalls(const std::function<void()>& work, const std::optional<Fault>& fault,
-                      const std::string& program) {
-    Watch watch(fault, program);
+                      const std::string& program, const std::set<std::string>& mayStay) {
+    Watch watch(fault, program, mayStay);
     std::promise<UniqueFd> listener;
     std::atomic<bool> isDone = false;
     std::exception_ptr failure;

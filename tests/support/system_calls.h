@@ -3,6 +3,7 @@
 
 #include <functional>
 #include <optional>
+#include <set>
 #include <string>
 #include <vector>
 
@@ -37,10 +38,14 @@ struct WatchedRun {
 // test itself if none is given, and have not become another program. Calls of the loader are not
 // counted, nor, until it asks for it, those of the thread itself. Memory is not among them.
 //
+// Programs of these names may stay behind: they are killed once nothing else is left. For others it
+// waits 10 s, and then says that they were left.
+//
 // An exception of the work is thrown again.
 WatchedRun WatchCalls(const std::function<void()>& work,
                       const std::optional<Fault>& fault = std::nullopt,
-                      const std::string& program = "/proc/self/exe");
+                      const std::string& program = "/proc/self/exe",
+                      const std::set<std::string>& mayStay = {});
 
 // Within the work: whether calls of this thread, or forked process, are counted from now on.
 void CountMyCalls(bool on);
