@@ -1,6 +1,7 @@
 #include "cli/ap/access_point.h"
 
 #include <sys/statvfs.h>
+#include <tavicore/keyvalue.h>
 #include <tavicore/section.h>
 #include <tavisdk/network.h>
 #include <unistd.h>
@@ -121,6 +122,19 @@ std::string AddressOf(const char* interface) {
     return TAVINetIFGetInfo(interface, &info) == 1 ? info.address : "";
 }
 
+// A file by which the access point would come back: the library goes on when it cannot change it.
+// Empty when there is none.
+std::string FileOfTheAccessPoint() {
+    const char* interface = TAVIWirelessAPInterfaceGet();
+    const std::string info = wireless::HostapdInfo(interface);
+    const std::string file = wireless::InterfaceFile(interface);
+    char bridge[TAVI_NET_IF_NAME_SIZE];
+    if (!wireless::IsMissing(info.c_str())) {
+        return info;
+    }
+    return VEXACFileGetKeyValue(file.c_str(), "BRIDGE", bridge, sizeof bridge) > 0 ? file : "";
+}
+
 }  // namespace
 
 APStatus LookAtAP() {
@@ -193,11 +207,9 @@ void SwitchAPOff() {
         throw CommandError(kFailure,
                            "the access point could not be switched off; the system log tells why");
     }
-    // By this file it would come back; the library goes on when it cannot be removed.
-    if (const std::string info = wireless::HostapdInfo(TAVIWirelessAPInterfaceGet());
-        !wireless::IsMissing(info.c_str())) {
+    if (const std::string left = FileOfTheAccessPoint(); !left.empty()) {
         throw CommandError(kFailure,
-                           "switched off, but not after a restart: cannot remove " + info);
+                           "switched off, but not after a restart: cannot change " + left);
     }
     const auto settings = FindSettings();
     if (settings && settings->enabled != 0) {

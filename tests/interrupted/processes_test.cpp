@@ -120,7 +120,7 @@ struct KilledCommand : testing::TestWithParam<CommandCall> {
     RunResult RunAnother() const {
         const std::string cli = BuiltProgram("taviwireless_with_wifi");
         return GetParam().IsOfModems()
-                   ? RunProgram(WithShortWaits({cli, "modem", "--direct", "show", "usbmodem0"}))
+                   ? RunProgram(WithShortWaits({cli, "modem", "--direct", "show", "usbmodem1"}))
                    : RunProgram(WithShortWaits({cli, "wifi", "connect", "My Net"}));
     }
 
@@ -157,7 +157,7 @@ TEST_P(KilledCommand, LetsTheNextOneWork) {
     const std::string wanted = State();
     const auto inspect = [&] {
         for (int i = 0; i < 2 && GetParam().IsOfModems(); ++i) {
-            surroundings.Simulator().Received("0");  // it has answered whom was killed
+            surroundings.Simulator().Received("1");  // it has answered whom was killed
         }
         const auto left = Stores();
         for (size_t i = 0; i < left.size(); ++i) {
@@ -302,12 +302,12 @@ TEST_F(StoppedHolder, OfAWifiStoreKeepsOthersForASentence) {
 TEST_F(StoppedHolder, OfAProfileOrAPortKeepsOthersForASentence) {
     const Surroundings surroundings(Needs::kPlugged);
     EXPECT_THAT(OthersIn("/var/lib/usbmodem/.usbmodem.profile.001010123456789.lock",
-                         {cli, "modem", "--direct", "profile", "set", "usbmodem0", "apn=new"}),
-                testing::HasSubstr("cannot set apn in the profile of usbmodem0; "));
-    usbmodem_lib::USBModem modem(0, "/tmp/usbmodem.info0");
+                         {cli, "modem", "--direct", "profile", "set", "usbmodem1", "apn=new"}),
+                testing::HasSubstr("cannot set apn in the profile of usbmodem1; "));
+    usbmodem_lib::USBModem modem(1, "/tmp/usbmodem.info1");
     EXPECT_THAT(Others([&modem] { modem.OpenFileDevice("/dev/ttyUSB1"); },
-                       {cli, "modem", "--direct", "show", "usbmodem0"}),
-                testing::HasSubstr("modem usbmodem0 is not ready: "));
+                       {cli, "modem", "--direct", "show", "usbmodem1"}),
+                testing::HasSubstr("modem usbmodem1 is not ready: "));
 }
 
 }  // namespace

@@ -69,7 +69,7 @@ std::string WithoutNumbers(const std::string& text, size_t shortest = 3) {
 bool IsOfTheTest(const std::string& path) {
     static const std::set<std::string> kFiles = {"/tmp/commands", "/tmp/arguments",
                                                  "/tmp/started",  "/tmp/associated",
-                                                 "/tmp/master",   "/tmp/usbmodem.info0"};
+                                                 "/tmp/master",   "/tmp/usbmodem.info1"};
     return kFiles.count(path) > 0 || path.find("/run/lock/LCK") == 0;
 }
 
@@ -246,13 +246,21 @@ bool IsDocumented(const std::string& name, const SystemCall& struck) {
         // A radio whose setting cannot be read leaves nothing to do.
         {std::regex("TAVIWireless(NetworkConnect|AutoConnect)"),
          std::regex("/tmp/?|/tmp/wireless.info|/usr/tavi/etc/?|.*wireless_ap.conf|memory")},
-        // A key without value means nothing there.
-        {std::regex("TAVIWirelessAPDisable"), std::regex("memory")},
+        // A model that cannot be asked offers no network for guests.
+        {std::regex("TAVIWirelessAPEnable|TAVIWirelessSetHostAPConf"),
+         std::regex("/etc.defaults/.*|memory")},
+        // Only the DHCP service can fail it: the command line looks what is left. A bridge that
+        // comes up without members serves nobody.
+        {std::regex("TAVIWirelessAPDisable"), std::regex(".*")},
+        {std::regex(".* ap disable"), std::regex(".*ifcfg-lbr0.*")},
+        // What cannot be looked at is not connected.
+        {std::regex("TAVIWirelessNetworkDisconnect_core"),
+         std::regex("socket:.*|/sys/class/net.*|/etc/dhcpc.*")},
         // A connection without a way back is better than none.
         {std::regex(".*::BackupDefaultRoute"), std::regex(".*")},
-        // What happened to the program is in the log.
+        // There was a process; what became of it tells the log, or the next look at the link.
         {std::regex(".*(::NetConnect|::BackgroundExec| modem connect)"),
-         std::regex("/usr/tavi/bin/wvdial|/bin/true")},
+         std::regex("/usr/tavi/bin/wvdial|/bin/true|.*[./]pid.*|/var/lib/usbmodem/log|/proc/.*")},
         // What the modem does not tell has no default.
         {std::regex(".*(::ResetProfile|::SetProfileToDefault| profile reset)"),
          std::regex("/dev/pts/.*|/usr/tavi/etc/usbmodem/.*")},
