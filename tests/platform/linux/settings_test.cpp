@@ -6,7 +6,6 @@
 #include <tavicore/section.h>
 #include <unistd.h>
 
-#include <cstring>
 #include <vector>
 
 #include "common/sz_hash.h"
@@ -69,26 +68,6 @@ TEST(Section, ShowsEveryChangeOfTheFileAtOnce) {
     unlink(kFile);
     EXPECT_EQ(ValueOf("98"), "");
     umount("/tmp");
-}
-
-// What this process has read so far, in bytes.
-size_t BytesRead() {
-    return std::stoul(ReadFile("/proc/self/io").substr(strlen("rchar: ")));
-}
-
-TEST(Section, ReadingOneByOneReadsAFileNoMoreThanTwice) {
-    std::string text;
-    for (int i = 0; i < 500; ++i) {
-        text += "[" + std::to_string(i) + "]\nKEY=" + std::to_string(i) + "\n";
-    }
-    WriteFile(kFile, text);
-    usleep(50000);  // only a file that is not being written is remembered
-    const size_t before = BytesRead();
-    for (int i = 0; i < 500; ++i) {
-        EXPECT_EQ(ValueOf(std::to_string(i).c_str()), std::to_string(i));
-    }
-    constexpr size_t kOther = 1000;  // of the count itself
-    EXPECT_LT(BytesRead() - before, 2 * text.size() + kOther);
 }
 
 TEST(Section, ChangesStandWhereTheKeysStood) {
