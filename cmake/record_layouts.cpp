@@ -5,11 +5,12 @@
 #include <tavisdk/network.h>
 #include <taviwireless/wireless.h>
 
-#define CHOOSE(narrow, wide) (sizeof(void*) == 4 ? (narrow) : (wide))
-#define SIZE(record, narrow, wide) static_assert(sizeof(record) == CHOOSE(narrow, wide), #record)
+#define SAME_SIZE(record, size) static_assert(sizeof(record) == (size), #record)
+#define SAME_AT(record, member, offset) \
+    static_assert(offsetof(record, member) == (offset), #record " " #member)
+#define SIZE(record, narrow, wide) SAME_SIZE(record, sizeof(void*) == 4 ? (narrow) : (wide))
 #define AT(record, member, narrow, wide) \
-    static_assert(offsetof(record, member) == CHOOSE(narrow, wide), #record " " #member)
-#define SAME_AT(record, member, offset) AT(record, member, offset, offset)
+    SAME_AT(record, member, sizeof(void*) == 4 ? (narrow) : (wide))
 
 SIZE(WirelessNameValue, 8, 16);
 SAME_AT(WirelessNameValue, name, 0);
@@ -45,9 +46,9 @@ SIZE(WirelessStatus, 76, 88);
 SAME_AT(WirelessStatus, status, 0);
 AT(WirelessStatus, network, 4, 8);
 
-SIZE(WirelessInfo, 36, 36);
+SAME_SIZE(WirelessInfo, 36);
 
-SIZE(WirelessAPSecret, 288, 288);
+SAME_SIZE(WirelessAPSecret, 288);
 SAME_AT(WirelessAPSecret, wepKey, 0);
 SAME_AT(WirelessAPSecret, wpa.wpaVersion, 0);
 SAME_AT(WirelessAPSecret, wpa.passphrase, 4);
@@ -58,7 +59,7 @@ SAME_AT(WirelessAPSecret, enterprise.radiusAddr, 8);
 SAME_AT(WirelessAPSecret, enterprise.radiusPort, 28);
 SAME_AT(WirelessAPSecret, enterprise.radiusSecret, 32);
 
-SIZE(WirelessAPConf, 1028, 1028);
+SAME_SIZE(WirelessAPConf, 1028);
 SAME_AT(WirelessAPConf, ssid, 0);
 SAME_AT(WirelessAPConf, bridge, 128);
 SAME_AT(WirelessAPConf, hidden, 144);
@@ -79,7 +80,7 @@ SAME_AT(WirelessAPConf, guestIsolate, 732);
 SAME_AT(WirelessAPConf, guestSecurity, 736);
 SAME_AT(WirelessAPConf, guestSecret, 740);
 
-SIZE(WirelessAPSettings, 1440, 1440);
+SAME_SIZE(WirelessAPSettings, 1440);
 SAME_AT(WirelessAPSettings, enabled, 0);
 SAME_AT(WirelessAPSettings, txPower, 4);
 SAME_AT(WirelessAPSettings, name, 8);
@@ -94,33 +95,33 @@ SAME_AT(WirelessAPSettings, guestAccessServer, 1428);
 SAME_AT(WirelessAPSettings, guestInternetBlock, 1432);
 SAME_AT(WirelessAPSettings, guestAllowHttp, 1436);
 
-SIZE(VEXACSzList, 4, 4);
+SAME_SIZE(VEXACSzList, 4);
 SAME_AT(VEXACSzList, count, 0);
 
-SIZE(TAVINetIFInfo, 20, 20);
+SAME_SIZE(TAVINetIFInfo, 20);
 SAME_AT(TAVINetIFInfo, address, 0);
 
-SIZE(VEXANetInterfaceInfo, 20, 20);
+SAME_SIZE(VEXANetInterfaceInfo, 20);
 SAME_AT(VEXANetInterfaceInfo, name, 0);
 SAME_AT(VEXANetInterfaceInfo, linkState, 16);
 
-SIZE(TAVINetCard, 60, 60);
+SAME_SIZE(TAVINetCard, 60);
 SAME_AT(TAVINetCard, interface, 0);
 SAME_AT(TAVINetCard, isStatic, 16);
 SAME_AT(TAVINetCard, address, 20);
 SAME_AT(TAVINetCard, netmask, 40);
 
-SIZE(TAVINetBridge, 60, 60);
+SAME_SIZE(TAVINetBridge, 60);
 SAME_AT(TAVINetBridge, isLocal, 0);
 SAME_AT(TAVINetBridge, name, 4);
 SAME_AT(TAVINetBridge, address, 20);
 SAME_AT(TAVINetBridge, netmask, 40);
 
-SIZE(TAVINetBridgeMember, 20, 20);
+SAME_SIZE(TAVINetBridgeMember, 20);
 SAME_AT(TAVINetBridgeMember, kind, 0);
 SAME_AT(TAVINetBridgeMember, interface, 4);
 
-SIZE(TAVINetDhcpServer, 144, 144);
+SAME_SIZE(TAVINetDhcpServer, 144);
 SAME_AT(TAVINetDhcpServer, enabled, 0);
 SAME_AT(TAVINetDhcpServer, reserved, 4);
 SAME_AT(TAVINetDhcpServer, leaseTime, 8);
