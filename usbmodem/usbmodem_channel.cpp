@@ -6,6 +6,7 @@
 #include <algorithm>
 #include <cerrno>
 #include <chrono>
+#include <csignal>
 #include <cstdio>
 #include <optional>
 
@@ -69,6 +70,17 @@ std::optional<std::string> ReadReply(WvModem& modem) {
         return std::nullopt;
     }
     return reply.substr(0, reply.find('\0'));  // a zero byte ends the reply
+}
+
+// Without signals meanwhile: writing to a serial line is given up for one that is caught, and
+// WvStreams never writes to a line again that failed once.
+void Write(WvModem& modem, const std::string& data) {
+    sigset_t all;
+    sigset_t before;
+    sigfillset(&all);
+    pthread_sigmask(SIG_SETMASK, &all, &before);
+    modem.write(data.data(), data.size());
+    pthread_sigmask(SIG_SETMASK, &before, nullptr);
 }
 
 // Returns the lines of data that are neither blank nor the echo of cmd, each ended by a line feed.
@@ -155,7 +167,7 @@ int USBModem::DrainDeviceBuffer() {
         TAVI_LOG_ERROR("Error when cleaning device buffer, modem is null");
         return -1;
     }
-    device_->write("\r\r\r\r\r");
+    Write(*device_, "\r\r\r\r\r");
     const auto limit = Clock::now() + kDrainLimit;
     for (std::string discarded; Receive(*device_, kDrainQuiet, discarded) == Input::kCame;
          discarded.clear()) {
@@ -192,7 +204,7 @@ int USBModem::Exchange(const std::string& cmd, std::string& reply) {
         return -1;
     }
     const std::string line = cmd + '\r';
-    device_->write(line.data(), line.size());
+    Write(*device_, line);
     const std::optional<std::string> data = ReadReply(*device_);
     if (!data) {  // also when the modem was unplugged
         TAVI_LOG_ERROR("No respond on modem cmd %s", LoggableCommand(cmd).c_str());

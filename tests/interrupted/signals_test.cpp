@@ -65,7 +65,7 @@ void ExpectWithSignals(const std::vector<Wait>& rows) {
     const char* given = getenv("TAVI_SEED");
     const unsigned seed = given != nullptr ? std::stoul(given) : std::random_device()();
     for (const Wait& row : rows) {
-        for (unsigned i = 0; i < 4; ++i) {
+        for (unsigned i = 0; i < 2; ++i) {
             const SignalStorm storm(seed + i);
             EXPECT_EQ(row.work(), row.expected) << row.name << ", TAVI_SEED=" << seed + i;
         }
@@ -116,8 +116,9 @@ TEST(Signals, ChangeNoExchangeWithAModem) {
          "+CSQ: 17,99\nOK\n"},
         {"the lock of a modem",
          [&] {
+             log.Clear();
              HoldForAMoment([&] { lock.Enter(); }, [] {});  // its end gives it back
-             return modem.ModemCmd("AT+CGMM", text) == 0 ? text : "";
+             return modem.ModemCmd("AT+CGMM", text) == 0 ? text : log.Text();
          },
          "E1752\nOK\n"},
         {"a new profile",

@@ -176,6 +176,11 @@ struct BesiegedMachine : testing::Test {
     }
 };
 
+// Calls meet obstacles in turns, unless all are wanted.
+const bool kAll = getenv("TAVI_NEIGHBOUR") != nullptr;
+constexpr int kEachOf = 3;
+int turn = 0;
+
 struct Besieged : BesiegedMachine, testing::WithParamInterface<std::tuple<Needs, size_t>> {
     template <typename Call>
     void TryThose(const std::vector<Call>& calls) {
@@ -213,6 +218,9 @@ struct Besieged : BesiegedMachine, testing::WithParamInterface<std::tuple<Needs,
         const std::string expected = Result(call, around);
         const bool isRepeatable = Result(call, around) == expected;
         for (const Obstacle& obstacle : kObstacles) {
+            if (!kAll && ++turn % kEachOf != 0) {
+                continue;
+            }
             SCOPED_TRACE(call.name + " " + obstacle.name);
             if (!isRepeatable) {
                 around.Arrange(call.sim);

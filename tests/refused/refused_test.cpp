@@ -13,7 +13,7 @@
 //
 // Tried is a sample: the first call of each name on each file in a case, of commands those that
 // change something, and the first call of each row, with one error; and of allocations number 0, 1,
-// 2, 4, 8 and so on. With TAVI_REFUSED=all it is every call of each row, with several errors, and
+// 3, 9, 27 and so on. With TAVI_REFUSED=all it is every call of each row, with several errors, and
 // every allocation.
 #include <gtest/gtest.h>
 #include <sys/wait.h>
@@ -432,7 +432,7 @@ void FailEachAllocation(const std::string& name, const State& before,
     int step = 1;
     for (int count = 0; tried.empty() || tried.back().second.hasFailed; count += step) {
         tried.emplace_back(count, attempt(count));
-        step = kAll ? 1 : std::max(1, count);
+        step = kAll ? 1 : std::max(1, 2 * count);
     }
     Tally tally(name, before, good.result, tried.back().first);
     tried.pop_back();
