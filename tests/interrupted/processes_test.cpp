@@ -218,17 +218,6 @@ TEST(KilledNetworkProgram, LosesNoAddressAndNoRoute) {
         wired + '\'' + program + "' restart wlan0 br0; echo ONBOOT=no >ifcfg-br0");
 }
 
-TEST(KilledHotplugScript, LeavesNoDrafts) {
-    InstallRootScripts();
-    ToolStandIns().Add("/usr/sbin/iw");
-    Shell(
-        "mount -t tmpfs none /sys/class/net; cd /sys/class/net; mkdir -p wlan0/phy80211 "
-        "wlan0/device;"
-        "echo PRODUCT=1/2/3 >wlan0/device/uevent; echo phy0 >wlan0/phy80211/name");
-    ExpectTheSameOnceKilled({"/usr/tavi/hotplug/usb.plug"}, "/bin/sh",
-                            "rm -f /tmp/.usb* /tmp/wireless.info");
-}
-
 TEST(KilledService, LeavesItsModemsToTheNextOne) {
     const PrivateBus bus;
     const ModemSimulator simulator({"--modem", "12d1,id=1,ports=dial/at"});

@@ -1,12 +1,12 @@
 // Other programs on the bus send what they like, and the service goes on for everybody else.
 #include "tests/support/bus.h"
-#include "tests/support/wait.h"
 
 #include <dbus/dbus.h>
 #include <gmock/gmock.h>
 #include <unistd.h>
 
 #include "tests/support/files.h"
+#include "tests/support/wait.h"
 
 namespace taviwireless::test {
 namespace {

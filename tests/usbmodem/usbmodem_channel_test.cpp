@@ -73,10 +73,8 @@ TEST(Channel, IsKeptFromItsPortByALockFileWhoseProcessLives) {
         const char* made;  // by a command, with $f for the lock file
         bool counts;
     } kFiles[] = {
-        {"true", false},
-        {"echo 4194305 >$f", false},  // no process has a number that high
-        {"echo $PPID >$f", true},
-        {"touch $f", false},  // by who was killed before he wrote
+        {"true", false},          {"echo 4194305 >$f", false},  // no process has a number that high
+        {"echo $PPID >$f", true}, {"touch $f", false},          // by who was killed before he wrote
         {"echo x >$f", true},
     };
     OpenedModem modem("generic");

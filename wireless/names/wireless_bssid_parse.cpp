@@ -11,8 +11,8 @@ int TAVIWirelessBssidParse(const char* text, unsigned char bssid[6]) {
         return -1;
     }
     unsigned long long groups[6];
-    if (sscanf(text, " %llx:%llx:%llx:%llx:%llx:%llx", &groups[0], &groups[1], &groups[2], &groups[3],
-               &groups[4], &groups[5]) < 6) {
+    if (sscanf(text, " %llx:%llx:%llx:%llx:%llx:%llx", &groups[0], &groups[1], &groups[2],
+               &groups[3], &groups[4], &groups[5]) < 6) {
         TAVI_LOG_ERROR("Failed to parse BSSID '%s'", text);
         return -1;
     }
