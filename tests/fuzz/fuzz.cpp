@@ -43,7 +43,6 @@ extern "C" int LLVMFuzzerInitialize(int*, char***) {
     if (getenv(kIsInside) != nullptr) {
         return 0;
     }
-    setenv(kIsInside, "", 1);
     try {
         const char* output = getenv("TAVI_TEST_OUTPUT");
         taviwireless::EnterApplianceRoot(output != nullptr ? output : "");
@@ -51,6 +50,7 @@ extern "C" int LLVMFuzzerInitialize(int*, char***) {
         fprintf(stderr, "%s\n", error.what());
         exit(taviwireless::kApplianceRootFailed);
     }
+    setenv(kIsInside, "", 1);  // not before: entering, too, may start the program once more
     return 0;
 }
 
