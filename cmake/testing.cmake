@@ -28,7 +28,7 @@ function(tavi_add_test)
   target_compile_options(${TEST_NAME} PRIVATE -pthread $<$<CONFIG:Debug>:-g1>)
   target_precompile_headers(${TEST_NAME} REUSE_FROM tavi_test_headers)
   # Cases that wait for a serial line begin first, or the others would have nobody to run beside at the end.
-  if(tavi_modem_simulator IN_LIST TEST_LIBS)
+  if(tavi_modem_simulator IN_LIST TEST_LIBS OR tavi_public_calls IN_LIST TEST_LIBS)
     set(cost COST 10)
   endif()
   # An emulated program on a busy machine takes its time to list its cases.

@@ -187,7 +187,7 @@ const std::vector<int>& ErrorsOf(const std::string& call) {
 
 // Of functions, the rest is seldom refused; of commands, functions that they call show it.
 bool IsInSample(const std::string& call, bool isOfCommand) {
-    static const std::set<std::string> kMinor = {"close",  "fcntl",      "newfstatat", "fstat",
+    static const std::set<std::string> kMinor = {"fcntl",  "newfstatat", "fstat",
                                                  "access", "setsockopt", "chdir"};
     static const std::set<std::string> kChanging = {
         "write",  "fsync",  "rename", "renameat", "unlink", "unlinkat", "mkdir", "clone",
@@ -320,7 +320,7 @@ std::string CallAndLook(const PublicCall& call, Surroundings& around) {
     text += waitpid(-1, nullptr, WNOHANG) >= 0 ? "  a child was left\n" : "";
     text += kNext;
     for (const auto& [number, target] : OpenDescriptors()) {
-        if (before.count(number) == 0 && target != "/dev/null") {  // see WatchCalls
+        if (before.count(number) == 0) {
             text += WithoutNumbers(target) + kNext;
         }
     }

@@ -25,7 +25,7 @@ struct Fault {
 constexpr int kKill = 0;  // as an error
 
 struct WatchedRun {
-    std::vector<SystemCall> calls;     // up to the fault and after it
+    std::vector<SystemCall> calls;     // all, if there is no fault
     std::optional<SystemCall> struck;  // what the fault befell
     std::vector<std::string> left;     // programs that were left running, and were killed
 };
