@@ -1,9 +1,11 @@
 // taviwireless, the library's functions for a person or a script: the commands, what they are
 // called and what they take.
 #include <signal.h>
+#include <stdio.h>
 #include <syslog.h>
 
 #include <iostream>
+#include <new>
 
 #include "base/command_line/command_line.h"
 #include "cli/adapter/credentials.h"
@@ -217,13 +219,19 @@ int main(int argc, char** argv) {
     signal(SIGCHLD, SIG_DFL);  // what started this may ignore it, and then no program has a result
     Options options;
     try {
-        RunCommandLine(argc, argv, options);
-        return kSuccess;
-    } catch (const CommandError& error) {
-        PrintFailure(options, error.what());
-        return error.Status();
-    } catch (const std::exception& error) {  // no memory, above all
-        PrintFailure(options, std::string("failed: ") + error.what());
-        return kFailure;
+        try {
+            RunCommandLine(argc, argv, options);
+            return kSuccess;
+        } catch (const CommandError& error) {
+            PrintFailure(options, error.what());
+            return error.Status();
+        } catch (const std::bad_alloc&) {
+            PrintFailure(options, "there is not enough memory");
+        } catch (const std::exception& error) {
+            PrintFailure(options, std::string("failed: ") + error.what());
+        }
+    } catch (const std::bad_alloc&) {  // nor for the sentence
+        fputs("taviwireless: there is not enough memory\n", stderr);
     }
+    return kFailure;
 }

@@ -16,22 +16,24 @@ thread_local int allocationsLeft = -1;  // negative: no end
 thread_local bool hasFailed = false;
 thread_local int allocated = 0;
 
-// Whether the nearest caller that is no system library is code of this project.
+// Whether the nearest caller that is no system library is code of this project, and not a stand-in
+// of the test for a system library or for the kernel.
 bool IsForUs() {
     void* callers[64];
     const int count = backtrace(callers, 64);
     Dl_info self{}, caller{};
     dladdr(reinterpret_cast<void*>(&HasAllocationFailed), &self);
+    bool isOurs = false, isDecided = false;
     for (int i = 2; i < count && dladdr(callers[i], &caller) != 0; ++i) {
-        const char* name = strrchr(caller.dli_fname, '/');
-        if (strstr(name != nullptr ? name : caller.dli_fname, "tavi") != nullptr) {
-            return true;
-        }
-        if (caller.dli_fbase == self.dli_fbase) {  // the test's stand-in
+        if (caller.dli_sname != nullptr && strcmp(caller.dli_sname, "ioctl") == 0) {
             return false;
         }
+        const char* name = strrchr(caller.dli_fname, '/');
+        isOurs = isOurs || (!isDecided &&
+                            strstr(name != nullptr ? name : caller.dli_fname, "tavi") != nullptr);
+        isDecided = isDecided || isOurs || caller.dli_fbase == self.dli_fbase;
     }
-    return false;
+    return isOurs;
 }
 
 }  // namespace
@@ -86,3 +88,29 @@ TAKEN_OVER void operator delete(void* memory, size_t) noexcept {
     taviwireless::test::allocated -= memory != nullptr ? 1 : 0;
     free(memory);
 }
+
+#ifdef TAVI_OF_PROGRAM
+
+namespace {
+
+using Main = int (*)(int, char**, char**);
+Main realMain = nullptr;
+
+int MainWithMemory(int argc, char** argv, char** environment) {
+    taviwireless::test::FailAllocationAfter(atoi(getenv("TAVI_ALLOCATIONS")));
+    return realMain(argc, argv, environment);
+}
+
+}  // namespace
+
+// The C library's start of a program, which calls main().
+extern "C" TAKEN_OVER int __libc_start_main(Main start, int argc, char** argv, void (*init)(),
+                                            void (*fini)(), void (*loaderFini)(), void* stackEnd) {
+    const auto next =
+        reinterpret_cast<decltype(&__libc_start_main)>(dlsym(RTLD_NEXT, "__libc_start_main"));
+    const bool isTold = getenv("TAVI_ALLOCATIONS") != nullptr;
+    realMain = start;
+    return next(isTold ? MainWithMemory : start, argc, argv, init, fini, loaderFini, stackEnd);
+}
+
+#endif

@@ -1,7 +1,9 @@
-#ifndef TAVIWIRELESS_TESTS_PLATFORM_LINUX_FAILING_MEMORY_H
-#define TAVIWIRELESS_TESTS_PLATFORM_LINUX_FAILING_MEMORY_H
+#ifndef TAVIWIRELESS_TESTS_SUPPORT_FAILING_MEMORY_H
+#define TAVIWIRELESS_TESTS_SUPPORT_FAILING_MEMORY_H
 
-// operator new, which a test program with this file takes over, for the libraries it loads as well.
+// operator new, which a test program with this file takes over, for the libraries it loads as well;
+// or another program, with libtavi_failing_memory_of_program.so preloaded, whose main() then begins
+// with FailAllocationAfter(TAVI_ALLOCATIONS).
 namespace taviwireless::test {
 
 // From now on, `count` allocations of this thread succeed, and the next one that code of this
