@@ -32,7 +32,8 @@ class TAVIWIRELESS_API DBusServer {
     // else owns is no failure here: the request is then queued.
     bool initialize(GType type, const DBusGObjectInfo* info, GObject* object);
 
-    // Serves on the calling thread until QuitLoop. Returns at once when the loop runs already.
+    // Serves on the calling thread until QuitLoop. Returns at once when the loop runs already. When
+    // the bus ends, libdbus ends the process with status 1.
     void StartLoop();
     // Ends the loop after the call that is being served; StartLoop then returns and may be called
     // again. Does nothing when none runs.
