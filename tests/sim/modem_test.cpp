@@ -1,17 +1,117 @@
-// The modem behind the line: its SIM card, its personality, and how it comes and goes.
+// The simulated modem: its line, its SIM card, its personality, and how it comes and goes.
+#include <fcntl.h>
 #include <gmock/gmock.h>
+#include <poll.h>
 
 #include <chrono>
 #include <filesystem>
+#include <stdexcept>
 #include <thread>
 
-#include "tests/sim/client.h"
+#include "base/unique_fd.h"
 #include "tests/support/files.h"
 #include "tests/support/modem_simulator.h"
 #include "tests/support/wait.h"
 
 namespace taviwireless::test {
 namespace {
+
+namespace fs = std::filesystem;
+
+using testing::EndsWith;
+using testing::UnorderedElementsAre;
+
+// A program that talks to a modem's port, as bare as can be: no settings of its own.
+class Client {
+  public:
+    static constexpr int kQuiet = 100;      // ms; nothing more comes after that
+    static constexpr int kPatience = 5000;  // ms; far above what any reply needs
+
+    explicit Client(int port) : Client("/dev/ttyUSB" + std::to_string(port)) {}
+    explicit Client(const std::string& path) : line_(open(path.c_str(), O_RDWR | O_NOCTTY)) {
+        if (line_.Get() < 0) {
+            throw std::runtime_error("Cannot open " + path);
+        }
+    }
+
+    void Write(const std::string& text) {
+        if (write(line_.Get(), text.data(), text.size()) != static_cast<ssize_t>(text.size())) {
+            throw std::runtime_error("The line does not take " + text);
+        }
+    }
+
+    // What comes until nothing comes for so long, or the line is hung up.
+    std::string ReadUntilQuiet(int quiet = kQuiet) {
+        std::string text;
+        while (ReadMore(quiet, &text)) {
+        }
+        return text;
+    }
+
+    // Sends the command and returns everything up to the end of its result.
+    std::string Ask(const std::string& command) {
+        Write(command + "\r");
+        return ReadReply();
+    }
+
+    std::string ReadReply() {
+        std::string text;
+        while (!EndsReply(text) && ReadMore(kPatience, &text)) {
+        }
+        return text;
+    }
+
+    // False when nothing comes for so long, or the line is hung up.
+    bool ReadMore(int patience, std::string* text) {
+        pollfd readable{line_.Get(), POLLIN, 0};
+        char buffer[4096];
+        if (poll(&readable, 1, patience) <= 0) {
+            return false;
+        }
+        const ssize_t count = read(line_.Get(), buffer, sizeof buffer);
+        hungUp_ = count <= 0;
+        text->append(buffer, hungUp_ ? 0 : count);
+        return !hungUp_;
+    }
+    bool IsHungUp() const { return hungUp_; }
+
+  private:
+    static bool EndsReply(const std::string& text) {
+        const size_t last = text.rfind("\r\n", text.size() - 3);
+        if (text.size() < 4 || last == std::string::npos ||
+            text.substr(text.size() - 2) != "\r\n") {
+            return false;
+        }
+        const std::string line = text.substr(last + 2, text.size() - last - 4);
+        return line == "OK" || line == "CONNECT" || line.find("ERROR") != std::string::npos;
+    }
+
+    UniqueFd line_;
+    bool hungUp_ = false;
+};
+
+// Everything up to these words.
+std::string ReadUntil(Client& client, const std::string& last) {
+    std::string text;
+    while (text.find(last) == std::string::npos && client.ReadMore(Client::kPatience, &text)) {
+    }
+    return text;
+}
+
+TEST(Call, CommandHasTheLineUntilItEndsAndThenTheModemHangsUp) {
+    ModemSimulator simulator(
+        {"--on-dial", "echo welcome; read -r line; echo \"heard $line\"; exit 3"});
+    Client client(0);
+    for (int round = 0; round < 2; ++round) {
+        client.Write("ATD*99#\r");
+        EXPECT_THAT(ReadUntil(client, "welcome\n"), EndsWith("\r\nCONNECT\r\nwelcome\n"));
+        simulator.Received("0");
+        client.Write("AT+CSQ\n");  // is the command's now
+        EXPECT_EQ(ReadUntil(client, "NO CARRIER\r\n"), "heard AT+CSQ\n\r\nNO CARRIER\r\n");
+        EXPECT_THAT(simulator.Received("0"), testing::IsEmpty());
+        EXPECT_THAT(client.Ask("AT"), EndsWith("OK\r\n"));
+    }
+}
 
 constexpr char kWrong[] = "+CME ERROR: incorrect password";
 constexpr char kBadArgument[] = "+CME ERROR: incorrect parameters";
@@ -61,10 +161,6 @@ TEST(PersonalityFile, OfAPersonsOwnAddsToAnotherOne) {
     EXPECT_EQ(client.Ask("AT+BAND?"), "\r\n+BAND: 18 00\r\n001010123456789\r\n\r\nOK\r\n");
     EXPECT_EQ(client.Ask("AT^CURC?"), "\r\n^CURC: 1\r\n\r\nOK\r\n");
 }
-
-namespace fs = std::filesystem;
-
-using testing::UnorderedElementsAre;
 
 std::vector<std::string> Names(const std::string& folder, const std::string& part) {
     std::vector<std::string> names;
