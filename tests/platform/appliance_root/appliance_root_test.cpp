@@ -4,18 +4,14 @@
 #include <gmock/gmock.h>
 #include <unistd.h>
 
-#include <algorithm>
 #include <csignal>
 #include <cstdlib>
-#include <filesystem>
 
-#include "tests/support/files.h"
 #include "tests/support/process.h"
 
 namespace taviwireless::test {
 namespace {
 
-using testing::HasSubstr;
 using testing::StartsWith;
 
 RunResult RunInside(std::vector<std::string> command) {
@@ -100,30 +96,6 @@ TEST_P(UsedMachine, IsNotSeenAndNotChanged) {
 
 INSTANTIATE_TEST_SUITE_P(ApplianceRoot, UsedMachine,
                          testing::Values("", "user", "read-only", "chroot"));
-
-void ExpectSentence(const std::string& script, const std::string& sentence) {
-    const auto result = RunProgram({"sh", "-c", script, BuiltProgram("appliance-root")});
-    EXPECT_EQ(result.status, kApplianceRootFailed);
-    EXPECT_THAT(result.err, StartsWith("appliance root: " + sentence));
-    EXPECT_EQ(std::count(result.err.begin(), result.err.end(), '\n'), 1);
-}
-
-TEST(KernelThatRefuses, IsNamedInOneSentence) {
-    const char* refused = "new namespaces are refused: run as root, or let ordinary users";
-    const std::string asNobodySpecial = "exec setpriv --bounding-set=-sys_admin \"$0\" true";
-    const std::string asUser = "exec unshare --mount --user --map-root-user ";
-    if (RunProgram({"sh", "-c", asUser + "true"}).status != 0) {  // as in a chroot
-        return ExpectSentence(asNobodySpecial, refused);
-    }
-    ExpectSentence(asUser + "sh -c 'echo 0 >/proc/sys/user/max_user_namespaces; " +
-                       asNobodySpecial + "' \"$0\"",
-                   refused);
-    ExpectSentence(asUser +
-                       "sh -c 'awk \"/ - proc / { print \\$5 }\" /proc/self/mountinfo |"
-                       "while read -r proc; do mount --bind /dev/null $proc/version; done;" +
-                       asUser + "\"$0\" true' \"$0\"",
-                   "cannot mount a private /proc (the kernel lets only root");
-}
 
 }  // namespace
 }  // namespace taviwireless::test

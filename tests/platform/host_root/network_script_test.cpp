@@ -66,48 +66,12 @@ int Running(const std::string& name) {
     return std::stoi(RunProgram({"pgrep", "--count", "--exact", name}).out);
 }
 
-// The lease that a station, at the far end of wlan0, gets: "ADDRESS ROUTER DNS LEASETIME".
-std::string LeaseOfStation() {
-    WriteProgram("/tmp/station", "#!/bin/sh\n[ $1 != bound ] || echo $ip $router $dns $lease\n");
-    return RunProgram({"udhcpc", "-f", "-n", "-q", "-t", "4", "-T", "1", "-i", "wlan0-far", "-s",
-                       "/tmp/station"})
-        .out;
-}
-
 // The server asks 10 ms long, not 2 s, whether somebody else has the address.
 void HurryServer() {
     RunProgram({"sh", "-c",
                 "mkdir /tmp/real && mv /usr/sbin/udhcpd /tmp/real/ && "
                 "printf '#!/bin/sh\\nexec /tmp/real/udhcpd -a 10 \"$@\"\\n' >/usr/sbin/udhcpd && "
                 "chmod 755 /usr/sbin/udhcpd"});
-}
-
-// Whatever ran before, and whatever the caller does about its children.
-TEST_F(NetworkProgram, StationOfALocalBridgeGetsALeaseAsLongAsItIsOn) {
-    HurryServer();
-    SaveLocalBridge();
-    for (int i = 0; i < 2; ++i) {
-        ASSERT_EQ(Shell("trap '' CHLD; exec env -i /etc/rc.network restart wlan0 lbr0 2>&1"), "");
-        EXPECT_THAT(Ip("address show lbr0"), HasSubstr("inet 10.1.14.1/24 brd 10.1.14.255"));
-        EXPECT_THAT(Ip("address show wlan0"), HasSubstr("master lbr0"));
-        EXPECT_EQ(LeaseOfStation(), "10.1.14.20 10.1.14.1 10.1.14.1 600\n");
-    }
-    const pid_t hostapd = VEXACReadPidFile("/var/run/hostapd-wlan0.pid");
-    const pid_t server = VEXACReadPidFile(kServerPid);
-    const std::string open = "ls -l /proc/" + std::to_string(hostapd) + "/fd";
-    EXPECT_THAT(Shell(open), Not(HasSubstr("rc.network")));
-    remove("/etc/hostapd/hostapd-wlan0.info");
-    WriteFile(kInterfaceFile + "wlan0", "IPADDR=10.1.14.1\n");
-    WriteFile(kInterfaceFile + "lbr0", "ONBOOT=no\n");
-    EXPECT_EQ(Restart("lbr0"), "");
-    EXPECT_NE(kill(hostapd, 0), 0);
-    EXPECT_NE(kill(server, 0), 0);
-    EXPECT_FALSE(Exists(kJoined) || Exists("/sys/class/net/lbr0"));
-    EXPECT_THAT(Ip("address show wlan0"), Not(HasSubstr("inet ")));
-    Process other({"sleep", "60"});  // that got the server's number
-    WriteFile(kServerPid, std::to_string(other.Pid()) + "\n");
-    EXPECT_EQ(Restart("lbr0"), "");
-    EXPECT_EQ(other.Wait(Process::Milliseconds(50)), std::nullopt);
 }
 
 // The server's own files are made of what was written by hand, whatever lay there.

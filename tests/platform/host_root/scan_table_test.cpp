@@ -5,7 +5,6 @@
 #include <taviwireless/wireless.h>
 
 #include "tests/wireless/wifi_fixture.h"
-#include "wireless/system/queue.h"
 
 namespace taviwireless::test {
 namespace {
@@ -25,19 +24,11 @@ std::string Ssid(const std::string& essid) {
 }
 
 const std::string kRates = Bytes("01 08 82 84 8b 96 0c 12 18 24 32 04 30 48 60 6c");
-const std::string kRsnPskMixed =
-    Bytes("30 18 01 00 00 0f ac 02 02 00 00 0f ac 04 00 0f ac 02 01 00 00 0f ac 02 00 00");
 
 constexpr bool kPrivate = true;
 
 ScanResult Beacon(int frequency, int signal, bool isPrivate, const std::string& elements) {
     return {{0x00, 0x11, 0x22, 0x33, 0x44, 0x55}, frequency, signal, 0, isPrivate, elements};
-}
-
-TEST(ScanTable, HasColumns) {
-    const auto beacon = Beacon(2437, -61, kPrivate, Ssid(" a\nb\xc3\xbc") + kRates + kRsnPskMixed);
-    EXPECT_EQ(TableLine(beacon), "6     a?b\xc3\xbc" + std::string(27, ' ') +
-                                     "00:11:22:33:44:55 70 11b/g WPA2PSK/TKIPAES\n");
 }
 
 // A beacon is a stranger's: whatever it holds, it is one line of the table, and its ESSID and what

@@ -1,10 +1,7 @@
 // Leases, from a real DHCP server at the other end of a veth pair, by the real client.
 #include <gmock/gmock.h>
-#include <sys/stat.h>
-#include <tavicore/error.h>
 #include <tavicore/process.h>
 #include <tavisdk/network.h>
-#include <tavisdk/service.h>
 
 #include "tests/platform/veth.h"
 #include "tests/support/files.h"
@@ -78,16 +75,6 @@ TEST_F(Dhcp, LeaseMayLackAGateway) {
     EXPECT_EQ(ReadFile(kLease), "IPADDR=\"10.7.0.20\"\nNETMASK=\"255.255.255.128\"\n");
 }
 
-TEST_F(Dhcp, FailureLeavesTheCardEmpty) {
-    WriteProgram("/usr/sbin/udhcpc", "#!/bin/sh\nexit 1\n");  // as when nobody answers, but at once
-    EXPECT_EQ(TAVIIGetDHCPTestNetInfo(&card_), -1);
-    EXPECT_EQ(VEXACErrGet(), VEXAC_ERR_NOT_FOUND);
-    EXPECT_STREQ(card_.address, "");
-    EXPECT_STREQ(card_.netmask, "");
-    card_ = {"none7", 0, "", ""};
-    EXPECT_EQ(TAVIIGetDHCPTestNetInfo(&card_), -1);
-}
-
 TEST_F(Dhcp, ProgramThatGotTheClientsNumberIsSpared) {
     Process other({"sleep", "60"});
     WriteFile(kPidFile, std::to_string(other.Pid()) + "\n");
@@ -95,20 +82,6 @@ TEST_F(Dhcp, ProgramThatGotTheClientsNumberIsSpared) {
     const TAVINetCard card = {"eth7", 1, "10.9.0.5", "255.255.0.0"};
     EXPECT_EQ(TAVINetSetCard1(&card, 0), 0);
     EXPECT_EQ(other.Wait(Process::Milliseconds(50)), std::nullopt);  // it runs on
-}
-
-TEST(MediaService, IsRestartedByItsScript) {
-    EXPECT_EQ(TAVIMediaService(TAVI_MEDIA_SERVICE_RESTART), -1);
-    EXPECT_EQ(VEXACErrGet(), VEXAC_ERR_NOT_FOUND);
-    WriteProgram("/etc/rc.mediaservice",
-                 "#!/bin/sh\necho $* >/tmp/arguments; exit $(cat /tmp/status)\n");
-    WriteFile("/tmp/status", "0");
-    EXPECT_EQ(TAVIMediaService(TAVI_MEDIA_SERVICE_RESTART), 0);
-    EXPECT_EQ(ReadFile("/tmp/arguments"), "restart\n");
-    WriteFile("/tmp/status", "3");
-    EXPECT_EQ(TAVIMediaService(TAVI_MEDIA_SERVICE_RESTART), -1);
-    EXPECT_EQ(TAVIMediaService(1), -1);
-    EXPECT_EQ(VEXACErrGet(), VEXAC_ERR_BAD_PARAMETER);
 }
 
 }  // namespace

@@ -6,10 +6,6 @@
 #include <tavicore/section.h>
 #include <unistd.h>
 
-#include <vector>
-
-#include "common/sz_hash.h"
-#include "common/sz_list.h"
 #include "tests/support/files.h"
 
 namespace taviwireless::test {
@@ -17,31 +13,6 @@ namespace {
 
 constexpr char kFile[] = "/tmp/sections";
 constexpr char kFormat[] = "\t%s=%s\n";
-
-using Pairs = std::vector<std::pair<std::string, std::string>>;
-
-struct Hash : SzHash {
-    explicit Hash(const Pairs& pairs = {}) : SzHash(64) {
-        for (const auto& [key, value] : pairs) {
-            Set(key.c_str(), value);
-        }
-    }
-};
-
-TEST(Section, TellsWhyThereIsNoValue) {
-    WriteFile(kFile, "[One]\nKEY=b\n[]\nLAST=1");
-    char value[32];
-    EXPECT_EQ(VEXACFileGetSectionValue(kFile, "", "LAST", value, 2), 0);
-    EXPECT_STREQ(value, "1");
-    EXPECT_EQ(VEXACFileGetSectionValue(kFile, "", "LAST", value, 1), -1);
-    EXPECT_EQ(VEXACErrGet(), VEXAC_ERR_TOO_LONG);
-    EXPECT_EQ(VEXACFileGetSectionValue(kFile, "One", "LAST", value, sizeof value), -1);
-    EXPECT_EQ(VEXACErrGet(), VEXAC_ERR_NOT_FOUND);
-    Hash two;
-    EXPECT_EQ(VEXACFileGetSection(kFile, "two", two.Address()), 0);
-    EXPECT_EQ(VEXACFileSetSectionValue(kFile, "One\n[two", "a", "x", kFormat), -1);
-    EXPECT_EQ(VEXACErrGet(), VEXAC_ERR_BAD_PARAMETER);
-}
 
 std::string ValueOf(const char* section) {
     char value[32];
@@ -68,17 +39,6 @@ TEST(Section, ShowsEveryChangeOfTheFileAtOnce) {
     unlink(kFile);
     EXPECT_EQ(ValueOf("98"), "");
     umount("/tmp");
-}
-
-TEST(Section, ChangesStandWhereTheKeysStood) {
-    const std::string top = "; top\n[one]\n[c=1\n", two = "\n# two\n[two]\nx=\xff\n";
-    WriteFile(kFile, top + "\ta=1\n\tb=2\n" + two);
-    EXPECT_EQ(VEXACFileSetSectionValue(kFile, "one", "c", " 3 ", kFormat), 0);
-    EXPECT_EQ(ReadFile(kFile), top + "\ta=1\n\tb=2\n\tc= 3 \n" + two);
-    const Hash pairs({{"b", "9"}, {"n", ""}});
-    EXPECT_EQ(VEXACFileSetSection(kFile, "ONE", nullptr, pairs.Get(), kFormat), 1);
-    EXPECT_EQ(VEXACFileAddSection(kFile, "new", pairs.Get(), kFormat), 1);
-    EXPECT_EQ(ReadFile(kFile), top + "\tb=9\n\tn=\n" + two + "[new]\n\tb=9\n\tn=\n");
 }
 
 constexpr char kSettings[] = "/tmp/settings";
@@ -128,16 +88,6 @@ TEST(KeyValue, AWriteLeavesOneLineOfItsKey) {
     WriteFile(kSettings, "KEY=old\n#\nKEY=again\nlast line");
     EXPECT_EQ(VEXACFileSetKeyValue(kSettings, "KEY", "new", nullptr), 1);
     EXPECT_EQ(ReadFile(kSettings), "KEY=\"new\"\n#\nlast line");
-}
-
-TEST(KeyValue, RefusesWhatIsNoFormat) {
-    WriteFile(kSettings, "KEY=1\n");
-    for (const char* format : {"%s=%s", "%s=%s %n\n", "%s=%s\n%s\n"}) {
-        VEXACErrSet(VEXAC_ERR_NONE);
-        EXPECT_EQ(VEXACFileSetKeyValue(kSettings, "KEY", "a", format), -1);
-        EXPECT_EQ(VEXACErrGet(), VEXAC_ERR_BAD_PARAMETER);
-    }
-    EXPECT_EQ(ReadFile(kSettings), "KEY=1\n");
 }
 
 }  // namespace

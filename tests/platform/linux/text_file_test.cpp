@@ -1,5 +1,4 @@
 // Replacing a file: in one step, alike, and one writer after the other.
-#include <fcntl.h>
 #include <gmock/gmock.h>
 #include <signal.h>
 #include <sys/mount.h>
@@ -164,31 +163,6 @@ TEST_F(Locking, AStrangersFileOrLinkIsNoLock) {
         EXPECT_LT(waits_.Seconds(), 0.1);
         ASSERT_EQ(symlink("/etc/passwd", kSharedLock), 0);
     }
-}
-
-// A killed root's lock in the folder of an ordinary user is taken over by him.
-TEST_F(Locking, AnOrdinaryUserLocksToo) {
-    TAVI_NEEDS_A_STRANGER()
-    ASSERT_EQ(chown("/tmp/state", kStranger, kStranger), 0);
-    ASSERT_EQ(chown(kFile, kStranger, kStranger), 0);
-    StoppedWriter().End();
-    int status = -1;
-    waitpid(Fork([] {
-                const bool isUser = setgid(kStranger) == 0 && setuid(kStranger) == 0;
-                _exit(isUser && SetKey(kFile, "2") == 1 ? 0 : 1);
-            }),
-            &status, 0);
-    EXPECT_EQ(status, 0);
-    EXPECT_EQ(ReadFile(kFile), "A=2\n");
-}
-
-TEST_F(Locking, AFolderThatCannotBeWrittenNeedsNoLock) {
-    ASSERT_EQ(mount("/tmp/state", "/tmp/state", nullptr, MS_BIND, nullptr), 0);
-    ASSERT_EQ(mount(nullptr, "/tmp/state", nullptr, MS_BIND | MS_REMOUNT | MS_RDONLY, nullptr), 0);
-    EXPECT_EQ(SetKey(kFile, "1"), 1);  // as it is
-    EXPECT_EQ(SetKey(kFile, "2"), -1);
-    EXPECT_EQ(VEXACErrGet(), VEXAC_ERR_IO);
-    EXPECT_EQ(waits_.Seconds(), 0);
 }
 
 }  // namespace
