@@ -49,23 +49,6 @@ TEST(Saving, WritesASectionThatOnlyTheOwnerCanRead) {
     EXPECT_EQ(station.log.Text(), "");
 }
 
-TEST(Saving, FailuresAreLogged) {
-    const std::string path = kSavedFile;
-    const std::pair<const char*, std::string> kCases[] = {
-        {"true", "Failed to add section: 00:11:22:AA:BB:CC from " + path + ", errno=0xD00"},
-        {"echo '[00:11:22:AA:BB:CC]' >", "Failed to set section: 00:11:22:AA:BB:CC from " + path},
-        {"mkdir", "Failed to get section: " + path + " from 00:11:22:AA:BB:CC, errno=0x800"},
-        {"rm -r /usr/tavi/etc; true", "Failed to touch " + path},
-    };
-    for (const auto& [arrange, line] : kCases) {
-        Station station;
-        Shell(arrange + (" " + path));
-        const WirelessConf conf = MakeConf("line\n[forged]");
-        EXPECT_EQ(TAVIWirelessConfSet(&conf), -1);
-        EXPECT_TRUE(station.log.Has(line)) << station.log.Text();
-    }
-}
-
 TEST(Reading, MissingKeysAreEmptyAndLongValuesCut) {
     Station station;
     WirelessConf conf;

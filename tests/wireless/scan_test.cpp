@@ -1,18 +1,17 @@
-// Scanning: waiting for the adapter, scans until two agree, what is read from the tool's table.
+// Scanning: waiting for the adapter, scans until two agree, what is read from the tool's table; names
+// and values.
 #include <gmock/gmock.h>
 #include <taviwireless/wireless.h>
 
 #include "tests/support/descriptors.h"
 #include "tests/support/log_capture.h"
 #include "tests/support/sleep_capture.h"
-#include "tests/wireless/scripted_driver.h"
 #include "tests/wireless/wifi_fixture.h"
 #include "wireless/system/queue.h"
 
 namespace taviwireless::test {
 namespace {
 
-using testing::HasSubstr;
 using Texts = std::vector<std::string>;
 using Networks = wireless::OwnedList<WirelessNetwork>;
 
@@ -121,22 +120,6 @@ TEST_F(Scan, ReadsALineByItsColumns) {
     }
 }
 
-TEST_F(Scan, ThatCannotBeRunFailsWithAnEmptyList) {
-    ScriptedDriver driver;
-    driver.unrunnable = kTableCommand;
-    WirelessLink networks{};
-    EXPECT_EQ(TAVIWirelessNetworkScan(0, &networks), -1);
-    EXPECT_TRUE(wireless::IsEmpty(networks));
-    EXPECT_EQ(log.Count("popen '" + std::string(kTableCommand) + "', errno=Resource tempora"), 5);
-    EXPECT_TRUE(log.Has("Scan 4: failed."));
-    EXPECT_TRUE(log.Has("Failed to get network scanning result"));
-    Shell("ip link set wlan0 name wlan1");
-    EXPECT_EQ(TAVIWirelessNetworkScan(0, &networks), -1);
-    EXPECT_TRUE(log.Has("Failed to activate network interface wlan0"));
-    EXPECT_EQ(sleeps.Total(), 1u);
-    Shell("ip link delete wlan1");
-}
-
 TEST_F(Scan, FindsOneNetworkAndTriggersAnotherScanWhenThereIsNone) {
     AddScanner(tools, {ScanLine(1, "home", "0:0:0:0:0:1", 10, "b", "NONE") +
                        ScanLine(2, "Home", "0:0:0:0:0:2", 20, "b", "WEP")});
@@ -165,6 +148,54 @@ TEST_F(Scan, FindsOneNetworkAndTriggersAnotherScanWhenThereIsNone) {
     Texts commands(7, kTableCommand);
     commands.insert(commands.begin() + 5, "/sbin/iwlist wlan0 scanning");
     EXPECT_EQ(tools.Commands(), commands);
+}
+
+// Names of values, and addresses.
+template <typename StringGet>
+std::string Printed(int last, StringGet stringGet) {
+    std::string text;
+    for (int value = -1; value <= last; ++value) {
+        text += std::string(stringGet(value)) + "|";
+    }
+    return text;
+}
+
+TEST(Names, OfValuesAreOneEach) {
+    EXPECT_EQ(Printed(9, TAVIWirelessAuthStringGet),
+              "unknown|unknown|OPEN|SHARED|WEPAUTO|WPAPSK|WPA2PSK|WPANONE|WPAEAP|WPA2EAP|unknown|");
+    EXPECT_EQ(Printed(8, TAVIWirelessOpmodeStringGet),
+              "Unknown|Auto|Ad-Hoc|Managed|Master|Repeater|Secondeary|Monitor|Unknown|Unknown|");
+    EXPECT_EQ(Printed(13, TAVIWirelessProtocolStringGet),
+              "unknown|unknown|11b/g|11b|11a|11a/b/g|11g|11a/b/g/n|11n|11g/n|11a/n|11b/g/n|"
+              "11a/g/n|11b/n|unknown|");
+    EXPECT_EQ(Printed(4, [](int bit) { return TAVIWirelessEncryptStringGet(1 << (bit + 1), 0); }),
+              "none|WEP|TKIP|AES|unknown|unknown|");
+    EXPECT_STREQ(TAVIWirelessEncryptStringGet(3, 1), "unknown");
+    EXPECT_STREQ(TAVIWirelessEncryptStringGet(8, 1), "CCMP");
+    EXPECT_STREQ(TAVIWirelessEncryptStringGet(12, 0), "TKIP AES");
+    EXPECT_STREQ(TAVIWirelessEncryptStringGet(12, 1), "TKIP CCMP");
+}
+
+TEST(Address, IsSixHexadecimalGroups) {
+    const std::pair<const char*, const char*> kRows[] = {
+        {"00:11:22:aa:BB:cc", "00:11:22:AA:BB:CC"},
+        {" \t0:1:2:3:4:5", "00:01:02:03:04:05"},
+        {"100:1ff:22:0033:44:55 and more", "00:FF:22:33:44:55"},
+        {"00-11-22-33-44-55", nullptr},  // refused
+        {"00:11:22:33:44:g5", nullptr},
+        {"%s%n", nullptr}};
+    for (const auto& [text, printed] : kRows) {
+        LogCapture log;
+        unsigned char bssid[6] = {9, 9, 9, 9, 9, 9};
+        char all[18];
+        EXPECT_EQ(TAVIWirelessBssidParse(text, bssid), printed != nullptr ? 0 : -1);
+        EXPECT_STREQ(TAVIWirelessBssidStringGet(bssid, all, sizeof all),
+                     printed != nullptr ? printed : "09:09:09:09:09:09");
+        EXPECT_EQ(log.Has("BSSID '" + std::string(text) + "'"), printed == nullptr);
+    }
+    char cut[6];
+    const unsigned char bssid[6] = {0x61, 0x62, 0x63, 0x64, 0x65, 0x66};
+    EXPECT_STREQ(TAVIWirelessBssidStringGet(bssid, cut, sizeof cut), "61:62");
 }
 
 }  // namespace

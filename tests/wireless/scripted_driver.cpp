@@ -1,7 +1,6 @@
 #include "tests/wireless/scripted_driver.h"
 
 #include <dlfcn.h>
-#include <spawn.h>
 
 #include <algorithm>
 #include <cerrno>
@@ -100,18 +99,4 @@ extern "C" __attribute__((visibility("default"))) int ioctl(int handle, unsigned
     using Ioctl = int (*)(int, unsigned long, ...);
     static const auto next = reinterpret_cast<Ioctl>(dlsym(RTLD_NEXT, "ioctl"));
     return next(handle, request, argument);
-}
-
-extern "C" __attribute__((visibility("default"))) int posix_spawnp(
-    pid_t* process, const char* path, const posix_spawn_file_actions_t* actions,
-    const posix_spawnattr_t* attributes, char* const arguments[], char* const environment[]) {
-    constexpr int kCommand = 2;  // behind "sh -c"
-    const bool isCommand = arguments[1] != nullptr && strcmp(arguments[1], "-c") == 0;
-    if (isCommand && living != nullptr && !living->unrunnable.empty() &&
-        strstr(arguments[kCommand], living->unrunnable.c_str()) != nullptr) {
-        return EAGAIN;
-    }
-    static const auto next =
-        reinterpret_cast<decltype(&posix_spawnp)>(dlsym(RTLD_NEXT, "posix_spawnp"));
-    return next(process, path, actions, attributes, arguments, environment);
 }

@@ -12,9 +12,9 @@
 namespace taviwireless::test {
 
 // What the driver of the wireless interface answers while this lives; at most one may live at a
-// time. A program that links tavi_scripted_driver defines ioctl() and posix_spawnp()
-// itself: requests of the wireless extensions go to the living ScriptedDriver, all else, and
-// everything when none lives, to the system.
+// time. A program that links tavi_scripted_driver defines ioctl() itself: requests of the wireless
+// extensions go to the living ScriptedDriver, all else, and everything when none lives, to the
+// system.
 struct ScriptedDriver {
     ScriptedDriver();
     ~ScriptedDriver();
@@ -22,7 +22,6 @@ struct ScriptedDriver {
     ScriptedDriver& operator=(const ScriptedDriver&) = delete;
 
     std::set<unsigned long> refused;  // these requests fail (SIOCGIW...)
-    std::string unrunnable;           // commands that hold this text cannot be run; empty: all can
     std::string name = "IEEE 802.11bgn";
     std::string essid;  // the bytes that are copied; no zero byte follows
     unsigned mode = IW_MODE_INFRA;

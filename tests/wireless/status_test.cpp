@@ -53,6 +53,7 @@ TEST_F(Adapter, HasAStatusByItsModeAndItsAccessPoint) {
         int status, statusWithAccessPoint, opmode;
     } kRows[] = {{0, 4, 5, 0}, {1, 6, 6, 1}, {2, 4, 5, 2}, {3, 7, 7, 3}, {4, 0, 0, 4},
                  {5, 0, 0, 5}, {6, 7, 7, 6}, {7, 0, 0, 7}, {8, 0, 0, 7}, {~0U, 0, 0, 7}};
+    const auto before = OpenDescriptors();
     for (const auto& row : kRows) {
         SCOPED_TRACE(row.mode);
         driver.mode = row.mode;
@@ -63,6 +64,7 @@ TEST_F(Adapter, HasAStatusByItsModeAndItsAccessPoint) {
         EXPECT_EQ(Status().status, row.statusWithAccessPoint);
     }
     EXPECT_EQ(TAVIWirelessOpmodeSet(WIRELESS_OPMODE_MANAGED), 0);
+    EXPECT_EQ(OpenDescriptors(), before);
     EXPECT_EQ(driver.mode, static_cast<unsigned>(IW_MODE_INFRA));
     driver.refused = {SIOCGIWAP};
     EXPECT_EQ(Status().status, WIRELESS_STATUS_NOT_CONNECTED);
@@ -105,29 +107,6 @@ TEST_F(Adapter, TellsEssidProtocolAndKeyState) {
     }
 }
 
-TEST_F(Adapter, LogsWhatIsRefused) {
-    static WirelessInfo info;
-    const struct {
-        int (*call)();
-        int result;
-        const char* line;
-    } kRows[] = {
-        {[] { return TAVIWirelessCurInfoGet(0, &info); }, -1, "Failed to request essid."},
-        {[] { return TAVIWirelessCurInfoGet(2, &info); }, -1, "Failed to request auth."},
-        {[] { return TAVIWirelessCurInfoGet(5, &info); }, -1, "This request is not supported."},
-        {TAVIWirelessOpmodeGet, 7, "Failed to get information from ioctl with ifname[wlan0]."},
-        {[] { return TAVIWirelessOpmodeSet(2); }, -1, "Failed to set opmode[Managed] of wlan0."},
-        {[] { return TAVIWirelessOpmodeSet(3); }, -1, "Opmode(Master) isn't supported"},
-    };
-    driver.refused = {SIOCGIWESSID, SIOCGIWENCODE, SIOCGIWMODE, SIOCSIWMODE};
-    const auto before = OpenDescriptors();
-    for (const auto& row : kRows) {
-        EXPECT_EQ(row.call(), row.result) << row.line;
-        EXPECT_TRUE(Logged(row.line)) << row.line;
-    }
-    EXPECT_EQ(OpenDescriptors(), before);
-}
-
 struct Connected : Adapter {
     Connected() { driver.accessPoint = {0, 1, 2, 3, 4, 5}; }
     WirelessNetwork Network(const std::string& record) {
@@ -153,18 +132,6 @@ TEST_F(Connected, IsToTheNetworkThatWasWrittenDown) {
         EXPECT_TRUE(Logged("Failed to get wireless network info"));
     }
     EXPECT_EQ(Network(k33.substr(1) + rest).essid, k33.substr(1));
-}
-
-TEST_F(Connected, HasASignalInPercent) {
-    const std::pair<const char*, int> kRows[] = {
-        {"Link Quality=33/-1", -3300}, {"Link Quality=5/0", 0},
-        {"Link Quality=5", 0},         {"Link Quality:5/100", 0},
-        {"no such words", 0},          {"Link Quality=30000000/30000000", 100}};
-    for (const auto& [quality, signal] : kRows) {
-        SetQuality(quality);
-        EXPECT_EQ(Network(kRecord).signal, signal) << quality;
-        EXPECT_EQ(Logged("Failed to get signal infomation"), signal == 0) << quality;
-    }
 }
 
 TEST_F(Adapter, DescribesItsAdhocNetwork) {
@@ -228,26 +195,6 @@ TEST_F(Adapter, CreatesAnAdhocNetwork) {
         EXPECT_EQ(TAVINetIsIFUp("wlan0"), isCreated ? 1 : 0);
     }
     EXPECT_FALSE(Exists("/tmp/ran"));
-}
-
-TEST_F(Adapter, CreatesNoNetworkWhenAStepFails) {
-    WirelessConf conf = AdhocConf("net", 2, "abcde");
-    driver.unrunnable = "key";
-    EXPECT_EQ(TAVIWirelessAdhocCreate(&conf), -1);
-    EXPECT_TRUE(Logged("Failed to execute '/sbin/iwconfig wlan0 key open s:***** > /dev/null"));
-    tools.ForgetCommands();
-    driver.unrunnable = "essid";
-    EXPECT_EQ(TAVIWirelessAdhocCreate(&conf), -1);
-    driver.refused = {SIOCSIWMODE};
-    EXPECT_EQ(TAVIWirelessAdhocCreate(&conf), -1);
-    EXPECT_TRUE(Logged("Failed to set Ad-Hoc mode of wlan0."));
-    conf.network.encrypt = WIRELESS_ENCRYPT_AES;
-    EXPECT_EQ(TAVIWirelessAdhocCreate(&conf), -1);
-    EXPECT_TRUE(Logged("Adhoc mode does not support encryption [AES]."));
-    conf.network.opmode = WIRELESS_OPMODE_MANAGED;
-    EXPECT_EQ(TAVIWirelessAdhocCreate(&conf), -1);
-    EXPECT_TRUE(Logged("Interface wlan0 is not Adhoc mode."));
-    EXPECT_THAT(tools.Commands(), testing::IsEmpty());
 }
 
 }  // namespace
