@@ -38,15 +38,6 @@ struct OpenedModem {
         log.Clear();
     }
 
-    // The modem answers this command with these lines and nothing else.
-    void Answer(const std::string& command, const std::vector<std::string>& lines) {
-        simulator.Reply("1", command, Framed(lines));
-    }
-    // Not even an echo comes back for this command; others are answered.
-    void Silence(const std::string& command) {
-        simulator.Fault("1", "noecho");
-        simulator.Reply("1", command, "");
-    }
     std::vector<std::string> Received() { return simulator.Received("1"); }
 
     ModemSimulator simulator;

@@ -1,15 +1,17 @@
-// The serial channel: opening, one command and its reply, and modems that misbehave.
+// The serial channel: opening, one command and its reply, modems that misbehave, and the lock between
+// processes.
 #include <sys/prctl.h>
 #include <sys/sem.h>
+#include <sys/stat.h>
 #include <sys/wait.h>
+#include <taviwireless/semaphore.h>
 #include <unistd.h>
 
-#include <algorithm>
+#include <cerrno>
 #include <chrono>
 #include <csignal>
 #include <cstdlib>
 #include <ctime>
-#include <filesystem>
 
 #include "tests/support/descriptors.h"
 #include "tests/support/files.h"
@@ -18,8 +20,7 @@
 namespace taviwireless::test {
 namespace {
 
-using testing::ElementsAre;
-using testing::HasSubstr;
+using semaphore::Semaphore;
 using testing::IsEmpty;
 using usbmodem_lib::USBModem;
 
@@ -48,24 +49,6 @@ struct WholeWaits {
 
 bool IsUnlocked() {
     return semctl(semget(1, 1, 0), 0, GETVAL) == 1;
-}
-
-TEST(Channel, ReplacesAnOpenOneAndKeepsThatUntilBothAreClosed) {
-    ModemSimulator simulator({"--modem", "generic,id=1,ports=dial/at/at"});
-    LogCapture log;
-    USBModem record(1, kInfo1);
-    const auto before = OpenDescriptors();
-    ASSERT_EQ(record.OpenFileDevice("/dev/ttyUSB1"), 0);
-    EXPECT_EQ(log.Text(), "");
-    EXPECT_EQ(record.OpenFileDevice("/dev/ttyUSB2"), 0);
-    EXPECT_TRUE(log.Has("Open device warning: new a modem which is not null"));
-    EXPECT_EQ(OpenDescriptors().size(), before.size() + 2);
-    std::string reply;
-    EXPECT_EQ(record.ModemCmd("AT+CGMM", reply), 0);
-    EXPECT_THAT(simulator.Received("1.1"), IsEmpty());
-    EXPECT_THAT(simulator.Received("1.2"), ElementsAre("AT+CGMM"));
-    record.CloseFileDevice();
-    EXPECT_EQ(OpenDescriptors(), before);
 }
 
 TEST(Channel, IsKeptFromItsPortByALockFileWhoseProcessLives) {
@@ -104,21 +87,6 @@ TEST(Channel, HasItsPortForItselfWithoutALockFileToo) {
     EXPECT_EQ(modem.record.ModemCmd("AT", reply), 0);
     modem.record.CloseFileDevice();
     EXPECT_EQ(second.OpenFileDevice(kQueryPort), 0);
-}
-
-TEST(Command, WithoutAChannelOrATextIsRefusedAndLeavesTheLockOpen) {
-    OpenedModem modem;
-    std::string reply = "kept";
-    EXPECT_EQ(modem.record.ModemCmd("", reply), -1);
-    EXPECT_TRUE(IsUnlocked());
-    modem.record.CloseFileDevice();
-    EXPECT_EQ(modem.record.ModemCmd("AT", reply), -1);
-    EXPECT_TRUE(IsUnlocked());
-    EXPECT_EQ(modem.log.Count("Error on executing modem cmd with a null modem or null command"), 2);
-    EXPECT_EQ(reply, "kept");
-    EXPECT_EQ(modem.record.DrainDeviceBuffer(), -1);
-    EXPECT_TRUE(modem.log.Has("Error when cleaning device buffer, modem is null"));
-    EXPECT_THAT(modem.Received(), IsEmpty());
 }
 
 TEST(Command, FailsWhileAStrangerKeepsTheLockAndFreesIt) {
@@ -164,57 +132,6 @@ TEST(Reply, HasNeitherBlankNorCutLinesNorEchoes) {
         EXPECT_EQ(reply, row.reply);
     }
     EXPECT_EQ(modem.log.Text(), "");
-}
-
-TEST(Reply, IsCutAt1024BytesAndTheRestIsGoneBeforeTheNextCommand) {
-    const WholeWaits waits;
-    OpenedModem modem;
-    modem.simulator.Fault("1", "long=3000");
-    std::string reply;
-    EXPECT_EQ(modem.record.ModemCmd("AT+CSQ", reply), 0);
-    EXPECT_THAT(reply, testing::StartsWith("+CSQ: 17,99\n^FILL: "));
-    EXPECT_LE(reply.size(), 1024u);
-    EXPECT_GE(reply.size(), 900u);
-    EXPECT_THAT(reply, testing::Not(HasSubstr("OK")));
-    modem.simulator.Fault("1", "off");
-    EXPECT_EQ(modem.record.ModemCmd("AT+CGMM", reply), 0);
-    EXPECT_EQ(reply, "E1752\nOK\n");
-}
-
-// The PINs and PUKs of the tests below.
-bool HasSecret(const std::string& text) {
-    const char* const kSecrets[] = {"1357", "3-57", "2468", "98765432"};
-    return std::any_of(std::begin(kSecrets), std::end(kSecrets), [&text](const char* secret) {
-        return text.find(secret) != std::string::npos;
-    });
-}
-
-TEST(Secrets, AreNotLoggedWhenTheModemIsSilent) {
-    OpenedModem modem;
-    modem.simulator.Unplug("1.1");  // fails as silence does, without its second of waiting
-    std::string reply;
-    for (const char* command :
-         {"AT+CPIN=1357", "AT+CPIN=\"98765432\",\"2468\"", "AT+CPWD=\"SC\",\"1357\",\"2468\"",
-          "AT+CLCK=\"SC\",1,\"1357\"", "AT+CSQ;+cpin=1357"}) {
-        EXPECT_EQ(modem.record.ModemCmd(command, reply), -1);
-    }
-    EXPECT_EQ(modem.log.Count("No respond on modem cmd "), 5) << modem.log.Text();
-    EXPECT_EQ(modem.log.Count("***"), 5);
-    EXPECT_FALSE(HasSecret(modem.log.Text())) << modem.log.Text();
-}
-
-TEST(Secrets, AreNotLoggedWhenTheModemRepeatsThemDamaged) {
-    OpenedModem modem("generic,pin=1357,attempts=9");
-    modem.simulator.Fault("1", "noecho");
-    for (const char* echo : {"AT+CPIN1357", "1357\"", "AT+CPIN13-57"}) {
-        SCOPED_TRACE(echo);
-        modem.log.Clear();
-        modem.simulator.ReplyOnce("1", "AT+CPIN=*",
-                                  std::string(echo) + "\r\r\n" + Framed({"+CMS ERROR: 303"}));
-        EXPECT_EQ(modem.record.PINUnlock("1357"), -2);
-        EXPECT_TRUE(modem.log.Has("+CMS ERROR: 303"));
-        EXPECT_FALSE(HasSecret(modem.log.Text())) << modem.log.Text();
-    }
 }
 
 TEST(TestDialogue, PrintsTheReplyOrWhatFailedAndClosesThePort) {
@@ -266,24 +183,6 @@ TEST(Babble, ThatACommandSetsOffIsCutOffInItsReply) {
     std::string reply;
     EXPECT_TRUE(EndsWithin(8, [&] { EXPECT_EQ(modem.record.ModemCmd("AT+CSQ", reply), 0); }));
     EXPECT_TRUE(IsUnlocked());
-}
-
-TEST(Unplugging, BetweenCommandsFailsThemQuicklyUntilThePortIsOpenedAnew) {
-    OpenedModem modem;
-    std::string reply;
-    modem.simulator.Unplug("1");
-    EXPECT_TRUE(IsQuick([&] {
-        for (int i = 0; i < 2; ++i) {
-            EXPECT_EQ(modem.record.ModemCmd("AT+CSQ", reply), -1);
-        }
-    }));
-    EXPECT_EQ(modem.log.Count("No respond on modem cmd AT+CSQ"), 2) << modem.log.Text();
-    EXPECT_TRUE(IsUnlocked());
-    modem.simulator.Plug("1");
-    EXPECT_EQ(modem.record.ModemCmd("AT+CSQ", reply), -1);  // the old channel stays dead
-    modem.record.CloseFileDevice();
-    ASSERT_EQ(modem.record.OpenFileDevice(kQueryPort), 0);
-    EXPECT_EQ(modem.record.ModemCmd("AT+CSQ", reply), 0);
 }
 
 TEST(Unplugging, WithinAReplyEndsIt) {
@@ -340,6 +239,34 @@ TEST(TwoProcesses, NeverGetEachOthersReplies) {
         EXPECT_EQ(status, 0) << "wrong replies: " << WEXITSTATUS(status);
     }
     EXPECT_EQ(modem.Received().size(), 2u * kCommands);
+}
+
+constexpr unsigned int kKey = 7;  // the appliance root has semaphores of its own
+
+TEST(Semaphore, IsOneSetOfOneSemaphoreWithValueOneForEverybody) {
+    umask(077);  // permissions do not depend on who comes first
+    int first = -1;
+    int second = -1;
+    EXPECT_EQ(Semaphore(kKey).Get(&first), 0);
+    EXPECT_EQ(Semaphore(kKey).Get(&second), 0);
+    EXPECT_EQ(first, second);
+    EXPECT_EQ(first, semget(kKey, 1, 0));
+    semid_ds description{};
+    ASSERT_EQ(semctl(first, 0, IPC_STAT, &description), 0);
+    EXPECT_EQ(description.sem_nsems, 1u);
+    EXPECT_EQ(description.sem_perm.mode & 0777, 0666);
+    EXPECT_EQ(semctl(first, 0, GETVAL), 1);
+}
+
+TEST(Semaphore, IsNotWaitedForForEver) {
+    ASSERT_EQ(Semaphore(kKey).Enter(), 0);
+    LogCapture log;
+    const auto begin = std::chrono::steady_clock::now();
+    EXPECT_EQ(Semaphore(kKey).Enter(), -1);
+    const auto waited = std::chrono::steady_clock::now() - begin;
+    EXPECT_TRUE(log.Has(" errno " + std::to_string(EAGAIN))) << log.Text();
+    EXPECT_GE(waited, std::chrono::seconds(4));  // an exchange that takes its time
+    EXPECT_LT(waited, std::chrono::seconds(15));
 }
 
 }  // namespace

@@ -1,9 +1,7 @@
 // The list: which files are modems, what an update does with them, and its records: copies, and what
 // they keep while the list grows and shrinks.
 #include <sys/resource.h>
-#include <sys/stat.h>
 #include <taviwireless/usbmodem_list.h>
-#include <unistd.h>
 
 #include <filesystem>
 #include <type_traits>
@@ -26,31 +24,6 @@ std::vector<std::string> DevIds(USBModemList& list) {
         ids.push_back(modem.GetDevId());
     }
     return ids;
-}
-
-TEST(Search, TakesExactlyTheNamesOfInfoFiles) {
-    for (const std::string name :
-         {"usbmodem.info0", "usbmodem.info12", "usbmodem.info-5",
-          // And these are none:
-          "usbmodem.info", "usbmodem.info01", "usbmodem.info-1", "usbmodem.info4.bak",
-          "usbmodem.info4294967295", "usbmodem.info8\n", "xusbmodem.info10"}) {
-        WriteFile("/tmp/" + name, "CONNECTNODE=0\n");
-    }
-    MakeDirectories("/tmp/usbmodem.info13");
-    USBModemList list;
-    EXPECT_EQ(list.SearchInfoPath(), 0);
-    EXPECT_THAT(DevIds(list),
-                testing::UnorderedElementsAre("usbmodem0", "usbmodem12", "usbmodem4294967291"));
-}
-
-TEST(Search, DropsWhatIsALinkNow) {
-    WriteFile(kInfo1, "CONNECTNODE=0\nDEVICENODE=0,1\n");
-    USBModemList list;
-    ASSERT_EQ(list.SearchInfoPath(), 0);
-    Shell("mv /tmp/usbmodem.info1 /tmp/elsewhere; ln -s elsewhere /tmp/usbmodem.info1");
-    EXPECT_EQ(list.FindUSBModem(1).AssignConnectNode(), -1);
-    list.DropUnplugged();
-    EXPECT_THAT(DevIds(list), IsEmpty());
 }
 
 TEST(Search, ThatFailsDropsNothing) {
@@ -78,18 +51,6 @@ struct TwoModems {
     USBModemList list;
 };
 
-TEST(Update, InitialisesEachNewModemOnce) {
-    TwoModems modems;
-    EXPECT_EQ(modems.list.Update(), 0);
-    EXPECT_TRUE(modems.list.FindUSBModem(1).IsInited());
-    EXPECT_TRUE(modems.list.FindUSBModem(2).IsInited());
-    EXPECT_THAT(modems.simulator.Received("1"), testing::Not(IsEmpty()));
-    EXPECT_THAT(modems.simulator.Received("2"), testing::Not(IsEmpty()));
-    EXPECT_EQ(modems.list.Update(), 0);
-    EXPECT_THAT(modems.simulator.Received("1"), IsEmpty());
-    EXPECT_THAT(modems.simulator.Received("2"), IsEmpty());
-}
-
 TEST(Update, StopsAtTheFirstModemThatCannotBeInitialised) {
     TwoModems modems;
     WriteFile(kInfo1, "USB_ID_VENDOR=ffff\nCONNECTNODE=0\nDEVICENODE=0\n");
@@ -102,21 +63,6 @@ TEST(Update, StopsAtTheFirstModemThatCannotBeInitialised) {
     EXPECT_EQ(modems.list.Update(), 0);
     EXPECT_THAT(DevIds(modems.list), ElementsAre("usbmodem2"));
     EXPECT_TRUE(modems.list.FindUSBModem(2).IsInited());
-}
-
-TEST(Update, DropsOneOfTwoNeighboursThatAreGoneAndTheOtherTheNextTime) {
-    for (const std::string id : {"1", "2"}) {
-        WriteFile("/tmp/usbmodem.info" + id, "");
-    }
-    USBModemList list;
-    ASSERT_EQ(list.SearchInfoPath(), 0);
-    std::filesystem::remove(kInfo1);
-    std::filesystem::remove("/tmp/usbmodem.info2");
-    list.Update();  // which finds no ports of the one that stays
-    EXPECT_THAT(DevIds(list), ElementsAre("usbmodem2"));
-    EXPECT_FALSE(list.FindUSBModem(2).IsInfoExist());
-    EXPECT_EQ(list.Update(), 0);
-    EXPECT_THAT(DevIds(list), IsEmpty());
 }
 
 // A vector that grows moves its elements only if that cannot fail.
@@ -150,23 +96,6 @@ TEST(Copy, HasTheStateAndOnlyAnAssignedOneTheNames) {
         EXPECT_TRUE(record->IsPINReady(err));
         EXPECT_EQ(record->GetVendorName(err), record == &copy ? "" : "Generic");
     }
-}
-
-TEST(Copy, SharesTheChannelUntilTheLastOneIsGone) {
-    OpenedModem modem("generic");
-    const auto open = OpenDescriptors();
-    {
-        USBModem copy(modem.record);
-        USBModem assigned(2, "/tmp/usbmodem.info2");
-        assigned = copy;
-        copy.CloseFileDevice();
-        EXPECT_EQ(AskFor(assigned, "AT+CGMI"), "Generic\nOK\n");
-    }
-    USBModem last(std::move(modem.record));
-    EXPECT_EQ(OpenDescriptors(), open);
-    EXPECT_EQ(AskFor(last, "AT+CGMI"), "Generic\nOK\n");
-    last.CloseFileDevice();
-    EXPECT_EQ(OpenDescriptors().size(), open.size() - 1);
 }
 
 TEST(List, KeepsChannelsAndNamesOfItsRecordsWhileItGrowsAndShrinks) {

@@ -9,12 +9,12 @@
 namespace taviwireless::test {
 namespace {
 
+constexpr char kOperators[] = "/usr/tavi/etc/usbmodem/wcdma_list.json";
 constexpr char kDirectory[] = "/var/lib/usbmodem";
 constexpr char kProfile[] = "/var/lib/usbmodem/usbmodem.profile.262019876543210";
 
 struct ReadyModem : OpenedModem {
-    explicit ReadyModem(const std::string& settings = "")
-        : OpenedModem("generic,imsi=262019876543210,operator=Nordnetz" + settings) {
+    ReadyModem() : OpenedModem("generic,imsi=262019876543210,operator=Nordnetz") {
         record.UpdateSIMStatus();
         Received();
         log.Clear();
@@ -22,8 +22,7 @@ struct ReadyModem : OpenedModem {
 };
 
 TEST(Profile, OfANewSIMHoldsTheDefaultsOfTheModem) {
-    WriteFile("/usr/tavi/etc/usbmodem/wcdma_list.json",
-              R"([{"id": "Germany", "isp": [{"name": "Nordnetz"}]}])");
+    WriteFile(kOperators, R"([{"id": "Germany", "isp": [{"name": "Nordnetz"}]}])");
     ReadyModem modem;
     bool err = false;
     EXPECT_EQ(modem.record.GetProfilePhone(err), "*99#");
@@ -48,23 +47,6 @@ TEST(Profile, TwoSIMsNeverTouchEachOthersFile) {
     EXPECT_EQ(ReadFile(kProfile), first);
     bool err = false;
     EXPECT_EQ(modem.record.GetProfileIMSI(err), "208011234567890");
-}
-
-TEST(Profile, WithoutAUsableSIMThereIsNone) {
-    for (const std::string sim : {"busy", "absent"}) {
-        ReadyModem modem(",sim=" + sim);
-        bool err = false;
-        EXPECT_EQ(modem.record.GetProfilePhone(err), "");
-        EXPECT_FALSE(err);
-        EXPECT_EQ(modem.log.Text(), "");
-        EXPECT_EQ(modem.record.SetProfilePhone("1"), -1);
-        EXPECT_TRUE(modem.log.Has("failed on init profile"));
-    }
-    OpenedModem unknown;  // its SIM status was never asked
-    bool err = false;
-    EXPECT_EQ(unknown.record.GetProfilePhone(err), "");
-    EXPECT_TRUE(err);
-    EXPECT_TRUE(unknown.log.Has("sim status is busy or error, cannot get key number"));
 }
 
 TEST(Profile, ThatCannotBeWrittenStaysAsItWasAndALaterResetWorks) {
@@ -92,6 +74,38 @@ TEST(Profile, ThatCannotBeWrittenStaysAsItWasAndALaterResetWorks) {
     bool err = false;
     EXPECT_EQ(modem.record.GetProfilePhone(err), "*99#");
     EXPECT_FALSE(err);
+}
+
+TEST(Location, IsTheFirstThatListsTheOperatorInADatabaseThatCanBeRead) {
+    const struct {
+        std::string database;
+        const char* id;  // null: it cannot be read
+    } kDatabases[] = {
+        {R"([{"id":"A","isp":[{"name":"Other"},{"name":"Nordnetz"}]},
+             {"id":"B","isp":[{"name":"Nordnetz"}]}])",
+         "A"},
+        {"[{", nullptr},
+        {"", nullptr},
+        {std::string(2000, '['), nullptr},
+        {R"([7, null, [], {"isp":[{"name":"Nordnetz"}]}, {"id":"no isp"},
+             {"id":"isp is text","isp":"Nordnetz"},
+             {"id":{"an":"object"},"isp":[{"name":"Nordnetz"}]},
+             {"id":"odd members","isp":[1, [], {}, {"name":{}}, {"nom":"Nordnetz"}]},
+             {"id":5,"isp":[{"name":"Nordnetz","mcc":"001"}],"other":true}])",
+         "5"},
+    };
+    ReadyModem modem;
+    for (const auto& row : kDatabases) {
+        SCOPED_TRACE(row.database.substr(0, 100));
+        modem.log.Clear();
+        WriteFile(kOperators, row.database);
+        bool err = row.id != nullptr;  // a lookup that was made takes it back
+        EXPECT_EQ(modem.record.GetDefaultLocation(err), row.id ? row.id : "");
+        EXPECT_EQ(err, row.id == nullptr);
+        EXPECT_EQ(modem.log.Has(std::string("Failed to parse json file [") + kOperators + "]"),
+                  err);
+        EXPECT_EQ(modem.log.Has("Failed to read APN data"), err);
+    }
 }
 
 }  // namespace
