@@ -2,9 +2,7 @@
 #include <taviwireless/usbmodem_client.h>
 
 #include <algorithm>
-#include <chrono>
 #include <future>
-#include <thread>
 
 #include "tests/support/bus.h"
 #include "tests/support/files.h"
@@ -23,33 +21,6 @@ std::vector<std::string> WithQuietWaits() {
 struct RunningService : ServedModems {
     RunningService() : ServedModems("12d1,ports=dial/at") {}
 };
-
-TEST(Survival, AModemThatVanishesWithinACall) {
-    RunningService running;
-    running.simulator.Fault("0", "vanish=5");
-    const RunResult vanished = CallService({"GetUSBModem", "usbmodem0"});
-    EXPECT_THAT(vanished.out, HasSubstr("\"id\": \"usbmodem0\"")) << vanished.err;
-    EXPECT_TRUE(running.service.Lists({}));
-    EXPECT_THAT(CallService({"GetUSBModem", "usbmodem0"}).err, HasSubstr("not found"));
-    running.simulator.Fault("0", "off");
-    running.simulator.Plug("0");
-    EXPECT_TRUE(running.service.Lists({"usbmodem0"}));
-}
-
-TEST(Survival, AModemThatBabblesFromTheStartKeepsNobodyWaiting) {
-    PrivateBus bus;
-    ModemSimulator simulator(
-        {"--modem", "generic,ports=dial/at,fault=babble", "--modem", "12d1,ports=dial/at"});
-    ModemService service(WithQuietWaits());
-    EXPECT_TRUE(service.Lists({"usbmodem1"}));
-    const auto end = std::chrono::steady_clock::now() + std::chrono::seconds(2);
-    while (std::chrono::steady_clock::now() < end) {
-        const auto begin = std::chrono::steady_clock::now();
-        EXPECT_EQ(CallService({"GetUSBModemList"}).status, 0);
-        EXPECT_LT(std::chrono::steady_clock::now() - begin, std::chrono::seconds(5));
-        std::this_thread::sleep_for(std::chrono::milliseconds(200));
-    }
-}
 
 TEST(Survival, AModemThatBeginsToBabbleIsOutOfServiceUntilItIsQuiet) {
     ServedModems served("generic,ports=dial/at", WithQuietWaits());

@@ -2,13 +2,11 @@
 #include <gmock/gmock.h>
 #include <sys/socket.h>
 #include <sys/un.h>
-#include <sys/wait.h>
 #include <taviwireless/usbmodem_client.h>
 
 #include <filesystem>
 #include <iterator>
 #include <sstream>
-#include <thread>
 
 #include "base/unique_fd.h"
 #include "tests/support/bus.h"
@@ -19,7 +17,6 @@ namespace taviwireless::test {
 namespace {
 
 using testing::HasSubstr;
-using testing::IsEmpty;
 using testing::StartsWith;
 
 RunResult Usbmodemd(const std::vector<std::string>& arguments) {
@@ -54,39 +51,6 @@ TEST(Usbmodemd, SaysWhyItCannotServe) {
     const RunResult second = Usbmodemd({"--foreground"});
     EXPECT_EQ(second.status, 1);
     EXPECT_THAT(second.err, HasSubstr("com.merilond.usbmodem is served by another process"));
-}
-
-TEST(Usbmodemd, IntrospectionListsTheTenMethodsAndTheirArguments) {
-    PrivateBus bus;
-    ModemService service;
-    const RunResult interfaces =
-        RunProgram({"gdbus", "introspect", "--session", "-d", "com.merilond.usbmodem", "-o", "/"});
-    EXPECT_THAT(interfaces.out, HasSubstr(R"(
-  interface com.merilond.usbmodem {
-    methods:
-      GetUSBModemIfList(out s usbmodem_if_list);
-      UnlockPIN(in  s devid,
-                in  s puk,
-                in  s pin);
-      SetProfile(in  s devid,
-                 in  s profile);
-      GetProfile(in  s devid,
-                 out s profile);
-      SetPIN(in  s devid,
-             in  s oldpin,
-             in  s newpin,
-             in  b protection);
-      UnlockSIM(in  s devid,
-                in  s pin);
-      GetUSBModem(in  s devid,
-                  out s usbmodem);
-      GetUSBModemList(out s usbmodem_list);
-      Disconnect(in  s devid);
-      Connect(in  s devid);
-    signals:
-    properties:
-  };
-)"));
 }
 
 TEST(Usbmodemd, FollowsPluggingAndUnplugging) {

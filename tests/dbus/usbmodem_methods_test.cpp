@@ -169,26 +169,6 @@ TEST(Methods, ListTheModemsThatAreReady) {
     EXPECT_EQ(unknown.code, -1);
 }
 
-TEST(Methods, ReportWhatTheModemSaysToPINAndPUK) {
-    ReadyService service(",pin=1234,attempts=1,puk=12345678");
-    const Outcome wrong = service.Do(usbmodem_unlock_sim, "usbmodem0", "9999");
-    EXPECT_EQ(wrong.text, "Failed to unlock PIN [usbmodem0]");
-    EXPECT_EQ(wrong.code, 2);
-    const Outcome wrongPUK = service.Do(usbmodem_unlock_pin, "usbmodem0", "87654321", "4321");
-    EXPECT_EQ(wrongPUK.text, "Failed to unlock PIN [usbmodem0]");
-    EXPECT_EQ(wrongPUK.code, 2);
-    EXPECT_TRUE(service.Do(usbmodem_unlock_pin, "usbmodem0", "12345678", "4321").isDone);
-    EXPECT_TRUE(service.SetPIN("4321", "1111", TRUE).isDone);
-    EXPECT_TRUE(service.SetPIN("1111", "", FALSE).isDone);
-    service.simulator.Unplug("0.1");  // fails as silence does, without its second of waiting
-    const Outcome silent = service.SetPIN("1111", "", TRUE);
-    EXPECT_EQ(silent.text, "Failed to set PIN [usbmodem0]");
-    EXPECT_EQ(silent.code, 1);
-    for (const char* secret : {"9999", "87654321", "12345678", "4321", "1111"}) {
-        EXPECT_FALSE(service.log.Has(secret)) << service.log.Text();
-    }
-}
-
 TEST(SetProfile, TakesTheFirstKeyOfEachLineWhereverItStands) {
     ReadyService service;
     const struct {
