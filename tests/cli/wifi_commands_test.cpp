@@ -33,7 +33,7 @@ struct WifiCommands : testing::Test {
                    {ScanLine(1, "Open\033[2J", "00:11:22:33:44:55", 30, "11b/g", "NONE") +
                     ScanLine(6, "My Home", "00:11:22:33:44:aa", 76, "11b/g/n", "WPA2PSK/AES") +
                     ScanLine(11, "Old", "00:11:22:33:44:66", 5, "11b", "WEP") +
-                    ScanLine(11, "Work", "00:11:22:33:44:77", 50, "11a/n", "WPA2EAP/AES")});
+                    ScanLine(11, "B\u00FCro", "00:11:22:33:44:77", 50, "11a/n", "WPA2EAP/AES")});
         tools.Add("/usr/sbin/wpa_supplicant",
                   "if grep -Eq 'right key|NONE' /usr/tavi/etc/wpa_supplicant.conf; then\n"
                   "touch /tmp/associated; fi");
@@ -56,7 +56,7 @@ TEST_F(WifiCommands, AScanIsSortedBySignalAndSteersNoTerminal) {
     EXPECT_EQ(scan.out,
               "NETWORK   SIGNAL      SECURITY     CHANNEL  BSSID\n"
               "My Home   [####] 76%  WPA2PSK/AES  6        00:11:22:33:44:AA\n"
-              "Work      [##--] 50%  WPA2EAP/AES  11       00:11:22:33:44:77\n"
+              "B\u00FCro      [##--] 50%  WPA2EAP/AES  11       00:11:22:33:44:77\n"
               "Open?[2J  [##--] 30%  open         1        00:11:22:33:44:55\n"
               "Old       [#---] 5%   WEP          11       00:11:22:33:44:66\n")
         << scan.err;
@@ -142,7 +142,7 @@ TEST_F(WifiCommands, FailuresAreOneSentenceAndAnExitStatus) {
         {{"connect", "My Home"}, std::string(64, 'k') + "\n", kUsage, "a WPA key has 8 to 63"},
         {{"connect", "My Home"}, "", kFailure, "standard input ended before"},
         {{"connect", "Old"}, "123456789x\n", kUsage, "a WEP key has 5 or 13 characters, or 10"},
-        {{"connect", "Work"}, "", kUsage, "Work wants a user name; add --user NAME"},
+        {{"connect", "B\u00FCro"}, "", kUsage, "B\u00FCro wants a user name; add --user NAME"},
         {{"connect", "a\rb"}, "", kUsage, "the name of a network may not hold a line break"},
         {{"connect", std::string(33, 'n')}, "", kUsage, "the name of a network has 1 to 32 bytes"},
         {{"connect", "X", "--static", "1.2.3.4/33"}, "", kUsage, "1.2.3.4/33 is no address"},
