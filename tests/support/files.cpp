@@ -18,13 +18,6 @@ namespace {
     throw std::system_error(errno, std::generic_category(), what);
 }
 
-void Write(const std::string& path, const std::string& text, std::ios::openmode mode) {
-    std::ofstream file(path, mode | std::ios::binary);
-    if (!file || !file.write(text.data(), text.size()) || !file.flush()) {
-        Fail("Cannot write " + path);
-    }
-}
-
 }  // namespace
 
 void WriteFile(const std::string& path, const std::string& text) {
@@ -36,17 +29,16 @@ void WriteFile(const std::string& path, const std::string& text) {
     if (access(path.c_str(), W_OK) != 0 && errno == EACCES) {
         std::filesystem::remove(path);
     }
-    Write(path, text, std::ios::trunc);
+    std::ofstream file(path, std::ios::binary);
+    if (!file || !file.write(text.data(), text.size()) || !file.flush()) {
+        Fail("Cannot write " + path);
+    }
 }
 
 void WriteProgram(const std::string& path, const std::string& text) {
     std::filesystem::remove(path);
     WriteFile(path, text);
     chmod(path.c_str(), 0755);
-}
-
-void AppendFile(const std::string& path, const std::string& text) {
-    Write(path, text, std::ios::app);
 }
 
 std::string ReadFile(const std::string& path) {

@@ -16,9 +16,6 @@ void WriteFile(const std::string& path, const std::string& text);
 // others need.
 void WriteProgram(const std::string& path, const std::string& text);
 
-// Appends `text` to `path`; the file is created when it is not there, its directory is not.
-void AppendFile(const std::string& path, const std::string& text);
-
 // The whole content of `path`. Reads up to the end, so files of /proc and /sys work too.
 std::string ReadFile(const std::string& path);
 

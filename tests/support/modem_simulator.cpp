@@ -3,7 +3,6 @@
 #include <json/reader.h>
 #include <json/writer.h>
 
-#include <filesystem>
 #include <sstream>
 #include <stdexcept>
 

@@ -1,6 +1,5 @@
 #include "tests/support/sleep_capture.h"
 
-#include <numeric>
 #include <utility>
 
 namespace taviwireless::test {
@@ -16,10 +15,6 @@ SleepCapture::SleepCapture(Hook atEachSleep) : atEachSleep_(std::move(atEachSlee
 
 SleepCapture::~SleepCapture() {
     capture = nullptr;
-}
-
-unsigned SleepCapture::Total() const {
-    return std::accumulate(calls_.begin(), calls_.end(), 0u);
 }
 
 unsigned SleepCapture::Record(unsigned seconds) {

@@ -26,7 +26,6 @@ class SleepCapture {
     void InterruptNext(unsigned secondsLeft) { leftByNext_ = secondsLeft; }
 
     const std::vector<unsigned>& Calls() const { return calls_; }  // the seconds of each, in order
-    unsigned Total() const;                                        // their sum
 
     unsigned Record(unsigned seconds);  // what sleep() does
 
