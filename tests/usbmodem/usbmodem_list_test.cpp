@@ -26,6 +26,16 @@ std::vector<std::string> DevIds(USBModemList& list) {
     return ids;
 }
 
+TEST(Search, DropsWhatIsALinkNow) {
+    WriteFile(kInfo1, "CONNECTNODE=0\nDEVICENODE=0,1\n");
+    USBModemList list;
+    ASSERT_EQ(list.SearchInfoPath(), 0);
+    Shell("mv /tmp/usbmodem.info1 /tmp/elsewhere; ln -s elsewhere /tmp/usbmodem.info1");
+    EXPECT_EQ(list.FindUSBModem(1).AssignConnectNode(), -1);
+    list.DropUnplugged();
+    EXPECT_THAT(DevIds(list), IsEmpty());
+}
+
 TEST(Search, ThatFailsDropsNothing) {
     LogCapture log;
     WriteFile(kInfo1, "");
