@@ -5,7 +5,6 @@
 
 #include <chrono>
 #include <filesystem>
-#include <stdexcept>
 #include <thread>
 
 #include "base/unique_fd.h"
@@ -27,23 +26,19 @@ class Client {
     static constexpr int kQuiet = 100;      // ms; nothing more comes after that
     static constexpr int kPatience = 5000;  // ms; far above what any reply needs
 
-    explicit Client(int port) : Client("/dev/ttyUSB" + std::to_string(port)) {}
-    explicit Client(const std::string& path) : line_(open(path.c_str(), O_RDWR | O_NOCTTY)) {
-        if (line_.Get() < 0) {
-            throw std::runtime_error("Cannot open " + path);
-        }
+    explicit Client(int port)
+        : line_(open(("/dev/ttyUSB" + std::to_string(port)).c_str(), O_RDWR | O_NOCTTY)) {
+        EXPECT_GE(line_.Get(), 0);
     }
 
     void Write(const std::string& text) {
-        if (write(line_.Get(), text.data(), text.size()) != static_cast<ssize_t>(text.size())) {
-            throw std::runtime_error("The line does not take " + text);
-        }
+        EXPECT_EQ(write(line_.Get(), text.data(), text.size()), static_cast<ssize_t>(text.size()));
     }
 
     // What comes until nothing comes for so long, or the line is hung up.
-    std::string ReadUntilQuiet(int quiet = kQuiet) {
+    std::string ReadUntilQuiet() {
         std::string text;
-        while (ReadMore(quiet, &text)) {
+        while (ReadMore(kQuiet, &text)) {
         }
         return text;
     }
@@ -51,10 +46,6 @@ class Client {
     // Sends the command and returns everything up to the end of its result.
     std::string Ask(const std::string& command) {
         Write(command + "\r");
-        return ReadReply();
-    }
-
-    std::string ReadReply() {
         std::string text;
         while (!EndsReply(text) && ReadMore(kPatience, &text)) {
         }

@@ -66,14 +66,6 @@ int Running(const std::string& name) {
     return std::stoi(RunProgram({"pgrep", "--count", "--exact", name}).out);
 }
 
-// The server asks 10 ms long, not 2 s, whether somebody else has the address.
-void HurryServer() {
-    RunProgram({"sh", "-c",
-                "mkdir /tmp/real && mv /usr/sbin/udhcpd /tmp/real/ && "
-                "printf '#!/bin/sh\\nexec /tmp/real/udhcpd -a 10 \"$@\"\\n' >/usr/sbin/udhcpd && "
-                "chmod 755 /usr/sbin/udhcpd"});
-}
-
 // The server's own files are made of what was written by hand, whatever lay there.
 TEST_F(NetworkProgram, AccessPointHasItsGuestsWhileThatIsSwitchedOn) {
     SaveLocalBridge();
@@ -204,7 +196,11 @@ TEST_F(NetworkProgram, ConfiguredGatewayIsUsedWhereverItStands) {
 
 // The lease is of a real server at the far end of the cable, by the real client.
 TEST_F(NetworkProgram, LeaseOfTheWiredInterfaceBecomesTheBridges) {
-    HurryServer();
+    // The server asks 10 ms long, not 2 s, whether somebody else has the address.
+    Shell(
+        "mkdir /tmp/real && mv /usr/sbin/udhcpd /tmp/real/ && "
+        "printf '#!/bin/sh\\nexec /tmp/real/udhcpd -a 10 \"$@\"\\n' >/usr/sbin/udhcpd && "
+        "chmod 755 /usr/sbin/udhcpd");
     MakeInterface("eth0", "10.9.0.5/16");
     Ip("address add 10.9.0.1/16 dev eth0-far");
     Ip("route add default via 10.9.0.7 dev eth0 metric 100");
