@@ -1,4 +1,5 @@
 #include <gmock/gmock.h>
+#include <sys/stat.h>
 #include <tavicore/error.h>
 #include <tavicore/file.h>
 #include <tavicore/keyvalue.h>
@@ -42,6 +43,7 @@ TEST(SharedFolder, OnlyRegularFilesOfRootOrOneselfCount) {
     WriteFile("/tmp/big", kText + std::string(65536, '\n'));
     WriteFile("/tmp/strange", kText);
     ASSERT_EQ(chown("/tmp/strange", kStranger, kStranger), 0);
+    ASSERT_EQ(mkfifo("/tmp/fifo", 0600), 0);
     ASSERT_EQ(symlink("/etc/target", "/tmp/own-link"), 0);
     ASSERT_EQ(symlink("/etc/target", "/tmp/strange-link"), 0);
     ASSERT_EQ(lchown("/tmp/strange-link", kStranger, kStranger), 0);
@@ -51,7 +53,7 @@ TEST(SharedFolder, OnlyRegularFilesOfRootOrOneselfCount) {
         bool isRead;
     } kRows[] = {{"/tmp/own", true},      {"/tmp/own-link", true},      {"/tmp/big", false},
                  {"/tmp/strange", false}, {"/tmp/strange-link", false}, {"/etc/link", false},
-                 {"/etc/target", true}};
+                 {"/etc/target", true},   {"/tmp/fifo", false}};
     for (const auto& row : kRows) {
         for (const auto& read : Readers()) {
             EXPECT_EQ(read(row.path), row.isRead ? 0 : -1) << row.path;
