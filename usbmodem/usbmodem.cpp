@@ -38,6 +38,7 @@ USBModem::USBModem(const USBModem& other)
       semaphore_(other.semaphore_),
       busy_(other.busy_),
       newPlugIn_(other.newPlugIn_),
+      pinProtection_(other.pinProtection_),
       errorCounter_(other.errorCounter_),
       device_(other.device_),
       atInterface_(other.atInterface_) {}

@@ -22,6 +22,10 @@ constexpr int kUnknownRSSI = 99;
 
 constexpr int kBusy = 2;
 
+bool IsOnScale(int rssi) {
+    return rssi >= kMinRSSI && rssi <= kMaxRSSI;
+}
+
 // Whether one of the operators of a location has this name.
 bool HasOperator(const Json::Value& location, const std::string& name) {
     if (!location["isp"].isArray()) {
@@ -203,12 +207,38 @@ int USBModem::GetSignalQuality(bool& err) {
     if (rssi_ == kUnknownRSSI) {
         rssi_ = 0;
     }
-    if (rssi_ < kMinRSSI || rssi_ > kMaxRSSI) {
+    if (!IsOnScale(rssi_)) {
         TAVI_LOG_ERROR("returned RSSI %d is not in range %d ~ %d", rssi_, kMinRSSI, kMaxRSSI);
         err = true;
         return 0;
     }
     return rssi_ * 100 / kMaxRSSI;
+}
+
+KnownModem USBModem::Known() const {
+    const bool isReady = simStatus_ == SimStatus::kReady;
+    const bool hasSIM =
+        isReady || simStatus_ == SimStatus::kPINRequired || simStatus_ == SimStatus::kPUKRequired;
+    // Both are 0 until they are read. A SIM without an attempt for its PUK is of no use any more.
+    const bool isCounted = hasSIM && (pinAttemptsRemaining_ > 0 || pukAttemptsRemaining_ > 0);
+    const bool isConnected = netStatus_ == NetStatus::kConnected;
+    KnownModem known;
+    known.vendor = vendorName_;
+    known.product = productName_;
+    known.carrier = isReady ? defaultISP_ : "";
+    known.imsi = imsi_;
+    known.signal = isReady && IsOnScale(rssi_) ? rssi_ * 100 / kMaxRSSI : 0;
+    known.simStatus = NameOf(simStatus_);
+    known.isPINProtected = pinProtection_ != 0;
+    known.pinRemains = isCounted ? pinAttemptsRemaining_ : -1;
+    known.pukRemains = isCounted && pukAttemptsRemaining_ > 0 ? pukAttemptsRemaining_ : -1;
+    known.isRoaming = roaming_ == "true";
+    known.netStatus = NameOf(netStatus_);
+    known.interface = isConnected ? netIFName_ : "";
+    known.address = isConnected ? netLocalIP_ : "";
+    known.connectNode = connectNode_;
+    known.queryNode = queryNode_;
+    return known;
 }
 
 int USBModem::SetHardwareFuncLvl(const std::string& level) {

@@ -107,12 +107,13 @@ int USBModem::GetPINEnable() {
         return -1;
     }
     if (Contains(reply, "+CLCK: 1")) {
-        return 1;
+        pinProtection_ = 1;
+    } else if (Contains(reply, "+CLCK: 0")) {
+        pinProtection_ = 0;
+    } else {
+        pinProtection_ = Contains(reply, "+CME ERROR: SIM PIN required") ? 1 : -1;
     }
-    if (Contains(reply, "+CLCK: 0")) {
-        return 0;
-    }
-    return Contains(reply, "+CME ERROR: SIM PIN required") ? 1 : -1;
+    return pinProtection_;
 }
 
 int USBModem::PINGetEnableProtection() {
@@ -138,9 +139,13 @@ int USBModem::ChangePINEnable(const std::string& pin, bool enable) {
     if ((current == 1) == enable) {
         return 0;
     }
-    return Send(*this, CommandSet(),
-                CommandSet().GetATCommandChangePINEnable(enable ? "1" : "0", pin), {pin},
-                "enable pin protection", "enable PIN protection");
+    const int result =
+        Send(*this, CommandSet(), CommandSet().GetATCommandChangePINEnable(enable ? "1" : "0", pin),
+             {pin}, "enable pin protection", "enable PIN protection");
+    if (result == 0) {
+        pinProtection_ = enable ? 1 : 0;
+    }
+    return result;
 }
 
 int USBModem::ChangePIN(const std::string& oldPin, const std::string& newPin) {

@@ -24,6 +24,27 @@ class USBModem_ATIF;
 enum class SimStatus : int;
 enum class NetStatus : int;
 
+// What is known of a modem without asking it: the last good answer to every question, and what the
+// last look at its link found. Texts are as the modem gave them, perhaps with blanks in front and
+// not UTF-8; empty: not known.
+struct KnownModem {
+    std::string vendor;
+    std::string product;
+    std::string carrier;  // empty while the SIM is not ready
+    std::string imsi;
+    int signal = 0;              // percent; 0 also while it is not known
+    std::string simStatus;       // as GetPINStatus names it
+    bool isPINProtected = true;  // true also when that cannot be told
+    int pinRemains = -1;         // attempts left for the PIN and the PUK, -1: not known
+    int pukRemains = -1;
+    bool isRoaming = false;
+    std::string netStatus;  // as GetNetStatus names it
+    std::string interface;  // network interface and IPv4 address; empty unless connected
+    std::string address;
+    std::string connectNode;  // device paths of the dial port and the query port
+    std::string queryNode;
+};
+
 // One plugged-in USB 3G modem: what its info file says, its serial channel and command set, and the
 // last good answer to everything that was asked.
 //
@@ -84,6 +105,8 @@ class TAVIWIRELESS_API USBModem {
     int IncreaseErrorCounter();
     // Whether a dialler has the modem; see "busy" above.
     bool IsUSBModemBusy();
+    // All that the queries below last gave. Sends nothing, and looks at no file and no link.
+    KnownModem Known() const;
     // True until SetNotNewPlugIn, PINSet, PINUnlock, ChangePINWithPUK, PUKSet, NetConnect or
     // NetDisconnect, whether these succeed or not.
     bool IsNewPlugIn();
@@ -408,6 +431,7 @@ class TAVIWIRELESS_API USBModem {
     semaphore::Semaphore semaphore_;
     bool busy_ = false;
     bool newPlugIn_ = true;
+    signed char pinProtection_ = -1;  // the last result of GetPINEnable; was padding once
     int errorCounter_ = 0;
     std::shared_ptr<WvModem> device_;
     std::shared_ptr<USBModem_ATIF> atInterface_;
