@@ -36,6 +36,9 @@ function(tavi_install_configured file folder)
 endfunction()
 tavi_install_configured(taviwireless.pc ${CMAKE_INSTALL_LIBDIR}/pkgconfig)
 tavi_install_configured(com.merilond.usbmodem.service share/dbus-1/services)
+tavi_install_configured(com.merilond.usbmodem.Objects.service share/dbus-1/services)
+install(FILES daemon/modem_objects.xml DESTINATION share/dbus-1/interfaces
+        RENAME com.merilond.usbmodem.Objects.xml)
 tavi_install_configured(usbmodemd.service lib/systemd/user)
 install(FILES packaging/taviwireless.tmpfiles.conf DESTINATION lib/tmpfiles.d
         RENAME taviwireless.conf)

@@ -4,6 +4,7 @@
 #include <unistd.h>
 
 #include <algorithm>
+#include <utility>
 
 #include "daemon/semaphore_sets.h"
 #include "usbmodem/rules/paths.h"
@@ -44,8 +45,9 @@ USBModem NewRecord(int interfaceId) {
 
 }  // namespace
 
-Initialisation::Initialisation(usbmodem_lib::USBModemList& list, int interfaceId)
-    : list_(list), interfaceId_(interfaceId), pause_(kFirstPause) {
+Initialisation::Initialisation(usbmodem_lib::USBModemList& list, int interfaceId,
+                               std::function<void()> onReady)
+    : list_(list), interfaceId_(interfaceId), onReady_(std::move(onReady)), pause_(kFirstPause) {
     list_.FindUSBModem(interfaceId_) = NewRecord(interfaceId_);
     Try();
 }
@@ -68,6 +70,8 @@ void Initialisation::Probed(const std::string& queryNode) {
         RemovePrivateSemaphoreSets(getpid());
         if (isReady) {
             syslog(LOG_INFO, "usbmodem%d is ready", interfaceId_);
+            const auto onReady = onReady_;
+            onReady();  // which may drop the modem, and this with it
             return;
         }
         modem = NewRecord(interfaceId_);

@@ -4,6 +4,7 @@
 #include <glib.h>
 #include <taviwireless/usbmodem_list.h>
 
+#include <functional>
 #include <optional>
 #include <string>
 
@@ -16,8 +17,10 @@ namespace taviwireless::daemon {
 // which knows the connection that another process may have dialled.
 class Initialisation {
   public:
-    // Starts. The modem is looked up in list whenever something is done with it.
-    Initialisation(usbmodem_lib::USBModemList& list, int interfaceId);
+    // Starts. The modem is looked up in list whenever something is done with it. Calls back once
+    // it is ready.
+    Initialisation(usbmodem_lib::USBModemList& list, int interfaceId,
+                   std::function<void()> onReady);
     ~Initialisation();
     Initialisation(const Initialisation&) = delete;
     Initialisation& operator=(const Initialisation&) = delete;
@@ -28,6 +31,7 @@ class Initialisation {
 
     usbmodem_lib::USBModemList& list_;
     int interfaceId_;
+    std::function<void()> onReady_;
     guint pause_;  // seconds, before the next try
     guint retry_ = 0;
     std::optional<Probe> probe_;

@@ -2,6 +2,7 @@
 #include <fcntl.h>
 #include <glib-unix.h>
 #include <syslog.h>
+#include <taviwireless/usbmodem_client.h>
 #include <taviwireless/usbmodem_server.h>
 #include <unistd.h>
 
@@ -13,10 +14,8 @@
 #include <string>
 
 #include "daemon/background.h"
-#include "daemon/info_file_watch.h"
-#include "daemon/modem_keeper.h"
 #include "daemon/probe.h"
-#include "daemon/semaphore_sets.h"
+#include "daemon/served_modems.h"
 #include "daemon/session_bus.h"
 #include "daemon/watchdog.h"
 #include "dbus/usbmodem_service.h"
@@ -29,11 +28,13 @@ namespace {
 
 constexpr char kName[] = "usbmodemd";
 constexpr char kBusLost[] = "the session bus has gone away; ending";
+constexpr char kIsServed[] = " is served by another process already; end that first";
 constexpr int kUsageError = 2;
 constexpr guint kLookPause = 5;  // seconds between looks at the modems
 
 constexpr char kDescription[] =
     "Serves the USB modems that are plugged in as com.merilond.usbmodem on the session bus.\n"
+    "What is known of them, and its changes, are objects of com.merilond.usbmodem.Objects.\n"
     "A modem is plugged in while there is an info file \"/tmp/usbmodem.info\" and a number.\n"
     "taviwireless modem shows what it serves; SIGTERM ends it, connections stay up.\n"
     "\n"
@@ -42,6 +43,7 @@ constexpr char kDescription[] =
 struct Options {
     gboolean foreground = FALSE;
     gboolean version = FALSE;
+    gint refresh = 30;  // seconds
     gint probe = -1;
     gboolean isProbe = FALSE;
 };
@@ -59,6 +61,9 @@ bool ParseOptions(int argc, char** argv) {
     const GOptionEntry entries[] = {
         {"foreground", 'f', 0, G_OPTION_ARG_NONE, &options.foreground,
          "Stay in the foreground and log to standard error as well", nullptr},
+        {"refresh", 0, 0, G_OPTION_ARG_INT, &options.refresh,
+         "Pause between looks at a modem while somebody listens, 30 if not given; 0: never look",
+         "SECONDS"},
         {"version", 0, 0, G_OPTION_ARG_NONE, &options.version, "Show the version", nullptr},
         {"probe", 0, G_OPTION_FLAG_HIDDEN, G_OPTION_ARG_CALLBACK,
          reinterpret_cast<gpointer>(TakeProbe), nullptr, nullptr},
@@ -74,6 +79,9 @@ bool ParseOptions(int argc, char** argv) {
     } else if (argc > 1) {
         fprintf(stderr, "%s: there are no arguments such as %s; see %s --help\n", kName, argv[1],
                 kName);
+        isRight = false;
+    } else if (options.refresh < 0) {
+        fprintf(stderr, "%s: the pause of --refresh is not below 0; see %s --help\n", kName, kName);
         isRight = false;
     }
     g_option_context_free(context);
@@ -107,8 +115,7 @@ void TakeName(USBModemServer& server, const SessionBus& bus) {
     }
     const char* self = server.GetConnectionName();
     if (self == nullptr || owner != self) {
-        throw std::runtime_error(std::string(kUSBModemService) +
-                                 " is served by another process already; end that first");
+        throw std::runtime_error(std::string(kUSBModemService) + kIsServed);
     }
 }
 
@@ -118,8 +125,8 @@ gboolean End(gpointer server) {
     return G_SOURCE_CONTINUE;
 }
 
-gboolean LookAfterModems(gpointer keeper) {
-    static_cast<ModemKeeper*>(keeper)->LookAfterModems();
+gboolean FindDeadPorts(gpointer modems) {
+    static_cast<ServedModems*>(modems)->FindDeadPorts();
     return G_SOURCE_CONTINUE;
 }
 
@@ -127,33 +134,31 @@ gboolean LookAfterModems(gpointer keeper) {
 int Serve(std::optional<Background>& background) {
     int status = EXIT_SUCCESS;
     USBModemServer* running = nullptr;
-    ModemKeeper* modems = nullptr;
-    SessionBus bus(
-        [&] {
-            RemovePrivateSemaphoreSets(getpid());
-            modems->LookAfterModems();
-        },
-        [&] {
-            syslog(LOG_ERR, "%s", kBusLost);
-            status = EXIT_FAILURE;
-            running->QuitLoop();
-        });
+    ServedModems* served = nullptr;
+    SessionBus bus([&] { served->LookAtLinks(); },
+                   [&] {
+                       syslog(LOG_ERR, "%s", kBusLost);
+                       status = EXIT_FAILURE;
+                       running->QuitLoop();
+                   });
     USBModemServer server;
     running = &server;
+    if (taviwireless::dbus::USBModemClient().IsServerReady()) {
+        throw std::runtime_error(std::string(kUSBModemService) + kIsServed);
+    }
+    // Whoever finds the service finds the objects, too.
+    ServedModems modems(*server.GetList(), static_cast<unsigned int>(options.refresh));
+    served = &modems;
     TakeName(server, bus);
-    ModemKeeper keeper(*server.GetList());
-    modems = &keeper;
-    InfoFileWatch watch([&keeper] { keeper.Rescan(); });
     for (const int number : {SIGTERM, SIGINT}) {
         g_unix_signal_add(number, End, &server);
     }
-    g_timeout_add_seconds(kLookPause, LookAfterModems, &keeper);
+    g_timeout_add_seconds(kLookPause, FindDeadPorts, &modems);
     FeedWatchdog();
     if (background) {
         background->Ready();
     }
-    ModemKeeper::EndOrphanedConnections();
-    keeper.Rescan();
+    modems.Begin();
     server.StartLoop();
     return status;
 }

@@ -45,9 +45,11 @@ void ModemKeeper::Rescan() {
     for (const int id : InterfaceIds(list_)) {
         Look(id);
     }
+    onChange_();
 }
 
 void ModemKeeper::LookAfterModems() {
+    bool hasChanged = false;
     for (const int id : InterfaceIds(list_)) {
         USBModem& modem = list_.FindUSBModem(id);
         if (!modem.IsInited()) {
@@ -55,11 +57,21 @@ void ModemKeeper::LookAfterModems() {
         }
         if (modem.IsError()) {
             syslog(LOG_WARNING, "usbmodem%d does not answer; out of service", id);
-            modems_[id].initialisation = std::make_unique<Initialisation>(list_, id);
+            Initialise(id);
+            hasChanged = true;
         } else if (!modem.IsPortAlive()) {
             Look(id);
+            hasChanged = true;
         }
     }
+    if (hasChanged) {
+        onChange_();
+    }
+}
+
+void ModemKeeper::Initialise(int interfaceId) {
+    modems_[interfaceId].initialisation =
+        std::make_unique<Initialisation>(list_, interfaceId, onChange_);
 }
 
 void ModemKeeper::Look(int interfaceId) {
@@ -78,7 +90,8 @@ void ModemKeeper::Look(int interfaceId) {
         list_.FindUSBModem(interfaceId).EndConnection();
         modems_.erase(known);
     }
-    modems_[interfaceId] = {*info, std::make_unique<Initialisation>(list_, interfaceId)};
+    modems_[interfaceId].info = *info;
+    Initialise(interfaceId);
 }
 
 // Writing the same text again, or touching the file, changes nothing. What counts are the ports: a

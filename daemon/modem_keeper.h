@@ -3,9 +3,11 @@
 
 #include <taviwireless/usbmodem_list.h>
 
+#include <functional>
 #include <map>
 #include <memory>
 #include <string>
+#include <utility>
 
 #include "daemon/initialisation.h"
 
@@ -15,8 +17,11 @@ namespace taviwireless::daemon {
 // modems one behind the other and stops at the first that fails, for as long as that takes.
 class ModemKeeper {
   public:
-    // list is borrowed, and touched from the main loop only.
-    explicit ModemKeeper(usbmodem_lib::USBModemList& list) : list_(list) {}
+    // list is borrowed, and touched from the main loop only. Calls back when modems came, went, or
+    // are ready.
+    explicit ModemKeeper(
+        usbmodem_lib::USBModemList& list, std::function<void()> onChange = [] {})
+        : list_(list), onChange_(std::move(onChange)) {}
 
     // Ends the connections of modems that were unplugged while no service ran.
     static void EndOrphanedConnections();
@@ -37,10 +42,12 @@ class ModemKeeper {
     };
 
     void Look(int interfaceId);
+    void Initialise(int interfaceId);
     bool IsSame(const Modem& known, const std::string& info, int interfaceId);
     void Drop(int interfaceId);
 
     usbmodem_lib::USBModemList& list_;
+    std::function<void()> onChange_;
     std::map<int, Modem> modems_;
 };
 

@@ -12,10 +12,6 @@ namespace {
 namespace profile = usbmodem_lib::profile;
 using usbmodem_lib::USBModem;
 
-// A modem that answers begins to do so long before this time is over; one that does not answer
-// costs more.
-constexpr std::chrono::milliseconds kPatience{1000};
-
 // Compatible with front ends, which read these layouts line by line and know no others: values
 // stand in a document as they come, without escapes, and what could not be read is empty.
 //

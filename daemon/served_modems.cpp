@@ -1,0 +1,59 @@
+#include "daemon/served_modems.h"
+
+#include <unistd.h>
+
+#include <cerrno>
+#include <system_error>
+
+#include "daemon/semaphore_sets.h"
+#include "usbmodem/rules/paths.h"
+
+namespace taviwireless::daemon {
+
+namespace {
+
+using namespace usbmodem_lib;
+
+constexpr bool kEachWriting = true;
+
+std::string FileName(const std::string& path) {
+    return path.substr(path.rfind('/') + 1);
+}
+
+}  // namespace
+
+ServedModems::ServedModems(USBModemList& list, unsigned int refresh)
+    : list_(list),
+      objects_([this](const auto& id, const auto& reply) { look_.Look(id, reply); }),
+      look_(
+          list, refresh, [this] { return objects_.HasClients(); }, [this] { Update(); }),
+      keeper_(list, [this] { LookAtLinks(); }),
+      infoFiles_(kInfoDirectory, {kInfoName}, !kEachWriting, [this] { keeper_.Rescan(); }),
+      // The dialler's log is closed when it ends.
+      stateFiles_(kStateDirectory, {FileName(kPidFilePrefix), FileName(kDialLogPrefix)},
+                  kEachWriting, [this] { LookAtLinks(); }),
+      network_([this] { LookAtLinks(); }) {
+    if (!infoFiles_.Begin()) {
+        throw std::system_error(errno, std::generic_category(), "cannot watch /tmp/");
+    }
+}
+
+void ServedModems::Begin() {
+    ModemKeeper::EndOrphanedConnections();
+    keeper_.Rescan();
+}
+
+// After everything that may have changed a record.
+void ServedModems::Update() {
+    RemovePrivateSemaphoreSets(getpid());
+    keeper_.LookAfterModems();
+    look_.Follow();
+    stateFiles_.Begin();  // the folder may come with the first connection
+    std::vector<ModemState> states;
+    for (const USBModem& modem : list_) {
+        states.push_back(StateOf(modem, look_.LastLook(modem)));
+    }
+    objects_.Publish(std::move(states));
+}
+
+}  // namespace taviwireless::daemon

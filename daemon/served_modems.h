@@ -1,0 +1,45 @@
+#ifndef TAVIWIRELESS_DAEMON_SERVED_MODEMS_H
+#define TAVIWIRELESS_DAEMON_SERVED_MODEMS_H
+
+#include <taviwireless/usbmodem_list.h>
+
+#include "daemon/background_look.h"
+#include "daemon/folder_watch.h"
+#include "daemon/modem_keeper.h"
+#include "daemon/modem_objects.h"
+#include "daemon/network_watch.h"
+
+namespace taviwireless::daemon {
+
+// The modems of the service: their list and their records are kept up to date, and what is known of
+// them is shown on the bus.
+class ServedModems {
+  public:
+    // list is borrowed; refresh: see BackgroundLook. Throws std::exception when something cannot be
+    // watched or shown.
+    ServedModems(usbmodem_lib::USBModemList& list, unsigned int refresh);
+
+    // Looks for modems from now on, and ends the connections of those that went meanwhile.
+    void Begin();
+
+    // To be called after each call of a method, which may have dialled or hung up.
+    void LookAtLinks() { look_.LookAtLinks(); }
+
+    // To be called at times.
+    void FindDeadPorts() { keeper_.LookAfterModems(); }
+
+  private:
+    void Update();
+
+    usbmodem_lib::USBModemList& list_;
+    ModemObjects objects_;
+    BackgroundLook look_;
+    ModemKeeper keeper_;
+    FolderWatch infoFiles_;
+    FolderWatch stateFiles_;
+    NetworkWatch network_;
+};
+
+}  // namespace taviwireless::daemon
+
+#endif
