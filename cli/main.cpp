@@ -87,16 +87,20 @@ void AddConnectionCommands(const Command& modem, Options& options) {
               options, ConnectModem)
         .AddFlag("--no-wait", options.noWait, "Return as soon as the dialler runs");
     AddForOne(modem, "disconnect", "Hang up", options, DisconnectModem);
-    AddForOne(modem, "status", "Show the state of the connection", options, ShowConnection);
+    AddForOne(modem, "status", "Show the state of the connection; asks no modem", options,
+              ShowConnection);
 }
 
 void AddModemCommands(const Command& app, Options& options) {
     const Command modem = app.AddGroup("modem", "USB modems that are plugged in");
     modem.AddFlag("--direct", options.direct, "Ask the modems without the modem service");
 
-    AddForModems(modem, "list", "List the modems and what they say of themselves", options,
-                 ListModems);
-    AddForOne(modem, "show", "Show one modem and its profile", options, ShowModem)
+    AddForModems(
+        modem, "list",
+        "List the modems and what is known of them; asks only those that nobody has asked for 5 "
+        "minutes",
+        options, ListModems);
+    AddForOne(modem, "show", "Ask one modem, and show it and its profile", options, ShowModem)
         .AddFlag("--show-secrets", options.showSecrets, "Show the password as well");
     AddForModems(
         modem, "watch",

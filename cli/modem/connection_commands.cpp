@@ -117,7 +117,7 @@ void DisconnectModem(const Options& options) {
 void ShowConnection(const Options& options) {
     const auto access = MakeAccess(options);
     const Connection connection =
-        Deadline(options).Limit([&] { return access->LookAtConnection(options.id); });
+        Deadline(options).Limit([&] { return access->KnownConnection(options.id); });
     Print(options, Describe(options.id, connection));
 }
 

@@ -3,6 +3,8 @@
 #include <taviwireless/usbmodem_list.h>
 
 #include <algorithm>
+#include <chrono>
+#include <thread>
 
 #include "cli/terminal.h"
 
@@ -20,7 +22,7 @@ bool IsDisconnected(const std::string& netStatus) {
     return netStatus == kDisconnected || netStatus == kConnectionLost;
 }
 
-std::vector<ModemState> ModemAccess::LookAtAll() {
+std::vector<ModemState> ModemAccess::KnownModems(bool withProfiles) {
     const std::vector<std::string> ready = ReadyModems();
     std::vector<ModemState> states;
     for (const std::string& id : PluggedModems()) {
@@ -28,7 +30,7 @@ std::vector<ModemState> ModemAccess::LookAtAll() {
         state.id = id;
         try {
             if (Contains(ready, id)) {
-                state = Look(id);
+                state = ReadyModem(id, withProfiles);
             }
         } catch (const CommandError& error) {
             if (error.Status() == kNoService) {
@@ -38,6 +40,12 @@ std::vector<ModemState> ModemAccess::LookAtAll() {
         states.push_back(state);
     }
     return states;
+}
+
+// A look keeps a service that shows nothing busy for about as long per modem; others want to be
+// served too.
+void ModemAccess::WaitForChange() {
+    std::this_thread::sleep_for(std::chrono::seconds(2));
 }
 
 std::unique_ptr<ModemAccess> MakeAccess(const Options& options) {

@@ -91,8 +91,14 @@ class ModemAccess {
 
     virtual ~ModemAccess() = default;
 
-    // All modems that are plugged in, in the order of their numbers.
-    std::vector<ModemState> LookAtAll();
+    // All modems that are plugged in, in the order of their numbers, as they are known: a modem
+    // that was looked at lately is not asked. Profiles cost a call for each.
+    std::vector<ModemState> KnownModems(bool withProfiles);
+    // One of them, with its profile.
+    virtual ModemState Known(const std::string& id) { return Look(id); }
+    virtual Connection KnownConnection(const std::string& id) { return LookAtConnection(id); }
+    // Returns when what is known may have changed since this was called last, or after a pause.
+    virtual void WaitForChange();
 
     // Asks the modem everything: about two seconds.
     virtual ModemState Look(const std::string& id) = 0;
@@ -118,8 +124,10 @@ class ModemAccess {
     virtual void Disconnect(const std::string& id) = 0;
 
   protected:
-    // The modems of LookAtAll that can be looked at.
+    // The modems of KnownModems that can be looked at.
     virtual std::vector<std::string> ReadyModems() = 0;
+    // One of these, right after it.
+    virtual ModemState ReadyModem(const std::string& id, bool /*withProfile*/) { return Look(id); }
 };
 
 std::unique_ptr<ModemAccess> MakeServiceAccess();

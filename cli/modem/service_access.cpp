@@ -3,9 +3,12 @@
 #include <taviwireless/usbmodem_ui.h>
 
 #include <algorithm>
+#include <cstdlib>
+#include <ctime>
 
 #include "cli/modem/modem_access.h"
 #include "cli/modem/service_document.h"
+#include "cli/modem/service_objects.h"
 #include "cli/terminal.h"
 
 namespace taviwireless::cli {
@@ -42,11 +45,14 @@ std::vector<std::string> Lines(int (*get)(std::vector<std::string>& list)) {
 
 // The functions that ask for one modem take whatever they are given, and answer alike for a modem
 // that the service does not know and for a call that failed; so the id is looked up first.
-void RequireReady(const std::string& id) {
-    const auto ready = Lines(usbmodem_ui::GetUSBModemList);
+void RequireAmong(const std::vector<std::string>& ready, const std::string& id) {
     if (std::find(ready.begin(), ready.end(), id) == ready.end()) {
         throw NotReadyError(id);
     }
+}
+
+void RequireReady(const std::string& id) {
+    RequireAmong(Lines(usbmodem_ui::GetUSBModemList), id);
 }
 
 std::string Document(std::string (*get)(const std::string& id), const std::string& id) {
@@ -75,8 +81,39 @@ void CheckSetting(const profile::Setting& setting) {
     }
 }
 
+// Whether what is known suffices. The service looks more often, unless it was told not to.
+bool IsRecent(const KnownModem& modem) {
+    constexpr long long kMaxAge = 300;  // seconds
+    return std::llabs(time(nullptr) - static_cast<long long>(modem.lastLook)) <= kMaxAge;
+}
+
+// The commands that only show what is known take it from the objects of the service, all others
+// ask. An older service has no objects.
 class ServiceAccess : public ModemAccess {
   public:
+    ModemState Known(const std::string& id) override {
+        RequireAmong(ReadyModems(), id);
+        return ReadyModem(id, true);
+    }
+
+    Connection KnownConnection(const std::string& id) override {
+        const auto ready = ReadyModems();
+        if (!known_) {
+            return LookAtConnection(id);
+        }
+        RequireAmong(ready, id);
+        const KnownModem& modem = *FindKnown(id);
+        return {modem.state.netStatus, modem.interface, modem.state.ip};
+    }
+
+    void WaitForChange() override {
+        if (known_) {
+            objects_.WaitForChange();
+        } else {
+            ModemAccess::WaitForChange();
+        }
+    }
+
     ModemState Look(const std::string& id) override {
         ModemState state = ReadModemDocument(Document(usbmodem_ui::GetUSBModem, id));
         // The document is written from top to bottom, so that of a link that comes up meanwhile
@@ -100,7 +137,7 @@ class ServiceAccess : public ModemAccess {
 
     // The service knows an interface once it looked at the connection.
     std::vector<Interface> Interfaces() override {
-        for (const std::string& id : ReadyModems()) {
+        for (const std::string& id : Lines(usbmodem_ui::GetUSBModemList)) {
             Look(id);
         }
         return KnownInterfaces();
@@ -165,12 +202,43 @@ class ServiceAccess : public ModemAccess {
     void Disconnect(const std::string& id) override { Sent(usbmodem_ui::Disconnect(id)); }
 
   protected:
-    std::vector<std::string> ReadyModems() override { return Lines(usbmodem_ui::GetUSBModemList); }
+    std::vector<std::string> ReadyModems() override {
+        known_ = objects_.Read();
+        if (!known_) {
+            return Lines(usbmodem_ui::GetUSBModemList);
+        }
+        std::vector<std::string> ready;
+        for (const KnownModem& modem : *known_) {
+            if (modem.answers) {
+                ready.push_back(modem.state.id);
+            }
+        }
+        return ready;
+    }
+
+    ModemState ReadyModem(const std::string& id, bool withProfile) override {
+        const KnownModem* modem = FindKnown(id);
+        if (modem == nullptr || !IsRecent(*modem)) {
+            return Look(id);
+        }
+        ModemState state = modem->state;
+        if (withProfile && state.simStatus == kReady) {
+            state.profile = ReadProfileDocument(Document(usbmodem_ui::GetProfile, id));
+        }
+        return state;
+    }
 
   private:
+    const KnownModem* FindKnown(const std::string& id) const {
+        const auto isIt = [&id](const KnownModem& modem) { return modem.state.id == id; };
+        const auto found = known_ ? std::find_if(known_->begin(), known_->end(), isIt)
+                                  : std::vector<KnownModem>::const_iterator();
+        return known_ && found != known_->end() ? &*found : nullptr;
+    }
+
     // The service lists ids and interfaces in the same order, in two calls.
     std::vector<Interface> KnownInterfaces() {
-        const auto ids = ReadyModems();
+        const auto ids = Lines(usbmodem_ui::GetUSBModemList);
         const auto names = Lines(usbmodem_ui::GetUSBModemIfList);
         if (ids.size() != names.size()) {
             throw CommandError(kFailure,
@@ -182,6 +250,9 @@ class ServiceAccess : public ModemAccess {
         }
         return interfaces;
     }
+
+    ServiceObjects objects_;
+    std::optional<std::vector<KnownModem>> known_;  // as of the last ReadyModems
 };
 
 }  // namespace

@@ -8,7 +8,7 @@ namespace taviwireless::cli {
 
 void ListModems(const Options& options) {
     const auto access = MakeAccess(options);
-    const auto states = Deadline(options).Limit([&] { return access->LookAtAll(); });
+    const auto states = Deadline(options).Limit([&] { return access->KnownModems(options.json); });
     Print(options, DescribeAll(states));
 }
 

@@ -2,9 +2,7 @@
 #include <signal.h>
 #include <unistd.h>
 
-#include <chrono>
 #include <iostream>
-#include <thread>
 
 #include "cli/command_error.h"
 #include "cli/deadline.h"
@@ -17,16 +15,14 @@ namespace taviwireless::cli {
 
 namespace {
 
-// A look keeps the service busy for about as long per modem; others want to be served too.
-constexpr std::chrono::seconds kPause{2};
-
 // Ends the program wherever it is: a look may take long, and everything shown is written out.
 void EndWithSuccess(int) {
     _exit(kSuccess);
 }
 
-Report LookAgain(ModemAccess& access, const std::string& id) {
-    return id.empty() ? DescribeAll(access.LookAtAll()) : Describe(access.Look(id));
+Report LookAgain(ModemAccess& access, const Options& options) {
+    return options.id.empty() ? DescribeAll(access.KnownModems(options.json))
+                              : Describe(access.Known(options.id));
 }
 
 void Show(const std::string& text, bool inPlace) {
@@ -50,7 +46,7 @@ void WatchModems(const Options& options) {
     std::string shown;
     for (;;) {
         deadline.Restart();
-        const Report report = deadline.Limit([&] { return LookAgain(*access, options.id); });
+        const Report report = deadline.Limit([&] { return LookAgain(*access, options); });
         const std::string text = Render(options, report, kInOneLine);
         if (text != shown) {
             const bool isNextTable = !options.json && !inPlace && !shown.empty();
@@ -58,7 +54,7 @@ void WatchModems(const Options& options) {
             shown = text;
         }
         ShowProgress("");
-        std::this_thread::sleep_for(kPause);
+        access->WaitForChange();
     }
 }
 

@@ -1,0 +1,50 @@
+#ifndef TAVIWIRELESS_CLI_MODEM_SERVICE_OBJECTS_H
+#define TAVIWIRELESS_CLI_MODEM_SERVICE_OBJECTS_H
+
+#include <gio/gio.h>
+
+#include <cstdint>
+#include <memory>
+#include <optional>
+#include <string>
+#include <vector>
+
+#include "cli/modem/modem_access.h"
+
+namespace taviwireless::cli {
+
+struct KnownModem {
+    ModemState state;  // without the profile
+    std::string interface;
+    bool answers = false;
+    std::uint64_t lastLook = 0;  // Unix time; 0: never
+};
+
+// The modems as the objects of the modem service show them (daemon/modem_objects.xml): nobody is
+// asked, and nobody waits.
+class ServiceObjects {
+  public:
+    ServiceObjects() = default;
+    ~ServiceObjects();
+    ServiceObjects(const ServiceObjects&) = delete;
+    ServiceObjects& operator=(const ServiceObjects&) = delete;
+
+    // All that are plugged in; nothing when there is no service, or one without such objects.
+    std::optional<std::vector<KnownModem>> Read();
+
+    // Returns when a modem, or the service, may have changed since this was called last; the first
+    // time at once.
+    void WaitForChange();
+
+  private:
+    struct Release {
+        void operator()(gpointer object) const { g_object_unref(object); }
+    };
+    std::unique_ptr<GDBusConnection, Release> connection_;
+    std::vector<guint> watches_;
+    bool hasChanged_ = false;
+};
+
+}  // namespace taviwireless::cli
+
+#endif
