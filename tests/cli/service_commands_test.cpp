@@ -3,6 +3,7 @@
 
 #include "tests/cli/cli_runs.h"
 #include "tests/support/bus.h"
+#include "tests/support/wait.h"
 
 namespace taviwireless::test {
 namespace {
@@ -47,6 +48,37 @@ TEST(ServiceCommands, ListShowsWhatEveryModemSays) {
         "disconnected  -\n"
         "usbmodem9  -       -         -         -       modem not ready  -         - / -         "
         "-             -\n");
+}
+
+TEST(ServiceCommands, WhatIsKnownIsShownWithoutAskingUnlessTheServiceIsOlder) {
+    std::string shown;
+    for (const bool isOlder : {false, true}) {
+        SCOPED_TRACE(isOlder);
+        PrivateBus bus;
+        if (isOlder) {  // its objects cannot be reached
+            std::string rules = ReadFile("/tmp/bus.conf");
+            rules.insert(rules.find("</policy>"),
+                         "<deny send_destination=\"com.merilond.usbmodem.Objects\"/>");
+            WriteFile("/tmp/bus.conf", rules);
+            bus.Restart();
+        }
+        ModemSimulator simulator({"--modem", "12d1,ports=dial/at"});
+        ModemService service(WithShortWaits(
+            {BuiltProgram("usbmodemd"), "--foreground", "--refresh", isOlder ? "0" : "1000"}));
+        EXPECT_TRUE(service.Lists({"usbmodem0"}));
+        const auto asks = [&](const char* command) {
+            simulator.Received("0");
+            Take({{command, "", 0, "disconnected"}});
+            return !simulator.Received("0").empty();
+        };
+        for (const char* const command :
+             {"list", "list --json", "status usbmodem0", "status --json usbmodem0"}) {
+            EXPECT_TRUE(isOlder ? asks(command) : Eventually([&] { return !asks(command); }));
+        }
+        EXPECT_TRUE(asks("show usbmodem0"));
+        const std::string list = Modem({"list", "--json"}).out;
+        EXPECT_EQ(std::exchange(shown, list), isOlder ? list : "");
+    }
 }
 
 TEST(ServiceCommands, FailuresAreOneSentenceAndAnExitStatus) {
@@ -166,6 +198,20 @@ TEST(ServiceCommands, WatchPrintsADocumentAtEachChangeUntilItIsEnded) {
     watch.Signal(SIGINT);
     EXPECT_EQ(watch.Wait(), 0);
     EXPECT_EQ(watch.ReadLine(), std::nullopt);
+}
+
+TEST(ServiceCommands, WatchEndsWithTheService) {
+    for (const bool withTheBus : {false, true}) {
+        ServedModems situation("generic");
+        Process watch({BuiltProgram("taviwireless"), "modem", "--json", "watch"});
+        EXPECT_EQ(Parse(watch.ReadLine().value_or(""))[0]["id"], "usbmodem0");
+        if (withTheBus) {
+            situation.bus.Restart();
+        } else {
+            situation.service.End();
+        }
+        EXPECT_EQ(watch.Wait(), kNoService);
+    }
 }
 
 }  // namespace
