@@ -104,8 +104,8 @@ void AddModemCommands(const Command& app, Options& options) {
         .AddFlag("--show-secrets", options.showSecrets, "Show the password as well");
     AddForModems(
         modem, "watch",
-        "Show the modems, or one, anew at every change until SIGINT or SIGTERM; --timeout is that "
-        "of one look",
+        "Show the modems, or one, anew at every change that the service tells of, until SIGINT or "
+        "SIGTERM; --timeout is that of one look",
         options, WatchModems)
         .AddOption("ID", options.id, "Device id, such as usbmodem0");
     AddPINCommands(modem, options);

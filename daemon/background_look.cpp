@@ -20,11 +20,13 @@ using Clock = std::chrono::steady_clock;
 constexpr guint kLinkPause = 2;          // seconds between looks at a connection that comes up
 constexpr unsigned int kIdleFactor = 5;  // of the ticks while nobody listens
 
-// What GetUSBModem asks; the SIM first, since most others need it. A modem does not change its
-// name.
+// What GetUSBModem asks; the SIM first, since most others need it. What does not change
+// is asked once.
 using Question = void (*)(USBModem& modem, bool& failed);
 constexpr Question kQuestions[] = {
     [](USBModem& modem, bool& failed) { modem.GetPINStatus(failed); },
+    [](USBModem& modem, bool& failed) { modem.GetSignalQuality(failed); },
+    [](USBModem& modem, bool& failed) { modem.GetDefaultISP(failed); },
     [](USBModem& modem, bool& failed) {
         if (modem.Known().vendor.empty()) {
             modem.GetVendorName(failed);
@@ -35,14 +37,20 @@ constexpr Question kQuestions[] = {
             modem.GetProductName(failed);
         }
     },
-    [](USBModem& modem, bool& failed) { modem.GetSignalQuality(failed); },
-    [](USBModem& modem, bool& failed) { modem.GetDefaultISP(failed); },
+    [](USBModem& modem, bool& failed) {
+        if (modem.Known().imsi.empty()) {
+            modem.GetIMSI(failed);
+        }
+    },
     [](USBModem& modem, bool& failed) { failed = modem.PINGetEnableProtection() < 0; },
     [](USBModem& modem, bool& failed) { failed = modem.PINGetAttemptRemain() < 0; },
     [](USBModem& modem, bool& failed) { failed = modem.PUKGetAttemptRemain() < 0; },
     [](USBModem& modem, bool& failed) { modem.GetRoaming(failed); },
 };
 constexpr size_t kSIMStatus = 0;
+// From here on: not asked again once the modem refused, until its state is another; each refusal is
+// an error in the log.
+constexpr size_t kRefusable = 3;
 
 // Calls a member function of self from the main loop until it returns false.
 template <typename Self, bool (Self::*member)()>
@@ -96,12 +104,21 @@ void BackgroundLook::Follow() {
             continue;
         }
         Modem& modem = modems_[record.GetIfid()];
-        const auto known = record.Known();
-        const std::string state = known.simStatus + ' ' + known.netStatus;
-        if (std::exchange(modem.state, state) != state && refresh_ > 0) {
+        if (TakeState(record, modem) && refresh_ > 0) {
             Begin(modem);
         }
     }
+}
+
+// Whether SIM or connection are in another state than before.
+bool BackgroundLook::TakeState(const USBModem& record, Modem& modem) {
+    const auto known = record.Known();
+    const std::string state = known.simStatus + ' ' + known.netStatus;
+    const bool isOther = std::exchange(modem.state, state) != state;
+    if (isOther) {
+        modem.refused.clear();
+    }
+    return isOther;
 }
 
 void BackgroundLook::LookAtLinks() {
@@ -139,7 +156,9 @@ void BackgroundLook::Look(const std::string& id, const ModemObjects::Reply& repl
     } else {
         Modem& modem = modems_[record.GetIfid()];
         modem.waiting.push_back(reply);
-        Begin(modem);
+        if (!modem.question) {
+            Begin(modem);
+        }
     }
 }
 
@@ -156,7 +175,7 @@ void BackgroundLook::BeginAll() {
     }
 }
 
-// A look that has begun begins again: what it learnt may be over.
+// One that goes on begins again: what it learnt may be over.
 void BackgroundLook::Begin(Modem& modem) {
     modem.question = kSIMStatus;
     modem.isDoubted = false;
@@ -189,12 +208,19 @@ void BackgroundLook::Ask(USBModem& record, Modem& modem) {
     const size_t question = modem.isDoubted ? kSIMStatus : *modem.question;
     bool failed = false;
     const auto begin = Clock::now();
-    kQuestions[question](record, failed);
+    if (modem.refused.count(question) == 0) {
+        kQuestions[question](record, failed);
+    }
     const bool isMute = failed && Clock::now() - begin > dbus::kPatience;
     if (isMute && (question == kSIMStatus || record.IsError())) {
         record.IncreaseErrorCounter();
         End(modem, "NotReady", record.GetDevId() + " does not answer any more");
         return;
+    }
+    if (question == kSIMStatus) {
+        TakeState(record, modem);  // what follows is asked in this state
+    } else if (failed && question >= kRefusable) {
+        modem.refused.insert(question);
     }
     modem.isDoubted = isMute;
     if (question == kSIMStatus && question != *modem.question) {

@@ -8,6 +8,7 @@
 #include <functional>
 #include <map>
 #include <optional>
+#include <set>
 #include <string>
 #include <vector>
 
@@ -47,10 +48,12 @@ class BackgroundLook {
         std::string state;  // of SIM and connection
         time_t lastLook = 0;
         std::optional<size_t> question;  // the next one, while it is looked at
+        std::set<size_t> refused;        // questions
         bool isDoubted = false;          // whether it left a question unanswered
         std::vector<ModemObjects::Reply> waiting;
     };
 
+    static bool TakeState(const usbmodem_lib::USBModem& record, Modem& modem);
     void Begin(Modem& modem);
     void BeginAll();
     bool AskNext();

@@ -147,6 +147,7 @@ ModemObjects::ModemObjects(OnLook onLook)
 }
 
 ModemObjects::~ModemObjects() {
+    g_dbus_connection_close_sync(connection_.get(), nullptr, nullptr);  // so no call is noted now
     g_dbus_connection_remove_filter(connection_.get(), filter_);
     Post(context_.get(), [this] { g_main_loop_quit(loop_.get()); });
     thread_.join();
