@@ -2,7 +2,7 @@
 """Shows USB modems as they come, change and go: examples/modem_events.py (Debian: python3-gi)"""
 from gi.repository import Gio, GLib
 
-INTERFACE = "com.merilond.usbmodem.Modem"
+NAMES = ("Vendor", "Product", "SimState")
 
 
 def say(modem, text):
@@ -10,9 +10,8 @@ def say(modem, text):
 
 
 def came(manager, modem):
-    proxy = modem.get_interface(INTERFACE)
-    values = {name: proxy.get_cached_property(name) for name in ("Vendor", "Product", "SimState")}
-    say(modem, "came: " + ", ".join(value.get_string() or "-" for value in values.values()))
+    get = modem.get_interface("com.merilond.usbmodem.Modem").get_cached_property
+    say(modem, "came: " + ", ".join(get(name).get_string() or "-" for name in NAMES))
 
 
 def changed(manager, modem, proxy, properties, invalidated):

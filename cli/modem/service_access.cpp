@@ -43,14 +43,14 @@ std::vector<std::string> Lines(int (*get)(std::vector<std::string>& list)) {
     return lines;
 }
 
-// The functions that ask for one modem take whatever they are given, and answer alike for a modem
-// that the service does not know and for a call that failed; so the id is looked up first.
 void RequireAmong(const std::vector<std::string>& ready, const std::string& id) {
     if (std::find(ready.begin(), ready.end(), id) == ready.end()) {
         throw NotReadyError(id);
     }
 }
 
+// The functions that ask for one modem take whatever they are given, and answer alike for a modem
+// that the service does not know and for a call that failed; so the id is looked up first.
 void RequireReady(const std::string& id) {
     RequireAmong(Lines(usbmodem_ui::GetUSBModemList), id);
 }
@@ -102,7 +102,7 @@ class ServiceAccess : public ModemAccess {
             return LookAtConnection(id);
         }
         RequireAmong(ready, id);
-        const KnownModem& modem = *FindKnown(id);
+        const KnownModem& modem = known_->at(id);
         return {modem.state.netStatus, modem.interface, modem.state.ip};
     }
 
@@ -208,20 +208,19 @@ class ServiceAccess : public ModemAccess {
             return Lines(usbmodem_ui::GetUSBModemList);
         }
         std::vector<std::string> ready;
-        for (const KnownModem& modem : *known_) {
+        for (const auto& [id, modem] : *known_) {
             if (modem.answers) {
-                ready.push_back(modem.state.id);
+                ready.push_back(id);
             }
         }
         return ready;
     }
 
     ModemState ReadyModem(const std::string& id, bool withProfile) override {
-        const KnownModem* modem = FindKnown(id);
-        if (modem == nullptr || !IsRecent(*modem)) {
+        if (!known_ || !IsRecent(known_->at(id))) {
             return Look(id);
         }
-        ModemState state = modem->state;
+        ModemState state = known_->at(id).state;
         if (withProfile && state.simStatus == kReady) {
             state.profile = ReadProfileDocument(Document(usbmodem_ui::GetProfile, id));
         }
@@ -229,13 +228,6 @@ class ServiceAccess : public ModemAccess {
     }
 
   private:
-    const KnownModem* FindKnown(const std::string& id) const {
-        const auto isIt = [&id](const KnownModem& modem) { return modem.state.id == id; };
-        const auto found = known_ ? std::find_if(known_->begin(), known_->end(), isIt)
-                                  : std::vector<KnownModem>::const_iterator();
-        return known_ && found != known_->end() ? &*found : nullptr;
-    }
-
     // The service lists ids and interfaces in the same order, in two calls.
     std::vector<Interface> KnownInterfaces() {
         const auto ids = Lines(usbmodem_ui::GetUSBModemList);
@@ -252,7 +244,7 @@ class ServiceAccess : public ModemAccess {
     }
 
     ServiceObjects objects_;
-    std::optional<std::vector<KnownModem>> known_;  // as of the last ReadyModems
+    std::optional<std::map<std::string, KnownModem>> known_;  // as of the last ReadyModems
 };
 
 }  // namespace

@@ -1,6 +1,6 @@
 #include "cli/modem/service_objects.h"
 
-#include <algorithm>
+#include <cstring>
 
 #include "usbmodem/rules/objects.h"
 
@@ -27,13 +27,13 @@ bool IsSet(GVariant* properties, const char* name) {
     return value;
 }
 
-KnownModem ReadProperties(const std::string& path, GVariant* properties) {
+KnownModem ReadProperties(const std::string& id, GVariant* properties) {
     KnownModem modem;
     modem.interface = TextOf(properties, "Interface");
     modem.answers = IsSet(properties, "Answers");
     g_variant_lookup(properties, "LastLook", "t", &modem.lastLook);
     ModemState& state = modem.state;
-    state.id = path.substr(path.rfind('/') + 1);
+    state.id = id;
     state.vendor = TextOf(properties, "Vendor");
     state.product = TextOf(properties, "Product");
     state.ip = TextOf(properties, "Address");
@@ -57,7 +57,7 @@ ServiceObjects::~ServiceObjects() {
     }
 }
 
-std::optional<std::vector<KnownModem>> ServiceObjects::Read() {
+std::optional<std::map<std::string, KnownModem>> ServiceObjects::Read() {
     if (!connection_) {
         connection_.reset(g_bus_get_sync(G_BUS_TYPE_SESSION, nullptr, nullptr));
         if (!connection_) {
@@ -72,7 +72,7 @@ std::optional<std::vector<KnownModem>> ServiceObjects::Read() {
     if (!reply) {
         return std::nullopt;
     }
-    std::vector<KnownModem> modems;
+    std::map<std::string, KnownModem> modems;
     const Variant all(g_variant_get_child_value(reply.get(), 0));
     GVariantIter next;
     g_variant_iter_init(&next, all.get());
@@ -82,7 +82,8 @@ std::optional<std::vector<KnownModem>> ServiceObjects::Read() {
         const Variant properties(
             g_variant_lookup_value(interfaces, objects::kModem, G_VARIANT_TYPE("a{sv}")));
         if (properties) {
-            modems.push_back(ReadProperties(path, properties.get()));
+            const std::string id = strrchr(path, '/') + 1;
+            modems[id] = ReadProperties(id, properties.get());
         }
     }
     return modems;

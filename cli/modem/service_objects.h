@@ -4,6 +4,7 @@
 #include <gio/gio.h>
 
 #include <cstdint>
+#include <map>
 #include <memory>
 #include <optional>
 #include <string>
@@ -29,8 +30,9 @@ class ServiceObjects {
     ServiceObjects(const ServiceObjects&) = delete;
     ServiceObjects& operator=(const ServiceObjects&) = delete;
 
-    // All that are plugged in; nothing when there is no service, or one without such objects.
-    std::optional<std::vector<KnownModem>> Read();
+    // All that are plugged in, by device id; nothing when there is no service, or one without such
+    // objects.
+    std::optional<std::map<std::string, KnownModem>> Read();
 
     // Returns when a modem, or the service, may have changed since this was called last; the first
     // time at once.
