@@ -186,13 +186,16 @@ void BackgroundLook::Begin(Modem& modem) {
 }
 
 bool BackgroundLook::AskNext() {
-    const auto next = std::find_if(modems_.begin(), modems_.end(), [](const auto& modem) {
-        return modem.second.question.has_value();
-    });
+    const auto isLookedAt = [](const auto& modem) { return modem.second.question.has_value(); };
+    auto next = std::find_if(modems_.upper_bound(lastAsked_), modems_.end(), isLookedAt);
+    if (next == modems_.end()) {
+        next = std::find_if(modems_.begin(), modems_.end(), isLookedAt);
+    }
     if (next == modems_.end()) {
         turn_ = 0;
         return false;
     }
+    lastAsked_ = next->first;
     Ask(list_.FindUSBModem(static_cast<int>(next->first)), next->second);
     onAnswer_();
     return true;

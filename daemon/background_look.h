@@ -65,6 +65,7 @@ class BackgroundLook {
     std::function<bool()> isListenedTo_;
     std::function<void()> onAnswer_;
     std::map<unsigned int, Modem> modems_;
+    unsigned int lastAsked_ = 0;  // in turn: a slow modem keeps none of the others waiting
     unsigned int ticks_ = 0;
     guint tick_ = 0;  // GLib sources
     guint turn_ = 0;

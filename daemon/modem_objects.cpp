@@ -1,6 +1,7 @@
 #include "daemon/modem_objects.h"
 
 #include <sys/stat.h>
+#include <syslog.h>
 
 #include <algorithm>
 #include <fstream>
@@ -86,21 +87,27 @@ void Fill(TaviModem* modem, const ModemState& state) {
     tavi_modem_set_last_look(modem, static_cast<guint64>(state.lastLook));
 }
 
+// Throws std::runtime_error when the bus does not let us have the name, such as by rules that are
+// older than it.
 void TakeName(GDBusConnection* connection) {
-    constexpr guint kDoNotQueue = 4;
+    constexpr guint kQueue = 0;
     constexpr guint kIsOwner = 1;
-    guint result = 0;
-    GVariant* reply = g_dbus_connection_call_sync(
-        connection, "org.freedesktop.DBus", "/org/freedesktop/DBus", "org.freedesktop.DBus",
-        "RequestName", g_variant_new("(su)", objects::kService, kDoNotQueue), nullptr,
-        G_DBUS_CALL_FLAGS_NONE, -1, nullptr, nullptr);
-    if (reply != nullptr) {
-        g_variant_get(reply, "(u)", &result);
-        g_variant_unref(reply);
+    GError* error = nullptr;
+    const std::unique_ptr<GVariant, void (*)(GVariant*)> reply(
+        g_dbus_connection_call_sync(
+            connection, "org.freedesktop.DBus", "/org/freedesktop/DBus", "org.freedesktop.DBus",
+            "RequestName", g_variant_new("(su)", objects::kService, kQueue), G_VARIANT_TYPE("(u)"),
+            G_DBUS_CALL_FLAGS_NONE, -1, nullptr, &error),
+        g_variant_unref);
+    if (!reply) {
+        const std::string reason = error->message;
+        g_error_free(error);
+        throw std::runtime_error(reason);
     }
+    guint result = 0;
+    g_variant_get(reply.get(), "(u)", &result);
     if (result != kIsOwner) {
-        throw std::runtime_error(std::string("the session bus does not give the name ") +
-                                 objects::kService);
+        syslog(LOG_WARNING, "%s is ours once another process has left it", objects::kService);
     }
 }
 
@@ -133,7 +140,7 @@ ModemObjects::ModemObjects(OnLook onLook)
       loop_(g_main_loop_new(context_.get(), FALSE), g_main_loop_unref) {
     connection_.reset(g_bus_get_sync(G_BUS_TYPE_SESSION, nullptr, nullptr));
     if (!connection_) {
-        throw std::runtime_error("cannot reach the session bus a second time");
+        throw std::runtime_error("the session bus takes no second connection");
     }
     g_dbus_connection_set_exit_on_close(connection_.get(), FALSE);
     // What is made under this context is served by the thread that runs it.

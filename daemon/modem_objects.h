@@ -43,7 +43,8 @@ class ModemObjects {
     // Gets calls of Look, in the main loop.
     using OnLook = std::function<void(const std::string& id, const Reply& reply)>;
 
-    // Takes the name. Throws std::runtime_error when there is no bus or the name is taken.
+    // Takes the name, at the latest when nobody else has it. Throws std::runtime_error when there is
+    // no bus, or when its rules refuse the name.
     explicit ModemObjects(OnLook onLook);
     ~ModemObjects();
     ModemObjects(const ModemObjects&) = delete;

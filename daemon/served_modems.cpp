@@ -1,9 +1,12 @@
 #include "daemon/served_modems.h"
 
+#include <syslog.h>
 #include <unistd.h>
 
 #include <cerrno>
+#include <stdexcept>
 #include <system_error>
+#include <utility>
 
 #include "daemon/semaphore_sets.h"
 #include "usbmodem/rules/paths.h"
@@ -20,13 +23,24 @@ std::string FileName(const std::string& path) {
     return path.substr(path.rfind('/') + 1);
 }
 
+// The methods are served all the same when the objects cannot be.
+std::unique_ptr<ModemObjects> MakeObjects(ModemObjects::OnLook onLook) {
+    try {
+        return std::make_unique<ModemObjects>(std::move(onLook));
+    } catch (const std::runtime_error& error) {
+        syslog(LOG_WARNING, "the modems are not shown as objects: %s", error.what());
+        return nullptr;
+    }
+}
+
 }  // namespace
 
 ServedModems::ServedModems(USBModemList& list, unsigned int refresh)
     : list_(list),
-      objects_([this](const auto& id, const auto& reply) { look_.Look(id, reply); }),
+      objects_(MakeObjects([this](const auto& id, const auto& reply) { look_.Look(id, reply); })),
       look_(
-          list, refresh, [this] { return objects_.HasClients(); }, [this] { Update(); }),
+          list, objects_ ? refresh : 0, [this] { return objects_->HasClients(); },
+          [this] { Update(); }),
       keeper_(list, [this] { LookAtLinks(); }),
       infoFiles_(kInfoDirectory, {kInfoName}, !kEachWriting, [this] { keeper_.Rescan(); }),
       // The dialler's log is closed when it ends.
@@ -49,11 +63,14 @@ void ServedModems::Update() {
     keeper_.LookAfterModems();
     look_.Follow();
     stateFiles_.Begin();  // the folder may come with the first connection
+    if (!objects_) {
+        return;
+    }
     std::vector<ModemState> states;
     for (const USBModem& modem : list_) {
         states.push_back(StateOf(modem, look_.LastLook(modem)));
     }
-    objects_.Publish(std::move(states));
+    objects_->Publish(std::move(states));
 }
 
 }  // namespace taviwireless::daemon

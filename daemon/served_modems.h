@@ -3,6 +3,8 @@
 
 #include <taviwireless/usbmodem_list.h>
 
+#include <memory>
+
 #include "daemon/background_look.h"
 #include "daemon/folder_watch.h"
 #include "daemon/modem_keeper.h"
@@ -12,11 +14,11 @@
 namespace taviwireless::daemon {
 
 // The modems of the service: their list and their records are kept up to date, and what is known of
-// them is shown on the bus.
+// them is shown on the bus, if that has a place for it.
 class ServedModems {
   public:
     // list is borrowed; refresh: see BackgroundLook. Throws std::exception when something cannot be
-    // watched or shown.
+    // watched.
     ServedModems(usbmodem_lib::USBModemList& list, unsigned int refresh);
 
     // Looks for modems from now on, and ends the connections of those that went meanwhile.
@@ -32,7 +34,7 @@ class ServedModems {
     void Update();
 
     usbmodem_lib::USBModemList& list_;
-    ModemObjects objects_;
+    std::unique_ptr<ModemObjects> objects_;  // null when the bus does not let us show any
     BackgroundLook look_;
     ModemKeeper keeper_;
     FolderWatch infoFiles_;

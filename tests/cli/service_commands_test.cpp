@@ -50,26 +50,37 @@ TEST(ServiceCommands, ListShowsWhatEveryModemSays) {
         "-             -\n");
 }
 
+// A service that shows the modems as objects, or is older: then the bus does not know their name.
+struct ServiceOfAge {
+    ServiceOfAge(bool isOlder, const std::string& refresh, const std::string& modem)
+        : simulator({"--modem", modem}) {
+        if (isOlder) {
+            std::string rules = ReadFile("/tmp/bus.conf");
+            rules.insert(rules.find("</policy>"), "<deny own=\"com.merilond.usbmodem.Objects\"/>");
+            WriteFile("/tmp/bus.conf", rules);
+            bus.Restart();
+        }
+        service.emplace(WithShortWaits({"sh", "-c", "exec \"$0\" -f --refresh " + refresh + " 2>&1",
+                                        BuiltProgram("usbmodemd")}));
+        EXPECT_TRUE(service->Says("usbmodem0 is ready"));
+        const bool warns = service->Log().find("are not shown as objects: ") != std::string::npos;
+        EXPECT_EQ(warns, isOlder) << service->Log();
+    }
+
+    PrivateBus bus;
+    ModemSimulator simulator;
+    std::optional<ModemService> service;
+};
+
 TEST(ServiceCommands, WhatIsKnownIsShownWithoutAskingUnlessTheServiceIsOlder) {
     std::string shown;
     for (const bool isOlder : {false, true}) {
         SCOPED_TRACE(isOlder);
-        PrivateBus bus;
-        if (isOlder) {  // its objects cannot be reached
-            std::string rules = ReadFile("/tmp/bus.conf");
-            rules.insert(rules.find("</policy>"),
-                         "<deny send_destination=\"com.merilond.usbmodem.Objects\"/>");
-            WriteFile("/tmp/bus.conf", rules);
-            bus.Restart();
-        }
-        ModemSimulator simulator({"--modem", "12d1,ports=dial/at"});
-        ModemService service(WithShortWaits(
-            {BuiltProgram("usbmodemd"), "--foreground", "--refresh", isOlder ? "0" : "1000"}));
-        EXPECT_TRUE(service.Lists({"usbmodem0"}));
+        ServiceOfAge situation(isOlder, "1000", "12d1,ports=dial/at");
         const auto asks = [&](const char* command) {
-            simulator.Received("0");
+            situation.simulator.Received("0");
             Take({{command, "", 0, "disconnected"}});
-            return !simulator.Received("0").empty();
+            return !situation.simulator.Received("0").empty();
         };
         for (const char* const command :
              {"list", "list --json", "status usbmodem0", "status --json usbmodem0"}) {
@@ -190,14 +201,17 @@ TEST(ServiceCommands, ADiallerThatGivesUpOrTakesTooLongIsAFailure) {
 }
 
 TEST(ServiceCommands, WatchPrintsADocumentAtEachChangeUntilItIsEnded) {
-    ServedModems situation("generic,signal=31");
-    Process watch({BuiltProgram("taviwireless"), "--json", "modem", "watch", "usbmodem0"});
-    EXPECT_EQ(Parse(watch.ReadLine().value_or(""))["signal"], 100);
-    situation.simulator.Set("0", "signal", "0");
-    EXPECT_EQ(Parse(watch.ReadLine().value_or(""))["signal"], 0);
-    watch.Signal(SIGINT);
-    EXPECT_EQ(watch.Wait(), 0);
-    EXPECT_EQ(watch.ReadLine(), std::nullopt);
+    for (const bool isOlder : {false, true}) {
+        SCOPED_TRACE(isOlder);
+        ServiceOfAge situation(isOlder, "1", "generic,signal=31");
+        Process watch({BuiltProgram("taviwireless"), "--json", "modem", "watch", "usbmodem0"});
+        EXPECT_EQ(Parse(watch.ReadLine().value_or(""))["signal"], 100);
+        situation.simulator.Set("0", "signal", "0");
+        EXPECT_EQ(Parse(watch.ReadLine().value_or(""))["signal"], 0);
+        watch.Signal(SIGINT);
+        EXPECT_EQ(watch.Wait(), 0);
+        EXPECT_EQ(watch.ReadLine(), std::nullopt);
+    }
 }
 
 TEST(ServiceCommands, WatchEndsWithTheService) {

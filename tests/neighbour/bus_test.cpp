@@ -14,6 +14,9 @@ namespace {
 namespace fs = std::filesystem;
 
 constexpr char kService[] = "com.merilond.usbmodem";
+constexpr char kObjects[] = "com.merilond.usbmodem.Objects";
+constexpr char kManager[] = "/com/merilond/usbmodem";
+constexpr char kModem[] = "/com/merilond/usbmodem/usbmodem0";
 constexpr char kId[] = "usbmodem0";
 
 struct ServedBus : testing::Test {
@@ -34,8 +37,9 @@ struct ServedBus : testing::Test {
 
 using Message = std::unique_ptr<DBusMessage, decltype(&dbus_message_unref)>;
 
-Message Call(const char* method, const char* interface = kService, const char* path = "/") {
-    return {dbus_message_new_method_call(kService, path, interface, method), dbus_message_unref};
+Message Call(const char* method, const char* interface = kService, const char* path = "/",
+             const char* service = kService) {
+    return {dbus_message_new_method_call(service, path, interface, method), dbus_message_unref};
 }
 
 // Appends a value of each of these types; of texts this one.
@@ -114,11 +118,21 @@ TEST_F(ServedBus, AMessageOfAWrongShapeIsRefusedOrLeftAlone) {
             caller.Send(With(Call(method, nullptr, "/other"), "s"));
         }
     }
+    for (const char* path : {"/", kManager, kModem, "/com/merilond/usbmodem/usbmodem9"}) {
+        for (const char* method :
+             {"GetManagedObjects", "Look", "Get", "Set", "GetAll", "Introspect", "Fly"}) {
+            for (const char* types : {"", "s", "ss", "ssv", "sv", "i", "a", "h"}) {
+                caller.Send(With(Call(method, nullptr, path, kObjects), types));
+            }
+        }
+    }
     for (const int type :
          {DBUS_MESSAGE_TYPE_METHOD_RETURN, DBUS_MESSAGE_TYPE_ERROR, DBUS_MESSAGE_TYPE_SIGNAL, 77}) {
-        for (const char* interface : {DBUS_INTERFACE_DBUS, DBUS_INTERFACE_LOCAL, kService}) {
+        for (const char* interface :
+             {DBUS_INTERFACE_DBUS, DBUS_INTERFACE_LOCAL, kService, kObjects}) {
             Message message(dbus_message_new(type), dbus_message_unref);
-            dbus_message_set_destination(message.get(), kService);
+            dbus_message_set_destination(message.get(),
+                                         interface == kObjects ? kObjects : kService);
             dbus_message_set_path(message.get(), "/");
             dbus_message_set_interface(message.get(), interface);
             dbus_message_set_member(message.get(), "Disconnected");
@@ -155,7 +169,7 @@ TEST_F(ServedBus, AnArgumentOf64MegabytesIsForgotten) {
 }
 
 // While a connection comes up nothing is sent to the modem, so calls cost no waiting.
-TEST_F(ServedBus, AThousandCallsAtOnceOfCallersWhoNeverReadAreServedAndForgotten) {
+TEST_F(ServedBus, ThousandsOfCallsAtOnceOfCallersWhoNeverReadAreServedAndForgotten) {
     InstallDialler();
     EXPECT_EQ(CallService({"Connect", kId}).status, 0);
     const long descriptors = Descriptors();
@@ -164,6 +178,9 @@ TEST_F(ServedBus, AThousandCallsAtOnceOfCallersWhoNeverReadAreServedAndForgotten
         std::vector<DeafCaller> callers(10);
         for (int i = 0; i < 1000; ++i) {
             callers[i % 10].Send(With(Call(i % 2 == 0 ? "GetUSBModem" : "GetProfile"), "s"));
+            callers[i % 10].Send(i % 2 == 0
+                                     ? Call("Look", nullptr, kModem, kObjects)
+                                     : Call("GetManagedObjects", nullptr, kManager, kObjects));
         }
         EXPECT_TRUE(served.service.Lists({kId}));  // behind all those calls
     }

@@ -151,6 +151,8 @@ const PublicCall kCalls[] = {
     LINK(AssignConnectInfo()), LINK(EndConnection()), LINK(GetLinkStats()), LINK(NetDisconnect()),
     LINK(RecallConnection()), LINK(UpdateIP()), LINK(UpdateNetStatus()), LINK(GetNetIFName(err)),
     LINK(GetNetLocalIP(err)), LINK(GetRoaming(err)),
+    ROW("usbmodem_lib::USBModem::Known", kModem, const KnownModem known = around.Modem().Known();
+        out << known.vendor << ' ' << known.simStatus << ' ' << known.queryNode),
     ROW("usbmodem_lib::USBModem::ReadAPNData", kModem, Json::Value data;
         out << around.Modem().ReadAPNData(data) << data),
     ROW("usbmodem_lib::USBModem::USBModem", kNothing, out << USBModem(1, "/tmp/usbmodem.info1")),
