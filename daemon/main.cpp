@@ -1,6 +1,7 @@
 // usbmodemd: serves the USB modems that are plugged in on the session bus.
 #include <fcntl.h>
 #include <glib-unix.h>
+#include <malloc.h>
 #include <syslog.h>
 #include <taviwireless/usbmodem_client.h>
 #include <taviwireless/usbmodem_server.h>
@@ -166,6 +167,7 @@ int Serve(std::optional<Background>& background) {
 }  // namespace
 
 int main(int argc, char** argv) {
+    mallopt(M_ARENA_MAX, 1);  // one for each thread would be memory for nothing
     FillStandardDescriptors();
     if (!ParseOptions(argc, argv)) {
         return kUsageError;
