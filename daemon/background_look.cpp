@@ -1,7 +1,6 @@
 #include "daemon/background_look.h"
 
 #include <algorithm>
-#include <chrono>
 #include <iterator>
 #include <utility>
 
@@ -15,10 +14,11 @@ namespace {
 using usbmodem_lib::NameOf;
 using usbmodem_lib::NetStatus;
 using usbmodem_lib::USBModem;
-using Clock = std::chrono::steady_clock;
 
 constexpr guint kLinkPause = 2;          // seconds between looks at a connection that comes up
 constexpr unsigned int kIdleFactor = 5;  // of the ticks while nobody listens
+constexpr guint kGroupPause = 100;       // milliseconds, in which the next call of a group comes
+constexpr auto kLongestGroup = std::chrono::seconds(10);
 
 // What GetUSBModem asks; the SIM first, since most others need it. What does not change
 // is asked once.
@@ -182,6 +182,15 @@ void BackgroundLook::Begin(Modem& modem) {
     if (turn_ == 0) {
         turn_ = g_idle_add_full(G_PRIORITY_LOW, Call<BackgroundLook, &BackgroundLook::AskNext>,
                                 this, nullptr);
+        waitsSince_ = Clock::now();
+    }
+}
+
+void BackgroundLook::GiveWay() {
+    if (turn_ != 0 && Clock::now() - waitsSince_ < kLongestGroup) {
+        g_source_remove(turn_);
+        turn_ = g_timeout_add_full(G_PRIORITY_LOW, kGroupPause,
+                                   Call<BackgroundLook, &BackgroundLook::AskNext>, this, nullptr);
     }
 }
 
@@ -198,6 +207,7 @@ bool BackgroundLook::AskNext() {
     lastAsked_ = next->first;
     Ask(list_.FindUSBModem(static_cast<int>(next->first)), next->second);
     onAnswer_();
+    waitsSince_ = Clock::now();
     return true;
 }
 

@@ -4,6 +4,7 @@
 #include <glib.h>
 #include <taviwireless/usbmodem_list.h>
 
+#include <chrono>
 #include <ctime>
 #include <functional>
 #include <map>
@@ -37,6 +38,10 @@ class BackgroundLook {
     // Looks at the connections, which asks no modem; again every 2 s while one comes up.
     void LookAtLinks();
 
+    // To be called after each call of a method. A program often calls again at once, and is to wait
+    // for one question alone, not for one before each of its calls.
+    void GiveWay();
+
     // Looks at one modem now. Replies when it is done, or why it cannot be.
     void Look(const std::string& id, const ModemObjects::Reply& reply);
 
@@ -44,6 +49,8 @@ class BackgroundLook {
     time_t LastLook(const usbmodem_lib::USBModem& modem) const;
 
   private:
+    using Clock = std::chrono::steady_clock;
+
     struct Modem {
         std::string state;  // of SIM and connection
         time_t lastLook = 0;
@@ -69,6 +76,7 @@ class BackgroundLook {
     unsigned int ticks_ = 0;
     guint tick_ = 0;  // GLib sources
     guint turn_ = 0;
+    Clock::time_point waitsSince_;  // the next question
     guint link_ = 0;
 };
 

@@ -136,7 +136,7 @@ int Serve(std::optional<Background>& background) {
     int status = EXIT_SUCCESS;
     USBModemServer* running = nullptr;
     ServedModems* served = nullptr;
-    SessionBus bus([&] { served->LookAtLinks(); },
+    SessionBus bus([&] { served->HasServed(); },
                    [&] {
                        syslog(LOG_ERR, "%s", kBusLost);
                        status = EXIT_FAILURE;

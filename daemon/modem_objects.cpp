@@ -55,7 +55,8 @@ std::uint64_t CountOf(const std::string& interface, const char* counter) {
     return count;
 }
 
-void Fill(TaviModem* modem, const ModemState& state) {
+void Fill(GDBusInterfaceSkeleton* skeleton, const ModemState& state) {
+    TaviModem* modem = TAVI_MODEM(skeleton);
     const KnownModem& known = state.known;
     tavi_modem_set_answers(modem, state.answers);
     tavi_modem_set_vendor(modem, Text(known.vendor).c_str());
@@ -185,7 +186,8 @@ void ModemObjects::Show(const std::vector<ModemState>& modems) {
             Fill(known->second.get(), state);
             continue;
         }
-        Owned<TaviModem> modem(tavi_modem_skeleton_new(), g_object_unref);
+        Owned<GDBusInterfaceSkeleton> modem(G_DBUS_INTERFACE_SKELETON(tavi_modem_skeleton_new()),
+                                            g_object_unref);
         Fill(modem.get(), state);  // before it is seen
         Export(state.id, modem.get());
         modems_.emplace(state.id, std::move(modem));
@@ -196,15 +198,15 @@ void ModemObjects::Show(const std::vector<ModemState>& modems) {
     }
 }
 
-void ModemObjects::Export(const std::string& id, TaviModem* modem) {
+void ModemObjects::Export(const std::string& id, GDBusInterfaceSkeleton* modem) {
     g_signal_connect(modem, "handle-look", G_CALLBACK(HandleLook), this);
     const Owned<GDBusObjectSkeleton> object(g_dbus_object_skeleton_new(PathOf(id).c_str()),
                                             g_object_unref);
-    g_dbus_object_skeleton_add_interface(object.get(), G_DBUS_INTERFACE_SKELETON(modem));
+    g_dbus_object_skeleton_add_interface(object.get(), modem);
     g_dbus_object_manager_server_export(manager_.get(), object.get());
 }
 
-gboolean ModemObjects::HandleLook(TaviModem* /*modem*/, GDBusMethodInvocation* call,
+gboolean ModemObjects::HandleLook(GDBusInterfaceSkeleton* /*modem*/, GDBusMethodInvocation* call,
                                   gpointer data) {
     auto* self = static_cast<ModemObjects*>(data);
     const std::string path = g_dbus_method_invocation_get_object_path(call);

@@ -14,8 +14,6 @@
 #include <thread>
 #include <vector>
 
-using TaviModem = struct _TaviModem;  // made from modem_objects.xml
-
 namespace taviwireless::daemon {
 
 // What the object of a modem shows.
@@ -57,12 +55,13 @@ class ModemObjects {
     bool HasClients() const { return hasClients_; }
 
   private:
-    static gboolean HandleLook(TaviModem* modem, GDBusMethodInvocation* call, gpointer self);
+    static gboolean HandleLook(GDBusInterfaceSkeleton* modem, GDBusMethodInvocation* call,
+                               gpointer self);
     static GDBusMessage* NoteCaller(GDBusConnection* connection, GDBusMessage* message,
                                     gboolean isIncoming, gpointer self);
     void Run();
     void Show(const std::vector<ModemState>& modems);
-    void Export(const std::string& id, TaviModem* modem);
+    void Export(const std::string& id, GDBusInterfaceSkeleton* modem);
     void AddClient(const std::string& name);
     void DropClient(const std::string& name);
 
@@ -77,7 +76,7 @@ class ModemObjects {
     Owned<GMainLoop, void (*)(GMainLoop*)> loop_;
     // These belong to the thread.
     Owned<GDBusObjectManagerServer> manager_{nullptr, g_object_unref};
-    std::map<std::string, Owned<TaviModem>> modems_;
+    std::map<std::string, Owned<GDBusInterfaceSkeleton>> modems_;
     std::map<std::string, guint> clients_;  // unique names, and what watches for their end
     std::thread thread_;
 };

@@ -41,12 +41,12 @@ ServedModems::ServedModems(USBModemList& list, unsigned int refresh)
       look_(
           list, objects_ ? refresh : 0, [this] { return objects_->HasClients(); },
           [this] { Update(); }),
-      keeper_(list, [this] { LookAtLinks(); }),
+      keeper_(list, [this] { look_.LookAtLinks(); }),
       infoFiles_(kInfoDirectory, {kInfoName}, !kEachWriting, [this] { keeper_.Rescan(); }),
       // The dialler's log is closed when it ends.
       stateFiles_(kStateDirectory, {FileName(kPidFilePrefix), FileName(kDialLogPrefix)},
-                  kEachWriting, [this] { LookAtLinks(); }),
-      network_([this] { LookAtLinks(); }) {
+                  kEachWriting, [this] { look_.LookAtLinks(); }),
+      network_([this] { look_.LookAtLinks(); }) {
     if (!infoFiles_.Begin()) {
         throw std::system_error(errno, std::generic_category(), "cannot watch /tmp/");
     }
@@ -55,6 +55,11 @@ ServedModems::ServedModems(USBModemList& list, unsigned int refresh)
 void ServedModems::Begin() {
     ModemKeeper::EndOrphanedConnections();
     keeper_.Rescan();
+}
+
+void ServedModems::HasServed() {
+    look_.LookAtLinks();
+    look_.GiveWay();
 }
 
 // After everything that may have changed a record.

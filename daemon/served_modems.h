@@ -25,7 +25,7 @@ class ServedModems {
     void Begin();
 
     // To be called after each call of a method, which may have dialled or hung up.
-    void LookAtLinks() { look_.LookAtLinks(); }
+    void HasServed();
 
     // To be called at times.
     void FindDeadPorts() { keeper_.LookAfterModems(); }
