@@ -100,8 +100,10 @@ void FillStandardDescriptors() {
 }
 
 // What GLib and dbus-glib have to say goes where everything else goes.
-void LogToSystem(const gchar* domain, GLogLevelFlags, const gchar* message, gpointer) {
-    syslog(LOG_WARNING, "%s: %s", domain != nullptr ? domain : "GLib", message);
+void LogToSystem(const gchar* domain, GLogLevelFlags level, const gchar* message, gpointer) {
+    if ((level & (G_LOG_LEVEL_INFO | G_LOG_LEVEL_DEBUG)) == 0) {
+        syslog(LOG_WARNING, "%s: %s", domain != nullptr ? domain : "GLib", message);
+    }
 }
 
 void TakeName(USBModemServer& server, const SessionBus& bus) {
