@@ -168,7 +168,7 @@ const std::vector<int>& ErrorsOf(const std::string& call) {
         {{"fork", "vfork", "clone", "clone3"}, {EAGAIN}},
         {{"execve"}, {ENOMEM, EACCES}},
         {{"pipe2", "socket", "socketpair", "memfd_create", "dup", "inotify_init1"}, {EMFILE}},
-        {{"flock", "fcntl"}, {ENOLCK}},
+        {{"flock", "fcntl", "fcntl64"}, {ENOLCK}},
         {{"semget"}, {ENOSPC, EACCES}},
         {{"semop", "semtimedop", "semctl"}, {EIDRM}},
         {{"connect"}, {ECONNREFUSED}},
@@ -187,8 +187,8 @@ const std::vector<int>& ErrorsOf(const std::string& call) {
 
 // Of functions, the rest is seldom refused; of commands, functions that they call show it.
 bool IsInSample(const std::string& call, bool isOfCommand) {
-    static const std::set<std::string> kMinor = {"fcntl",  "newfstatat", "fstat",
-                                                 "access", "setsockopt", "chdir"};
+    static const std::set<std::string> kMinor = {"fcntl", "fcntl64", "newfstatat", "fstat",
+                                                 "statx", "access",  "setsockopt", "chdir"};
     static const std::set<std::string> kChanging = {
         "write",  "fsync",  "rename", "renameat", "unlink", "unlinkat", "mkdir", "clone",
         "clone3", "execve", "pipe2",  "flock",    "fchmod", "fchown",   "vfork", "kill"};
