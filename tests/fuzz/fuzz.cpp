@@ -5,7 +5,7 @@
 #include <cstdlib>
 #include <exception>
 
-#include "platform/appliance_root/appliance_root.h"
+#include "tests/support/enter_root.h"
 #include "tests/support/log_capture.h"
 
 namespace taviwireless::fuzz {
@@ -38,14 +38,13 @@ void Demand(bool isTrue, const std::string& sentence, const std::string& seen) {
 }  // namespace taviwireless::fuzz
 
 // What comes out of the root, such as new inputs, goes to the folder that TAVI_TEST_OUTPUT names.
-extern "C" int LLVMFuzzerInitialize(int*, char***) {
+extern "C" int LLVMFuzzerInitialize(int*, char*** argv) {
     constexpr char kIsInside[] = "TAVI_FUZZ_IS_INSIDE";  // libFuzzer starts the program in itself
     if (getenv(kIsInside) != nullptr) {
         return 0;
     }
     try {
-        const char* output = getenv("TAVI_TEST_OUTPUT");
-        taviwireless::EnterApplianceRoot(output != nullptr ? output : "");
+        taviwireless::test::EnterRoot(*argv);
     } catch (const std::exception& error) {
         fprintf(stderr, "%s\n", error.what());
         exit(taviwireless::kApplianceRootFailed);

@@ -2,16 +2,14 @@
 // has to come out of it, such as a report, goes to the folder that TAVI_TEST_OUTPUT names. With
 // TAVI_TEST_OLD_KERNEL in the environment the cases run on a kernel as old as Linux 3.10.
 #include <gmock/gmock.h>
-#include <unistd.h>
 
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
-#include <stdexcept>
-#include <string>
-#include <vector>
+#include <exception>
 
 #include "platform/appliance_root/appliance_root.h"
+#include "tests/support/enter_root.h"
 #include "tests/support/old_kernel.h"
 
 namespace {
@@ -26,30 +24,12 @@ bool OnlyLists(int argc, char** argv) {
     return false;
 }
 
-// An emulator does not know all calls that an appliance root is made with: where there is one,
-// TAVI_TEST_ROOT names a program that makes it and runs this one in it.
-void EnterRoot(char** argv) {
-    const char* program = getenv("TAVI_TEST_ROOT");
-    const char* output = getenv("TAVI_TEST_OUTPUT");
-    if (program == nullptr) {
-        taviwireless::EnterApplianceRoot(output != nullptr ? output : "");
-    } else if (*program != '\0') {
-        std::vector<char*> command{strdup(program), strdup("--")};
-        do {
-            command.push_back(*argv);
-        } while (*argv++ != nullptr);
-        setenv("TAVI_TEST_ROOT", "", 1);  // entered
-        execv(command[0], command.data());
-        throw std::runtime_error(std::string("cannot run ") + command[0]);
-    }
-}
-
 }  // namespace
 
 int main(int argc, char** argv) {
     if (!OnlyLists(argc, argv)) {
         try {
-            EnterRoot(argv);
+            taviwireless::test::EnterRoot(argv);
             if (getenv("TAVI_TEST_OLD_KERNEL") != nullptr) {
                 taviwireless::test::RefuseNewerCalls();
             }
