@@ -3,10 +3,7 @@
 
 #include <syslog.h>
 
-// g++ has it from version 12 on.
-#ifndef __FILE_NAME__
-#define __FILE_NAME__ (__builtin_strrchr("/" __FILE__, '/') + 1)
-#endif
+#include "base/file_name.h"
 
 // Writes one line at error priority to the system log: "FILE:LINE message". FILE is the source file
 // without its folder. The format is printf's; it is always a literal, and foreign text is only ever

@@ -10,6 +10,7 @@
 #include <cstdio>
 #include <cstring>
 
+#include "base/file_name.h"
 #include "cli/ap/dry_run.h"
 #include "cli/ap/setting_words.h"
 #include "cli/command_error.h"

@@ -7,6 +7,7 @@
 #include <initializer_list>
 #include <string>
 
+#include "base/file_name.h"
 #include "base/unique_fd.h"
 #include "base/unique_file.h"
 
