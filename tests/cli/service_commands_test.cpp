@@ -194,8 +194,8 @@ TEST(ServiceCommands, ADiallerThatGivesUpOrTakesTooLongIsAFailure) {
     Take({{"connect usbmodem0", "", kFailure, "gave up, or could not be started"}});
     InstallDialler();
     Take({
-        {"connect usbmodem0 --timeout 3", "", kFailure,
-         "usbmodem0 is not connected after 3 s; it goes on"},
+        {"connect usbmodem0 --timeout 7", "", kFailure,
+         "usbmodem0 is not connected after 7 s; it goes on"},
         {"unlock usbmodem0", "", kBusy, ""},
     });
 }
