@@ -74,7 +74,11 @@ void Fuzz(Input input) {
                                                      : modem.PINSet(first, second, enable);
     isOver = true;
     const bool hasSecond = operation != kUnlock && operation != kSwitch;
-    const bool hasOK = (reply + first + second).find("OK") != reply.npos;
+    // What stands behind a carriage return in a line comes before the next line, so to say without end.
+    std::string said = reply + first + second;
+    said.erase(std::remove_if(said.begin(), said.end(), [](char c) { return strchr("\r\n", c); }),
+               said.end());
+    const bool hasOK = said.find("OK") != said.npos;
     std::vector<std::string> wanted;
     if (IsFit(first) && (!hasSecond || IsFit(second))) {
         const bool isQuoted = ModemLine::kVendors[vendor] == std::string("2001");

@@ -23,8 +23,9 @@ std::string Line(const WirelessNetwork& network) {
 
 // The ESSID's columns of the next line, which has 511 bytes at most. Zero bytes are its end.
 std::string NextEssid(std::string& rest) {
-    const std::string line = rest.substr(0, std::min<size_t>(rest.find('\n') + 1, 511) - 1);
-    rest.erase(0, line.size() + 1);
+    const size_t end = std::min<size_t>(rest.find('\n'), 511);
+    const std::string line = rest.substr(0, end);
+    rest.erase(0, end + (end < 511 ? 1 : 0));
     std::string essid = line.substr(0, line.find('\0'));
     essid = essid.size() > 5 ? essid.substr(5, 32) : "";
     return essid.substr(0, essid.find_last_not_of(" \t\r\v\f") + 1);
