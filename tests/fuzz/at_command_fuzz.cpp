@@ -53,6 +53,7 @@ void Fuzz(Input input) {
     const std::string second = input.Text();
     const std::string reply = input.Text();
     std::vector<std::string> sent;
+    std::string said;
     bool isOver = false;
     ModemLine line(vendor, [&](const std::string& command) {
         if (command == kQuery || command == kLockQuery) {
@@ -61,7 +62,10 @@ void Fuzz(Input input) {
         if (!isOver) {
             sent.push_back(command);
         }
-        return Filled(reply, isOver ? "" : first, sent.empty() ? "" : sent.back());
+        const std::string answer =
+            Filled(reply, isOver ? "" : first, sent.empty() ? "" : sent.back());
+        said += answer;
+        return answer;
     });
     USBModem& modem = line.record;
     modem.UpdateSIMStatus();
@@ -75,7 +79,6 @@ void Fuzz(Input input) {
     isOver = true;
     const bool hasSecond = operation != kUnlock && operation != kSwitch;
     // What stands behind a carriage return in a line comes before the next line, so to say without end.
-    std::string said = reply + first + second;
     said.erase(std::remove_if(said.begin(), said.end(), [](char c) { return strchr("\r\n", c); }),
                said.end());
     const bool hasOK = said.find("OK") != said.npos;
