@@ -58,14 +58,15 @@ void ServedModems::Begin() {
 }
 
 void ServedModems::HasServed() {
+    keeper_.LookAfterModems();
     look_.LookAtLinks();
     look_.GiveWay();
 }
 
-// After everything that may have changed a record.
+// After everything that may have changed a record. Ports are not looked at: when a link goes because
+// its modem does, the dialler would be ended while it still puts the name servers back.
 void ServedModems::Update() {
     RemovePrivateSemaphoreSets(getpid());
-    keeper_.LookAfterModems();
     look_.Follow();
     stateFiles_.Begin();  // the folder may come with the first connection
     if (!objects_) {
