@@ -37,7 +37,8 @@ int PINResult(int result) {
 
 std::vector<std::string> Lines(int (*get)(std::vector<std::string>& list)) {
     std::vector<std::string> lines;
-    if (Reached(get(lines)) < 0) {
+    // A service that ends within the call gives no answer, and is not there the second time.
+    if (Reached(get(lines)) < 0 && Reached(get(lines)) < 0) {
         throw CommandError(kFailure, "the modem service does not answer; --verbose shows why");
     }
     return lines;
@@ -60,6 +61,7 @@ std::string Document(std::string (*get)(const std::string& id), const std::strin
     ShowProgress("Asking " + id + " ...");
     std::string document = get(id);
     if (document.empty()) {
+        RequireReady(id);  // the service or the modem may have gone meanwhile
         throw CommandError(kFailure,
                            "the modem service does not tell about " + id + "; --verbose shows why");
     }
