@@ -18,7 +18,7 @@ using usbmodem_lib::USBModem;
 constexpr guint kLinkPause = 2;          // seconds between looks at a connection that comes up
 constexpr unsigned int kIdleFactor = 5;  // of the ticks while nobody listens
 constexpr guint kGroupPause = 100;       // milliseconds, in which the next call of a group comes
-constexpr auto kLongestGroup = std::chrono::seconds(10);
+constexpr auto kLongestGroup = std::chrono::seconds(1);
 
 // What GetUSBModem asks; the SIM first, since most others need it. What does not change
 // is asked once.

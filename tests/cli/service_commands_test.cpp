@@ -82,6 +82,7 @@ TEST(ServiceCommands, WhatIsKnownIsShownWithoutAskingUnlessTheServiceIsOlder) {
             Take({{command, "", 0, "disconnected"}});
             return !situation.simulator.Received("0").empty();
         };
+        CallObject("/usbmodem0", "com.merilond.usbmodem.Modem.Look");  // returns when made
         for (const char* const command :
              {"list", "list --json", "status usbmodem0", "status --json usbmodem0"}) {
             EXPECT_TRUE(isOlder ? asks(command) : Eventually([&] { return !asks(command); }));

@@ -23,11 +23,6 @@ using testing::IsSupersetOf;
 constexpr char kName[] = "com.merilond.usbmodem.Objects";
 constexpr char kPath[] = "/com/merilond/usbmodem";
 
-RunResult CallObject(const std::string& path, const std::string& method) {
-    return RunProgram(
-        {"gdbus", "call", "--session", "-d", kName, "-o", kPath + path, "-m", method});
-}
-
 std::string ManagedObjects() {
     return CallObject("", "org.freedesktop.DBus.ObjectManager.GetManagedObjects").out;
 }

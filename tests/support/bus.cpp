@@ -81,4 +81,9 @@ RunResult CallService(std::vector<std::string> methodAndArguments) {
     return RunProgram(command);
 }
 
+RunResult CallObject(const std::string& path, const std::string& method) {
+    return RunProgram({"gdbus", "call", "--session", "-d", "com.merilond.usbmodem.Objects", "-o",
+                       "/com/merilond/usbmodem" + path, "-m", method});
+}
+
 }  // namespace taviwireless::test

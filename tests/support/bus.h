@@ -73,6 +73,10 @@ struct ServedModems {
 // (gdbus): what it prints.
 RunResult CallService(std::vector<std::string> methodAndArguments);
 
+// Likewise that of a method, with its interface, of the manager (path "") or of a modem ("/" and
+// its id).
+RunResult CallObject(const std::string& path, const std::string& method);
+
 }  // namespace taviwireless::test
 
 #endif
