@@ -123,8 +123,9 @@ void Fuzz(Input input) {
     Demand(Without(answers["AT+CPIN?"], "\r\n").find(texts.at(status)) != status.npos,
            "the SIM said so", document);
     int rssi = 0;
-    Demand(sscanf(answers["AT+CSQ"].c_str(), "\r\n+CSQ: %2d,99\r\n", &rssi) != 1 ||
-               signal == (rssi <= 31 ? rssi * 100 / 31 : 0) || signal == 0,
+    int end = 0;  // 0 when the answer has another form
+    sscanf(answers["AT+CSQ"].c_str(), "\r\n+CSQ: %2d,99\r\n%n", &rssi, &end);
+    Demand(end == 0 || signal == (rssi <= 31 ? rssi * 100 / 31 : 0) || signal == 0,
            "the signal is that of the scale", document);
     answers["AT+CGMM"] = "ERROR\r\n";
     Demand(ToUTF8(twin.GetProductName(err)) == product && err, "what is known stays", document);
