@@ -78,7 +78,7 @@ void Fuzz(Input input) {
                                                      : modem.PINSet(first, second, enable);
     isOver = true;
     const bool hasSecond = operation != kUnlock && operation != kSwitch;
-    // What stands behind a carriage return in a line comes before the next line, so to say without end.
+    // Line ends are dropped, so that an OK may come of two lines.
     said.erase(std::remove_if(said.begin(), said.end(), [](char c) { return strchr("\r\n", c); }),
                said.end());
     const bool hasOK = said.find("OK") != said.npos;
