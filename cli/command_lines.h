@@ -1,0 +1,24 @@
+#ifndef TAVIWIRELESS_CLI_COMMAND_LINES_H
+#define TAVIWIRELESS_CLI_COMMAND_LINES_H
+
+#include "base/command_line/command_line.h"
+#include "cli/options.h"
+
+namespace taviwireless::cli {
+
+using Run = void (*)(const Options& options);
+
+// Adds a command. The options outlive the reading of the command line.
+inline Command Add(const Command& group, const char* name, const char* description,
+                   Options& options, Run run) {
+    return group.AddCommand(name, description, [&options, run] { run(options); });
+}
+
+// The groups of commands that the program has.
+void AddModemCommands(const Command& program, Options& options);
+void AddWifiCommands(const Command& program, Options& options);
+void AddAPCommands(const Command& program, Options& options);
+
+}  // namespace taviwireless::cli
+
+#endif
