@@ -1,9 +1,13 @@
 #include "cli/terminal.h"
 
+#include <langinfo.h>
+#include <sys/ioctl.h>
 #include <termios.h>
 #include <unistd.h>
 
 #include <cstdio>
+#include <cstdlib>
+#include <cstring>
 #include <iostream>
 
 #include "cli/command_error.h"
@@ -48,6 +52,26 @@ std::string Printable(const std::string& text) {
         i += isC1 ? 1 : 0;
     }
     return printable;
+}
+
+int TerminalWidth() {
+    winsize size{};
+    return isatty(STDOUT_FILENO) && ioctl(STDOUT_FILENO, TIOCGWINSZ, &size) == 0 ? size.ws_col : 0;
+}
+
+bool ShowsUTF8() {
+    return strcmp(nl_langinfo(CODESET), "UTF-8") == 0;
+}
+
+std::string Coloured(Colour colour, const std::string& text) {
+    constexpr const char* kCodes[] = {"32", "33", "31", "2"};
+    const char* terminal = getenv("TERM");
+    const char* unwanted = getenv("NO_COLOR");
+    if (!isatty(STDOUT_FILENO) || terminal == nullptr || strcmp(terminal, "dumb") == 0 ||
+        (unwanted != nullptr && *unwanted != '\0')) {
+        return text;
+    }
+    return std::string("\033[") + kCodes[static_cast<int>(colour)] + "m" + text + "\033[0m";
 }
 
 void ShowProgress(const std::string& text) {

@@ -9,6 +9,17 @@ namespace taviwireless::cli {
 // terminal.
 std::string Printable(const std::string& text);
 
+// Columns of the terminal that standard output is; 0 when it is none.
+int TerminalWidth();
+
+// Whether characters beyond ASCII can be shown on standard output.
+bool ShowsUTF8();
+
+enum class Colour { kGood, kWarning, kBad, kFaint };
+// The text in a colour, where standard output is a terminal that has some and its user wants them
+// (NO_COLOR, TERM); otherwise the text.
+std::string Coloured(Colour colour, const std::string& text);
+
 // Shows on standard error what is being waited for, one line that each call replaces; the empty
 // text removes it. Nothing is shown unless standard error is a terminal.
 void ShowProgress(const std::string& text);
