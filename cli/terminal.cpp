@@ -64,7 +64,7 @@ bool ShowsUTF8() {
 }
 
 std::string Coloured(Colour colour, const std::string& text) {
-    constexpr const char* kCodes[] = {"32", "33", "31", "2"};
+    constexpr const char* kCodes[] = {"32", "33", "31", "2", "1"};
     const char* terminal = getenv("TERM");
     const char* unwanted = getenv("NO_COLOR");
     if (!isatty(STDOUT_FILENO) || terminal == nullptr || strcmp(terminal, "dumb") == 0 ||

@@ -15,7 +15,7 @@ int TerminalWidth();
 // Whether characters beyond ASCII can be shown on standard output.
 bool ShowsUTF8();
 
-enum class Colour { kGood, kWarning, kBad, kFaint };
+enum class Colour { kGood, kWarning, kBad, kFaint, kBold };
 // The text in a colour, where standard output is a terminal that has some and its user wants them
 // (NO_COLOR, TERM); otherwise the text.
 std::string Coloured(Colour colour, const std::string& text);
