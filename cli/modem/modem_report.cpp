@@ -104,9 +104,18 @@ Report DescribeAll(const std::vector<ModemState>& states) {
         return {{{"No modem is plugged in: there is no usbmodem.info file in /tmp/."}},
                 Json::arrayValue};
     }
-    Report all{{{"DEVICE", "VENDOR", "PRODUCT", "OPERATOR", "SIGNAL", "SIM", "PIN LOCK",
-                 "PIN/PUK LEFT", "NETWORK", "ADDRESS"}},
-               Json::arrayValue};
+    Report all{{},
+               Json::arrayValue,
+               {{"DEVICE"},
+                {"VENDOR", kText},
+                {"PRODUCT", kText},
+                {"OPERATOR", kText},
+                {"SIGNAL"},
+                {"SIM", kText},
+                {"PIN LOCK"},
+                {"PIN/PUK LEFT"},
+                {"NETWORK", kText},
+                {"ADDRESS"}}};
     for (const ModemState& state : states) {
         all.document.append(Describe(state).document);
         all.rows.push_back(

@@ -21,7 +21,7 @@ void ShowModem(const Options& options) {
 void ListInterfaces(const Options& options) {
     const auto access = MakeAccess(options);
     const auto interfaces = Deadline(options).Limit([&] { return access->Interfaces(); });
-    Report all{{{"MODEM", "INTERFACE"}}, Json::arrayValue};
+    Report all{{}, Json::arrayValue, {{"MODEM"}, {"INTERFACE"}}};
     for (const Interface& interface : interfaces) {
         Json::Value document;
         document["id"] = interface.id;

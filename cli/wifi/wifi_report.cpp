@@ -132,7 +132,9 @@ Report DescribeAll(const std::vector<WirelessNetwork>& networks) {
     if (networks.empty()) {
         return {{{"No network is in range."}}, Json::arrayValue};
     }
-    Report all{{{"NETWORK", "SIGNAL", "SECURITY", "CHANNEL", "BSSID"}}, Json::arrayValue};
+    Report all{{},
+               Json::arrayValue,
+               {{"NETWORK", kText}, {"SIGNAL"}, {"SECURITY", kText}, {"CHANNEL"}, {"BSSID"}}};
     for (const WirelessNetwork& network : networks) {
         const std::string essid = network.essid;
         Report one;
@@ -149,7 +151,9 @@ Report DescribeAll(const std::vector<WirelessConf>& confs) {
     if (confs.empty()) {
         return {{{"No network is saved."}}, Json::arrayValue};
     }
-    Report all{{{"NETWORK", "SECURITY", "BSSID", "ADDRESS", "LAST USED"}}, Json::arrayValue};
+    Report all{{},
+               Json::arrayValue,
+               {{"NETWORK", kText}, {"SECURITY", kText}, {"BSSID"}, {"ADDRESS"}, {"LAST USED"}}};
     for (const WirelessConf& conf : confs) {
         all.document.append(Describe(conf).document);
         all.rows.push_back({Cell(conf.network.essid), Cell(SecurityText(conf.network)),
