@@ -2,16 +2,19 @@
 #define TAVIWIRELESS_CLI_COMMAND_LINES_H
 
 #include "base/command_line/command_line.h"
+#include "cli/deadline.h"
 #include "cli/options.h"
 
 namespace taviwireless::cli {
 
 using Run = void (*)(const Options& options);
 
-// Adds a command. The options outlive the reading of the command line.
+// Adds a command, which may take the time of --timeout. The options outlive the reading of the
+// command line.
 inline Command Add(const Command& group, const char* name, const char* description,
                    Options& options, Run run) {
-    return group.AddCommand(name, description, [&options, run] { run(options); });
+    return group.AddCommand(name, description,
+                            [&options, run] { Deadline(options).Limit([&] { run(options); }); });
 }
 
 // The groups of commands that the program has.

@@ -1,49 +1,72 @@
 // taviwireless, the library's functions for a person or a script.
+#include <fcntl.h>
 #include <signal.h>
 #include <stdio.h>
 #include <syslog.h>
+#include <unistd.h>
 
+#include <algorithm>
 #include <iostream>
 #include <new>
 
 #include "cli/command_error.h"
 #include "cli/command_lines.h"
+#include "cli/completed_arguments.h"
 #include "cli/report.h"
+#include "cli/terminal.h"
 
 namespace taviwireless::cli {
 
 namespace {
 
 constexpr char kFooter[] =
+    "taviwireless help COMMAND tells more of a command.\n"
     "Exit status: 0 done, 1 failed, 2 wrong usage, 3 no such modem or network, 4 busy: it "
     "has a connection already, or is connecting; 5 the modem service is not running.\n"
     "With --json, a failure is {\"error\": SENTENCE} on standard output.\n"
-    "Details of failures are in the system log; --verbose shows them here as well.";
+    "Details of failures are in the system log; --verbose shows them here as well.\n";
 
 void Define(const Command& program, Options& options) {
     program.SetVersion("taviwireless " TAVI_VERSION);
-    program.AddFlag("--json", options.json, "Print JSON instead of tables");
+    program.AddFlag("--json", options.json, "Print JSON instead of text");
+    program
+        .AddOption("--timeout", options.timeout,
+                   "Longest time that a command may take, without that in which it reads input, in "
+                   "seconds, from 1 to 3600",
+                   "SECONDS")
+        .Between(1, 3600);
     program.AddFlag(
         "-v,--verbose", [] { openlog("taviwireless", LOG_PERROR, LOG_USER); },
         "Show the library's log on standard error as well");
-    program.SetFooter(kFooter);
     program.RequireCommand();
     AddModemCommands(program, options);
     AddWifiCommands(program, options);
     AddAPCommands(program, options);
+    program.AddCompletion("complete-words", CompletedArguments());
+    program.SetFooter(kFooter);  // of the program's help alone
+}
+
+// A descriptor that is closed would become that of the next file, or modem, that is opened: what is
+// printed would be sent there.
+void RequireOutput() {
+    for (const int descriptor : {STDIN_FILENO, STDOUT_FILENO, STDERR_FILENO}) {
+        const bool isClosed = fcntl(descriptor, F_GETFD) < 0;
+        if (isClosed && open("/dev/null", O_RDWR) == descriptor && descriptor == STDOUT_FILENO) {
+            throw CommandError(kFailure, "standard output is closed; nothing was done");
+        }
+    }
 }
 
 void RunCommandLine(int argc, char** argv, Options& options) {
     try {
-        const bool isRun =
-            ReadCommandLine(argc, argv, "taviwireless",
-                            "Wireless connectivity of the appliance: USB modems and Wi-Fi",
-                            [&](const Command& program) { Define(program, options); });
-        if (isRun && !std::cout.flush()) {
-            throw CommandError(kFailure, "cannot write the output");
-        }
+        RequireOutput();
+        ReadCommandLine(argc, argv, "taviwireless",
+                        "Wireless connectivity of the appliance: USB modems and Wi-Fi",
+                        [&](const Command& program) { Define(program, options); });
+        FlushOutput();
     } catch (const UsageError& error) {
-        throw CommandError(kUsage, std::string(error.what()) + "; see taviwireless --help");
+        options.json = std::count(argv, argv + argc, std::string("--json")) > 0;
+        throw CommandError(kUsage, Printable(error.what()));
     }
 }
 
@@ -54,6 +77,7 @@ void RunCommandLine(int argc, char** argv, Options& options) {
 int main(int argc, char** argv) {
     using namespace taviwireless::cli;
     signal(SIGCHLD, SIG_DFL);  // what started this may ignore it, and then no program has a result
+    signal(SIGPIPE, [](int) {});  // not ignored, which programs that are started would inherit
     Options options;
     try {
         try {

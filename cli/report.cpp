@@ -3,10 +3,13 @@
 #include <json/writer.h>
 
 #include <algorithm>
+#include <cerrno>
+#include <cstring>
 #include <iostream>
 #include <numeric>
 
 #include "base/wrap.h"
+#include "cli/command_error.h"
 #include "cli/terminal.h"
 #include "cli/text_width.h"
 
@@ -211,6 +214,14 @@ void Print(const Options& options, const Report& report) {
     std::cout << Render(options, report);
 }
 
+void FlushOutput() {
+    errno = 0;
+    if (!std::cout.flush()) {
+        const std::string reason = errno == 0 ? "" : std::string(": ") + strerror(errno);
+        throw CommandError(kFailure, "the output could not be written" + reason);
+    }
+}
+
 RowPrinter::RowPrinter(const Options& options, std::vector<Column> columns)
     : options_(options), columns_(std::move(columns)) {}
 
@@ -221,8 +232,9 @@ void RowPrinter::Add(const std::vector<std::string>& row, const Json::Value& doc
     }
     const ListText list(columns_, {});
     ShowProgress("");
-    std::cout << (isFirst_ ? list.Titles() : "") << list.Row(row) << std::flush;
+    std::cout << (isFirst_ ? list.Titles() : "") << list.Row(row);
     isFirst_ = false;
+    FlushOutput();
 }
 
 void RowPrinter::Finish(const std::string& withoutRows) {
@@ -237,7 +249,8 @@ void PrintFailure(const Options& options, const std::string& sentence) {
         Report report;
         report.document["error"] = sentence;
         Print(options, report);
-    } else {
+    }
+    if (!options.json || !std::cout.flush()) {
         std::cerr << "taviwireless: " << sentence << '\n';
     }
 }

@@ -49,6 +49,9 @@ std::string Render(const Options& options, const Report& report, bool documentIn
 // Prints on standard output; what ShowProgress shows goes away.
 void Print(const Options& options, const Report& report);
 
+// Writes out what was printed. Throws CommandError where that cannot be done.
+void FlushOutput();
+
 // A list of which each row is printed as it is known; with --json, one array at the end. At a
 // terminal that is too narrow for the columns a row is a block of lines.
 class RowPrinter {
@@ -73,7 +76,8 @@ void PrintOutcome(const Options& options, const std::string& sentence, const Sta
     Print(options, options.json ? state() : Report{rows, {}});
 }
 
-// Reports a failure: {"error": SENTENCE} on standard output, or the sentence on standard error.
+// Reports a failure: {"error": SENTENCE} on standard output, or the sentence on standard error, where
+// it also is when the document cannot be written.
 void PrintFailure(const Options& options, const std::string& sentence);
 
 }  // namespace taviwireless::cli

@@ -1,95 +1,108 @@
 #include "cli/terminal.h"
 
-#include <langinfo.h>
-#include <sys/ioctl.h>
-#include <termios.h>
+#include <bsd/readpassphrase.h>
+#include <glib.h>
+#include <strings.h>
 #include <unistd.h>
 
-#include <cstdio>
+#include <algorithm>
+#include <cerrno>
 #include <cstdlib>
 #include <cstring>
 #include <iostream>
 
+#include "base/terminal_columns.h"
 #include "cli/command_error.h"
+#include "cli/deadline.h"
 
 namespace taviwireless::cli {
 
 namespace {
 
-// Switches the terminal's echo off while it lives.
-class NoEcho {
-  public:
-    NoEcho() : isTerminal_(tcgetattr(STDIN_FILENO, &settings_) == 0) {
-        if (isTerminal_) {
-            termios silent = settings_;
-            silent.c_lflag &= ~static_cast<tcflag_t>(ECHO);
-            tcsetattr(STDIN_FILENO, TCSAFLUSH, &silent);
-        }
-    }
-    ~NoEcho() {
-        if (isTerminal_) {
-            tcsetattr(STDIN_FILENO, TCSAFLUSH, &settings_);
-            std::cerr << '\n';
-        }
-    }
-    NoEcho(const NoEcho&) = delete;
-    NoEcho& operator=(const NoEcho&) = delete;
+std::string Environment(const char* name) {
+    const char* value = getenv(name);
+    return value == nullptr ? "" : value;
+}
 
-  private:
-    termios settings_{};
-    bool isTerminal_;
-};
+// Whether the character moves the cursor, or the text behind it to its front.
+bool Steers(gunichar code) {
+    const GUnicodeType type = g_unichar_type(code);
+    const bool isDirection = (code >= 0x200E && code <= 0x200F) ||
+                             (code >= 0x202A && code <= 0x202E) ||
+                             (code >= 0x2066 && code <= 0x2069);
+    return type == G_UNICODE_CONTROL || type == G_UNICODE_LINE_SEPARATOR ||
+           type == G_UNICODE_PARAGRAPH_SEPARATOR || isDirection;
+}
+
+std::string ReadLine(const std::string& what) {
+    std::string line;
+    if (!std::getline(std::cin, line)) {
+        throw CommandError(kFailure, "standard input ended before there was a line for: " + what);
+    }
+    return line;
+}
 
 }  // namespace
 
 std::string Printable(const std::string& text) {
+    const bool onlyASCII = isatty(STDOUT_FILENO) != 0 && !ShowsUTF8();
     std::string printable;
-    for (size_t i = 0; i < text.size(); ++i) {
-        const auto byte = static_cast<unsigned char>(text[i]);
-        const auto next = static_cast<unsigned char>(text[i + 1]);      // zero at the end
-        const bool isC1 = byte == 0xC2 && next >= 0x80 && next < 0xA0;  // in UTF-8, two bytes
-        printable += byte < 0x20 || byte == 0x7F || isC1 ? '?' : text[i];
-        i += isC1 ? 1 : 0;
+    for (size_t place = 0; place < text.size();) {
+        const char* next = &text[place];
+        const auto left = static_cast<gssize>(text.size() - place);
+        const gunichar code = g_utf8_get_char_validated(next, left);
+        const bool isValid = code < static_cast<gunichar>(-2);  // else one of two mistakes
+        const auto bytes = isValid ? static_cast<size_t>(g_utf8_next_char(next) - next) : 1;
+        const bool isShown = isValid && !Steers(code) && (bytes == 1 || !onlyASCII);
+        printable += isShown ? text.substr(place, bytes) : "?";
+        place += bytes;
     }
     return printable;
 }
 
 int TerminalWidth() {
-    winsize size{};
-    return isatty(STDOUT_FILENO) && ioctl(STDOUT_FILENO, TIOCGWINSZ, &size) == 0 ? size.ws_col : 0;
+    return ColumnsOf(STDOUT_FILENO);
 }
 
+// The name of the locale tells: the appliance may not have the one that a remote user has set.
 bool ShowsUTF8() {
-    return strcmp(nl_langinfo(CODESET), "UTF-8") == 0;
+    std::string locale;
+    for (const char* name : {"LC_ALL", "LC_CTYPE", "LANG"}) {
+        locale = locale.empty() ? Environment(name) : locale;
+    }
+    std::string codeset = locale.substr(std::min(locale.find('.'), locale.size()));
+    codeset.erase(std::remove(codeset.begin(), codeset.end(), '-'), codeset.end());
+    return strncasecmp(codeset.c_str(), ".utf8", 5) == 0;
+}
+
+bool TakesEscapes(int descriptor) {
+    const std::string terminal = Environment("TERM");
+    return isatty(descriptor) != 0 && !terminal.empty() && terminal != "dumb" &&
+           terminal != "unknown";
 }
 
 std::string Coloured(Colour colour, const std::string& text) {
     constexpr const char* kCodes[] = {"32", "33", "31", "2", "1"};
-    const char* terminal = getenv("TERM");
-    const char* unwanted = getenv("NO_COLOR");
-    if (!isatty(STDOUT_FILENO) || terminal == nullptr || strcmp(terminal, "dumb") == 0 ||
-        (unwanted != nullptr && *unwanted != '\0')) {
+    if (!TakesEscapes(STDOUT_FILENO) || !Environment("NO_COLOR").empty()) {
         return text;
     }
     return std::string("\033[") + kCodes[static_cast<int>(colour)] + "m" + text + "\033[0m";
 }
 
-void ShowProgress(const std::string& text) {
-    if (isatty(STDERR_FILENO)) {
-        std::fprintf(stderr, "\r\033[K%s", text.c_str());
-    }
-}
-
 std::string ReadSecret(const std::string& prompt) {
-    if (isatty(STDIN_FILENO)) {
-        ShowProgress("");
-        std::cerr << prompt << ": ";
+    const Untimed untimed;
+    ShowProgress("");
+    if (isatty(STDIN_FILENO) == 0) {
+        return ReadLine(prompt);
     }
-    const NoEcho noEcho;
-    std::string secret;
-    if (!std::getline(std::cin, secret)) {
-        throw CommandError(kFailure, "standard input ended before there was a line for: " + prompt);
+    char line[4096];  // longer than a terminal's line
+    if (readpassphrase((prompt + ": ").c_str(), line, sizeof line, RPP_REQUIRE_TTY) == nullptr) {
+        throw CommandError(kFailure, "cannot read from the terminal (" +
+                                         std::string(strerror(errno)) +
+                                         "); a pipe can give a line for: " + prompt);
     }
+    const std::string secret = line;
+    explicit_bzero(line, sizeof line);
     return secret;
 }
 
@@ -105,6 +118,7 @@ bool Confirm(const std::string& question, const std::string& withoutTerminal) {
     if (!isatty(STDIN_FILENO)) {
         throw CommandError(kFailure, withoutTerminal);
     }
+    const Untimed untimed;
     ShowProgress("");
     std::cerr << question << " [yes/no] ";
     std::string answer;

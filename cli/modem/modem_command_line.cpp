@@ -6,22 +6,10 @@ namespace taviwireless::cli {
 
 namespace {
 
-// Adds one command about modems, with what all of them take.
-Command AddForModems(const Command& group, const char* name, const char* description,
-                     Options& options, Run run) {
-    const Command command = Add(group, name, description, options, run);
-    command
-        .AddOption("--timeout", options.timeout,
-                   "Longest time that this may take once its input is read, in seconds",
-                   "SECONDS:INT in [1 - 3600]")
-        .Between(1, 3600);
-    return command;
-}
-
 // Adds a command about one modem.
 Command AddForOne(const Command& group, const char* name, const char* description, Options& options,
                   Run run) {
-    const Command command = AddForModems(group, name, description, options, run);
+    const Command command = Add(group, name, description, options, run);
     command.AddOption("ID", options.id, "Device id, such as usbmodem0").Required();
     return command;
 }
@@ -70,15 +58,13 @@ void AddModemCommands(const Command& app, Options& options) {
     const Command modem = app.AddGroup("modem", "USB modems that are plugged in");
     modem.AddFlag("--direct", options.direct, "Ask the modems without the modem service");
 
-    AddForModems(
-        modem, "list",
+    Add(modem, "list",
         "List the modems and what is known of them; asks only those that nobody has asked for 5 "
         "minutes",
         options, ListModems);
     AddForOne(modem, "show", "Ask one modem, and show it and its profile", options, ShowModem)
         .AddFlag("--show-secrets", options.showSecrets, "Show the password as well");
-    AddForModems(
-        modem, "watch",
+    Add(modem, "watch",
         "Show the modems, or one, anew at every change that the service tells of, until SIGINT or "
         "SIGTERM; --timeout is that of one look",
         options, WatchModems)
@@ -86,8 +72,7 @@ void AddModemCommands(const Command& app, Options& options) {
     AddPINCommands(modem, options);
     AddProfileCommands(modem, options);
     AddConnectionCommands(modem, options);
-    AddForModems(modem, "interfaces", "List the network interfaces of the modems", options,
-                 ListInterfaces);
+    Add(modem, "interfaces", "List the network interfaces of the modems", options, ListInterfaces);
 }
 
 }  // namespace taviwireless::cli

@@ -98,7 +98,7 @@ TEST(ServiceCommands, FailuresAreOneSentenceAndAnExitStatus) {
     WriteFile("/tmp/usbmodem.info9", "");
     Take({
         {"show usbmodem1", "", kNotFound, "taviwireless: there is no modem usbmodem1; "},
-        {"unlock \xff", "", kNotFound, "taviwireless: there is no modem \xff; "},
+        {"unlock \xff", "", kNotFound, "taviwireless: there is no modem ?; "},
         {"profile set usbmodem1 apn=x", "", kNotFound, "there is no modem usbmodem1; "},
         {"connect usbmodem9", "", kFailure, "modem usbmodem9 is not ready: "},
         {"profile reset usbmodem0", "", kUsage, "the modem service cannot reset a profile; "},

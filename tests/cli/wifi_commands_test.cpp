@@ -149,7 +149,7 @@ TEST_F(WifiCommands, FailuresAreOneSentenceAndAnExitStatus) {
         {{"connect", "X", "--static", "1.2.3.4/24,1.2.5.1"}, "", kUsage, "the gateway 1.2.5.1 is "},
         {{"adhoc", "My Net"}, "", kUsage, "the name of an ad-hoc network may not hold a blank"},
         {{"mode", "client"}, "", kFailure, "the mode of the adapter could not be changed"},
-        {{"mode", "monitor"}, "", kUsage, "MODE: monitor not in {ap,client}"},
+        {{"mode", "monitor"}, "", kUsage, "MODE: \"monitor\" is none of ap, client; "},
     };
     for (const auto& failing : kCases) {
         SCOPED_TRACE(failing.sentence);

@@ -1,5 +1,5 @@
-#ifndef TAVIWIRELESS_BASE_TERMINAL_WIDTH_H
-#define TAVIWIRELESS_BASE_TERMINAL_WIDTH_H
+#ifndef TAVIWIRELESS_BASE_TERMINAL_COLUMNS_H
+#define TAVIWIRELESS_BASE_TERMINAL_COLUMNS_H
 
 #include <sys/ioctl.h>
 #include <unistd.h>
@@ -8,7 +8,7 @@ namespace taviwireless {
 
 // Columns of the terminal that a descriptor is; 0 when it is none. A serial line does not know its
 // own: the usual 80.
-inline int TerminalWidth(int descriptor) {
+inline int ColumnsOf(int descriptor) {
     if (isatty(descriptor) == 0) {
         return 0;
     }
