@@ -148,7 +148,10 @@ bool ReadCommandLine(int argc, char** argv, const char* name, const char* descri
     define(Command(&app));
     const std::vector<std::string> words(argv + 1, argv + argc);
     const command_line::Position position = command_line::Find(app, words);
-    if (position.wantsHelp && position.unknown.empty()) {
+    if (!position.unknown.empty()) {
+        throw UsageError(command_line::UnknownWord(app, position));
+    }
+    if (position.wantsHelp) {
         PrintHelp(*position.command);
         return false;
     }
@@ -160,7 +163,7 @@ bool ReadCommandLine(int argc, char** argv, const char* name, const char* descri
     } catch (const CLI::CallForVersion& version) {
         std::cout << version.what() << '\n';
     } catch (const CLI::ParseError& error) {
-        throw UsageError(command_line::Mistake(app, words, error));
+        throw UsageError(command_line::Mistake(position, error));
     }
     return false;
 }

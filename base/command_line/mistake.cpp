@@ -97,7 +97,7 @@ std::string OptionMistake(const Position& position) {
     return "there is no option " + Quoted(name) + In(*position.command) + Guess(name, names);
 }
 
-std::string UnknownWord(CLI::App& program, const Position& position) {
+std::string SentenceOnUnknown(CLI::App& program, const Position& position) {
     if (position.unknown[0] == '-' && position.unknown.size() > 1 && !position.onlyArguments) {
         return OptionMistake(position);
     }
@@ -156,6 +156,10 @@ std::string WrongCount(const CLI::App& command, const std::string& what) {
     return "--" + name + " takes no value";
 }
 
+std::string SeeHelp(const Position& position) {
+    return "; see " + FullName(*position.command) + " --help";
+}
+
 }  // namespace
 
 std::string Guess(const std::string& wrong, const Words& words) {
@@ -163,19 +167,20 @@ std::string Guess(const std::string& wrong, const Words& words) {
     return meant.empty() ? "" : " (did you mean " + Quoted(meant) + "?)";
 }
 
-std::string Mistake(CLI::App& program, const Words& words, const CLI::ParseError& error) {
-    const Position position = Find(program, words);
+std::string UnknownWord(CLI::App& program, const Position& position) {
+    return SentenceOnUnknown(program, position) + SeeHelp(position);
+}
+
+std::string Mistake(const Position& position, const CLI::ParseError& error) {
     std::string sentence = error.what();  // for a value that is refused: the check's own
-    if (!position.unknown.empty()) {
-        sentence = UnknownWord(program, position);
-    } else if (dynamic_cast<const CLI::RequiredError*>(&error) != nullptr) {
+    if (dynamic_cast<const CLI::RequiredError*>(&error) != nullptr) {
         sentence = MissingWord(*position.command);
     } else if (dynamic_cast<const CLI::ArgumentMismatch*>(&error) != nullptr) {
         sentence = WrongCount(*position.command, sentence);
     } else if (dynamic_cast<const CLI::ValidationError*>(&error) == nullptr) {
         sentence = WrongCompany(*position.command);
     }
-    return sentence + "; see " + FullName(*position.command) + " --help";
+    return sentence + SeeHelp(position);
 }
 
 }  // namespace taviwireless::command_line

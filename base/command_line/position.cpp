@@ -16,8 +16,8 @@ const CLI::Option* FindOption(const CLI::App* command, const std::string& name) 
     return nullptr;
 }
 
-CLI::App* FindCommand(const CLI::App& group, const std::string& name) {
-    for (CLI::App* command : CommandsIn(group)) {
+CLI::App* FindCommand(CLI::App& group, const std::string& name) {
+    for (CLI::App* command : group.get_subcommands([](CLI::App*) { return true; })) {
         if (command->get_name() == name) {
             return command;
         }

@@ -41,8 +41,9 @@ std::string HelpText(const CLI::App& command, size_t columns);
 // What was perhaps meant instead of a wrong word, in brackets; empty when none of these is near.
 std::string Guess(const std::string& wrong, const Words& words);
 
-// What is wrong with the words, when CLI11 says this of them, in a sentence.
-std::string Mistake(CLI::App& program, const Words& words, const CLI::ParseError& error);
+// What is wrong with a command line, in a sentence: that of an unknown word, or what CLI11 found.
+std::string UnknownWord(CLI::App& program, const Position& position);
+std::string Mistake(const Position& position, const CLI::ParseError& error);
 
 }  // namespace taviwireless::command_line
 
