@@ -11,6 +11,7 @@
 #include "cli/wifi/joining.h"
 #include "cli/wifi/saved_networks.h"
 #include "cli/wifi/station.h"
+#include "cli/wifi/supplicant_events.h"
 #include "cli/wifi/wifi_commands.h"
 #include "cli/wifi/wifi_report.h"
 #include "wireless/rules/paths.h"
@@ -70,9 +71,8 @@ void ConnectAutomatically(const Options& options) {
     RequireNobodyJoins();
     // The library would end the connection that exists.
     if (IsInNetwork(TAVIWirelessConnStatusGet())) {
-        throw CommandError(kBusy, WifiInterface() +
-                                      " has a connection already; taviwireless wifi disconnect "
-                                      "ends it");
+        PrintConnection(options);
+        return;
     }
     if (SavedNetworks().empty()) {
         throw CommandError(kNotFound, "no network is saved; taviwireless wifi connect saves one");
@@ -80,11 +80,14 @@ void ConnectAutomatically(const Options& options) {
     ShowProgress("Joining a saved network ...");
     const FormerConnection none;
     const UndoneBySignal guard([&] { none.Undo(options); });
+    SupplicantEvents events;
     // The library reports success, too, when it cannot tell whether the radio may be used.
     if (TAVIWirelessAutoConnect() != 0 || !IsInNetwork(TAVIWirelessConnStatusGet())) {
+        const std::string reason = events.WhyNotJoined();
         throw CommandError(kFailure,
-                           "none of the saved networks could be joined; is one in range, and its "
-                           "key still right?");
+                           "none of the saved networks could be joined; " +
+                               (reason.empty() ? "is one in range, and its key still right?"
+                                               : "of one of them, " + reason));
     }
     if (!UseLeasedGateway()) {
         throw CommandError(kFailure, "connected, but could not make " + ConnectionGateway() +

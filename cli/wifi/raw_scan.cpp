@@ -27,6 +27,25 @@ std::string ReadEssid(const std::string& quoted) {
     return "";
 }
 
+// The name of a suite of key management that is newer than WPA2; empty for others, which are rare.
+const char* NewerWord(int suite) {
+    switch (suite) {
+        case 8:  // SAE
+        case 9:
+        case 24:
+        case 25:
+            return "WPA3";
+        case 11:  // Suite B
+        case 12:
+        case 13:
+            return "WPA3EAP";
+        case 18:
+            return "OWE";
+        default:
+            return "";
+    }
+}
+
 // Reads a suite of key management, by name, or by number where the tool has no name for it.
 void ReadSuites(const char* suites, bool isWpa1, RawNetwork& raw) {
     int32_t& auth = raw.network.auth;
@@ -37,9 +56,8 @@ void ReadSuites(const char* suites, bool isWpa1, RawNetwork& raw) {
         auth = isWpa1 && auth != WIRELESS_AUTH_WPA2_EAP ? WIRELESS_AUTH_WPA_EAP
                                                         : WIRELESS_AUTH_WPA2_EAP;
     } else if (const char* number = Behind("unknown (", suites); number != nullptr) {
-        constexpr int kOwe = 18;
         auth = WIRELESS_AUTH_UNKNOWN;
-        raw.newerSecurity = atoi(number) == kOwe ? "OWE" : "WPA3";
+        raw.newerSecurity = NewerWord(atoi(number));
     }
 }
 

@@ -27,6 +27,7 @@ constexpr Reason kReasons[] = {
     {"CTRL-EVENT-EAP-FAILURE", "its access point refused user or password", 3},
     {"reason=WRONG_KEY", "its access point refused the key", 3},
 };
+constexpr char kPing[] = "PING";  // it answers
 constexpr char kEnd[] = "CTRL-EVENT-TERMINATING";
 
 // A socket to which the supplicant sends its events; none while it does not run.
@@ -82,17 +83,18 @@ void SupplicantEvents::Listen() {
 
 void SupplicantEvents::Hear(int socket) {
     constexpr int kPatience = 500;  // ms; one that was killed says nothing
-    char text[2048];
-    while (!IsOver(kPatience, socket)) {
-        const ssize_t size = recv(socket, text, sizeof text, MSG_DONTWAIT);
-        if (size <= 0 && send(socket, "PING", 4, MSG_DONTWAIT) < 0) {
-            return;
+    bool isOver = false;
+    for (bool hasEnded = false; !isOver && !hasEnded;) {
+        isOver = IsOver(kPatience, socket);
+        bool isQuiet = true;
+        char text[2048];
+        for (ssize_t size; (size = recv(socket, text, sizeof text, MSG_DONTWAIT)) > 0;) {
+            const std::string event(text, static_cast<size_t>(size));
+            Note(event);
+            isQuiet = false;
+            hasEnded = hasEnded || event.find(kEnd) != std::string::npos;
         }
-        const std::string event(text, size > 0 ? static_cast<size_t>(size) : 0);
-        Note(event);
-        if (event.find(kEnd) != std::string::npos) {
-            return;
-        }
+        hasEnded = hasEnded || (isQuiet && send(socket, kPing, sizeof kPing - 1, MSG_DONTWAIT) < 0);
     }
 }
 
