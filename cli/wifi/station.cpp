@@ -153,7 +153,7 @@ bool SetNameServers(const std::string& nameServers) {
     }
     // Leaving the network puts the copy back that was made when it was joined. Where there was
     // nothing to copy, an empty one takes these away again.
-    std::ofstream(wireless::kResolverBackup, std::ios::app);
+    const std::ofstream backup(wireless::kResolverBackup, std::ios::app);
     std::ofstream resolver(wireless::kResolver);
     for (const std::string& server : Split(nameServers, ',')) {
         resolver << "nameserver " << server << '\n';
