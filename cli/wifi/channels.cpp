@@ -1,6 +1,7 @@
 #include "cli/wifi/channels.h"
 
 #include <algorithm>
+#include <cstdint>
 #include <cstdlib>
 #include <map>
 #include <set>
@@ -42,7 +43,8 @@ int Share(const WirelessNetwork& network, int channel, const Band& band) {
 // The picture of one band.
 class Picture {
   public:
-    Picture(const Band& band, const std::vector<NetworkInRange>& networks) : band_(band) {
+    Picture(const Band& band, const std::vector<NetworkInRange>& networks)
+        : band_(band), channelColumns_(band.isUpper ? 4 : 3) {
         std::set<int> channels;
         for (const NetworkInRange& one : networks) {
             if (IsIn(band, one.network)) {
@@ -58,17 +60,18 @@ class Picture {
         Fit();
     }
 
-    void AddTo(Report& report) const {
-        if (networks_.empty()) {
-            return;
-        }
+    bool IsEmpty() const { return networks_.empty(); }
+    // Columns that are left for the names.
+    size_t NameColumns() const { return nameColumns_; }
+
+    void AddTo(Report& report, size_t nameColumns) const {
         if (!report.rows.empty()) {
             report.rows.emplace_back();
         }
         report.rows.push_back({band_.title, Ruler()});
         for (const NetworkInRange& one : networks_) {
             const std::string name = (one.isInUse ? "* " : "") + NameOf(one.network);
-            report.rows.push_back({Cut(name, nameColumns_), Strip([&](int channel) {
+            report.rows.push_back({Cut(name, nameColumns), Strip([&](int channel) {
                                        return Share(one.network, channel, band_);
                                    }),
                                    std::to_string(one.network.signal) + "%"});
@@ -110,11 +113,14 @@ class Picture {
 
     template <typename PercentOf>
     std::string Strip(const PercentOf& percentOf) const {
+        // Channels that do not overlap stand apart.
+        const size_t gap = band_.isUpper && channelColumns_ > 1 ? 1 : 0;
         std::string strip;
         for (const int channel : channels_) {
-            for (size_t i = 0; i < channelColumns_; ++i) {
+            for (size_t i = gap; i < channelColumns_; ++i) {
                 strip += Level(percentOf(channel));
             }
+            strip.append(gap, ' ');
         }
         return strip;
     }
@@ -148,19 +154,28 @@ class Picture {
     const Band& band_;
     std::vector<NetworkInRange> networks_;
     std::vector<int> channels_;
-    size_t channelColumns_ = 3;
+    size_t channelColumns_;
     size_t nameColumns_ = 0;
 };
 
 }  // namespace
 
 Report DescribeChannels(const std::vector<NetworkInRange>& networks) {
-    Report report{{}, Json::arrayValue};
+    std::vector<Picture> pictures;
+    size_t nameColumns = SIZE_MAX;  // the same for all, as they stand in one table
     for (const Band& band : kBands) {
-        Picture(band, networks).AddTo(report);
+        Picture picture(band, networks);
+        if (!picture.IsEmpty()) {
+            nameColumns = std::min(nameColumns, picture.NameColumns());
+            pictures.push_back(picture);
+        }
     }
-    if (report.rows.empty()) {
-        report.rows = {{"No network is in range."}};
+    if (pictures.empty()) {
+        return {{{"No network is in range."}}, Json::arrayValue};
+    }
+    Report report{{}, Json::arrayValue};
+    for (const Picture& picture : pictures) {
+        picture.AddTo(report, nameColumns);
     }
     return report;
 }

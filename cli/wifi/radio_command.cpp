@@ -9,26 +9,26 @@
 #include "cli/wifi/wifi_report.h"
 #include "wireless/rules/paths.h"
 #include "wireless/system/ap_store.h"
-#include "wireless/system/files.h"
 
 namespace taviwireless::cli {
 
 namespace {
 
-// Stores whether the radio may be used, with the other settings of this adapter. Where none are
-// stored, it may be.
-void StoreRadio(bool isOn) {
-    const bool isStored = !wireless::IsMissing(wireless::kAPSettings);
-    if (isOn && (!isStored || TAVIWirelessCheckBlock() == 1)) {
-        return;
-    }
+// The section of this adapter's settings. Throws when nobody knows which adapter it is.
+std::string SectionOfTheAdapter() {
     char product[1024];
     if (VEXACFileGetKeyValue(wireless::kAdapterInfo, "PRODUCT", product, sizeof product) <= 0) {
         throw CommandError(kFailure, std::string(wireless::kAdapterInfo) +
                                          " does not name the adapter; unplug it and plug it in");
     }
-    wireless::FindAPSection(product, __FILE_NAME__, __LINE__);  // makes a store that is missing
-    if (VEXACFileSetSectionValue(wireless::kAPSettings, product, "unblock", isOn ? "yes" : "no",
+    return product;
+}
+
+// Stores whether the radio may be used, with the other settings of this adapter.
+void StoreRadio(const std::string& section, const char* mayBeUsed) {
+    // Makes a store that is missing.
+    wireless::FindAPSection(section.c_str(), __FILE_NAME__, __LINE__);
+    if (VEXACFileSetSectionValue(wireless::kAPSettings, section.c_str(), "unblock", mayBeUsed,
                                  wireless::kSectionLine) != 0) {
         throw CommandError(kFailure, std::string("cannot store that in ") + wireless::kAPSettings +
                                          ", which may not be writable, or held by another program");
@@ -48,9 +48,12 @@ void SwitchRadio(const Options& options) {
     const bool isOn = options.mode == "on";
     if (!isOn) {
         RequireNoAccessPoint();
+        const std::string section = SectionOfTheAdapter();
         LeaveNetwork();
+        StoreRadio(section, "no");
+    } else if (TAVIWirelessCheckBlock() != 1) {  // where nothing is stored, it may be used
+        StoreRadio(SectionOfTheAdapter(), "yes");
     }
-    StoreRadio(isOn);
     if (!SetRadioSwitch(isOn)) {
         throw CommandError(kFailure,
                            "the setting is stored, but the kernel does not let the radio "

@@ -92,10 +92,11 @@ class Watch {
     std::string InPlace(const std::string& line, const std::string& percent) {
         constexpr char kClearLine[] = "\r\033[K";
         constexpr size_t kMost = 60;
-        const auto width = static_cast<size_t>(std::max(TerminalWidth() - 1, 1));
-        const std::string now = Cut(line, width - std::min(percent.size(), width - 1)) + percent;
-        const size_t room = std::min(width - std::min(now.size() + 2, width), kMost);
-        while (signals_.size() > std::max<size_t>(room, 1)) {
+        const auto width = static_cast<size_t>(std::max(TerminalWidth() - 1, 10));
+        const size_t least = percent.empty() ? 0 : width / 4;  // of the history
+        const std::string now = Cut(line, width - percent.size() - least) + percent;
+        const size_t room = std::min(std::max(width - std::min(now.size(), width), least), kMost);
+        while (signals_.size() + 2 > std::max<size_t>(room, 3)) {
             signals_.pop_front();
         }
         std::string history;
@@ -104,7 +105,7 @@ class Watch {
         }
         const bool isNew = !line_.empty() && line != line_;
         return (isNew ? "\n" : kClearLine) + now +
-               (percent.empty() || room == 0 ? "" : "  " + history);
+               (percent.empty() || room < 3 ? "" : "  " + history);
     }
 
     void Show(const std::string& text) {

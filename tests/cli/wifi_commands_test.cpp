@@ -118,6 +118,8 @@ TEST_F(WifiCommands, AScanShowsWhatIsHiddenNewerInUseAndSaved) {
               "* Newer                           :::===+++===:::  60%\n"
               "(hidden)  :::---===---:::                          50%\n"
               "all       :::---===+++***%%%+++::::::===+++===:::\n");
+    AddScanner(tools, {ScanLine(6, "My Home", "00:11:22:33:44:aa", 76, "11b/g/n", "NONE") +
+                       ScanLine(36, std::string(32, 'n'), "00:11:22:33:44:ab", 9, "11a", "NONE")});
     for (const size_t columns : {40, 80, 200}) {
         const std::string picture =
             Shell("script -qec 'stty cols " + std::to_string(columns) + "; LC_ALL=C.UTF-8 " +
