@@ -5,6 +5,8 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include <algorithm>
+#include <cerrno>
 #include <chrono>
 #include <csignal>
 #include <filesystem>
@@ -20,6 +22,8 @@
 namespace taviwireless::cli {
 
 namespace {
+
+using Clock = std::chrono::steady_clock;
 
 // Of the signals that end a program, those that are not ignored.
 sigset_t EndingSignals() {
@@ -64,7 +68,6 @@ void Reap() {
 // Ends all that was started, each as it likes if it is quick. What a process that ends has started
 // becomes a child of this one, as its reaper.
 void EndChildren() {
-    using Clock = std::chrono::steady_clock;
     constexpr std::chrono::milliseconds kPatience(400);
     constexpr std::chrono::milliseconds kPause(5);
     for (const int number : {SIGTERM, SIGKILL}) {
@@ -98,28 +101,35 @@ void EndChildren() {
 // What the program does while its child works.
 class Waiting {
   public:
-    Waiting(pid_t child, int done, const sigset_t& signals)
-        : child_(child), done_(done), signals_(signals) {}
+    Waiting(pid_t child, int done, const sigset_t& signals, std::optional<int> seconds)
+        : child_(child), done_(done), signals_(signals), seconds_(seconds) {}
 
-    [[noreturn]] void Run(const std::function<void()>& undo) {
+    [[noreturn]] void Run(const UndoneBySignal::Undo& undo) {
         const int number = AwaitSignal();
         kill(child_, SIGKILL);
         waitpid(child_, nullptr, 0);
         char byte;
         if (read(done_, &byte, 1) != 1) {
             EndChildren();
-            undo();
+            undo(number != kTimeIsOver ? "interrupted"
+                                       : "not done within " + std::to_string(*seconds_) + " s");
             std::cout.flush();
+        }
+        if (number == kTimeIsOver) {
+            _exit(kFailure);
         }
         DieOf(number);
     }
 
   private:
+    static constexpr int kTimeIsOver = 0;
+
     // Returns the signal that this program, or the child, has got. Ends with the child.
     int AwaitSignal() {
+        const auto end = Clock::now() + std::chrono::seconds(seconds_.value_or(0));
         for (;;) {
-            const int number = sigwaitinfo(&signals_, nullptr);
-            if (number > 0 && number != SIGCHLD) {
+            const int number = NextSignal(end - Clock::now());
+            if (number >= 0 && number != SIGCHLD) {
                 return number;
             }
             int status = 0;
@@ -134,14 +144,28 @@ class Waiting {
         }
     }
 
+    // Negative when there is none yet.
+    int NextSignal(Clock::duration left) const {
+        if (!seconds_) {
+            return sigwaitinfo(&signals_, nullptr);
+        }
+        using std::chrono::nanoseconds;
+        constexpr long kSecond = 1000000000;
+        const long rest = std::max<long>(nanoseconds(left).count(), 0);
+        const timespec limit{rest / kSecond, rest % kSecond};
+        const int number = sigtimedwait(&signals_, nullptr, &limit);
+        return number < 0 && errno == EAGAIN ? kTimeIsOver : number;
+    }
+
     const pid_t child_;
     const int done_;
     const sigset_t signals_;
+    const std::optional<int> seconds_;
 };
 
 }  // namespace
 
-UndoneBySignal::UndoneBySignal(const std::function<void()>& undo) {
+UndoneBySignal::UndoneBySignal(const Undo& undo, std::optional<int> seconds) {
     std::cout.flush();
     sigset_t signals = EndingSignals();
     sigset_t before;
@@ -154,7 +178,7 @@ UndoneBySignal::UndoneBySignal(const std::function<void()>& undo) {
     if (child > 0) {
         done.writeEnd.Close();
         fcntl(done.readEnd.Get(), F_SETFL, O_NONBLOCK);
-        Waiting(child, done.readEnd.Get(), signals).Run(undo);
+        Waiting(child, done.readEnd.Get(), signals, seconds).Run(undo);
     }
     sigprocmask(SIG_SETMASK, &before, nullptr);
     if (child < 0) {

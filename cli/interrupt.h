@@ -2,6 +2,8 @@
 #define TAVIWIRELESS_CLI_INTERRUPT_H
 
 #include <functional>
+#include <optional>
+#include <string>
 
 #include "base/unique_fd.h"
 
@@ -9,8 +11,8 @@ namespace taviwireless::cli {
 
 // While it lives, a signal that ends the program (SIGINT, SIGTERM, SIGHUP) has the work undone:
 //
-//   const UndoneBySignal guard([] { ... });  // puts back what was, and says so
-//   ...                                      // the work
+//   const UndoneBySignal guard([](const std::string& why) { ... });  // puts back what was, says so
+//   ...                                                              // the work
 //
 // The work can be anywhere then, within a call of the library too, which knows no end but its own.
 // So it goes on in a child: the constructor forks and returns in the child alone. The program that
@@ -18,14 +20,17 @@ namespace taviwireless::cli {
 // started, daemons included; then undo runs, with nobody beside it, in the program that waited,
 // which knows what was known when the guard was made, and which at last dies of the signal. So is a
 // child undone that was killed by another signal. Behind the destructor a signal just ends the
-// program.
+// program. `why` begins a sentence: "interrupted", or "not done within 5 s".
 //
 // To be made after input was read (a child that is ended gives no echo back to its terminal), and
 // before there are threads or a connection to a bus; not within another one. A signal that is
 // ignored stays so. Throws CommandError when there is no process for it.
 class UndoneBySignal {
   public:
-    explicit UndoneBySignal(const std::function<void()>& undo);
+    using Undo = std::function<void(const std::string& why)>;
+
+    // With a limit, work that takes longer is undone as well; the program then has failed.
+    explicit UndoneBySignal(const Undo& undo, std::optional<int> seconds = std::nullopt);
     ~UndoneBySignal();
     UndoneBySignal(const UndoneBySignal&) = delete;
     UndoneBySignal& operator=(const UndoneBySignal&) = delete;

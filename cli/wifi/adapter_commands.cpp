@@ -4,6 +4,7 @@
 #include "base/fixed_field.h"
 #include "cli/adapter/credentials.h"
 #include "cli/adapter/requirements.h"
+#include "cli/deadline.h"
 #include "cli/interrupt.h"
 #include "cli/terminal.h"
 #include "cli/wifi/channels.h"
@@ -50,7 +51,7 @@ void ListNetworks(const Options& options) {
     RequireAdapter();
     RequireScanner();
     ShowProgress("Looking for networks ...");
-    const std::vector<NetworkInRange> networks = Scan();
+    const std::vector<NetworkInRange> networks = Deadline(options).Limit(Scan);
     Print(options, options.channels ? DescribeChannels(networks) : DescribeAll(networks));
 }
 
@@ -79,7 +80,7 @@ void ConnectAutomatically(const Options& options) {
     }
     ShowProgress("Joining a saved network ...");
     const FormerConnection none;
-    const UndoneBySignal guard([&] { none.Undo(options); });
+    const UndoneBySignal guard([&](const auto& why) { none.Undo(options, why); }, options.timeout);
     SupplicantEvents events;
     // The library reports success, too, when it cannot tell whether the radio may be used.
     if (TAVIWirelessAutoConnect() != 0 || !IsInNetwork(TAVIWirelessConnStatusGet())) {
@@ -112,7 +113,8 @@ void CreateAdhoc(const Options& options) {
         CopyField(conf.key, key);
     }
     FormerConnection former;
-    const UndoneBySignal guard([&] { former.Undo(options); });
+    const UndoneBySignal guard([&](const auto& why) { former.Undo(options, why); },
+                               options.timeout);
     LeaveNetwork();
     ShowProgress("Creating " + Printable(options.network) + " ...");
     if (TAVIWirelessAdhocCreate(&conf) != 0) {

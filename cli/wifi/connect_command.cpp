@@ -5,6 +5,7 @@
 #include "base/fixed_field.h"
 #include "cli/adapter/credentials.h"
 #include "cli/adapter/requirements.h"
+#include "cli/deadline.h"
 #include "cli/interrupt.h"
 #include "cli/terminal.h"
 #include "cli/wifi/ip_address.h"
@@ -32,7 +33,8 @@ class Connecting {
     void Run() {
         WirelessConf conf = Describe(options_.hidden ? HiddenNetwork() : NetworkInReach());
         FormerConnection former;
-        const UndoneBySignal guard([&] { former.Undo(options_); });
+        const UndoneBySignal guard([&](const auto& why) { former.Undo(options_, why); },
+                                   options_.timeout);
         LeaveNetwork();
         const std::string fault = Join(conf, nameServers_);
         if (!fault.empty()) {
@@ -48,7 +50,8 @@ class Connecting {
     WirelessNetwork NetworkInReach() const {
         ShowProgress("Looking for " + name_ + " ...");
         WirelessNetwork network{};
-        const int count = TAVIWirelessNetworkGet(wanted_.Key(), wanted_.KeyKind(), &network);
+        const int count = Deadline(options_).Limit(
+            [&] { return TAVIWirelessNetworkGet(wanted_.Key(), wanted_.KeyKind(), &network); });
         if (count < 0) {
             throw ScanError();
         }

@@ -87,10 +87,10 @@ std::string FormerConnection::ComeBack() {
            "), so there is no connection now";
 }
 
-void FormerConnection::Undo(const Options& options) const {
+void FormerConnection::Undo(const Options& options, const std::string& why) const {
     ShowProgress("");
     CleanUpAttempt();
-    PrintFailure(options, "interrupted: " + WifiInterface() + " is not connected" +
+    PrintFailure(options, why + ": " + WifiInterface() + " is not connected" +
                               (name_.empty() ? "" : "; " + name_ + " was left already"));
 }
 

@@ -22,8 +22,8 @@ class FormerConnection {
     // Ends a failed attempt, and goes back on the network that was left for it. Returns what became
     // of that, to be added to the sentence of the failure.
     std::string ComeBack();
-    // What a signal that ends the attempt leads to: no connection, and a sentence that says so.
-    void Undo(const Options& options) const;
+    // When the attempt is cut off: no connection, and a sentence that says why and so.
+    void Undo(const Options& options, const std::string& why) const;
 
   private:
     std::string name_;                   // of a network that was left; empty: there was none
