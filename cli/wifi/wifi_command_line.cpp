@@ -12,12 +12,17 @@ void AddWifiConnectCommand(const Command& wifi, Options& options) {
         Add(wifi, "connect",
             "Join a network, and save it; its key is read from standard input unless saved",
             options, ConnectWifi);
-    connect.AddOption("SSID", options.network, "Name of the network").Required();
+    connect
+        .AddOption("NETWORK", options.network,
+                   "Its name (SSID), or the BSSID of the one access point to join")
+        .Required();
     connect.AddOption("--user", options.user, "User, where a network wants one");
     connect.AddFlag("--new-key", options.newKey, "Ask for the key although one is saved");
     const Argument isStatic = connect.AddOption(
         "--static", options.staticAddress,
         "This address instead of one by DHCP, and the default gateway", "ADDRESS/PREFIX[,GATEWAY]");
+    connect.AddOption("--dns", options.nameServers, "Name servers that go with a static address",
+                      "ADDRESS[,ADDRESS]");
     connect.AddFlag("--dhcp", options.dhcp, "DHCP although a static address is saved")
         .Excludes(isStatic);
     const Argument isHidden =
@@ -27,21 +32,41 @@ void AddWifiConnectCommand(const Command& wifi, Options& options) {
         .OneOf(SecurityWords());
 }
 
+constexpr char kSavedName[] = "Its name (SSID), or the BSSID of its access point";
+
 void AddSavedNetworkCommands(const Command& wifi, Options& options) {
     const Command saved = wifi.AddGroup("saved", "The networks that were joined before");
     Add(saved, "list", "List them, the last used first", options, ListSavedNetworks);
     const Command show = Add(saved, "show", "Show one of them", options, ShowSavedNetwork);
-    show.AddOption("NETWORK", options.network, "Its name, or the BSSID of its access point")
-        .Required();
+    show.AddOption("NETWORK", options.network, kSavedName).Required();
     show.AddFlag("--show-secrets", options.showSecrets, "Show the key as well");
+    const Command edit =
+        Add(saved, "edit", "Change what is saved of one of them", options, EditSavedNetwork);
+    edit.AddOption("NETWORK", options.network, kSavedName).Required();
+    edit.AddOption("SETTING", options.settings,
+                   "key (alone: it is read from standard input), user=NAME, dhcp=yes, "
+                   "address=ADDRESS/PREFIX, gateway=ADDRESS, dns=ADDRESS[,ADDRESS]; an empty "
+                   "gateway or dns takes it away",
+                   "KEY=VALUE")
+        .Required();
+    Add(wifi, "forget", "Remove a saved network (host edition of the SDK alone)", options,
+        ForgetNetwork)
+        .AddOption("NETWORK", options.network, kSavedName)
+        .Required();
 }
 
 }  // namespace
 
 void AddWifiCommands(const Command& app, Options& options) {
     const Command wifi = app.AddGroup("wifi", "The Wi-Fi adapter");
+    wifi.AddOption("--timeout", options.timeout,
+                   "Give up after this time, in seconds, and undo what was begun", "SECONDS")
+        .Between(1, 3600);
     Add(wifi, "status", "Show the state of the adapter and its connection", options, ShowWifi);
-    Add(wifi, "scan", "List the networks in range", options, ListNetworks);
+    Add(wifi, "watch", "Show the state and the signal as they change, until Ctrl-C", options,
+        WatchWifi);
+    Add(wifi, "scan", "List the networks in range", options, ListNetworks)
+        .AddFlag("--channels", options.channels, "Draw who is on which channel");
     AddWifiConnectCommand(wifi, options);
     Add(wifi, "disconnect", "End the connection", options, DisconnectWifi);
     Add(wifi, "auto", "Join the saved network that was used last and is in range", options,
@@ -57,6 +82,10 @@ void AddWifiCommands(const Command& app, Options& options) {
         .AddOption("MODE", options.mode, "ap or client")
         .Required()
         .OneOf({"ap", "client"});
+    Add(wifi, "radio", "Switch the radio of the adapter on or off", options, SwitchRadio)
+        .AddOption("STATE", options.mode, "on or off")
+        .Required()
+        .OneOf({"on", "off"});
     Add(wifi, "gateway", "Show the gateway that the connection should use", options,
         ShowWifiGateway);
 }

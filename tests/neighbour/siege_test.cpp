@@ -157,8 +157,8 @@ std::string Result(const CommandCall& command, Surroundings&) {
     argv.insert(argv.begin(), {"timeout", kSeconds});
     const RunResult result = RunProgram(argv, command.input);
     EXPECT_LT(result.status, 6);
-    if (command.name == "modem watch") {
-        return "";  // it may be ended before it has found a modem
+    if (command.name == "modem watch" || command.name == "wifi watch") {
+        return "";  // it may be ended before it has shown anything
     }
     // A failure looks like that of a function.
     const std::string text = std::to_string(-result.status) + ' ' + result.out + result.err;
@@ -216,7 +216,8 @@ struct Besieged : BesiegedMachine, testing::WithParamInterface<std::tuple<Needs,
     template <typename Call>
     std::string Try(const Call& call, Surroundings& around, const std::set<std::string>& paths) {
         const std::string expected = Result(call, around);
-        const bool isRepeatable = Result(call, around) == expected;
+        // Where a network is joined already, there is nothing to join.
+        const bool isRepeatable = Result(call, around) == expected && call.name != "wifi auto";
         for (const Obstacle& obstacle : kObstacles) {
             if (!kAll && ++turn % kEachOf != 0) {
                 continue;

@@ -301,7 +301,10 @@ const CommandCall kCommands[] = {
     {"modem disconnect", Needs::kDialled, true, {kId}},
     {"modem status", Needs::kPlugged, false, {kId}},
     {"modem interfaces", Needs::kPlugged, false, {}}, {"wifi status", Needs::kAdapter, false, {}},
-    {"wifi scan", Needs::kAdapter, false, {}},
+    {"wifi scan", Needs::kAdapter, false, {}}, {"wifi watch", Needs::kJoined, false, {}},
+    {"wifi saved edit", Needs::kAdapter, true, {"My Net", "dhcp=yes"}},
+    {"wifi forget", Needs::kAdapter, true, {"My Net"}},
+    {"wifi radio", Needs::kAdapter, true, {"off"}},
     {"wifi connect", Needs::kAdapter, true, {"My Net", "--new-key"}, "another key\n"},
     {"wifi disconnect", Needs::kJoined, true, {}}, {"wifi auto", Needs::kAdapter, true, {}},
     {"wifi saved list", Needs::kAdapter, false, {}},
@@ -362,7 +365,7 @@ std::vector<std::string> CommandCall::Argv() const {
     if (needs == Needs::kPlugged || needs == Needs::kDialled) {
         argv.insert(argv.begin() + 2, "--direct");
     }
-    if (name == "modem watch") {
+    if (name == "modem watch" || name == "wifi watch") {
         argv.insert(argv.begin(), {"timeout", "--preserve-status", "--signal=INT", "0.5"});
     }
     return WithShortWaits(argv);

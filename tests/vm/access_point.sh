@@ -152,7 +152,7 @@ enables_twice_at_once() {
 is_station_again() {
     start_ap wlan2
     taviwireless wifi mode client
-    holds "$(taviwireless wifi scan)" "^Neighbour .* 02:00:00:00:02:00$"
+    holds "$(taviwireless wifi scan)" "^ +Neighbour .* 02:00:00:00:02:00 +-$"
 }
 
 mkdir -p /etc.defaults

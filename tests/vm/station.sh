@@ -90,11 +90,12 @@ lists_networks() {
     start_afresh
     local list
     list=$(wifi scan)
-    holds "$list" '^My Net +\[####\] 100% +WPA2PSK/AES +6 +02:00:00:00:01:00$'
-    holds "$list" '^Old +\[####\] 100% +WPAPSK/TKIP +1 +02:00:00:00:02:00$'
-    holds "$list" '^Café 24/7 +\[####\] 85% +open +11 +02:00:00:00:03:00$'
+    holds "$list" '^ +My Net +\[####\] 100% +WPA2PSK/AES +6 +02:00:00:00:01:00 +-$'
+    holds "$list" '^ +Old +\[####\] 100% +WPAPSK/TKIP +1 +02:00:00:00:02:00 +-$'
+    holds "$list" '^ +Café 24/7 +\[####\] 85% +open +11 +02:00:00:00:03:00 +-$'
+    holds "$list" '^ +\(hidden\) +\[####\] 100% +WPA2PSK +3 +02:00:00:00:04:00 +-$'
     must_fail grep Unseen <<<"$list"
-    same 4 "$(wc -l <<<"$list")" # with the heading
+    same 5 "$(wc -l <<<"$list")" # with the heading
 }
 
 joins_wpa2() {
@@ -116,6 +117,32 @@ disconnects() {
     wifi connect "My Net" </dev/null # the key is known now
     connected_to "My Net" 1 11b/g/n WPA2PSK/AES
     wifi disconnect
+    nothing_is_left
+}
+
+# The supplicant tells why, and the network before is joined again.
+goes_back() {
+    start_afresh
+    wifi connect "My Net" </dev/null
+    holds "$(wifi connect Old --new-key <<<'a wrong key' 2>&1)" \
+        ': its access point refused the key.*; back on My Net$'
+    connected_to "My Net" 1 11b/g/n WPA2PSK/AES
+    leased_address_of 1
+    holds "$(wifi scan)" '^\* +My Net .* yes$'
+}
+
+# A second is enough for all of it.
+is_interrupted() {
+    start_afresh
+    taviwireless wifi connect "My Net" --new-key <<<'a wrong key' &
+    local connect=$! status=0
+    wait_for 10 test -e /var/tmp/.wireless_connecting
+    wait_for 5 pgrep -x wpa_supplicant
+    local start=$EPOCHREALTIME
+    kill -TERM $connect
+    wait $connect || status=$?
+    same 143 $status
+    same 1 "$(awk "BEGIN { print $EPOCHREALTIME - $start < 1 }")"
     nothing_is_left
 }
 
@@ -172,5 +199,7 @@ scenario "joins a WPA-TKIP network" joins_wpa_tkip
 scenario "joins an open network" joins_open
 scenario "joins a WPA2 network by DHCP" joins_wpa2
 scenario "disconnects, and joins the saved network without a key" disconnects
+scenario "goes back on the network that it left for a wrong key" goes_back
+scenario "undoes an attempt within a second of a signal" is_interrupted
 scenario "joins the reachable saved network that was used last" joins_automatically
 scenario "joins a hidden network" joins_hidden
