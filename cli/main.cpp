@@ -9,6 +9,7 @@
 #include "cli/command_error.h"
 #include "cli/command_lines.h"
 #include "cli/report.h"
+#include "usbmodem/rules/trace.h"
 
 namespace taviwireless::cli {
 
@@ -24,8 +25,12 @@ void Define(const Command& program, Options& options) {
     program.SetVersion("taviwireless " TAVI_VERSION);
     program.AddFlag("--json", options.json, "Print JSON instead of tables");
     program.AddFlag(
-        "-v,--verbose", [] { openlog("taviwireless", LOG_PERROR, LOG_USER); },
-        "Show the library's log on standard error as well");
+        "-v,--verbose",
+        [] {
+            openlog("taviwireless", LOG_PERROR, LOG_USER);
+            usbmodem_lib::SwitchTraceOn();
+        },
+        "Show what is done, and the library's log, on standard error");
     program.SetFooter(kFooter);
     program.RequireCommand();
     AddModemCommands(program, options);
