@@ -168,17 +168,9 @@ class DirectAccess : public ModemAccess {
     }
 
   protected:
-    // Each modem is initialised on its own: one that is dead does not hide those behind it.
-    std::vector<std::string> ReadyModems() override {
-        Refresh();
-        std::vector<std::string> ready;
-        for (USBModem& modem : list_) {
-            if (Initialise(modem)) {
-                ready.push_back(modem.GetDevId());
-            }
-        }
-        return ready;
-    }
+    // Each modem is initialised when it is looked at: one that is dead does not hide those behind
+    // it.
+    std::vector<std::string> ReadyModems() override { return PluggedModems(); }
 
   private:
     // Follows what was plugged in and unplugged meanwhile.
@@ -217,7 +209,7 @@ class DirectAccess : public ModemAccess {
         USBModem& modem = list_.FindUSBModem(id);
         if (modem.IsNull() || !Initialise(modem)) {
             const auto holder = HolderOfPorts(id);
-            throw holder ? CommandError(kBusy, holder->sentence) : NotReadyError(id);
+            throw holder ? CommandError(kFailure, holder->sentence) : NotReadyError(id);
         }
         if (hasIMSI_.count(id) == 0) {
             bool failed = false;

@@ -58,6 +58,22 @@ std::string WhoMay(const struct stat& status) {
     return helps ? "root or a member of group " + name : "root";
 }
 
+// By the lock file, which its owner leaves behind when it is killed.
+std::optional<PortHolder> HolderOfPort(const std::string& port, const std::string& id) {
+    const auto lock = ReadTrusted(usbmodem_lib::LockPath(port.substr(port.rfind('/') + 1)));
+    const int pid = lock ? atoi(lock->c_str()) : 0;
+    std::string program;
+    std::ifstream comm("/proc/" + std::to_string(pid) + "/comm");
+    if (pid <= 0 || pid == getpid() || !std::getline(comm, program)) {
+        return std::nullopt;
+    }
+    const bool isService = program == kServiceProgram;
+    const std::string who = isService ? "the modem service" : Printable(program);
+    return PortHolder{isService, who + " (process " + std::to_string(pid) + ") holds " + port +
+                                     " of " + id + "; end it" +
+                                     (isService ? ", or leave --direct out" : "")};
+}
+
 }  // namespace
 
 std::optional<CommandError> PortTrouble(const std::string& id) {
@@ -89,19 +105,20 @@ std::string StateFolderTrouble() {
 
 std::optional<PortHolder> HolderOfPorts(const std::string& id) {
     const Ports ports = PortsOf(id);
+    std::optional<PortHolder> holder;
+    bool isAnyFree = false;
     for (const std::string& port : ports.all) {
-        const std::string lock = usbmodem_lib::LockPath(port.substr(port.rfind('/') + 1));
-        const auto text = port == ports.dial ? std::nullopt : ReadTrusted(lock);
-        const int pid = text ? atoi(text->c_str()) : 0;
-        std::string program;
-        std::ifstream comm("/proc/" + std::to_string(pid) + "/comm");
-        if (pid > 0 && pid != getpid() && std::getline(comm, program)) {
-            const bool isService = program == kServiceProgram;
-            return PortHolder{isService, (isService ? "the modem service" : Printable(program)) +
-                                             " (process " + std::to_string(pid) + ") holds " +
-                                             port + " of " + id + "; end it" +
-                                             (isService ? ", or leave --direct out" : "")};
+        if (port == ports.dial) {
+            continue;  // the dialler's, and nobody is asked there
         }
+        const auto found = HolderOfPort(port, id);
+        isAnyFree = isAnyFree || (!found && access(port.c_str(), F_OK) == 0);
+        if (found && (!holder || found->isService)) {
+            holder = found;
+        }
+    }
+    if (holder && (holder->isService || !isAnyFree)) {
+        return holder;
     }
     if (IsServiceThere()) {
         return PortHolder{true, "the modem service is running, and holds the ports of " + id +

@@ -189,16 +189,20 @@ class ServiceAccess : public ModemAccess {
     }
 
     int EnterPIN(const std::string& id, const std::string& pin) override {
+        Trace("telling the service the PIN");
         return PINResult(usbmodem_ui::UnlockSIM(id, pin));
     }
 
     int EnterPUK(const std::string& id, const std::string& puk,
                  const std::string& newPin) override {
+        Trace("telling the service the PUK and a new PIN");
         return PINResult(usbmodem_ui::UnlockPIN(id, puk, newPin));
     }
 
     int SetPIN(const std::string& id, const std::string& pin, const std::string& newPin,
                bool protection) override {
+        Trace(std::string("telling the service to switch the PIN lock ") +
+              (protection ? "on" : "off") + (newPin.empty() ? "" : ", and a new PIN"));
         return PINResult(usbmodem_ui::SetPIN(id, pin, newPin, protection));
     }
 
@@ -226,6 +230,7 @@ class ServiceAccess : public ModemAccess {
         }
         RequireReady(id);
         ShowProgress("Setting the profile of " + id + " ...");
+        Trace("telling the service the settings");
         Sent(usbmodem_ui::SetProfile(id, lines));
         Profile wanted = ReadProfileDocument(Document(usbmodem_ui::GetProfile, id));
         const Profile now = wanted;
@@ -246,7 +251,10 @@ class ServiceAccess : public ModemAccess {
         Sent(usbmodem_ui::Connect(id));
     }
 
-    void Disconnect(const std::string& id) override { Sent(usbmodem_ui::Disconnect(id)); }
+    void Disconnect(const std::string& id) override {
+        Trace("telling the service to hang up");
+        Sent(usbmodem_ui::Disconnect(id));
+    }
 
     // By a connection that is not the one on which a reply may be awaited meanwhile.
     void HangUp(const std::string& id) override { HangUpByBus(id); }

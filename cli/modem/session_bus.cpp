@@ -111,8 +111,7 @@ bool FindSessionBus() {
 
 bool IsServiceThere() {
     Failure failure;
-    const Bus bus =
-        FindSessionBus() ? Connect(failure) : Bus(nullptr, g_object_unref);
+    const Bus bus = FindSessionBus() ? Connect(failure) : Bus(nullptr, g_object_unref);
     return bus && IsThere(bus.get());
 }
 
@@ -134,9 +133,9 @@ void RequireService() {
     Failure failure;
     const Bus bus = Connect(failure);
     if (!bus) {
-        throw CommandError(kNoService, "cannot reach the session bus at " +
-                                           Printable(getenv(kAddress)) + ": " +
-                                           Printable(failure.Text()));
+        throw CommandError(kNoService,
+                           "cannot reach the session bus at " + Printable(getenv(kAddress)) + ": " +
+                               Printable(failure.Text()) + "; --direct does without it");
     }
     if (IsThere(bus.get())) {
         return;

@@ -1,5 +1,8 @@
 // taviwireless modem list, show, interfaces, usage and at: what the modems say of themselves.
+#include <unistd.h>
+
 #include <algorithm>
+#include <iostream>
 #include <optional>
 
 #include "base/join.h"
@@ -45,7 +48,9 @@ void ListOneByOne(ModemAccess& access) {
     for (const std::string& id : PluggedModems()) {
         AddItem(names, id);
     }
-    ShowProgress("Asking " + names + " ...");
+    if (isatty(STDERR_FILENO)) {
+        std::cerr << "Asking " << names << " ..." << std::endl;
+    }
     std::optional<ModemRows> rows;
     access.KnownModems(false, [&rows](const ModemState& state) {
         if (!rows) {
@@ -90,7 +95,7 @@ void ShowModem(const Options& options) {
 void ListInterfaces(const Options& options) {
     const auto access = MakeAccess(options);
     const auto interfaces = Deadline(options).Limit([&] { return access->Interfaces(); });
-    Report all{{{"MODEM", "INTERFACE"}}, Json::arrayValue};
+    Report all{{{"DEVICE", "INTERFACE"}}, Json::arrayValue};
     for (const Interface& interface : interfaces) {
         Json::Value document;
         document["id"] = interface.id;
@@ -104,7 +109,7 @@ void ListInterfaces(const Options& options) {
 void ShowUsage(const Options& options) {
     const auto access = MakeAccess(options);
     const auto interfaces = Deadline(options).Limit([&] { return access->Interfaces(); });
-    Report all{{{"MODEM", "INTERFACE", "SENT", "RECEIVED", "SINCE"}}, Json::arrayValue};
+    Report all{{{"DEVICE", "INTERFACE", "SENT", "RECEIVED", "SINCE"}}, Json::arrayValue};
     for (const Interface& interface : interfaces) {
         if (!options.id.empty() && interface.id != options.id) {
             continue;

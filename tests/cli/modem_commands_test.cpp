@@ -58,7 +58,7 @@ TEST(DirectCommands, WhyPortsCannotBeUsedIsSaidAtOnce) {
     const Process holder({"sleep", "1000"});
     WriteFile("/var/lock/LCK..ttyUSB1", std::to_string(holder.Pid()) + "\n");
     const RunResult held = DirectModem({"show", "0"});
-    EXPECT_EQ(held.status, kBusy);
+    EXPECT_EQ(held.status, kFailure);
     EXPECT_THAT(held.err, HasSubstr("sleep (process " + std::to_string(holder.Pid()) +
                                     ") holds /dev/ttyUSB1 of usbmodem0; end it"));
     WriteFile("/tmp/usbmodem.info0", "CONNECTNODE=77\nDEVICENODE=77,78\n");
@@ -113,7 +113,7 @@ TEST(DirectCommands, ConnectShowTheStateAndHangUp) {
     EXPECT_EQ(connected["state"], "connected");
     EXPECT_EQ(connected["address"], "127.0.0.1");
     EXPECT_EQ(DirectModem({"status", "0"}).out, "usbmodem0: connected, 127.0.0.1 on lo\n");
-    EXPECT_EQ(DirectModem({"interfaces"}).out, "MODEM      INTERFACE\nusbmodem0  lo\n");
+    EXPECT_EQ(DirectModem({"interfaces"}).out, "DEVICE     INTERFACE\nusbmodem0  lo\n");
     const Json::Value usage = Parse(DirectModem({"usage", "0", "--json"}).out)[0];
     EXPECT_TRUE(usage["bytes_sent"].isUInt64() && usage["dialled_at"].asUInt64() > 0) << usage;
     EXPECT_EQ(DirectModem({"disconnect", "usbmodem0"}).out, "usbmodem0: disconnected\n");

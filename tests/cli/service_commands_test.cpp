@@ -123,6 +123,17 @@ TEST(ServiceCommands, FailuresAreOneSentenceAndAnExitStatus) {
     Take({{"show usbmodem0 --timeout 1", "", kFailure, "not done within 1 s; "}});
 }
 
+TEST(ServiceCommands, ADebuggedServiceLogsTheDialogueWithoutCodes) {
+    PrivateBus bus;
+    ModemSimulator simulator({"--modem", "generic,pin=9753"});
+    ModemService service(WithShortWaits(
+        {"sh", "-c", "exec \"$0\" --foreground --debug 2>&1", BuiltProgram("usbmodemd")}));
+    EXPECT_TRUE(service.Says("usbmodem0 is ready"));
+    Take({{"-v unlock 0", "9753\n", 0, "telling the service the PIN\n"}});
+    EXPECT_TRUE(service.Says("usbmodem0 <- AT+CPIN=***"));
+    EXPECT_THAT(service.Log(), testing::Not(HasSubstr("9753")));
+}
+
 TEST(ServiceCommands, WithoutTheServiceTheyNameWhatStartsIt) {
     PrivateBus bus;
     ModemSimulator simulator({"--modem", "generic"});
@@ -217,7 +228,7 @@ TEST(ServiceCommands, ConnectShowTheStateAndHangUp) {
     EXPECT_EQ(connected["address"], "127.0.0.1");
     EXPECT_EQ(Modem({"connect", "0"}).out, "usbmodem0: connected already, 127.0.0.1 on lo\n");
     EXPECT_EQ(Modem({"status", "usbmodem0"}).out, "usbmodem0: connected, 127.0.0.1 on lo\n");
-    EXPECT_EQ(Modem({"interfaces"}).out, "MODEM      INTERFACE\nusbmodem0  lo\n");
+    EXPECT_EQ(Modem({"interfaces"}).out, "DEVICE     INTERFACE\nusbmodem0  lo\n");
     EXPECT_EQ(Modem({"disconnect", "usbmodem0"}).out, "usbmodem0: disconnected\n");
 }
 
