@@ -88,7 +88,7 @@ std::pair<Connection, std::string> Dial(ModemAccess& access, const Options& opti
         return {{state.netStatus, state.interface, state.ip}, " already"};
     }
     RequireReadyToDial(state);
-    const DialAttempt attempt(state);
+    const DialAttempt attempt(access, state);
     guard.HasDialled();
     access.Connect(options.id);
     const Connection connection = WaitUntilConnected(access, options, attempt);

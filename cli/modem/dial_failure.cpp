@@ -46,10 +46,8 @@ std::string WhyNotStarted(bool takesDefaultRoute) {
 
 }  // namespace
 
-DialAttempt::DialAttempt(const ModemState& state)
-    : id_(state.id),
-      log_(state.imsi.empty() ? "" : usbmodem_lib::DialLogPath(state.imsi)),
-      before_(StatusOf(log_)) {
+DialAttempt::DialAttempt(ModemAccess& access, const ModemState& state)
+    : id_(state.id), log_(access.LogFile(state)), before_(StatusOf(log_)) {
     const auto route = state.profile.find(profile::kDefaultGateway);
     takesDefaultRoute_ = route != state.profile.end() && route->second == "true";
 }

@@ -14,7 +14,7 @@ namespace taviwireless::cli {
 class DialAttempt {
   public:
     // To be made before the modem is told to dial.
-    explicit DialAttempt(const ModemState& state);
+    DialAttempt(ModemAccess& access, const ModemState& state);
 
     // The failure as a sentence, by the dialler's log, or by what kept the dialler from being
     // started.

@@ -1,5 +1,6 @@
 // The modems themselves, through the layer that the service uses too.
 #include <taviwireless/usbmodem_list.h>
+#include <unistd.h>
 
 #include <algorithm>
 #include <set>
@@ -25,6 +26,12 @@ Profile ReadStoredProfile(USBModem& modem, bool& failed) {
             key.isStored ? modem.GetProfileWithKey(key.name, failed) : modem.GetRoaming(ignored);
     }
     return values;
+}
+
+// As of the last time that it was asked.
+bool IsReady(USBModem& modem) {
+    bool ignored = false;
+    return modem.IsPINReady(ignored);
 }
 
 class DirectAccess : public ModemAccess {
@@ -124,9 +131,10 @@ class DirectAccess : public ModemAccess {
 
     Profile ReadProfile(const std::string& id) override {
         bool failed = false;
-        Profile profile = ReadStoredProfile(Initialised(id), failed);
+        USBModem& modem = Initialised(id);
+        Profile profile = ReadStoredProfile(modem, failed);
         if (failed) {
-            throw ProfileError("cannot read the profile of " + id);
+            throw ProfileError("cannot read the profile of " + id, IsReady(modem));
         }
         return profile;
     }
@@ -136,7 +144,7 @@ class DirectAccess : public ModemAccess {
         USBModem& modem = Initialised(id);
         for (const profile::Setting& setting : settings) {
             if (modem.SetProfileWithKey(setting.key, setting.value) != 0) {
-                throw ProfileError("cannot change the profile of " + id);
+                throw ProfileError("cannot change the profile of " + id, IsReady(modem));
             }
         }
     }
@@ -145,7 +153,7 @@ class DirectAccess : public ModemAccess {
         USBModem& modem = Initialised(id);
         ShowProgress("Reading defaults from " + id + " ...");
         if (modem.SetProfileToDefault() != 0) {
-            throw ProfileError("cannot reset the profile of " + id);
+            throw ProfileError("cannot reset the profile of " + id, IsReady(modem));
         }
     }
 
@@ -153,10 +161,15 @@ class DirectAccess : public ModemAccess {
     void Connect(const std::string& id) override { Initialised(id).NetConnect(); }
 
     void Disconnect(const std::string& id) override {
-        if (Initialised(id).NetDisconnect() != 0) {
-            throw CommandError(kFailure,
-                               "cannot disconnect " + id + "; --verbose shows the reason");
+        if (Initialised(id).NetDisconnect() == 0) {
+            return;
         }
+        const bool isUp = !IsDisconnected(LookAtConnection(id).status);
+        const char* why = geteuid() != 0 ? "that takes root" : "the system log tells why";
+        throw CommandError(
+            kFailure, isUp ? std::string("cannot end the dialler of ") + id + "; " + why
+                           : id + " is hung up, but the default route could not be given back; "
+                                  "set it anew");
     }
 
     // By the dialler's files, with a record of its own.

@@ -8,6 +8,7 @@
 
 #include "cli/modem/port_trouble.h"
 #include "cli/terminal.h"
+#include "usbmodem/rules/paths.h"
 
 namespace taviwireless::cli {
 
@@ -50,6 +51,10 @@ void ModemAccess::WaitForChange() {
     std::this_thread::sleep_for(std::chrono::seconds(2));
 }
 
+std::string ModemAccess::LogFile(const ModemState& state) {
+    return state.imsi.empty() ? "" : usbmodem_lib::DialLogPath(state.imsi);
+}
+
 std::unique_ptr<ModemAccess> MakeAccess(const Options& options) {
     return options.direct ? MakeDirectAccess() : MakeServiceAccess();
 }
@@ -84,9 +89,12 @@ CommandError NotReadyError(const std::string& id) {
                            "; taviwireless modem list shows those that are plugged in"};
 }
 
-CommandError ProfileError(const std::string& whatFailed) {
+CommandError ProfileError(const std::string& whatFailed, bool isSIMReady) {
     const std::string trouble = StateFolderTrouble();
-    return {kFailure, whatFailed + "; " + (trouble.empty() ? "is its SIM ready?" : trouble)};
+    return {kFailure, whatFailed + "; " +
+                          (!isSIMReady       ? "its SIM is not ready"
+                           : trouble.empty() ? "the system log tells why"
+                                             : trouble)};
 }
 
 }  // namespace taviwireless::cli

@@ -116,6 +116,10 @@ class ModemAccess {
     // Asks the modem everything: about two seconds.
     virtual ModemState Look(const std::string& id) = 0;
     virtual Connection LookAtConnection(const std::string& id) = 0;
+    // Adds what Look may leave out: IMSI and ports.
+    virtual void AddDetails(ModemState& /*state*/) {}
+    // The dialler's log of a modem that was looked at; empty when it cannot be told.
+    virtual std::string LogFile(const ModemState& state);
     // The network interfaces of the modems that are ready for use. Asks no modem.
     virtual std::vector<Interface> Interfaces() = 0;
     // Sends the modem an AT command, and returns what it answers.
@@ -159,7 +163,7 @@ std::vector<std::string> PluggedModems();
 // The error for a modem that is not among the ready ones: unplugged, unknown or not ready.
 CommandError NotReadyError(const std::string& id);
 // What failed with a profile, and why as far as that can be told.
-CommandError ProfileError(const std::string& whatFailed);
+CommandError ProfileError(const std::string& whatFailed, bool isSIMReady);
 
 }  // namespace taviwireless::cli
 

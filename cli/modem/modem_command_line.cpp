@@ -11,7 +11,7 @@ constexpr char kIdHelp[] = "Device id, such as usbmodem0, or its number alone";
 
 constexpr char kSettingsHelp[] =
     "Settings:\n"
-    "  number=NUMBER          what the modem dials: digits and *#+, (*99# if empty)\n"
+    "  number=NUMBER          what the modem dials: digits, *, #, + and commas (*99# if empty)\n"
     "  user=NAME              for the provider's login\n"
     "  password               likewise; stands alone, and is read from standard input\n"
     "  apn=NAME               access point name, such as internet (if empty, the modem's own)\n"

@@ -47,7 +47,8 @@ std::string SettableKeys() {
 // Refuses what no modem could do anything with.
 void CheckNumber(const std::string& number) {
     if (number.find_first_not_of(kDialled) != std::string::npos) {
-        throw CommandError(kUsage, "number is what the modem dials: digits and *#+, such as *99#");
+        throw CommandError(
+            kUsage, "number is what the modem dials: digits, *, #, + and commas, such as *99#");
     }
 }
 

@@ -3,8 +3,10 @@
 #include <taviwireless/usbmodem_ui.h>
 
 #include <algorithm>
+#include <chrono>
 #include <cstdlib>
 #include <ctime>
+#include <thread>
 #include <utility>
 
 #include "cli/modem/modem_access.h"
@@ -38,6 +40,18 @@ int PINResult(int result) {
     return Reached(result) > 0 ? ModemAccess::kDone : result;
 }
 
+// A service that was just started looks for its modems first.
+void WaitForModems() {
+    constexpr auto kPatience = std::chrono::seconds(10);
+    const auto end = std::chrono::steady_clock::now() + kPatience;
+    std::vector<std::string> ready;
+    while (usbmodem_ui::GetUSBModemList(ready) > 0 && ready.size() < PluggedModems().size() &&
+           std::chrono::steady_clock::now() < end) {
+        std::this_thread::sleep_for(std::chrono::milliseconds(100));
+        ready.clear();
+    }
+}
+
 // To be called before the service is asked anything. Only the first time: a service that ends
 // meanwhile is not started again.
 void EnsureService() {
@@ -45,7 +59,9 @@ void EnsureService() {
     if (std::exchange(isDone, true)) {
         return;
     }
-    RequireService();
+    if (RequireService()) {
+        WaitForModems();
+    }
     Trace(
         "asking the modem service; its side is in the system log, with the AT dialogue if it runs "
         "as usbmodemd --debug");
@@ -154,12 +170,19 @@ class ServiceAccess : public ModemAccess {
                 state.interface = interface.id == id ? interface.name : state.interface;
             }
         }
-        const auto known = objects_.Read();
-        if (known && known->count(id) != 0) {
-            state.imsi = known->at(id).state.imsi;
-            state.ports = known->at(id).state.ports;
-        }
         return state;
+    }
+
+    void AddDetails(ModemState& state) override {
+        const auto known = objects_.Read();
+        if (known && known->count(state.id) != 0) {
+            state.imsi = known->at(state.id).state.imsi;
+            state.ports = known->at(state.id).state.ports;
+        }
+    }
+
+    std::string LogFile(const ModemState& state) override {
+        return TextProperty(state.id, "LogFile");
     }
 
     Connection LookAtConnection(const std::string& id) override {
@@ -215,7 +238,7 @@ class ServiceAccess : public ModemAccess {
                    entry.first == profile::kRoaming;
         });
         if (isEmpty && Look(id).simStatus != kReady) {
-            throw ProfileError("cannot read the profile of " + id);
+            throw ProfileError("cannot read the profile of " + id, false);
         }
         return profile;
     }
@@ -238,7 +261,8 @@ class ServiceAccess : public ModemAccess {
             wanted[setting.key] = setting.value;
         }
         if (wanted != now) {
-            throw ProfileError("the modem service did not set the profile of " + id);
+            throw ProfileError("the modem service did not set the profile of " + id,
+                               Look(id).simStatus == kReady);
         }
     }
 

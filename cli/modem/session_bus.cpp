@@ -1,83 +1,74 @@
+// By libdbus: GIO would need a thread, and ends the program where none can be had.
 #include "cli/modem/session_bus.h"
 
-#include <gio/gio.h>
+#include <dbus/dbus.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
-#include <chrono>
 #include <cstdlib>
 #include <memory>
-#include <thread>
 
 #include "cli/command_error.h"
-#include "cli/modem/modem_access.h"
-#include "cli/modem/service_objects.h"
 #include "cli/modem/trace.h"
 #include "cli/terminal.h"
+#include "usbmodem/rules/objects.h"
 
 namespace taviwireless::cli {
 
 namespace {
 
+namespace objects = usbmodem_lib::objects;
+
 constexpr char kService[] = "com.merilond.usbmodem";
-constexpr int kPatience = 30000;  // milliseconds, until a service was started
 constexpr char kAddress[] = "DBUS_SESSION_BUS_ADDRESS";
 
 struct Failure {
-    GError* error = nullptr;
-    ~Failure() { g_clear_error(&error); }
-    std::string Text() const { return error != nullptr ? error->message : ""; }
+    Failure() { dbus_error_init(&error); }
+    ~Failure() { dbus_error_free(&error); }
+    Failure(const Failure&) = delete;
+    Failure& operator=(const Failure&) = delete;
+
+    bool Is(const char* name) const { return dbus_error_has_name(&error, name) != FALSE; }
+    std::string Text() const { return Printable(error.message != nullptr ? error.message : ""); }
+
+    DBusError error;
 };
-using Bus = std::unique_ptr<GDBusConnection, void (*)(gpointer)>;
+
+// A connection of its own, so that nothing waits behind the calls of others.
+struct Close {
+    void operator()(DBusConnection* connection) const {
+        dbus_connection_close(connection);
+        dbus_connection_unref(connection);
+    }
+};
+using Bus = std::unique_ptr<DBusConnection, Close>;
 
 Bus Connect(Failure& failure) {
-    Bus bus(g_bus_get_sync(G_BUS_TYPE_SESSION, nullptr, &failure.error), g_object_unref);
+    Bus bus(dbus_bus_get_private(DBUS_BUS_SESSION, &failure.error));
     if (bus) {
-        g_dbus_connection_set_exit_on_close(bus.get(), FALSE);
+        dbus_connection_set_exit_on_disconnect(bus.get(), FALSE);
     }
     return bus;
 }
 
-// Calls a method of the bus itself. Returns its number or yes; nothing on failure.
-std::optional<guint> AskBus(GDBusConnection* bus, const char* method, GVariant* arguments,
-                            const char* type, Failure& failure) {
-    const std::unique_ptr<GVariant, void (*)(GVariant*)> reply(
-        g_dbus_connection_call_sync(bus, "org.freedesktop.DBus", "/org/freedesktop/DBus",
-                                    "org.freedesktop.DBus", method, arguments, G_VARIANT_TYPE(type),
-                                    G_DBUS_CALL_FLAGS_NONE, kPatience, nullptr, &failure.error),
-        g_variant_unref);
-    if (!reply) {
-        return std::nullopt;
-    }
-    const std::unique_ptr<GVariant, void (*)(GVariant*)> value(
-        g_variant_get_child_value(reply.get(), 0), g_variant_unref);
-    return g_variant_is_of_type(value.get(), G_VARIANT_TYPE_BOOLEAN)
-               ? static_cast<guint>(g_variant_get_boolean(value.get()))
-               : g_variant_get_uint32(value.get());
-}
-
-bool IsThere(GDBusConnection* bus) {
+bool IsThere(DBusConnection* bus) {
     Failure failure;
-    return AskBus(bus, "NameHasOwner", g_variant_new("(s)", kService), "(b)", failure)
-               .value_or(0) != 0;
+    return dbus_bus_name_has_owner(bus, kService, &failure.error) != FALSE;
 }
 
-// One that was just started looks for its modems first.
-void WaitForModems() {
-    constexpr auto kPatience = std::chrono::seconds(10);
-    const auto end = std::chrono::steady_clock::now() + kPatience;
-    ServiceObjects objects;
-    for (;;) {
-        const auto modems = objects.Read();
-        bool allAnswer = modems && modems->size() >= PluggedModems().size();
-        for (const auto& modem : modems.value_or(std::map<std::string, KnownModem>())) {
-            allAnswer = allAnswer && modem.second.answers;
-        }
-        if (allAnswer || std::chrono::steady_clock::now() > end) {
-            return;
-        }
-        std::this_thread::sleep_for(std::chrono::milliseconds(100));
+using Message = std::unique_ptr<DBusMessage, void (*)(DBusMessage*)>;
+
+Message Call(const std::string& service, const std::string& path, const std::string& interface,
+             const char* method, const char* first, const char* second = nullptr) {
+    Message call(
+        dbus_message_new_method_call(service.c_str(), path.c_str(), interface.c_str(), method),
+        dbus_message_unref);
+    if (!call || !dbus_message_append_args(call.get(), DBUS_TYPE_STRING, &first,
+                                           second != nullptr ? DBUS_TYPE_STRING : DBUS_TYPE_INVALID,
+                                           &second, DBUS_TYPE_INVALID)) {
+        throw std::bad_alloc();
     }
+    return call;
 }
 
 [[noreturn]] void FailWithoutBus() {
@@ -111,7 +102,7 @@ bool FindSessionBus() {
 
 bool IsServiceThere() {
     Failure failure;
-    const Bus bus = FindSessionBus() ? Connect(failure) : Bus(nullptr, g_object_unref);
+    const Bus bus = FindSessionBus() ? Connect(failure) : nullptr;
     return bus && IsThere(bus.get());
 }
 
@@ -119,42 +110,63 @@ void HangUpByBus(const std::string& id) {
     Failure failure;
     const Bus bus = Connect(failure);
     if (bus) {
-        g_dbus_connection_call(bus.get(), kService, "/", kService, "Disconnect",
-                               g_variant_new("(s)", id.c_str()), nullptr, G_DBUS_CALL_FLAGS_NONE,
-                               -1, nullptr, nullptr, nullptr);
-        g_dbus_connection_flush_sync(bus.get(), nullptr, nullptr);
+        const Message call = Call(kService, "/", kService, "Disconnect", id.c_str());
+        dbus_message_set_no_reply(call.get(), TRUE);
+        dbus_connection_send(bus.get(), call.get(), nullptr);
+        dbus_connection_flush(bus.get());
     }
 }
 
-void RequireService() {
+std::string TextProperty(const std::string& id, const char* property) {
+    Failure failure;
+    const Bus bus = Connect(failure);
+    const Message call = Call(objects::kService, std::string(objects::kManager) + '/' + id,
+                              DBUS_INTERFACE_PROPERTIES, "Get", objects::kModem, property);
+    dbus_message_set_auto_start(call.get(), FALSE);
+    const Message reply(bus ? dbus_connection_send_with_reply_and_block(
+                                  bus.get(), call.get(), DBUS_TIMEOUT_USE_DEFAULT, &failure.error)
+                            : nullptr,
+                        dbus_message_unref);
+    DBusMessageIter value;
+    DBusMessageIter text;
+    if (!reply || !dbus_message_iter_init(reply.get(), &value) ||
+        dbus_message_iter_get_arg_type(&value) != DBUS_TYPE_VARIANT) {
+        return "";
+    }
+    dbus_message_iter_recurse(&value, &text);
+    const char* result = "";
+    if (dbus_message_iter_get_arg_type(&text) == DBUS_TYPE_STRING) {
+        dbus_message_iter_get_basic(&text, &result);
+    }
+    return result;
+}
+
+bool RequireService() {
     if (!FindSessionBus()) {
         FailWithoutBus();
     }
     Failure failure;
     const Bus bus = Connect(failure);
     if (!bus) {
-        throw CommandError(kNoService,
-                           "cannot reach the session bus at " + Printable(getenv(kAddress)) + ": " +
-                               Printable(failure.Text()) + "; --direct does without it");
+        throw CommandError(kNoService, "cannot reach the session bus at " +
+                                           Printable(getenv(kAddress)) + ": " + failure.Text() +
+                                           "; --direct does without it");
     }
     if (IsThere(bus.get())) {
-        return;
+        return false;
     }
     ShowProgress("Starting the modem service ...");
-    constexpr guint kNoFlags = 0;
-    if (!AskBus(bus.get(), "StartServiceByName", g_variant_new("(su)", kService, kNoFlags), "(u)",
-                failure)) {
-        const bool isUnknown =
-            g_error_matches(failure.error, G_DBUS_ERROR, G_DBUS_ERROR_SERVICE_UNKNOWN) != FALSE;
-        g_dbus_error_strip_remote_error(failure.error);
-        throw CommandError(
-            kNoService,
-            "the modem service is not running; usbmodemd starts it (or add "
-            "--direct to do without it)" +
-                (isUnknown ? "" : "; the bus could not: " + Printable(failure.Text())));
+    constexpr unsigned int kNoFlags = 0;
+    if (!dbus_bus_start_service_by_name(bus.get(), kService, kNoFlags, nullptr, &failure.error)) {
+        throw CommandError(kNoService,
+                           "the modem service is not running; usbmodemd starts it (or add "
+                           "--direct to do without it)" +
+                               (failure.Is(DBUS_ERROR_SERVICE_UNKNOWN)
+                                    ? ""
+                                    : "; the bus could not: " + failure.Text()));
     }
     Trace("the bus has started the modem service");
-    WaitForModems();
+    return true;
 }
 
 }  // namespace taviwireless::cli

@@ -16,8 +16,11 @@ bool IsServiceThere();
 void HangUpByBus(const std::string& id);
 
 // Makes sure that there is a session bus and that the modem service is on it, which the bus is told
-// to start where it knows how. Throws CommandError.
-void RequireService();
+// to start where it knows how. Returns whether it was started now. Throws CommandError.
+bool RequireService();
+
+// A property of the service's object of a modem; empty when it cannot be had.
+std::string TextProperty(const std::string& id, const char* property);
 
 }  // namespace taviwireless::cli
 

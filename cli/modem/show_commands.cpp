@@ -85,7 +85,8 @@ void ShowModem(const Options& options) {
     const auto access = MakeAccess(options);
     Deadline deadline(options);
     deadline.Limit([&] {
-        const ModemState state = access->Look(options.id);
+        ModemState state = access->Look(options.id);
+        access->AddDetails(state);
         const ModemDetails details{AskRegistration(*access, options.id),
                                    UsageOf(options.id, state.interface)};
         Print(options, Describe(state, details, options.showSecrets));
