@@ -15,6 +15,7 @@
 #include "cli/completed_arguments.h"
 #include "cli/report.h"
 #include "cli/terminal.h"
+#include "usbmodem/rules/trace.h"
 
 namespace taviwireless::cli {
 
@@ -37,8 +38,12 @@ void Define(const Command& program, Options& options) {
                    "SECONDS")
         .Between(1, 3600);
     program.AddFlag(
-        "-v,--verbose", [] { openlog("taviwireless", LOG_PERROR, LOG_USER); },
-        "Show the library's log on standard error as well");
+        "-v,--verbose",
+        [] {
+            openlog("taviwireless", LOG_PERROR, LOG_USER);
+            usbmodem_lib::SwitchTraceOn();
+        },
+        "Show what is done, and the library's log, on standard error");
     program.RequireCommand();
     AddModemCommands(program, options);
     AddWifiCommands(program, options);

@@ -17,6 +17,7 @@ struct Options {
     std::optional<int> timeout;  // seconds
     bool showSecrets = false;
     bool force = false;                 // use up the last attempt without a question
+    std::string atCommand;              // at
     bool noWait = false;                // connect: return as soon as the dialler runs
     std::vector<std::string> settings;  // profile set, ap set: KEY=VALUE or KEY
 

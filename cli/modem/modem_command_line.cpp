@@ -1,16 +1,39 @@
 // taviwireless modem: the commands, what they are called and what they take.
 #include "cli/command_lines.h"
+#include "cli/modem/modem_access.h"
 #include "cli/modem/modem_commands.h"
 
 namespace taviwireless::cli {
 
 namespace {
 
+constexpr char kIdHelp[] = "Device id, such as usbmodem0, or its number alone";
+
+constexpr char kSettingsHelp[] =
+    "Settings:\n"
+    "  number=NUMBER          what the modem dials: digits, *, #, + and commas (*99# if empty)\n"
+    "  user=NAME              for the provider's login\n"
+    "  password               likewise; stands alone, and is read from standard input\n"
+    "  apn=NAME               access point name, such as internet (if empty, the modem's own)\n"
+    "  isp=TEXT               the provider, for people\n"
+    "  location=TEXT          where that is, for people\n"
+    "  default-route=yes|no   whether the connection takes the default route\n"
+    "Roaming is shown, and up to the network.";
+
+// Adds one command about modems.
+Command AddForModems(const Command& group, const char* name, const char* description,
+                     Options& options, Run run) {
+    return group.AddCommand(name, description, [&options, run] {
+        options.id = FullId(options.id);
+        run(options);
+    });
+}
+
 // Adds a command about one modem.
 Command AddForOne(const Command& group, const char* name, const char* description, Options& options,
                   Run run) {
-    const Command command = Add(group, name, description, options, run);
-    command.AddOption("ID", options.id, "Device id, such as usbmodem0").Required();
+    const Command command = AddForModems(group, name, description, options, run);
+    command.AddOption("ID", options.id, kIdHelp).Required();
     return command;
 }
 
@@ -32,19 +55,21 @@ void AddProfileCommands(const Command& modem, Options& options) {
     const Command profile = modem.AddGroup("profile", "Connection profile of the SIM in a modem");
     AddForOne(profile, "show", "Show the profile; one is made for a new SIM", options, ShowProfile)
         .AddFlag("--show-secrets", options.showSecrets, "Show the password as well");
-    AddForOne(profile, "set",
-              "Change settings of the profile; the service connects a connected modem anew",
-              options, SetProfile)
-        .AddOption("KEY=VALUE", options.settings,
-                   "Settings; KEY alone reads its value from standard input (for pass)")
-        .Required();
+    const Command set =
+        AddForOne(profile, "set",
+                  "Change settings of the profile; the service connects a connected modem anew",
+                  options, SetProfile);
+    set.AddOption("SETTING", options.settings, "KEY=VALUE, or password").Required();
+    set.SetFooter(kSettingsHelp);
     AddForOne(profile, "reset",
               "Write the profile anew, with the defaults of the modem; only with --direct", options,
               ResetProfile);
 }
 
 void AddConnectionCommands(const Command& modem, Options& options) {
-    AddForOne(modem, "connect", "Dial, and wait until the link is up, at most 60 s or --timeout",
+    AddForOne(modem, "connect",
+              "Dial, and wait until the link is up, at most 60 s or --timeout; after that, and at "
+              "SIGINT, what was dialled is hung up",
               options, ConnectModem)
         .AddFlag("--no-wait", options.noWait, "Return as soon as the dialler runs");
     AddForOne(modem, "disconnect", "Hang up", options, DisconnectModem);
@@ -64,15 +89,26 @@ void AddModemCommands(const Command& app, Options& options) {
         options, ListModems);
     AddForOne(modem, "show", "Ask one modem, and show it and its profile", options, ShowModem)
         .AddFlag("--show-secrets", options.showSecrets, "Show the password as well");
-    Add(modem, "watch",
-        "Show the modems, or one, anew at every change that the service tells of, until SIGINT or "
-        "SIGTERM; --timeout is that of one look",
+    AddForModems(
+        modem, "watch",
+        "Show the modems, or one, anew at every change that the service tells of, with the last "
+        "signals drawn, until SIGINT or SIGTERM; --timeout is that of one look",
         options, WatchModems)
-        .AddOption("ID", options.id, "Device id, such as usbmodem0");
+        .AddOption("ID", options.id, kIdHelp);
     AddPINCommands(modem, options);
     AddProfileCommands(modem, options);
     AddConnectionCommands(modem, options);
-    Add(modem, "interfaces", "List the network interfaces of the modems", options, ListInterfaces);
+    AddForModems(modem, "interfaces", "List the network interfaces; asks no modem", options,
+                 ListInterfaces);
+    AddForModems(modem, "usage", "Show the bytes that went over each connection; asks no modem",
+                 options, ShowUsage)
+        .AddOption("ID", options.id, kIdHelp);
+    AddForOne(modem, "at",
+              "For support: send an AT command, whatever it does, and show what the modem answers",
+              options, SendATCommand)
+        .AddOption("COMMAND", options.atCommand,
+                   "Such as ATI; without one it is read from standard input, as is best for one "
+                   "that holds a PIN");
 }
 
 }  // namespace taviwireless::cli

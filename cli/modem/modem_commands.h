@@ -9,6 +9,8 @@ namespace taviwireless::cli {
 void ListModems(const Options& options);
 void ShowModem(const Options& options);
 void ListInterfaces(const Options& options);
+void ShowUsage(const Options& options);
+void SendATCommand(const Options& options);
 void WatchModems(const Options& options);
 
 void UnlockSIM(const Options& options);

@@ -276,8 +276,8 @@ TEST(OurPaths, HoldAllThatStandsInTheSources) {
         " grep -oE '/(tmp|var/tmp|var/lock|var/run|run|dev/shm)/[a-zA-Z0-9._-]*[a-zA-Z0-9]' | sort "
         "-u");
     for (const std::string& path : Lines(named)) {
-        if (path.find("XXXXXX") != path.npos) {
-            continue;  // a name that nobody knows before
+        if (path.find("XXXXXX") != path.npos || path == "/run/user") {
+            continue;  // a name that nobody knows before; where everybody has a folder of his own
         }
         const auto next = paths.lower_bound(path);
         EXPECT_TRUE(next != paths.end() && next->rfind(path, 0) == 0) << path;
