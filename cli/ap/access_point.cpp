@@ -11,12 +11,17 @@
 #include <cstring>
 
 #include "base/file_name.h"
+#include "cli/ap/channel_choice.h"
+#include "cli/ap/country.h"
 #include "cli/ap/dry_run.h"
+#include "cli/ap/failure_reason.h"
+#include "cli/ap/hostapd.h"
 #include "cli/ap/setting_words.h"
 #include "cli/command_error.h"
 #include "cli/terminal.h"
 #include "wireless/rules/ap_settings.h"
 #include "wireless/rules/paths.h"
+#include "wireless/rules/radio.h"
 #include "wireless/system/ap_store.h"
 #include "wireless/system/bridge.h"
 #include "wireless/system/files.h"
@@ -51,13 +56,6 @@ std::optional<WirelessAPSettings> FindSettings() {
     return settings;
 }
 
-// Whether the section says how the network is protected; an open network says that, too.
-bool IsStored(const WirelessAPSettings& settings) {
-    char kind[16];
-    return VEXACFileGetSectionValue(kAPSettings, settings.name, "encryption", kind, sizeof kind) ==
-           0;
-}
-
 void RequireStored(bool isDone) {
     if (!isDone) {
         throw CommandError(kFailure, std::string("cannot store the settings in ") + kAPSettings +
@@ -65,19 +63,25 @@ void RequireStored(bool isDone) {
     }
 }
 
-// Stores whether the access point is on, and changes nothing else in the file.
-void StoreEnabled(const WirelessAPSettings& settings, const char* yesOrNo) {
-    RequireStored(VEXACFileSetSectionValue(kAPSettings, settings.name, "enable", yesOrNo,
+// Stores one value, and changes nothing else in the file.
+void StoreValue(const WirelessAPSettings& settings, const char* key, const std::string& value) {
+    RequireStored(VEXACFileSetSectionValue(kAPSettings, settings.name, key, value.c_str(),
                                            wireless::kSectionLine) == 0);
+}
+
+// Stores whether the access point is on.
+void StoreEnabled(const WirelessAPSettings& settings, const char* yesOrNo) {
+    StoreValue(settings, "enable", yesOrNo);
 }
 
 // Settings with which an access point may be served; throws when there are none.
 WirelessAPSettings SettingsToServe() {
     WirelessAPSettings settings = ReadAPSettings();
-    if (!IsStored(settings)) {
+    if (!AreStored(settings)) {
         throw CommandError(kFailure, "no settings are stored for the adapter " +
                                          Printable(settings.name) +
-                                         "; taviwireless ap set stores them");
+                                         "; taviwireless ap set stores them, and --open serves a "
+                                         "network that everybody can join");
     }
     if (SecurityWord(MainNetwork(settings.ap)).empty()) {
         throw CommandError(kFailure,
@@ -100,8 +104,9 @@ bool HasProgram(const char* name) {
            0;
 }
 
-// The library says only that it failed; these are what commonly stands behind that.
-std::string CauseOfFailure() {
+// The library says only that it failed; these are what commonly stands behind that, and then what
+// was written on standard error.
+std::string CauseOfFailure(const std::string& errors) {
     struct statvfs disk {};
     if (access("/etc", W_OK) != 0) {
         return std::string("/etc cannot be written: ") + strerror(errno);
@@ -115,7 +120,8 @@ std::string CauseOfFailure() {
     if (!HasChannels()) {
         return "the adapter offers no channel; is its radio switched off? (rfkill list)";
     }
-    return "the system log tells why, and --verbose shows it";
+    const std::string reason = ReasonIn(errors);
+    return reason.empty() ? "the system log tells why, and --verbose shows it" : reason;
 }
 
 std::string AddressOf(const char* interface) {
@@ -136,7 +142,49 @@ std::string FileOfTheAccessPoint() {
     return VEXACFileGetKeyValue(file.c_str(), "BRIDGE", bridge, sizeof bridge) > 0 ? file : "";
 }
 
+// Switches it on with the settings that are stored. A channel that was chosen is stored meanwhile:
+// the library knows no other way to be told.
+void SwitchOnAsStored(const WirelessAPSettings& settings, int chosenChannel) {
+    const bool isChosen = chosenChannel != settings.ap.channel;
+    if (isChosen) {
+        StoreValue(settings, "channel", std::to_string(chosenChannel));
+    }
+    std::string cause;
+    {
+        const ErrorKeeper errors;
+        if (TAVIWirelessAPEnable() != 1) {
+            cause = CauseOfFailure(errors.Text());
+        }
+    }
+    if (isChosen) {
+        StoreValue(settings, "channel", std::to_string(settings.ap.channel));
+    }
+    if (!cause.empty()) {
+        throw CommandError(kFailure, "the access point could not be switched on: " + cause);
+    }
+}
+
+void AddRemark(Switched& switched, const std::string& remark) {
+    if (!remark.empty()) {
+        switched.remarks.push_back(remark);
+    }
+}
+
+bool IsOffAlready() {
+    const auto settings = FindSettings();
+    return settings && settings->enabled == 0 && FileOfTheAccessPoint().empty() &&
+           TAVIWirelessOpmodeGet() != WIRELESS_OPMODE_MASTER &&
+           !ServesHostapd(TAVIWirelessAPInterfaceGet());
+}
+
 }  // namespace
+
+// An open network says how it is protected, too.
+bool AreStored(const WirelessAPSettings& settings) {
+    char kind[16];
+    return VEXACFileGetSectionValue(kAPSettings, settings.name, "encryption", kind, sizeof kind) ==
+           0;
+}
 
 APStatus LookAtAP() {
     APStatus status{};
@@ -170,7 +218,18 @@ void StoreAPSettings(WirelessAPSettings settings) {
         __LINE__));
 }
 
-void SwitchAPOn() {
+void StoreOpenNetwork() {
+    WirelessAPSettings settings = ReadAPSettings();
+    if (!AreStored(settings)) {
+        StoreAPSettings(settings);  // the defaults
+    } else if (settings.ap.security != WIRELESS_AP_OPEN) {
+        throw CommandError(kUsage, "--open is for an open network, and security " +
+                                       SecurityWord(MainNetwork(settings.ap)) +
+                                       " is stored; leave it out, or set security=open");
+    }
+}
+
+Switched SwitchAPOn() {
     if (TAVIWirelessAPIsConnecting() == 1) {
         // This is refused, but also removes the flag that an attempt may have left when it was
         // killed.
@@ -181,17 +240,29 @@ void SwitchAPOn() {
     }
     const WirelessAPSettings settings = SettingsToServe();
     const bool wasOff = settings.enabled == 0;
+    if (!wasOff && IsServed(settings.ap)) {
+        return {true, {}};
+    }
+    Switched switched;
+    AddRemark(switched, EnforceCountry());
+    ChannelChoice choice{settings.ap.channel, ""};
+    if (choice.channel == wireless::kAnyChannel) {
+        choice = FindEmptiestChannel(settings.ap);
+        AddRemark(switched, choice.reason);
+    }
     if (wasOff) {
         StoreEnabled(settings, "yes");
     }
-    if (TAVIWirelessAPEnable() != 1) {
-        const std::string cause = CauseOfFailure();
+    try {
+        SwitchOnAsStored(settings, choice.channel);
+    } catch (const CommandError&) {
         if (wasOff) {
             TAVIWirelessAPDisable();  // of the last step, much may run already
             StoreEnabled(settings, "no");
         }
-        throw CommandError(kFailure, "the access point could not be switched on: " + cause);
+        throw;
     }
+    return switched;
 }
 
 std::vector<std::string> PlanAP() {
@@ -203,7 +274,10 @@ std::vector<std::string> PlanAP() {
     return PlanOfEnabling(settings.ap);
 }
 
-void SwitchAPOff() {
+bool SwitchAPOff() {
+    if (IsOffAlready()) {
+        return false;
+    }
     if (TAVIWirelessAPDisable() != 1) {
         throw CommandError(kFailure,
                            "the access point could not be switched off; the system log tells why");
@@ -222,6 +296,7 @@ void SwitchAPOff() {
                            std::string("switched off, but not after a restart: cannot read ") +
                                wireless::kAdapterInfo + " or " + kAPSettings);
     }
+    return true;
 }
 
 }  // namespace taviwireless::cli

@@ -25,19 +25,21 @@ void ListSavedNetworks(const Options& options) {
     Print(options, DescribeAll(SavedNetworks()));
 }
 
-// Shows, of several access points with one name, the one that was used last.
-void ShowSavedNetwork(const Options& options) {
-    RequireWifiSettings();
+WirelessConf SavedNetworkCalled(const std::string& name) {
     const auto saved = SavedNetworks();
-    const auto found = std::find_if(saved.begin(), saved.end(), [&](const WirelessConf& conf) {
-        return IsCalled(conf, options.network);
-    });
+    const auto found = std::find_if(saved.begin(), saved.end(),
+                                    [&](const WirelessConf& conf) { return IsCalled(conf, name); });
     if (found == saved.end()) {
-        throw CommandError(kNotFound, "no network " + Printable(options.network) +
+        throw CommandError(kNotFound, "no network " + Printable(name) +
                                           " is saved; taviwireless wifi saved list shows those "
                                           "that are");
     }
-    Print(options, Describe(*found, options.showSecrets));
+    return *found;
+}
+
+void ShowSavedNetwork(const Options& options) {
+    RequireWifiSettings();
+    Print(options, Describe(SavedNetworkCalled(options.network), options.showSecrets));
 }
 
 }  // namespace taviwireless::cli

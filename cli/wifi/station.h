@@ -19,6 +19,9 @@ std::vector<WirelessNetwork> Scan();
 
 // The last used first.
 std::vector<WirelessConf> SavedNetworks();
+// By its name or BSSID; of several access points with one name, the one that was used last. Throws
+// when none is called so.
+WirelessConf SavedNetworkCalled(const std::string& name);
 
 // True in a network, be it that of an access point or an ad-hoc one.
 bool IsInNetwork(int status);

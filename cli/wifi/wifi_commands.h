@@ -13,6 +13,7 @@ void DisconnectWifi(const Options& options);
 void ConnectAutomatically(const Options& options);
 void ListSavedNetworks(const Options& options);
 void ShowSavedNetwork(const Options& options);
+void ShowSavedCode(const Options& options);
 void CreateAdhoc(const Options& options);
 void ChangeWifiMode(const Options& options);
 void ShowWifiGateway(const Options& options);
