@@ -32,6 +32,7 @@ void Define(const Command& program, Options& options) {
     AddModemCommands(program, options);
     AddWifiCommands(program, options);
     AddAPCommands(program, options);
+    AddDoctorCommand(program, options);
 }
 
 void RunCommandLine(int argc, char** argv, Options& options) {

@@ -313,7 +313,7 @@ const CommandCall kCommands[] = {
     {"ap enable", Needs::kAdapter, true, {}}, {"ap disable", Needs::kAccessPoint, true, {}},
     {"ap hotspot", Needs::kAdapter, true, {}}, {"ap qr", Needs::kAdapter, false, {}},
     {"ap stations", Needs::kAccessPoint, false, {}},
-    {"wifi qr", Needs::kAdapter, false, {"My Net"}},
+    {"wifi qr", Needs::kAdapter, false, {"My Net"}}, {"doctor", Needs::kAdapter, false, {}},
 };
 // clang-format on
 
