@@ -11,7 +11,6 @@
 #include <cstring>
 
 #include "base/file_name.h"
-#include "cli/ap/channel_choice.h"
 #include "cli/ap/country.h"
 #include "cli/ap/dry_run.h"
 #include "cli/ap/failure_reason.h"
@@ -21,7 +20,6 @@
 #include "cli/terminal.h"
 #include "wireless/rules/ap_settings.h"
 #include "wireless/rules/paths.h"
-#include "wireless/rules/radio.h"
 #include "wireless/system/ap_store.h"
 #include "wireless/system/bridge.h"
 #include "wireless/system/files.h"
@@ -63,15 +61,10 @@ void RequireStored(bool isDone) {
     }
 }
 
-// Stores one value, and changes nothing else in the file.
-void StoreValue(const WirelessAPSettings& settings, const char* key, const std::string& value) {
-    RequireStored(VEXACFileSetSectionValue(kAPSettings, settings.name, key, value.c_str(),
-                                           wireless::kSectionLine) == 0);
-}
-
-// Stores whether the access point is on.
+// Stores whether the access point is on, and changes nothing else in the file.
 void StoreEnabled(const WirelessAPSettings& settings, const char* yesOrNo) {
-    StoreValue(settings, "enable", yesOrNo);
+    RequireStored(VEXACFileSetSectionValue(kAPSettings, settings.name, "enable", yesOrNo,
+                                           wireless::kSectionLine) == 0);
 }
 
 // Settings with which an access point may be served; throws when there are none.
@@ -142,31 +135,11 @@ std::string FileOfTheAccessPoint() {
     return VEXACFileGetKeyValue(file.c_str(), "BRIDGE", bridge, sizeof bridge) > 0 ? file : "";
 }
 
-// Switches it on with the settings that are stored. A channel that was chosen is stored meanwhile:
-// the library knows no other way to be told.
-void SwitchOnAsStored(const WirelessAPSettings& settings, int chosenChannel) {
-    const bool isChosen = chosenChannel != settings.ap.channel;
-    if (isChosen) {
-        StoreValue(settings, "channel", std::to_string(chosenChannel));
-    }
-    std::string cause;
-    {
-        const ErrorKeeper errors;
-        if (TAVIWirelessAPEnable() != 1) {
-            cause = CauseOfFailure(errors.Text());
-        }
-    }
-    if (isChosen) {
-        StoreValue(settings, "channel", std::to_string(settings.ap.channel));
-    }
-    if (!cause.empty()) {
-        throw CommandError(kFailure, "the access point could not be switched on: " + cause);
-    }
-}
-
-void AddRemark(Switched& switched, const std::string& remark) {
-    if (!remark.empty()) {
-        switched.remarks.push_back(remark);
+void SwitchOnAsStored() {
+    const ErrorKeeper errors;
+    if (TAVIWirelessAPEnable() != 1) {
+        throw CommandError(kFailure, "the access point could not be switched on: " +
+                                         CauseOfFailure(errors.Text()));
     }
 }
 
@@ -229,7 +202,7 @@ void StoreOpenNetwork() {
     }
 }
 
-Switched SwitchAPOn() {
+Switched SwitchAPOn(const std::optional<WirelessAPSettings>& changed) {
     if (TAVIWirelessAPIsConnecting() == 1) {
         // This is refused, but also removes the flag that an attempt may have left when it was
         // killed.
@@ -238,23 +211,20 @@ Switched SwitchAPOn() {
                            "an access point is being switched on already; if that was interrupted, "
                            "try again");
     }
-    const WirelessAPSettings settings = SettingsToServe();
+    WirelessAPSettings settings = changed ? *changed : SettingsToServe();
     const bool wasOff = settings.enabled == 0;
-    if (!wasOff && IsServed(settings.ap)) {
-        return {true, {}};
-    }
-    Switched switched;
-    AddRemark(switched, EnforceCountry());
-    ChannelChoice choice{settings.ap.channel, ""};
-    if (choice.channel == wireless::kAnyChannel) {
-        choice = FindEmptiestChannel(settings.ap);
-        AddRemark(switched, choice.reason);
-    }
-    if (wasOff) {
+    settings.enabled = 1;
+    if (changed) {
+        StoreAPSettings(settings);
+    } else if (wasOff) {
         StoreEnabled(settings, "yes");
     }
+    if (!wasOff && IsServed(settings.ap)) {
+        return {true, ""};
+    }
+    const std::string remark = EnforceCountry();
     try {
-        SwitchOnAsStored(settings, choice.channel);
+        SwitchOnAsStored();
     } catch (const CommandError&) {
         if (wasOff) {
             TAVIWirelessAPDisable();  // of the last step, much may run already
@@ -262,7 +232,7 @@ Switched SwitchAPOn() {
         }
         throw;
     }
-    return switched;
+    return {false, remark};
 }
 
 std::vector<std::string> PlanAP() {

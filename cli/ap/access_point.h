@@ -32,13 +32,13 @@ void StoreAPSettings(WirelessAPSettings settings);
 void StoreOpenNetwork();
 
 struct Switched {
-    bool wasOn = false;                // with these settings; nothing was done
-    std::vector<std::string> remarks;  // why this channel, and what could not be done
+    bool wasOn;          // with these settings; nothing was done
+    std::string remark;  // on what could not be done; mostly empty
 };
 // Stores that the access point is on, and switches it on: with stored settings only, never with
 // defaults, which are those of an open network. When that fails and it was stored as off, it is
-// switched off and stored as off again.
-Switched SwitchAPOn();
+// switched off and stored as off again. Settings that were changed are stored in the same step.
+Switched SwitchAPOn(const std::optional<WirelessAPSettings>& changed = std::nullopt);
 // What switching it on would do to the network of the machine, in lines; does none of it.
 std::vector<std::string> PlanAP();
 // Switches it off, and stores that. False when it was off already.

@@ -143,7 +143,7 @@ constexpr Setting kSettings[] = {
     {"bridge", false, SetBridge, "lbr0 (a network of its own), or the bridge to join"},
     {"band", false, SetBandWord, "2.4 or 5 (GHz)"},
     {"mode", false, SetModeWord, "b, bg, bgn, n; a, an at 5 GHz"},
-    {"channel", false, SetChannelWord, "a number, or auto: the emptiest each time"},
+    {"channel", false, SetChannelWord, "a number, or auto: the emptiest one now"},
     {"width", false, SetWidthWord, "20 or 40 (MHz)"},
     {"guest", false, SetGuest, "yes or no: a second network, for guests"},
     {"ssid", false, SetSsid, "the name of the network, 1 to 32 bytes"},

@@ -121,11 +121,8 @@ Report DescribeSwitchedOn(const Switched& switched, WirelessAPConf conf) {
         TAVIWirelessAPInterfaceGet() + (": access point " + Printable(conf.ssid)) +
         (switched.wasOn ? " is on already, " : " switched on, ") +
         (isOpen ? "open: everybody can join" : "security " + SecurityWord(network));
-    report.document["remarks"] = Json::arrayValue;
-    for (const std::string& remark : switched.remarks) {
-        report.document["remarks"].append(remark);
-        sentence += "; " + remark;
-    }
+    report.document["remark"] = TextOrNull(switched.remark);
+    sentence += (switched.remark.empty() ? "" : "; ") + switched.remark;
     report.rows = {{sentence}};
     return report;
 }

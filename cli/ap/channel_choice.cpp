@@ -66,7 +66,7 @@ std::string Reason(const Load& best, const std::vector<Load>& loads) {
     std::string fuller;
     for (const Load& load : loads) {
         const std::string channel = std::to_string(load.channel);
-        if (load.channel != best.channel && load.networks == best.networks) {
+        if (load.networks == best.networks && load.strongest > best.strongest) {
             AddItem(alike, channel, " and ");
         } else if (load.networks > best.networks) {
             AddItem(fuller, channel + " has " + std::to_string(load.networks));
@@ -94,24 +94,23 @@ std::vector<int> UsableChannels() {
 
 }  // namespace
 
-ChannelChoice ChooseChannel(const WirelessAPConf& conf,
-                            const std::vector<WirelessNetwork>& networks,
-                            const std::vector<int>& usable) {
-    const std::vector<Load> loads = Loads(conf, networks, usable);
-    const auto best =
-        std::min_element(loads.begin(), loads.end(), [](const Load& a, const Load& b) {
-            return a.networks != b.networks ? a.networks < b.networks : a.strongest < b.strongest;
-        });
-    return best == loads.end() ? ChannelChoice{}
-                               : ChannelChoice{best->channel, Reason(*best, loads)};
-}
-
-ChannelChoice FindEmptiestChannel(const WirelessAPConf& conf) {
+std::string TakeEmptiestChannel(WirelessAPConf& conf) {
     ShowProgress("Looking for the emptiest channel ...");
+    conf.channel = wireless::kAnyChannel;
     try {
-        return ChooseChannel(conf, Scan(), UsableChannels());
+        const std::vector<Load> loads = Loads(conf, Scan(), UsableChannels());
+        const auto best =
+            std::min_element(loads.begin(), loads.end(), [](const auto& a, const auto& b) {
+                return a.networks != b.networks ? a.networks < b.networks
+                                                : a.strongest < b.strongest;
+            });
+        if (best != loads.end()) {
+            conf.channel = best->channel;
+            return Reason(*best, loads);
+        }
+        return "hostapd chooses the channel: the adapter offers none of those to choose from";
     } catch (const CommandError& error) {
-        return {0, std::string("hostapd chooses the channel: ") + error.what()};
+        return std::string("hostapd chooses the channel: ") + error.what();
     }
 }
 

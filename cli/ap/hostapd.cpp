@@ -5,13 +5,11 @@
 
 #include <algorithm>
 #include <cstdio>
-#include <cstdlib>
 #include <cstring>
 #include <fstream>
 #include <iterator>
 
 #include "wireless/rules/paths.h"
-#include "wireless/rules/radio.h"
 #include "wireless/system/guest_network.h"
 #include "wireless/system/shell.h"
 
@@ -22,16 +20,6 @@ namespace {
 bool Holds(const ConfFile& file) {
     std::ifstream text(file.path);
     return text && std::string(std::istreambuf_iterator<char>(text), {}) == file.conf.Text();
-}
-
-// Where any channel will do, the one that was chosen.
-int ChannelServed(const WirelessAPConf& conf, const std::string& interface) {
-    char channel[8];
-    VEXACFileGetKeyValue(wireless::HostapdHostConf(interface).c_str(), "channel", channel,
-                         sizeof channel);
-    WirelessAPConf served = conf;
-    served.channel = atoi(channel);
-    return wireless::IsChannelOfBand(served) ? served.channel : conf.channel;
 }
 
 bool GuestsAreAsStored(const WirelessAPConf& conf, const std::string& interface) {
@@ -70,14 +58,11 @@ bool ServesHostapd(const std::string& interface) {
     return !answer.empty() && answer.back() == "PONG";
 }
 
-bool IsServed(WirelessAPConf conf) {
+bool IsServed(const WirelessAPConf& conf) {
     const std::string interface = TAVIWirelessAPInterfaceGet();
     if (TAVIWirelessOpmodeGet() != WIRELESS_OPMODE_MASTER || if_nametoindex(conf.bridge) == 0 ||
         !ServesHostapd(interface)) {
         return false;
-    }
-    if (conf.channel == wireless::kAnyChannel) {
-        conf.channel = ChannelServed(conf, interface);
     }
     const std::vector<ConfFile> files = RenderConfFiles(conf);
     return std::all_of(files.begin(), files.end(), Holds) && GuestsAreAsStored(conf, interface);

@@ -24,7 +24,7 @@ std::vector<std::string> AskHostapd(const std::string& interface, const char* qu
 bool ServesHostapd(const std::string& interface);
 
 // Whether the access point runs with these settings: nothing would change if it were switched on.
-bool IsServed(WirelessAPConf conf);
+bool IsServed(const WirelessAPConf& conf);
 
 }  // namespace taviwireless::cli
 

@@ -10,10 +10,12 @@
 #include "cli/ap/ap_changes.h"
 #include "cli/ap/ap_commands.h"
 #include "cli/ap/ap_report.h"
+#include "cli/ap/channel_choice.h"
 #include "cli/ap/setting_words.h"
 #include "cli/command_error.h"
 #include "cli/qr_code.h"
 #include "cli/terminal.h"
+#include "wireless/rules/radio.h"
 
 namespace taviwireless::cli {
 
@@ -86,17 +88,24 @@ void ServeHotspot(const Options& options) {
     RequireAPSupport();
     WirelessAPSettings settings = ReadAPSettings();
     MakeHotspot(settings.ap, options.network);
-    StoreAPSettings(settings);
+    std::string channel;
+    if (settings.ap.channel == wireless::kAnyChannel) {
+        channel = TakeEmptiestChannel(settings.ap);
+    }
     ShowProgress("Switching the access point on ...");
-    const Switched switched = SwitchAPOn();
+    const Switched switched = SwitchAPOn(settings);
     const CodeNetwork code = CodeOf(MainNetwork(settings.ap));
     Report outcome = DescribeSwitchedOn(switched, settings.ap);
     Report network;
+    if (!channel.empty()) {
+        outcome.rows.push_back({channel});
+    }
     network.Add("ssid", "Network", code.ssid);
     network.Add("key", "Key", code.key);
     if (!options.json) {
         return PrintForAPerson(outcome, network, code);
     }
+    outcome.document["channel_reason"] = TextOrNull(channel);
     outcome.document["key"] = code.key;
     outcome.document["qr_text"] = WifiText(code);
     Print(options, outcome);

@@ -4,6 +4,7 @@
 #include "cli/ap/ap_changes.h"
 #include "cli/ap/ap_commands.h"
 #include "cli/ap/ap_report.h"
+#include "cli/ap/channel_choice.h"
 #include "cli/ap/country.h"
 #include "cli/ap/setting_words.h"
 #include "cli/command_error.h"
@@ -68,12 +69,23 @@ void SetAP(const Options& options) {
         RequireSecuritySaid(GuestNetwork(settings.ap), changes);
     }
     CheckAPConf(settings.ap);
+    const APChange* channel = FindChange(changes, "channel");
+    std::string remark;
+    if (channel != nullptr && channel->value == "auto") {
+        remark = TakeEmptiestChannel(settings.ap);
+    }
     if (const APChange* country = FindChange(changes, "country")) {
         StoreCountry(CountryOf(country->value));
     }
     StoreAPSettings(settings);
-    PrintOutcome(options, "Stored; taviwireless ap enable puts it into force.",
-                 [&] { return Describe(settings); });
+    PrintOutcome(options,
+                 "Stored" + (remark.empty() ? "" : ", " + remark) +
+                     "; taviwireless ap enable puts it into force.",
+                 [&] {
+                     Report report = Describe(settings);
+                     report.document["remark"] = TextOrNull(remark);
+                     return report;
+                 });
 }
 
 void EnableAP(const Options& options) {

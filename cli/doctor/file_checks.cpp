@@ -79,7 +79,7 @@ Findings Folders() {
 }
 
 Findings Space() {
-    constexpr unsigned long kLittle = 1024 * 1024;  // bytes; a file is written anew beside the old
+    constexpr unsigned long kLittle = 1UL << 20;  // bytes; a file is written anew beside the old
     std::string full;
     std::string nearlyFull;
     for (const char* folder : kFolders) {
