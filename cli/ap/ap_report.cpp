@@ -66,14 +66,20 @@ void AddNetwork(Report& report, const APNetwork& network, bool showSecrets) {
     }
 }
 
-const char* StateText(const APStatus& status) {
+struct State {
+    const char* word;
+    const char* text;
+};
+State StateOf(const APStatus& status) {
     if (status.isConnecting) {
-        return "being switched on";
+        return {"connecting", "being switched on"};
     }
     if (status.isOn) {
-        return "on";
+        return {"on", "on"};
     }
-    return status.isSupported ? "off" : "the adapter, if there is one, cannot be an access point";
+    return status.isSupported
+               ? State{"off", "off"}
+               : State{"not_supported", "the adapter, if there is one, cannot be an access point"};
 }
 
 // Rows only while there is a network for guests.
@@ -94,10 +100,8 @@ Report Describe(const APStatus& status) {
     const std::string interface = TAVIWirelessAPInterfaceGet();
     Report report;
     report.Add("interface", "Interface", interface, interface);
-    report.rows.push_back({"State", StateText(status)});
-    report.document["supported"] = status.isSupported;
-    report.document["connecting"] = status.isConnecting;
-    report.document["on"] = status.isOn;
+    const State state = StateOf(status);
+    report.Add("state", "State", state.word, state.text);
     if (!status.settings) {
         for (const char* key : {"enabled", "ssid", "bridge", "address", "max_stations"}) {
             report.document[key] = Json::Value();

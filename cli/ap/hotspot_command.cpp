@@ -21,8 +21,8 @@ namespace taviwireless::cli {
 
 namespace {
 
-// 64 bits in 16 letters, with a dash after every four. No letter looks like another one, or like a
-// digit, in any script.
+// 64 bits in 16 letters, with a dash after every four. None of the letters is easily taken for
+// another one, or for a digit.
 std::string NewKey() {
     constexpr char kLetters[] = "acdefhjkmnprtwxy";
     unsigned char random[16];

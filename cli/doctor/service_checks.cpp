@@ -2,7 +2,7 @@
 #include <gio/gio.h>
 #include <unistd.h>
 
-#include <algorithm>
+#include <cstdlib>
 #include <memory>
 #include <string>
 
@@ -28,8 +28,9 @@ std::string BusAddress() {
     if (address != nullptr && *address != '\0') {
         return address;
     }
-    const std::string ofUser = "/run/user/" + std::to_string(geteuid()) + "/bus";
-    return access(ofUser.c_str(), F_OK) == 0 ? "unix:path=" + ofUser : "";
+    const char* folder = getenv("XDG_RUNTIME_DIR");
+    const std::string ofUser = std::string(folder != nullptr ? folder : "") + "/bus";
+    return folder != nullptr && access(ofUser.c_str(), F_OK) == 0 ? "unix:path=" + ofUser : "";
 }
 
 Owned<GDBusConnection> Connect(std::string& reason) {

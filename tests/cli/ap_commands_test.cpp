@@ -205,7 +205,7 @@ TEST_F(APCommands, ItIsSwitchedOnAndOff) {
     ASSERT_EQ(Set({"ssid=New"}).status, 0);
     EXPECT_THAT(AP({"enable"}).out, StartsWith("wlan0: access point New switched on, "));
     const Json::Value on = Parse(AP({"status", "--json"}).out);
-    EXPECT_TRUE(on["on"] == true && on["enabled"] == true) << on;
+    EXPECT_TRUE(on["state"] == "on" && on["enabled"] == true) << on;
     EXPECT_EQ(on["bridge"], "lbr0");
     EXPECT_EQ(on["address"], "10.1.14.1");
     EXPECT_EQ(on["max_stations"], 256);
@@ -475,7 +475,7 @@ TEST_F(APCommands, WhatIsMissingIsSaidInOneLine) {
     EXPECT_THAT(AP({"enable"}).err, StartsWith("taviwireless: there is no adapter that can be an"));
     Shell("rm /tmp/wireless.info");
     EXPECT_THAT(AP({"show"}).err, StartsWith("taviwireless: there are no settings without an"));
-    EXPECT_EQ(Parse(AP({"status", "--json"}).out)["supported"], false);
+    EXPECT_EQ(Parse(AP({"status", "--json"}).out)["state"], "not_supported");
 }
 
 }  // namespace

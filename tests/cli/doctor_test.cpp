@@ -117,6 +117,9 @@ TEST(Doctor, NamesWhatIsWrongAndWhatToDo) {
         EXPECT_THAT(complaints, testing::StartsWith(row.complaint));
         EXPECT_EQ(Lines(complaints).size(), 1u) << complaints;
     }
+    EXPECT_THAT(
+        RunAsNobody({BuiltProgram("taviwireless_with_wifi"), "doctor"}).out,
+        HasSubstr("\n-   access point           only root may read its settings; look as root\n"));
     machine.served.service.End();
     EXPECT_THAT(Complaints(),
                 HasSubstr("modem service warning: does not run, and this bus cannot"));
