@@ -21,6 +21,7 @@ inline Command Add(const Command& group, const char* name, const char* descripti
 void AddModemCommands(const Command& program, Options& options);
 void AddWifiCommands(const Command& program, Options& options);
 void AddAPCommands(const Command& program, Options& options);
+void AddDoctorCommand(const Command& program, Options& options);
 
 }  // namespace taviwireless::cli
 

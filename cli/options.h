@@ -22,7 +22,9 @@ struct Options {
     std::vector<std::string> settings;  // profile set, ap set: KEY=VALUE or KEY
 
     // ap
-    bool dryRun = false;  // enable: show what would be done
+    bool dryRun = false;       // enable: show what would be done
+    bool guest = false;        // qr: of the network for guests
+    bool openNetwork = false;  // enable: without settings, a network that everybody can join
 
     // wifi
     std::string network;        // SSID, or BSSID

@@ -15,13 +15,26 @@ void AddAPCommands(const Command& app, Options& options) {
     set.AddOption("SETTING", options.settings,
                   "KEY=VALUE, or KEY alone for a secret, which is read from standard input")
         .Required();
-    set.SetFooter("Settings: " + APSettingNames());
+    set.SetFooter(APSettingsHelp());
 
     Add(ap, "check", "Show what hostapd would be started with, and whether it understands that",
         options, CheckAP)
         .AddFlag("--show-secrets", options.showSecrets, "Show the secrets as well");
-    Add(ap, "enable", "Switch it on, now and after a restart", options, EnableAP)
-        .AddFlag("--dry-run", options.dryRun, "Only show what that would change in the network");
+    const Command enable =
+        Add(ap, "enable", "Switch it on, now and after a restart", options, EnableAP);
+    const Argument isDryRun = enable.AddFlag("--dry-run", options.dryRun,
+                                             "Only show what that would change in the network");
+    enable
+        .AddFlag("--open", options.openNetwork,
+                 "Without stored settings, serve a network that everybody can join")
+        .Excludes(isDryRun);
+    Add(ap, "hotspot", "Serve a network with WPA2 and a new key, and show its QR code to join by",
+        options, ServeHotspot)
+        .AddOption("SSID", options.network, "Name of the network; without it, the stored one");
+    Add(ap, "qr", "Show the QR code by which a telephone joins; it holds the key", options,
+        ShowAPCode)
+        .AddFlag("--guest", options.guest, "That of the network for guests");
+    Add(ap, "stations", "List who is connected", options, ListStations);
     Add(ap, "disable", "Switch it off, now and after a restart", options, DisableAP);
 }
 

@@ -73,6 +73,11 @@ void AddWifiCommands(const Command& app, Options& options) {
         ConnectAutomatically);
     AddSavedNetworkCommands(wifi, options);
 
+    Add(wifi, "qr", "Show the QR code by which a telephone joins; it holds the key", options,
+        ShowSavedCode)
+        .AddOption("NETWORK", options.network, "A saved network: its name, or BSSID")
+        .Required();
+
     const Command adhoc =
         Add(wifi, "adhoc", "Create or join an ad-hoc network", options, CreateAdhoc);
     adhoc.AddOption("SSID", options.network, "Name of the network").Required();

@@ -17,6 +17,7 @@ void EditSavedNetwork(const Options& options);
 void ForgetNetwork(const Options& options);
 void SwitchRadio(const Options& options);
 void WatchWifi(const Options& options);
+void ShowSavedCode(const Options& options);
 void CreateAdhoc(const Options& options);
 void ChangeWifiMode(const Options& options);
 void ShowWifiGateway(const Options& options);

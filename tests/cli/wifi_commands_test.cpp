@@ -162,6 +162,8 @@ TEST_F(WifiCommands, SavedNetworksHideTheirKeys) {
         const RunResult shown = Wifi({"saved", "show", name, "--show-secrets", "--json"});
         EXPECT_EQ(Parse(shown.out)["key"], "the right key");
     }
+    EXPECT_EQ(Parse(Wifi({"qr", "My Home", "--json"}).out)["qr_text"],
+              "WIFI:T:WPA;S:My Home;P:the right key;;");
     EXPECT_EQ(Wifi({"saved", "show", "Elsewhere"}).status, kNotFound);
 }
 

@@ -315,6 +315,9 @@ const CommandCall kCommands[] = {
     {"ap status", Needs::kAdapter, false, {}}, {"ap show", Needs::kAdapter, false, {}},
     {"ap set", Needs::kAdapter, true, {"ssid=Other"}}, {"ap check", Needs::kAdapter, false, {}},
     {"ap enable", Needs::kAdapter, true, {}}, {"ap disable", Needs::kAccessPoint, true, {}},
+    {"ap hotspot", Needs::kAdapter, true, {}}, {"ap qr", Needs::kAdapter, false, {}},
+    {"ap stations", Needs::kAccessPoint, false, {}},
+    {"wifi qr", Needs::kAdapter, false, {"My Net"}}, {"doctor", Needs::kAdapter, false, {}},
 };
 // clang-format on
 

@@ -14,7 +14,7 @@ status_of() {
     ap status | sed -n "s/^$1  *//p"
 }
 
-# join NETWORK PASSPHRASE: what a station does at home.
+# join NETWORK KEY: what a station does at home.
 join() {
     leave
     printf '%s\n' ctrl_interface=/run/station "network={" "ssid=\"$1\"" "psk=\"$2\"" scan_ssid=1 "}" >/run/station.conf
@@ -55,7 +55,7 @@ set_up() {
 }
 
 sets_and_checks() {
-    ap set ssid="My Home" security=wpa2 passphrase channel=6 <<<"correct horse"
+    ap set ssid="My Home" security=wpa2 key channel=6 <<<"correct horse"
     same 600 "$(stat -c %a /usr/tavi/etc/wireless_ap.conf)"
     must_fail grep -F "correct horse" <<<"$(ap show)"
     ap check
@@ -83,7 +83,7 @@ serves_station() {
     leased=$(lease)
     holds "$leased" "^ip=10\.1\.14\.([2-9]|[1-9][0-9]|1[0-9][0-9]|2[0-4][0-9]|25[0-4]) mask=24 router=10.1.14.1 "
     in_air ping -c 2 -i 0.2 -W 2 10.1.14.1
-    iw dev wlan0 station dump | grep "^Station $(in_air cat /sys/class/net/wlan1/address)"
+    holds "$(ap stations)" "^$(in_air cat /sys/class/net/wlan1/address) +.* +10\.1\.14\.[0-9]+ +[0-9]+% .* My Home$"
 }
 
 disables() {
@@ -105,7 +105,7 @@ serves_guests() {
         >/etc/sysconfig/network-scripts/ifcfg-gbr
     printf '%s\n' enable=yes reserved=30 lease=3600 start=10.1.15.50 end=10.1.15.59 interface=gbr bridge=gbr \
         gateway=10.1.15.1 nameserver=10.1.15.1 netmask=255.255.255.0 >/etc/dhcpd/dhcpd-gbr-gbr.info
-    ap set guest=yes guest-ssid=Visitors guest-security=wpa2 guest-passphrase <<<"welcome friend"
+    ap set guest=yes guest-ssid=Visitors guest-security=wpa2 guest-key <<<"welcome friend"
     ap enable
     join Visitors "welcome friend"
     holds "$(lease)" "^ip=10.1.15.5[0-9] "
