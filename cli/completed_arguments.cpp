@@ -1,9 +1,10 @@
 #include "cli/completed_arguments.h"
 
-#include "base/split.h"
 #include "cli/ap/ap_changes.h"
 #include "cli/modem/modem_access.h"
-#include "cli/wifi/station.h"
+#include "cli/modem/modem_commands.h"
+#include "cli/wifi/saved_networks.h"
+#include "cli/wifi/wifi_commands.h"
 
 namespace taviwireless::cli {
 
@@ -19,24 +20,6 @@ Words SavedNames() {
     return names;
 }
 
-Words APSettings() {
-    Words settings;
-    for (const std::string& name : Split(APSettingNames(), ',')) {
-        settings.push_back(name.substr(name.find_first_not_of(' ')) + "=");
-    }
-    return settings;
-}
-
-Words ProfileSettings() {
-    Words settings;
-    for (const ProfileKey& key : kProfileKeys) {
-        if (key.isStored) {
-            settings.push_back(std::string(key.name) + "=");
-        }
-    }
-    return settings;
-}
-
 // Nothing where the files cannot be read: a shell has no use for a sentence.
 template <Words (*kRead)()>
 Words OrNone() {
@@ -50,11 +33,9 @@ Words OrNone() {
 }  // namespace
 
 ArgumentValues CompletedArguments() {
-    return {{"ID", OrNone<PluggedModems>},
-            {"SSID", OrNone<SavedNames>},
-            {"NETWORK", OrNone<SavedNames>},
-            {"SETTING", APSettings},
-            {"KEY=VALUE", ProfileSettings}};
+    return {{"ID", OrNone<PluggedModems>},   {"SSID", OrNone<SavedNames>},
+            {"NETWORK", OrNone<SavedNames>}, {"SETTING", APSettingWords},
+            {"CHANGE", SavedSettingWords},   {"KEY=VALUE", ProfileSettingWords}};
 }
 
 }  // namespace taviwireless::cli

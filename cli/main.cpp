@@ -83,7 +83,7 @@ void RunCommandLine(int argc, char** argv, Options& options) {
 
 int main(int argc, char** argv) {
     using namespace taviwireless::cli;
-    setlocale(LC_CTYPE, "");  // the letters that the terminal has
+    setlocale(LC_CTYPE, "");   // the letters that the terminal has
     signal(SIGCHLD, SIG_DFL);  // what started this may ignore it, and then no program has a result
     signal(SIGPIPE, [](int) {});  // not ignored, which programs that are started would inherit
     Options options;

@@ -238,6 +238,14 @@ std::string APSettingsHelp() {
     return help;
 }
 
+std::vector<std::string> APSettingWords() {
+    std::vector<std::string> words;
+    for (const Setting& setting : kSettings) {
+        words.push_back(setting.key + std::string(IsSecret(setting) ? "" : "="));
+    }
+    return words;
+}
+
 const APChange* FindChange(const std::vector<APChange>& changes, const std::string& key) {
     const auto found = std::find_if(changes.begin(), changes.end(),
                                     [&](const APChange& change) { return change.key == key; });

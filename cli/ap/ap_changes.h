@@ -17,6 +17,9 @@ struct APChange {
 // The settings there are, a line each with the values that it takes.
 std::string APSettingsHelp();
 
+// How they begin on a command line: "ssid=", and "key" for what is read.
+std::vector<std::string> APSettingWords();
+
 // "KEY=VALUE" each, or "KEY" alone for the secrets, which are read from standard input, a line each
 // in this order. Nothing is read when there is a mistake.
 std::vector<APChange> ReadAPChanges(const std::vector<std::string>& texts);

@@ -40,7 +40,7 @@ bool IsAllowed(WirelessAPConf conf, int channel, const std::vector<int>& usable)
     return hasRoom && std::find(usable.begin(), usable.end(), channel) != usable.end();
 }
 
-std::vector<Load> Loads(const WirelessAPConf& conf, const std::vector<WirelessNetwork>& networks,
+std::vector<Load> Loads(const WirelessAPConf& conf, const std::vector<NetworkInRange>& networks,
                         const std::vector<int>& usable) {
     const std::vector<int> apart = BandWord(conf) == "2.4"
                                        ? std::vector<int>{1, 6, 11}
@@ -49,7 +49,8 @@ std::vector<Load> Loads(const WirelessAPConf& conf, const std::vector<WirelessNe
     for (const int channel : apart) {
         if (IsAllowed(conf, channel, usable)) {
             Load load{channel};
-            for (const WirelessNetwork& network : networks) {
+            for (const NetworkInRange& other : networks) {
+                const WirelessNetwork& network = other.network;
                 if (IsInTheWay(conf, channel, network.channel)) {
                     ++load.networks;
                     load.strongest = std::max(load.strongest, static_cast<int>(network.signal));

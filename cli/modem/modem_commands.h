@@ -1,6 +1,9 @@
 #ifndef TAVIWIRELESS_CLI_MODEM_MODEM_COMMANDS_H
 #define TAVIWIRELESS_CLI_MODEM_MODEM_COMMANDS_H
 
+#include <string>
+#include <vector>
+
 #include "cli/options.h"
 
 // What the commands about modems do. Each throws CommandError when it fails.
@@ -21,6 +24,8 @@ void UsePUK(const Options& options);
 
 void ShowProfile(const Options& options);
 void SetProfile(const Options& options);
+// How the settings that it takes begin: "apn=", and "password" for what is read.
+std::vector<std::string> ProfileSettingWords();
 void ResetProfile(const Options& options);
 
 void ConnectModem(const Options& options);

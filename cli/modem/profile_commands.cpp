@@ -132,6 +132,16 @@ void ShowProfile(const Options& options) {
     Print(options, Describe(profile, options.showSecrets));
 }
 
+std::vector<std::string> ProfileSettingWords() {
+    std::vector<std::string> words;
+    for (const ProfileKey& key : kProfileKeys) {
+        if (key.isStored) {
+            words.push_back(Word(key) + (key.name == std::string(profile::kPassword) ? "" : "="));
+        }
+    }
+    return words;
+}
+
 void SetProfile(const Options& options) {
     std::vector<profile::Setting> settings;
     for (const std::string& text : options.settings) {

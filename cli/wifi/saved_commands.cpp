@@ -109,6 +109,14 @@ void ShowSavedNetwork(const Options& options) {
     Print(options, Describe(SavedNetworksCalled(options.network).front(), options.showSecrets));
 }
 
+std::vector<std::string> SavedSettingWords() {
+    std::vector<std::string> words;
+    for (const Setting& setting : kSettings) {
+        words.push_back(setting.key + std::string(setting.isSecret ? "" : "="));
+    }
+    return words;
+}
+
 void EditSavedNetwork(const Options& options) {
     RequireWifiSettings();
     EditedNetwork network{SavedNetworksCalled(options.network).front(), "", {}};

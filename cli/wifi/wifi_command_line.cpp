@@ -43,7 +43,7 @@ void AddSavedNetworkCommands(const Command& wifi, Options& options) {
     const Command edit =
         Add(saved, "edit", "Change what is saved of one of them", options, EditSavedNetwork);
     edit.AddOption("NETWORK", options.network, kSavedName).Required();
-    edit.AddOption("SETTING", options.settings,
+    edit.AddOption("CHANGE", options.settings,
                    "key (alone: it is read from standard input), user=NAME, dhcp=yes, "
                    "address=ADDRESS/PREFIX, gateway=ADDRESS, dns=ADDRESS[,ADDRESS]; an empty "
                    "gateway or dns takes it away",
