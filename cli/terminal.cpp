@@ -1,19 +1,13 @@
 #include "cli/terminal.h"
 
-#include <bsd/readpassphrase.h>
 #include <glib.h>
 #include <strings.h>
 #include <unistd.h>
 
 #include <algorithm>
-#include <cerrno>
 #include <cstdlib>
-#include <cstring>
-#include <iostream>
 
 #include "base/terminal_columns.h"
-#include "cli/command_error.h"
-#include "cli/deadline.h"
 
 namespace taviwireless::cli {
 
@@ -32,14 +26,6 @@ bool Steers(gunichar code) {
                              (code >= 0x2066 && code <= 0x2069);
     return type == G_UNICODE_CONTROL || type == G_UNICODE_LINE_SEPARATOR ||
            type == G_UNICODE_PARAGRAPH_SEPARATOR || isDirection;
-}
-
-std::string ReadLine(const std::string& what) {
-    std::string line;
-    if (!std::getline(std::cin, line)) {
-        throw CommandError(kFailure, "standard input ended before there was a line for: " + what);
-    }
-    return line;
 }
 
 }  // namespace
@@ -87,42 +73,6 @@ std::string Coloured(Colour colour, const std::string& text) {
         return text;
     }
     return std::string("\033[") + kCodes[static_cast<int>(colour)] + "m" + text + "\033[0m";
-}
-
-std::string ReadSecret(const std::string& prompt) {
-    const Untimed untimed;
-    ShowProgress("");
-    if (isatty(STDIN_FILENO) == 0) {
-        return ReadLine(prompt);
-    }
-    char line[4096];  // longer than a terminal's line
-    if (readpassphrase((prompt + ": ").c_str(), line, sizeof line, RPP_REQUIRE_TTY) == nullptr) {
-        throw CommandError(kFailure, "cannot read from the terminal (" +
-                                         std::string(strerror(errno)) +
-                                         "); a pipe can give a line for: " + prompt);
-    }
-    const std::string secret = line;
-    explicit_bzero(line, sizeof line);
-    return secret;
-}
-
-std::string ReadNewSecret(const std::string& prompt) {
-    const std::string secret = ReadSecret(prompt);
-    if (isatty(STDIN_FILENO) && ReadSecret(prompt + " again") != secret) {
-        throw CommandError(kUsage, "the two differ; nothing was changed");
-    }
-    return secret;
-}
-
-bool Confirm(const std::string& question, const std::string& withoutTerminal) {
-    if (!isatty(STDIN_FILENO)) {
-        throw CommandError(kFailure, withoutTerminal);
-    }
-    const Untimed untimed;
-    ShowProgress("");
-    std::cerr << question << " [yes/no] ";
-    std::string answer;
-    return std::getline(std::cin, answer) && answer == "yes";
 }
 
 }  // namespace taviwireless::cli

@@ -1,3 +1,4 @@
+# shellcheck shell=bash
 # Completion of taviwireless for bash. The program itself knows what its words may be.
 _taviwireless() {
     # Words as a person sees them: bash divides them at "=" and ":" as well, and replaces what is behind the last.

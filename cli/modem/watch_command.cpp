@@ -64,9 +64,7 @@ void Show(const std::string& text, bool inPlace) {
     constexpr char kClearScreen[] = "\033[H\033[2J";
     ShowProgress("");
     std::cout << (inPlace ? kClearScreen : "") << text;
-    if (!std::cout.flush()) {
-        throw CommandError(kFailure, "cannot write the output");
-    }
+    FlushOutput();
 }
 
 }  // namespace
@@ -74,7 +72,7 @@ void Show(const std::string& text, bool inPlace) {
 void WatchModems(const Options& options) {
     signal(SIGINT, EndWithSuccess);
     signal(SIGTERM, EndWithSuccess);
-    const bool inPlace = !options.json && isatty(STDOUT_FILENO);
+    const bool inPlace = !options.json && TakesEscapes(STDOUT_FILENO);
     const auto access = MakeAccess(options);
     Deadline deadline(options);
     constexpr bool kInOneLine = true;

@@ -107,7 +107,7 @@ TEST(Terminals, ASecretIsNotShownAndTheEchoComesBack) {
     for (const auto& [typed, signal, status] : kEnds) {
         Terminal terminal(
             In("xterm", "C", "modem --direct profile set usbmodem0 pass", "taviwireless"), 80);
-        ASSERT_TRUE(terminal.Await("pass: ")) << terminal.Shown();
+        ASSERT_TRUE(terminal.AwaitPrompt("pass: ")) << terminal.Shown();
         EXPECT_FALSE(terminal.Echoes());
         terminal.Type(typed);
         terminal.Signal(signal);

@@ -13,7 +13,9 @@
 #include <chrono>
 #include <csignal>
 #include <system_error>
+#include <thread>
 
+#include "tests/support/files.h"
 #include "tests/support/process.h"
 
 namespace taviwireless::test {
@@ -98,6 +100,15 @@ bool Terminal::Await(const std::string& text) {
     }
     awaited_ = place + text.size();
     return true;
+}
+
+bool Terminal::AwaitPrompt(const std::string& text) {
+    const bool isShown = Await(text);
+    const std::string status = "/proc/" + std::to_string(pid_) + "/status";
+    while (isShown && !HasEnded() && ReadFile(status).find("State:\tS") == std::string::npos) {
+        std::this_thread::sleep_for(std::chrono::milliseconds(1));
+    }
+    return isShown;
 }
 
 int Terminal::Wait() {

@@ -28,6 +28,9 @@ class Terminal {
     // the end of the program, or within 50 s.
     bool Await(const std::string& text);
 
+    // Await; then the program sleeps, so that a signal interrupts its reading.
+    bool AwaitPrompt(const std::string& text);
+
     // Waits until the program has ended. Its exit status, or 128 + N when signal N killed it.
     int Wait();
     // All that was shown until now.
