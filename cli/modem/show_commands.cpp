@@ -61,9 +61,10 @@ void ListOneByOne(ModemAccess& access) {
 }
 
 void CheckCommand(const std::string& command) {
-    const auto isControl = [](unsigned char c) { return c < ' ' || c == 0x7F; };
-    if (command.empty() || std::any_of(command.begin(), command.end(), isControl)) {
-        throw CommandError(kUsage, "an AT command has characters, and no control characters");
+    const bool isPrintable =
+        std::all_of(command.begin(), command.end(), [](char c) { return c >= ' ' && c <= '~'; });
+    if (command.empty() || !isPrintable) {
+        throw CommandError(kUsage, "an AT command is printable ASCII");
     }
 }
 

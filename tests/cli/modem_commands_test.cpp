@@ -19,6 +19,9 @@ TEST(DirectCommands, ADeadModemDoesNotHideTheOneBehindIt) {
     EXPECT_TRUE(modems[0]["vendor"].isNull() && modems[0]["sim_state"].isNull());
     EXPECT_EQ(modems[1]["sim_state"], "ready");
     EXPECT_EQ(modems[1]["signal"], 54);
+    const std::string rows = DirectModem({"list"}).out;
+    EXPECT_THAT(rows, StartsWith("DEVICE"));
+    EXPECT_THAT(rows, testing::ContainsRegex("\nusbmodem0 +- .*\nusbmodem1 +huawei +E1752 "));
 }
 
 TEST(DirectCommands, FailuresAreOneSentenceAndAnExitStatus) {
@@ -29,7 +32,7 @@ TEST(DirectCommands, FailuresAreOneSentenceAndAnExitStatus) {
     } kCases[] = {
         {{"show", "usbmodem0"}, kNotFound, "there is no modem usbmodem0; "},
         {{"status", "0"}, kNotFound, "there is no modem usbmodem0; "},
-        {{"at", "0", "AT\rAT"}, kUsage, "an AT command has characters"},
+        {{"at", "0", "AT\rAT"}, kUsage, "an AT command is printable ASCII"},
         {{"show"}, kUsage, "ID is required"},
         {{}, kUsage, "A subcommand is required"},
         {{"list", "--what"}, kUsage, "The following argument was not expected: --what"},

