@@ -74,7 +74,9 @@ void ListModems(const Options& options) {
     const auto access = MakeAccess(options);
     Deadline deadline(options);
     deadline.Limit([&] {
-        if (!options.json && !PluggedModems().empty() && access->HasToAsk()) {
+        // Whoever waits sees rows come; a program gets the same table, whatever has to be asked.
+        const bool isWatched = !options.json && isatty(STDOUT_FILENO);
+        if (isWatched && !PluggedModems().empty() && access->HasToAsk()) {
             ListOneByOne(*access);
         } else {
             Print(options, DescribeAll(access->KnownModems(options.json)));

@@ -19,9 +19,10 @@ TEST(DirectCommands, ADeadModemDoesNotHideTheOneBehindIt) {
     EXPECT_TRUE(modems[0]["vendor"].isNull() && modems[0]["sim_state"].isNull());
     EXPECT_EQ(modems[1]["sim_state"], "ready");
     EXPECT_EQ(modems[1]["signal"], 54);
-    const std::string rows = DirectModem({"list"}).out;
-    EXPECT_THAT(rows, StartsWith("DEVICE"));
-    EXPECT_THAT(rows, testing::ContainsRegex("\nusbmodem0 +- .*\nusbmodem1 +huawei +E1752 "));
+    const std::string list = "'" + BuiltProgram("taviwireless") + "' modem --direct list";
+    EXPECT_THAT(RunProgram(WithShortWaits({"script", "-qec", list, "/dev/null"})).out,
+                testing::ContainsRegex("Asking usbmodem0, usbmodem1 .*DEVICE .*usbmodem0 +- .*"
+                                       "usbmodem1 +huawei +E1752 "));
 }
 
 TEST(DirectCommands, FailuresAreOneSentenceAndAnExitStatus) {

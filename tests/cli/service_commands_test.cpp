@@ -290,7 +290,11 @@ TEST(ServiceCommands, WatchPrintsADocumentAtEachChangeUntilItIsEnded) {
         Process watch({BuiltProgram("taviwireless"), "--json", "modem", "watch", "usbmodem0"});
         EXPECT_EQ(Parse(watch.ReadLine().value_or(""))["signal"], 100);
         situation.simulator.Set("0", "signal", "0");
-        EXPECT_EQ(Parse(watch.ReadLine().value_or(""))["signal"], 0);
+        Json::Value signal = 100;
+        while (signal == 100) {  // the first look may still tell more
+            signal = Parse(watch.ReadLine().value_or(""))["signal"];
+        }
+        EXPECT_EQ(signal, 0);
         watch.Signal(SIGINT);
         EXPECT_EQ(watch.Wait(), 0);
         EXPECT_EQ(watch.ReadLine(), std::nullopt);
