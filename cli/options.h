@@ -14,10 +14,10 @@ struct Options {
     // modem
     bool direct = false;         // ask the modems themselves, not the service
     std::string id;              // device id; empty when none was given
+    std::string atCommand;       // at
     std::optional<int> timeout;  // seconds
     bool showSecrets = false;
     bool force = false;                 // use up the last attempt without a question
-    std::string atCommand;              // at
     bool noWait = false;                // connect: return as soon as the dialler runs
     std::vector<std::string> settings;  // profile set, ap set: KEY=VALUE or KEY
 

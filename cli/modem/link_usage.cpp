@@ -25,9 +25,10 @@ LinkUsage UsageOf(const std::string& id, const std::string& interface) {
         return {};
     }
     LinkUsage usage{CountOf(interface, "tx_bytes"), CountOf(interface, "rx_bytes"), std::nullopt};
-    const std::string number = id.substr(id.find_first_of("-0123456789"));
+    const int number = usbmodem_lib::InterfaceIdIn(id, "usbmodem").value_or(-1);
+    const std::string path = usbmodem_lib::kPidFilePrefix + std::to_string(number);
     struct stat pidFile {};
-    if (stat((usbmodem_lib::kPidFilePrefix + number).c_str(), &pidFile) == 0) {
+    if (stat(path.c_str(), &pidFile) == 0) {
         usage.since = pidFile.st_mtime;
     }
     return usage;

@@ -32,9 +32,8 @@ struct Ports {
 
 // The ports' device paths by the modem's info file.
 Ports PortsOf(const std::string& id) {
-    const std::string number = id.substr(std::min(id.find_first_of("-0123456789"), id.size()));
-    const std::string path =
-        std::string(usbmodem_lib::kInfoDirectory) + usbmodem_lib::kInfoName + number;
+    const int number = usbmodem_lib::InterfaceIdIn(id, "usbmodem").value_or(-1);
+    const std::string path = usbmodem_lib::InfoPath(number);
     Ports ports;
     for (const std::string& line : Lines(ReadTrusted(path).value_or(""))) {
         const size_t equals = std::min(line.find('='), line.size());

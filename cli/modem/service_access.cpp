@@ -301,7 +301,9 @@ class ServiceAccess : public ModemAccess {
 
     ModemState ReadyModem(const std::string& id, bool withProfile) override {
         if (!known_ || !IsRecent(known_->at(id))) {
-            return Look(id);
+            ModemState state = Look(id);
+            AddDetails(state);
+            return state;
         }
         ModemState state = known_->at(id).state;
         if (withProfile && state.simStatus == kReady) {

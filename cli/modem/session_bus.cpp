@@ -118,10 +118,14 @@ void HangUpByBus(const std::string& id) {
 }
 
 std::string TextProperty(const std::string& id, const char* property) {
+    const std::string path = std::string(objects::kManager) + '/' + id;
+    if (!dbus_validate_path(path.c_str(), nullptr)) {
+        return "";  // libdbus would end the program
+    }
     Failure failure;
     const Bus bus = Connect(failure);
-    const Message call = Call(objects::kService, std::string(objects::kManager) + '/' + id,
-                              DBUS_INTERFACE_PROPERTIES, "Get", objects::kModem, property);
+    const Message call =
+        Call(objects::kService, path, DBUS_INTERFACE_PROPERTIES, "Get", objects::kModem, property);
     dbus_message_set_auto_start(call.get(), FALSE);
     const Message reply(bus ? dbus_connection_send_with_reply_and_block(
                                   bus.get(), call.get(), DBUS_TIMEOUT_USE_DEFAULT, &failure.error)

@@ -58,9 +58,10 @@ void ListOneByOne(ModemAccess& access, const Options& options) {
 }
 
 void CheckCommand(const std::string& command) {
-    const auto isControl = [](unsigned char c) { return c < ' ' || c == 0x7F; };
-    if (command.empty() || std::any_of(command.begin(), command.end(), isControl)) {
-        throw CommandError(kUsage, "an AT command has characters, and no control characters");
+    const bool isPrintable =
+        std::all_of(command.begin(), command.end(), [](char c) { return c >= ' ' && c <= '~'; });
+    if (command.empty() || !isPrintable) {
+        throw CommandError(kUsage, "an AT command is printable ASCII");
     }
 }
 
@@ -70,7 +71,9 @@ void ListModems(const Options& options) {
     const auto access = MakeAccess(options);
     Deadline deadline(options);
     deadline.Limit([&] {
-        if (!options.json && !PluggedModems().empty() && access->HasToAsk()) {
+        // Whoever waits sees rows come; a program gets the same table, whatever has to be asked.
+        const bool isWatched = !options.json && isatty(STDOUT_FILENO);
+        if (isWatched && !PluggedModems().empty() && access->HasToAsk()) {
             ListOneByOne(*access, options);
         } else {
             Print(options, DescribeAll(access->KnownModems(options.json)));

@@ -19,6 +19,10 @@ TEST(DirectCommands, ADeadModemDoesNotHideTheOneBehindIt) {
     EXPECT_TRUE(modems[0]["vendor"].isNull() && modems[0]["sim_state"].isNull());
     EXPECT_EQ(modems[1]["sim_state"], "ready");
     EXPECT_EQ(modems[1]["signal"], 54);
+    const std::string list = "'" + BuiltProgram("taviwireless") + "' modem --direct list";
+    EXPECT_THAT(RunProgram(WithShortWaits({"script", "-qec", list, "/dev/null"})).out,
+                testing::ContainsRegex("Asking usbmodem0, usbmodem1 .*DEVICE .*usbmodem0 +- .*"
+                                       "usbmodem1 +huawei +E1752 "));
 }
 
 TEST(DirectCommands, FailuresAreOneSentenceAndAnExitStatus) {
@@ -29,7 +33,7 @@ TEST(DirectCommands, FailuresAreOneSentenceAndAnExitStatus) {
     } kCases[] = {
         {{"show", "usbmodem0"}, kNotFound, "there is no modem usbmodem0; "},
         {{"status", "0"}, kNotFound, "there is no modem usbmodem0; "},
-        {{"at", "0", "AT\rAT"}, kUsage, "an AT command has characters"},
+        {{"at", "0", "AT\rAT"}, kUsage, "an AT command is printable ASCII"},
     };
     for (const auto& failing : kCases) {
         SCOPED_TRACE(failing.sentence);
