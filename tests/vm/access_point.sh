@@ -98,6 +98,13 @@ disables() {
     must_fail is_on_air
 }
 
+# The neighbour is on channel 1.
+chooses_emptiest_channel() {
+    start_ap wlan2
+    holds "$(ap set channel=auto)" "^Stored, channel 6: no networks; 1 has 1; "
+    stop_ap wlan2
+}
+
 # The guests' bridge and its addresses are the model's own.
 serves_guests() {
     echo support_pci_wifi=yes >>/etc.defaults/taviinfo.conf
@@ -164,6 +171,7 @@ scenario "takes settings, and hostapd understands them" sets_and_checks
 scenario "switches on, with bridge and address" enables
 scenario "a station joins, gets a lease and reaches it" serves_station
 scenario "switches off, and leaves nothing" disables
+scenario "chooses the emptiest channel" chooses_emptiest_channel
 scenario "serves guests on a network of their own" serves_guests
 scenario "is on again after a restart" comes_back_after_restart
 scenario "two enable it at once" enables_twice_at_once
