@@ -17,6 +17,12 @@ inline Command Add(const Command& group, const char* name, const char* descripti
                             [&options, run] { Deadline(options).Limit([&] { run(options); }); });
 }
 
+// Adds a command that ends itself at the time of --timeout: there is something to undo.
+inline Command AddSelfTimed(const Command& group, const char* name, const char* description,
+                            Options& options, Run run) {
+    return group.AddCommand(name, description, [&options, run] { run(options); });
+}
+
 // The groups of commands that the program has.
 void AddModemCommands(const Command& program, Options& options);
 void AddWifiCommands(const Command& program, Options& options);

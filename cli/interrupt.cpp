@@ -18,6 +18,7 @@
 
 #include "base/unique_pipe.h"
 #include "cli/command_error.h"
+#include "cli/terminal.h"
 
 namespace taviwireless::cli {
 
@@ -166,6 +167,7 @@ class Waiting {
 }  // namespace
 
 UndoneBySignal::UndoneBySignal(const Undo& undo, std::optional<int> seconds) {
+    EndProgress();
     std::cout.flush();
     sigset_t signals = EndingSignals();
     sigset_t before;

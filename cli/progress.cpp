@@ -31,11 +31,23 @@ class Progress {
             return;
         }
         Draw();
-        if (!text.empty() && !isTicking_) {
-            isTicking_ = true;
+        if (!text.empty() && !ticker_.joinable()) {
             StartTicking();
         }
         changed_.notify_one();
+    }
+
+    void End() {
+        Show("");
+        if (ticker_.joinable()) {
+            {
+                const std::lock_guard lock(mutex_);
+                isOver_ = true;
+            }
+            changed_.notify_one();
+            ticker_.join();
+            isOver_ = false;
+        }
     }
 
   private:
@@ -54,14 +66,14 @@ class Progress {
 
     void StartTicking() {
         try {
-            StartBeside([this] { Tick(); }).detach();
+            ticker_ = StartBeside([this] { Tick(); });
         } catch (const std::system_error&) {  // then the text stands there alone
         }
     }
 
-    [[noreturn]] void Tick() {
+    void Tick() {
         std::unique_lock lock(mutex_);
-        for (;;) {
+        while (!isOver_) {
             if (text_.empty()) {
                 changed_.wait(lock);
             } else if (changed_.wait_for(lock, std::chrono::seconds(1)) ==
@@ -76,15 +88,26 @@ class Progress {
     std::condition_variable changed_;
     std::string text_;
     Clock::time_point begin_;
-    bool isTicking_ = false;
+    bool isOver_ = false;
+    std::thread ticker_;
 };
+
+Progress& TheProgress() {
+    static auto* const progress = new Progress;  // its thread goes on until the program ends
+    return *progress;
+}
 
 }  // namespace
 
 void ShowProgress(const std::string& text) {
-    static auto* const progress = new Progress;  // its thread goes on until the program ends
     if (isatty(STDERR_FILENO) != 0) {
-        progress->Show(text);
+        TheProgress().Show(text);
+    }
+}
+
+void EndProgress() {
+    if (isatty(STDERR_FILENO) != 0) {
+        TheProgress().End();
     }
 }
 

@@ -28,6 +28,9 @@ std::string Coloured(Colour colour, const std::string& text);
 // standard error is a terminal.
 void ShowProgress(const std::string& text);
 
+// Removes it, and ends the thread that counts: a child that is forked would not have it.
+void EndProgress();
+
 // Reads one line from standard input: at a terminal behind a prompt and without echo, so that it
 // appears neither on the screen nor in a process list; a signal restores the echo. Throws
 // CommandError when there is none.

@@ -157,7 +157,7 @@ Findings Registration(const std::string& id, const KnownModem& modem) {
 
 Findings Link(const std::string& id, const KnownModem& modem) {
     if (modem.state.netStatus == kConnected) {
-        return Ok(id + " is connected on " + modem.interface + ", " + modem.state.ip);
+        return Ok(id + " is connected on " + modem.state.interface + ", " + modem.state.ip);
     }
     if (modem.state.netStatus == kConnectionLost) {
         return Failed("that of " + id + " was lost",

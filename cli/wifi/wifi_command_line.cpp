@@ -8,10 +8,10 @@ namespace taviwireless::cli {
 namespace {
 
 void AddWifiConnectCommand(const Command& wifi, Options& options) {
-    const Command connect =
-        Add(wifi, "connect",
-            "Join a network, and save it; its key is read from standard input unless saved",
-            options, ConnectWifi);
+    const Command connect = AddSelfTimed(
+        wifi, "connect",
+        "Join a network, and save it; its key is read from standard input unless saved", options,
+        ConnectWifi);
     connect
         .AddOption("NETWORK", options.network,
                    "Its name (SSID), or the BSSID of the one access point to join")
@@ -69,8 +69,8 @@ void AddWifiCommands(const Command& app, Options& options) {
         .AddFlag("--channels", options.channels, "Draw who is on which channel");
     AddWifiConnectCommand(wifi, options);
     Add(wifi, "disconnect", "End the connection", options, DisconnectWifi);
-    Add(wifi, "auto", "Join the saved network that was used last and is in range", options,
-        ConnectAutomatically);
+    AddSelfTimed(wifi, "auto", "Join the saved network that was used last and is in range", options,
+                 ConnectAutomatically);
     AddSavedNetworkCommands(wifi, options);
 
     Add(wifi, "qr", "Show the QR code by which a telephone joins; it holds the key", options,
@@ -79,7 +79,7 @@ void AddWifiCommands(const Command& app, Options& options) {
         .Required();
 
     const Command adhoc =
-        Add(wifi, "adhoc", "Create or join an ad-hoc network", options, CreateAdhoc);
+        AddSelfTimed(wifi, "adhoc", "Create or join an ad-hoc network", options, CreateAdhoc);
     adhoc.AddOption("SSID", options.network, "Name of the network").Required();
     adhoc.AddFlag("--wep", options.wep, "With a WEP key, which is read from standard input");
 
