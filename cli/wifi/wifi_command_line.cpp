@@ -59,9 +59,6 @@ void AddSavedNetworkCommands(const Command& wifi, Options& options) {
 
 void AddWifiCommands(const Command& app, Options& options) {
     const Command wifi = app.AddGroup("wifi", "The Wi-Fi adapter");
-    wifi.AddOption("--timeout", options.timeout,
-                   "Give up after this time, in seconds, and undo what was begun", "SECONDS")
-        .Between(1, 3600);
     Add(wifi, "status", "Show the state of the adapter and its connection", options, ShowWifi);
     Add(wifi, "watch", "Show the state and the signal as they change, until Ctrl-C", options,
         WatchWifi);
