@@ -48,7 +48,6 @@ std::string Seconds(double seconds, int digits) {
 
 // Looks until the link is up or the dialler gave up; the deadline ends it otherwise.
 Connection WaitUntilConnected(ModemAccess& access, const std::string& id, bool noWait) {
-    const auto begin = Clock::now();
     for (;;) {
         const Connection connection = access.LookAtConnection(id);
         if (IsDisconnected(connection.status)) {
@@ -59,7 +58,7 @@ Connection WaitUntilConnected(ModemAccess& access, const std::string& id, bool n
         if (noWait || connection.status == kConnected) {
             return connection;
         }
-        ShowProgress("Connecting " + id + " ... " + Seconds(SecondsSince(begin), 0));
+        ShowProgress("Connecting " + id + " ...");
         std::this_thread::sleep_for(kLookPause);
     }
 }
