@@ -50,7 +50,8 @@ int TerminalWidth() {
     return ColumnsOf(STDOUT_FILENO);
 }
 
-// The name of the locale tells: the appliance may not have the one that a remote user has set.
+// The name of the locale tells, as the appliance may not have the one that a remote user has set. It
+// has set none itself, and then the terminal is most likely one that does.
 bool ShowsUTF8() {
     std::string locale;
     for (const char* name : {"LC_ALL", "LC_CTYPE", "LANG"}) {
@@ -58,7 +59,7 @@ bool ShowsUTF8() {
     }
     std::string codeset = locale.substr(std::min(locale.find('.'), locale.size()));
     codeset.erase(std::remove(codeset.begin(), codeset.end(), '-'), codeset.end());
-    return strncasecmp(codeset.c_str(), ".utf8", 5) == 0;
+    return locale.empty() || strncasecmp(codeset.c_str(), ".utf8", 5) == 0;
 }
 
 bool TakesEscapes(int descriptor) {

@@ -22,12 +22,13 @@ struct Character {
             width = 0;
             return;
         }
+        const char* const begin = &text[place];
         const gunichar code =
-            g_utf8_get_char_validated(&text[place], static_cast<gssize>(text.size() - place));
+            g_utf8_get_char_validated(begin, static_cast<gssize>(text.size() - place));
         constexpr auto kIncomplete =
             static_cast<gunichar>(-2);  // the largest but that of a mistake
         if (code < kIncomplete) {
-            bytes = static_cast<size_t>(g_utf8_skip[static_cast<unsigned char>(text[place])]);
+            bytes = static_cast<size_t>(g_utf8_next_char(begin) - begin);
             width = g_unichar_iszerowidth(code) != 0 ? 0 : g_unichar_iswide(code) != 0 ? 2 : 1;
         }
     }

@@ -147,13 +147,10 @@ std::string WrongCompany(const CLI::App& command) {
 // CLI11 names the option at the beginning, a flag without its dashes.
 std::string WrongCount(const CLI::App& command, const std::string& what) {
     const std::string name = what.substr(0, what.find_first_of(": "));
-    for (const CLI::App* place = &command; place != nullptr; place = place->get_parent()) {
-        const CLI::Option* option = place->get_option_no_throw(name);
-        if (option != nullptr && TakesValue(*option)) {
-            return name + " wants a value: " + option->get_description();
-        }
-    }
-    return "--" + name + " takes no value";
+    const CLI::Option* option = FindOption(command, name);
+    return option != nullptr && TakesValue(*option)
+               ? name + " wants a value: " + option->get_description()
+               : "--" + name + " takes no value";
 }
 
 std::string SeeHelp(const Position& position) {

@@ -6,16 +6,6 @@ namespace taviwireless::command_line {
 
 namespace {
 
-// An option of the command or of one that it is in.
-const CLI::Option* FindOption(const CLI::App* command, const std::string& name) {
-    for (; command != nullptr; command = command->get_parent()) {
-        if (const CLI::Option* option = command->get_option_no_throw(name)) {
-            return option;
-        }
-    }
-    return nullptr;
-}
-
 CLI::App* FindCommand(CLI::App& group, const std::string& name) {
     for (CLI::App* command : group.get_subcommands([](CLI::App*) { return true; })) {
         if (command->get_name() == name) {
@@ -29,7 +19,7 @@ CLI::App* FindCommand(CLI::App& group, const std::string& name) {
 bool TakeOption(Position& position, const std::string& word) {
     const bool isLong = word[1] == '-';
     const std::string name = word.substr(0, isLong ? word.find('=') : 2);
-    const CLI::Option* option = FindOption(position.command, name);
+    const CLI::Option* option = FindOption(*position.command, name);
     if (option != nullptr && TakesValue(*option) && name == word) {
         position.option = option;
     }
@@ -98,6 +88,18 @@ std::vector<const CLI::Option*> ArgumentsOf(const CLI::App& command) {
 
 std::vector<const CLI::Option*> OptionsOf(const CLI::App& command) {
     return command.get_options([](const CLI::Option* option) { return option->nonpositional(); });
+}
+
+// Not by CLI11's own function, which a lack of memory ends the program in.
+const CLI::Option* FindOption(const CLI::App& command, const std::string& name) {
+    for (const CLI::App* place = &command; place != nullptr; place = place->get_parent()) {
+        for (const CLI::Option* option : place->get_options()) {
+            if (option->check_name(name)) {
+                return option;
+            }
+        }
+    }
+    return nullptr;
 }
 
 bool IsGroup(const CLI::App& command) {

@@ -25,6 +25,9 @@ std::vector<CLI::App*> CommandsIn(const CLI::App& command);
 std::vector<const CLI::Option*> ArgumentsOf(const CLI::App& command);
 std::vector<const CLI::Option*> OptionsOf(const CLI::App& command);
 
+// The option of this name that the command or one around it has; null when there is none.
+const CLI::Option* FindOption(const CLI::App& command, const std::string& name);
+
 bool IsGroup(const CLI::App& command);
 bool TakesValue(const CLI::Option& option);
 // The words that a value may be; none when it may be anything else.

@@ -53,7 +53,6 @@ std::string Seconds(double seconds, int digits) {
 // Looks until the link is up or the dialler gave up; a DialGuard ends it otherwise.
 Connection WaitUntilConnected(ModemAccess& access, const Options& options,
                               const DialAttempt& attempt) {
-    const auto begin = Clock::now();
     for (;;) {
         const Connection connection = access.LookAtConnection(options.id);
         if (IsDisconnected(connection.status)) {
@@ -62,7 +61,7 @@ Connection WaitUntilConnected(ModemAccess& access, const Options& options,
         if (options.noWait || connection.status == kConnected) {
             return connection;
         }
-        ShowProgress("Connecting " + options.id + " ... " + Seconds(SecondsSince(begin), 0));
+        ShowProgress("Connecting " + options.id + " ...");
         std::this_thread::sleep_for(kLookPause);
     }
 }

@@ -150,12 +150,9 @@ TEST(Usage, BashCompletesNamesWithBlanksAndQuotes) {
                "' \"$@\"; else printf '<%s>' \"$@\"; fi; }; "
                ". '" TAVI_SOURCE_DIR "/packaging/taviwireless.bash'\n");
     const std::pair<const char*, const char*> kTyped[] = {
-        {"My\\ H\t\n", "<My Home>"},
-        {"\"My H\t\n", "<My Home>"},
-        {"It\\'\t\n", "<It's \"d\" $x>"},
-        {"'It\t\n", "<It's \"d\" $x>"},
-        {"\"It\t\n", "<It's \"d\" $x>"},
-        {"a:\t\n", "<a:b c>"},
+        {"My\\ H\t\n", "<My Home>"},      {"\"My H\t\n", "<My Home>"},
+        {"It\\'\t\n", "<It's \"d\" $x>"}, {"'It\t\n", "<It's \"d\" $x>"},
+        {"\"It\t\n", "<It's \"d\" $x>"},  {"a:\t\n", "<a:b c>"},
     };
     for (const auto& [typed, word] : kTyped) {
         ASSERT_TRUE(shell.Await("ready> "));
