@@ -1,4 +1,5 @@
 // taviwireless, the library's functions for a person or a script.
+#include <locale.h>
 #include <signal.h>
 #include <stdio.h>
 #include <syslog.h>
@@ -58,6 +59,7 @@ void RunCommandLine(int argc, char** argv, Options& options) {
 
 int main(int argc, char** argv) {
     using namespace taviwireless::cli;
+    setlocale(LC_CTYPE, "");   // which characters the terminal can show
     signal(SIGCHLD, SIG_DFL);  // what started this may ignore it, and then no program has a result
     Options options;
     try {
