@@ -1,6 +1,5 @@
 // taviwireless, the library's functions for a person or a script.
 #include <fcntl.h>
-#include <locale.h>
 #include <signal.h>
 #include <stdio.h>
 #include <syslog.h>
@@ -83,7 +82,6 @@ void RunCommandLine(int argc, char** argv, Options& options) {
 
 int main(int argc, char** argv) {
     using namespace taviwireless::cli;
-    setlocale(LC_CTYPE, "");   // the letters that the terminal has
     signal(SIGCHLD, SIG_DFL);  // what started this may ignore it, and then no program has a result
     signal(SIGPIPE, [](int) {});  // not ignored, which programs that are started would inherit
     Options options;

@@ -152,9 +152,10 @@ bool RequireService() {
     Failure failure;
     const Bus bus = Connect(failure);
     if (!bus) {
+        const char* address = getenv(kAddress);
         throw CommandError(kNoService, "cannot reach the session bus at " +
-                                           Printable(getenv(kAddress)) + ": " + failure.Text() +
-                                           "; --direct does without it");
+                                           Printable(address != nullptr ? address : "") + ": " +
+                                           failure.Text() + "; --direct does without it");
     }
     if (IsThere(bus.get())) {
         return false;
