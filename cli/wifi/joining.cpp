@@ -65,6 +65,7 @@ FormerConnection::FormerConnection() {
     if (const WirelessConf* saved = FindSaved(all, status.network); saved != nullptr) {
         saved_ = *saved;
         saved_->network.opmode = WIRELESS_OPMODE_MANAGED;
+        saved_->network.protocol = status.network.protocol;  // is not saved
         saved_->anyBssid = 1;
     }
 }

@@ -187,8 +187,12 @@ void CleanUpAttempt() {
     if (TAVIWirelessOpmodeGet() == WIRELESS_OPMODE_ADHOC) {
         TAVIWirelessOpmodeSet(WIRELESS_OPMODE_MANAGED);
     }
-    unlink(wireless::kCurrentConnection);
-    unlink(wireless::kSupplicantConf);
+    // A supplicant that had to be killed leaves its own.
+    const std::string control = wireless::kSupplicantSockets + ("/" + WifiInterface());
+    for (const char* file : {wireless::kCurrentConnection, wireless::kSupplicantConf,
+                             wireless::kSupplicantPidFile, control.c_str()}) {
+        unlink(file);
+    }
     if (!wireless::IsMissing(wireless::kResolverBackup)) {
         rename(wireless::kResolverBackup, wireless::kResolver);
     }
