@@ -18,21 +18,6 @@ inline std::string Level(int percent) {
     return ShowsUTF8() ? kBlocks[level] : std::string(1, kInk[level]);
 }
 
-// The first columns of a text, of which the last tells that there is more.
-inline std::string Cut(const std::string& text, size_t columns) {
-    std::string cut;
-    size_t width = 0;
-    for (size_t i = 0; i < text.size(); ++i) {
-        const bool isStart = (static_cast<unsigned char>(text[i]) & 0xC0) != 0x80;
-        width += isStart ? 1 : 0;
-        if (isStart && width == columns && i + 1 < text.size()) {
-            return cut + "~";
-        }
-        cut += text[i];
-    }
-    return cut;
-}
-
 }  // namespace taviwireless::cli
 
 #endif

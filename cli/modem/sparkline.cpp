@@ -1,15 +1,14 @@
 #include "cli/modem/sparkline.h"
 
 #include <algorithm>
-#include <iterator>
+
+#include "cli/level.h"
 
 namespace taviwireless::cli {
 
 namespace {
 
 constexpr size_t kLength = 16;  // values
-constexpr const char* kBlocks[] = {"▁", "▂", "▃", "▄", "▅", "▆", "▇", "█"};
-constexpr const char* kASCII[] = {"_", ".", ":", "-", "=", "+", "*", "#"};
 
 }  // namespace
 
@@ -20,12 +19,10 @@ void Trend::Add(int percent) {
     }
 }
 
-std::string Trend::Draw(bool isUTF8) const {
-    constexpr int kLevels = std::size(kBlocks);
+std::string Trend::Draw() const {
     std::string line;
     for (const int value : values_) {
-        const int level = std::min(value * kLevels / 100, kLevels - 1);
-        line += isUTF8 ? kBlocks[level] : kASCII[level];
+        line += Level(value);
     }
     return line;
 }

@@ -11,8 +11,8 @@ namespace taviwireless::cli {
 class Trend {
   public:
     void Add(int percent);
-    // A character for each value, the higher the more: of a block of growing height, or in ASCII.
-    std::string Draw(bool isUTF8) const;
+    // A character for each value.
+    std::string Draw() const;
 
   private:
     std::vector<int> values_;

@@ -48,7 +48,7 @@ class Watched {
             signal.last = state.signal;
             signal.trend.Add(state.signal);
         }
-        state.trend = signal.trend.Draw(ShowsUTF8());
+        state.trend = signal.trend.Draw();
     }
 
     struct Signal {

@@ -7,6 +7,7 @@
 #include <set>
 
 #include "cli/level.h"
+#include "cli/text_width.h"
 #include "cli/wifi/network_name.h"
 
 namespace taviwireless::cli {

@@ -6,8 +6,6 @@
 #include <unistd.h>
 
 #include <csignal>
-#include <cstdlib>
-#include <cstring>
 #include <deque>
 #include <iostream>
 
@@ -15,6 +13,8 @@
 #include "cli/adapter/requirements.h"
 #include "cli/command_error.h"
 #include "cli/level.h"
+#include "cli/terminal.h"
+#include "cli/text_width.h"
 #include "cli/wifi/station.h"
 #include "cli/wifi/wifi_commands.h"
 #include "cli/wifi/wifi_report.h"
@@ -61,11 +61,8 @@ class LinkEvents {
 // What is shown of the connection: a sentence, and the signal over time.
 class Watch {
   public:
-    explicit Watch(const Options& options) : options_(options) {
-        const char* terminal = getenv("TERM");
-        isInPlace_ = !options.json && isatty(STDOUT_FILENO) && terminal != nullptr &&
-                     strcmp(terminal, "dumb") != 0;
-    }
+    explicit Watch(const Options& options)
+        : options_(options), isInPlace_(!options.json && TakesEscapes(STDOUT_FILENO)) {}
 
     bool IsInPlace() const { return isInPlace_; }
 
@@ -95,7 +92,8 @@ class Watch {
         const auto width = static_cast<size_t>(std::max(TerminalWidth() - 1, 10));
         const size_t least = percent.empty() ? 0 : width / 4;  // of the history
         const std::string now = Cut(line, width - percent.size() - least) + percent;
-        const size_t room = std::min(std::max(width - std::min(now.size(), width), least), kMost);
+        const size_t room =
+            std::min(std::max(width - std::min(TextWidth(now), width), least), kMost);
         while (signals_.size() + 2 > std::max<size_t>(room, 3)) {
             signals_.pop_front();
         }
@@ -109,14 +107,15 @@ class Watch {
     }
 
     void Show(const std::string& text) {
-        if (text != shown_ && !(std::cout << text).flush()) {
-            throw CommandError(kFailure, "cannot write the output");
+        if (text != shown_) {
+            std::cout << text;
+            FlushOutput();
         }
         shown_ = text;
     }
 
     const Options& options_;
-    bool isInPlace_;
+    const bool isInPlace_;
     std::deque<int> signals_;  // percent; the last is that of now
     std::string line_;
     std::string shown_;
