@@ -24,7 +24,8 @@ using Owned = std::unique_ptr<Object, Release>;
 
 // Empty where there is none: the library would start one of its own that nobody else sees.
 std::string BusAddress() {
-    return FindSessionBus() ? getenv("DBUS_SESSION_BUS_ADDRESS") : "";
+    const char* address = FindSessionBus() ? getenv("DBUS_SESSION_BUS_ADDRESS") : nullptr;
+    return address != nullptr ? address : "";
 }
 
 Owned<GDBusConnection> Connect(std::string& reason) {
