@@ -31,12 +31,12 @@ struct Options {
     std::string user;           // EAP identity
     std::string staticAddress;  // ADDRESS/PREFIX[,GATEWAY]
     std::string nameServers;    // ADDRESS[,ADDRESS]
+    std::string security;       // of a hidden network
+    std::string mode;           // "ap" or "client"; "on" or "off"
     bool dhcp = false;          // also where a static address is saved
     bool newKey = false;        // ask for the key although one is saved
     bool hidden = false;        // the network does not show in a scan
-    std::string security;       // of a hidden network
     bool wep = false;           // adhoc: with a WEP key
-    std::string mode;           // "ap" or "client"; "on" or "off"
     bool channels = false;      // scan: draw who is on which channel
 };
 

@@ -54,7 +54,11 @@ void AddNetwork(Report& report, const APNetwork& network, bool showSecrets) {
                Cell(security) + (cipher.empty() ? "" : ", cipher " + cipher));
     report.document["cipher"] = TextOrNull(cipher);
     const Secret secret = SecretOf(network);
-    report.document["key"] = Json::Value();
+    for (const char* key : {"key", "radius_server", "radius_port", "radius_secret"}) {
+        if (!network.isForGuests || key == std::string("key")) {
+            report.document[key] = Json::Value();
+        }
+    }
     if (secret.key != nullptr) {
         report.Add(secret.key, secret.title, SecretText(secret.text, showSecrets));
     }

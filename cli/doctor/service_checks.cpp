@@ -1,12 +1,12 @@
 // The session bus, and the modem service on it.
 #include <gio/gio.h>
-#include <unistd.h>
 
 #include <cstdlib>
 #include <memory>
 #include <string>
 
 #include "cli/doctor/check.h"
+#include "cli/modem/session_bus.h"
 
 namespace taviwireless::cli {
 
@@ -24,13 +24,8 @@ using Owned = std::unique_ptr<Object, Release>;
 
 // Empty where there is none: the library would start one of its own that nobody else sees.
 std::string BusAddress() {
-    const char* address = getenv("DBUS_SESSION_BUS_ADDRESS");
-    if (address != nullptr && *address != '\0') {
-        return address;
-    }
-    const char* folder = getenv("XDG_RUNTIME_DIR");
-    const std::string ofUser = std::string(folder != nullptr ? folder : "") + "/bus";
-    return folder != nullptr && access(ofUser.c_str(), F_OK) == 0 ? "unix:path=" + ofUser : "";
+    const char* address = FindSessionBus() ? getenv("DBUS_SESSION_BUS_ADDRESS") : nullptr;
+    return address != nullptr ? address : "";
 }
 
 Owned<GDBusConnection> Connect(std::string& reason) {

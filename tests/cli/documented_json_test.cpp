@@ -17,33 +17,12 @@ constexpr char kFailures[] = "failures";
 
 // The commands without a table in the document.
 const std::set<std::string> kUndocumented = {
-    "modem list",
-    "modem show",
-    "modem unlock",
-    "modem pin set",
-    "modem pin protect",
-    "modem pin unprotect",
-    "modem puk",
-    "modem profile show",
-    "modem profile set",
-    "modem profile reset",
-    "modem connect",
-    "modem disconnect",
-    "modem status",
-    "wifi status",
-    "wifi scan",
-    "wifi connect",
-    "wifi disconnect",
-    "wifi auto",
-    "wifi saved list",
-    "wifi saved show",
-    "wifi adhoc",
-    "wifi mode",
-    "ap status",
-    "ap show",
-    "ap set",
-    "ap enable",
-    "ap disable",
+    "modem list",        "modem show",          "modem unlock",    "modem pin set",
+    "modem pin protect", "modem pin unprotect", "modem puk",       "modem profile show",
+    "modem profile set", "modem profile reset", "modem connect",   "modem disconnect",
+    "modem status",      "wifi status",         "wifi scan",       "wifi connect",
+    "wifi disconnect",   "wifi auto",           "wifi saved list", "wifi saved show",
+    "wifi adhoc",        "wifi mode",
 };
 
 // The tables of the document by the commands of their headings: "### `modem list`, `modem show`",
@@ -122,7 +101,7 @@ TEST_P(DocumentedJson, IsPrinted) {
         }
         SCOPED_TRACE(command.name);
         const auto table = tables.find(command.name);
-        ASSERT_EQ(table == tables.end(), kUndocumented.count(command.name) == 1);
+        EXPECT_EQ(table == tables.end(), kUndocumented.count(command.name) == 1);
         if (table == tables.end()) {
             continue;
         }
@@ -134,8 +113,10 @@ TEST_P(DocumentedJson, IsPrinted) {
         argv.emplace_back("--json");
         const RunResult result = RunProgram(argv, command.input);
         SCOPED_TRACE(result.out + result.err);
-        Compare(Parse(result.out), result.status == 0 ? table->second : tables.at(kFailures));
-        EXPECT_EQ(result.status, 0);
+        // The doctor's status tells what it has found.
+        const bool isAnswer = result.status == 0 || command.name == "doctor";
+        Compare(Parse(result.out), isAnswer ? table->second : tables.at(kFailures));
+        EXPECT_TRUE(isAnswer);
     }
 }
 
