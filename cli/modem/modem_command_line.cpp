@@ -59,7 +59,7 @@ void AddProfileCommands(const Command& modem, Options& options) {
         AddForOne(profile, "set",
                   "Change settings of the profile; the service connects a connected modem anew",
                   options, SetProfile);
-    set.AddOption("SETTING", options.settings, "KEY=VALUE, or password").Required();
+    set.AddOption("KEY=VALUE", options.settings, "Settings; password alone").Required();
     set.SetFooter(kSettingsHelp);
     AddForOne(profile, "reset",
               "Write the profile anew, with the defaults of the modem; only with --direct", options,
