@@ -66,7 +66,7 @@ std::string ToText(const Table& rows) {
 // The rows of a list, in the room that there is.
 class ListText {
   public:
-    ListText(const std::vector<Column>& columns, const Table& rows) : columns_(columns) {
+    ListText(const std::vector<Column>& columns, const Table& rows) : all_(columns) {
         Table cells = {{}};
         for (const Column& column : columns) {
             cells[0].push_back(column.title);
@@ -75,7 +75,13 @@ class ListText {
         widths_ = Widths(cells);
         for (size_t column = 0; column < columns.size(); ++column) {
             widths_[column] = std::max(widths_[column], columns[column].width);
+            shown_.push_back(column);
         }
+        if (room_ > 0) {
+            LeaveOut();
+        }
+        columns_ = Shown(all_);
+        widths_ = Shown(widths_);
         if (room_ > 0) {
             Narrow();
         }
@@ -94,10 +100,29 @@ class ListText {
     }
 
     std::string Row(const std::vector<std::string>& row) const {
-        return isInBlocks_ ? Block(row) : Line(Join(Fitting(row)));
+        return isInBlocks_ ? Block(row) : Line(Join(Fitting(Shown(row))));
     }
 
   private:
+    // Of the values of all columns, those of the columns that are shown.
+    template <typename Value>
+    std::vector<Value> Shown(const std::vector<Value>& values) const {
+        std::vector<Value> shown;
+        for (const size_t column : shown_) {
+            shown.push_back(values[column]);
+        }
+        return shown;
+    }
+
+    // Leaves columns out, the last first, until a row fits.
+    void LeaveOut() {
+        for (size_t column = all_.size(); column-- > 0;) {
+            if (all_[column].isExtra && LineWidth(Shown(widths_)) > room_) {
+                shown_.erase(std::find(shown_.begin(), shown_.end(), column));
+            }
+        }
+    }
+
     // Takes from the widest column of text until a row fits.
     void Narrow() {
         constexpr size_t kLeast = 6;
@@ -143,12 +168,14 @@ class ListText {
     std::string Block(const std::vector<std::string>& row) const {
         Table lines;
         for (size_t column = 0; column < row.size(); ++column) {
-            lines.push_back({columns_[column].title, row[column]});
+            lines.push_back({all_[column].title, row[column]});
         }
         return ToText(lines) + "\n";
     }
 
-    const std::vector<Column>& columns_;
+    const std::vector<Column>& all_;
+    std::vector<size_t> shown_;  // indices of columns
+    std::vector<Column> columns_;
     const size_t room_ = static_cast<size_t>(TerminalWidth());  // 0 without a terminal
     std::vector<size_t> widths_;
     bool isInBlocks_ = false;

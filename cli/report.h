@@ -16,10 +16,12 @@ using Table = std::vector<std::vector<std::string>>;
 // A column of a list.
 struct Column {
     std::string title;
-    bool isText = false;  // may be cut where the terminal is too narrow: no number, no id
-    size_t width = 0;     // what nearly all of its cells need: for rows that come one by one
+    bool isText = false;   // may be cut where the terminal is too narrow: no number, no id
+    size_t width = 0;      // what nearly all of its cells need: for rows that come one by one
+    bool isExtra = false;  // left out where the terminal is too narrow
 };
 constexpr bool kText = true;
+constexpr bool kExtra = true;
 
 // What a command has to tell: rows for a person, a document for a program. What is not known is
 // "-" in rows and null in documents.

@@ -115,13 +115,13 @@ void AddProfile(Report& report, const ModemState& state, bool showSecrets) {
 }  // namespace
 
 const std::vector<Column> kModemColumns = {{"DEVICE", !kText, 9},
-                                           {"VENDOR", kText, 10},
+                                           {"VENDOR", kText, 10, kExtra},
                                            {"PRODUCT", kText, 12},
                                            {"OPERATOR", kText, 14},
                                            {"SIGNAL"},
                                            {"SIM", kText, 15},
-                                           {"PIN LOCK"},
-                                           {"PIN/PUK LEFT"},
+                                           {"PIN LOCK", !kText, 0, kExtra},
+                                           {"PIN/PUK LEFT", !kText, 0, kExtra},
                                            {"STATE", kText, 15},
                                            {"ADDRESS", !kText, 15}};
 

@@ -313,8 +313,8 @@ TEST(ServiceCommands, WatchDrawsTheLastSignals) {
         }
     };
     EXPECT_TRUE(reads("100% #"));
-    situation.simulator.Set("0", "signal", "0");
-    EXPECT_TRUE(reads("0% #_"));
+    situation.simulator.Set("0", "signal", "10");
+    EXPECT_TRUE(reads("32% #-"));
 }
 
 TEST(ServiceCommands, WatchEndsWithTheService) {

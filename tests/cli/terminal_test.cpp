@@ -106,8 +106,8 @@ TEST(Terminals, ASecretIsNotShownAndTheEchoComesBack) {
                  {"", SIGHUP, 128 + SIGHUP}};
     for (const auto& [typed, signal, status] : kEnds) {
         Terminal terminal(
-            In("xterm", "C", "modem --direct profile set usbmodem0 pass", "taviwireless"), 80);
-        ASSERT_TRUE(terminal.AwaitPrompt("pass: ")) << terminal.Shown();
+            In("xterm", "C", "modem --direct profile set usbmodem0 password", "taviwireless"), 80);
+        ASSERT_TRUE(terminal.AwaitPrompt("Password: ")) << terminal.Shown();
         EXPECT_FALSE(terminal.Echoes());
         terminal.Type(typed);
         terminal.Signal(signal);
