@@ -38,11 +38,11 @@ Checks AllChecks() {
     return all;
 }
 
-std::string Line(const std::string& subject, size_t width, const Finding& finding) {
+std::vector<std::string> Row(const char* subject, const Finding& finding) {
     const HealthWord& words = WordsOf(finding.health);
-    return Coloured(words.colour, words.mark) + "  " + subject +
-           std::string(width - subject.size() + 2, ' ') + Printable(finding.text) +
-           (finding.advice.empty() ? "" : "; " + Printable(finding.advice));
+    return {
+        Coloured(words.colour, words.mark), subject,
+        Printable(finding.text) + (finding.advice.empty() ? "" : "; " + Printable(finding.advice))};
 }
 
 Json::Value Document(const char* subject, const Finding& finding) {
@@ -57,17 +57,12 @@ Json::Value Document(const char* subject, const Finding& finding) {
 }  // namespace
 
 void Examine(const Options& options) {
-    const Checks checks = AllChecks();
-    size_t width = 0;
-    for (const Check& check : checks) {
-        width = std::max(width, std::string(check.subject).size());
-    }
     Report report{{}, Json::arrayValue};
     bool hasFailed = false;
-    for (const Check& check : checks) {
-        ShowProgress(std::string("Looking at: ") + check.subject);
+    ShowProgress("Examining ...");
+    for (const Check& check : AllChecks()) {
         for (const Finding& finding : check.look()) {
-            report.rows.push_back({Line(check.subject, width, finding)});
+            report.rows.push_back(Row(check.subject, finding));
             report.document.append(Document(check.subject, finding));
             hasFailed = hasFailed || finding.health == Health::kFailed;
         }
