@@ -150,10 +150,11 @@ class Waiting {
         if (!seconds_) {
             return sigwaitinfo(&signals_, nullptr);
         }
-        using std::chrono::nanoseconds;
-        constexpr long kSecond = 1000000000;
-        const long rest = std::max<long>(nanoseconds(left).count(), 0);
-        const timespec limit{rest / kSecond, rest % kSecond};
+        using namespace std::chrono;
+        const auto rest = std::max(nanoseconds(left), nanoseconds(0));
+        const auto whole = duration_cast<seconds>(rest);
+        const timespec limit{static_cast<time_t>(whole.count()),
+                             static_cast<long>((rest - whole).count())};
         const int number = sigtimedwait(&signals_, nullptr, &limit);
         return number < 0 && errno == EAGAIN ? kTimeIsOver : number;
     }

@@ -86,16 +86,17 @@ std::string CommandMistake(CLI::App& program, const Position& position) {
 
 std::string OptionMistake(const Position& position) {
     const std::string name = position.unknown.substr(0, position.unknown.find('='));
-    const CLI::App& last = *position.command;
     Words names;
-    for (const CLI::App* command = &last; command != nullptr; command = command->get_parent()) {
+    const CLI::App* command = position.command;
+    do {
         for (const CLI::Option* option : OptionsOf(*command)) {
             for (const std::string& known : option->get_lnames()) {
                 names.push_back("--" + known);
             }
         }
-    }
-    return "there is no option " + Quoted(name) + In(last) + Guess(name, names);
+        command = command->get_parent();
+    } while (command != nullptr);
+    return "there is no option " + Quoted(name) + In(*position.command) + Guess(name, names);
 }
 
 std::string SentenceOnUnknown(CLI::App& program, const Position& position) {
