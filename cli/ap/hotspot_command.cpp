@@ -1,6 +1,5 @@
 // taviwireless ap hotspot and ap qr: a network that somebody joins by a look at the screen.
-#include <sys/random.h>
-
+#include <fstream>
 #include <iostream>
 
 #include "base/fixed_field.h"
@@ -26,7 +25,9 @@ namespace {
 std::string NewKey() {
     constexpr char kLetters[] = "acdefhjkmnprtwxy";
     unsigned char random[16];
-    if (getrandom(random, sizeof random, 0) != sizeof random) {
+    std::ifstream source("/dev/urandom",
+                         std::ios::binary);  // kernels before 3.17 have no call for it
+    if (!source.read(reinterpret_cast<char*>(random), sizeof random)) {
         throw CommandError(kFailure, "the kernel gives no random numbers for a key");
     }
     std::string key;
