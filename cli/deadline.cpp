@@ -3,11 +3,19 @@
 #include <unistd.h>
 
 #include <iostream>
+#include <utility>
 
 #include "cli/command_error.h"
 #include "cli/report.h"
+#include "cli/signal_free_thread.h"
 
 namespace taviwireless::cli {
+
+namespace {
+
+Deadline* innermost = nullptr;
+
+}  // namespace
 
 Deadline::Deadline(const Options& options, std::optional<int> seconds)
     : seconds_(options.timeout ? options.timeout : seconds), options_(options) {
@@ -15,8 +23,10 @@ Deadline::Deadline(const Options& options, std::optional<int> seconds)
         sentence_ = "not done within " + std::to_string(*seconds_) +
                     " s; what was begun may still come to its end";
         Restart();
-        watcher_ = std::thread([this] { Watch(); });
+        watcher_ = StartBeside([this] { Watch(); });
     }
+    outer_ = std::exchange(innermost, this);
+    wasRunning_ = outer_ != nullptr && outer_->Stop();
 }
 
 Deadline::~Deadline() {
@@ -27,6 +37,10 @@ Deadline::~Deadline() {
         }
         changed_.notify_one();
         watcher_.join();
+    }
+    innermost = outer_;
+    if (wasRunning_) {
+        outer_->Start();
     }
 }
 
@@ -46,11 +60,15 @@ void Deadline::Start() {
     changed_.notify_one();
 }
 
-void Deadline::Stop() {
+bool Deadline::Stop() {
     const std::lock_guard lock(mutex_);
+    if (!end_) {
+        return false;
+    }
     left_ = *end_ - Clock::now();
     end_.reset();
     changed_.notify_one();
+    return true;
 }
 
 void Deadline::Watch() {
@@ -66,6 +84,14 @@ void Deadline::Watch() {
             std::cout.flush();
             _exit(kFailure);
         }
+    }
+}
+
+Untimed::Untimed() : paused_(innermost != nullptr && innermost->Stop() ? innermost : nullptr) {}
+
+Untimed::~Untimed() {
+    if (paused_ != nullptr) {
+        paused_->Start();
     }
 }
 

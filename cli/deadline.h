@@ -13,8 +13,10 @@
 namespace taviwireless::cli {
 
 // The time that a command may take. A call of the library cannot be ended early, so when the time
-// is over while work is done, the failure is printed and the program ends there and then. The time
-// between two pieces of work, in which input is read, does not count.
+// is over while work is done, the failure is printed and the program ends there and then.
+//
+// Every command has one, by --timeout. A command that wants another makes its own, for the time
+// between whose pieces of work no limit counts.
 class Deadline {
   public:
     // What Options::timeout says, or these seconds; without both there is no limit.
@@ -52,7 +54,7 @@ class Deadline {
     };
 
     void Start();
-    void Stop();
+    bool Stop();  // returns whether the time counted
     void Watch();
 
     const std::optional<int> seconds_;
@@ -64,6 +66,22 @@ class Deadline {
     std::optional<Clock::time_point> end_;  // while work is done
     bool isOver_ = false;
     std::thread watcher_;
+
+    friend class Untimed;
+    Deadline* outer_ = nullptr;  // whose time does not count while this one lives
+    bool wasRunning_ = false;
+};
+
+// While it lives, no time counts: input is read from a person.
+class Untimed {
+  public:
+    Untimed();
+    ~Untimed();
+    Untimed(const Untimed&) = delete;
+    Untimed& operator=(const Untimed&) = delete;
+
+  private:
+    Deadline* const paused_;
 };
 
 }  // namespace taviwireless::cli

@@ -1,90 +1,79 @@
 #include "cli/terminal.h"
 
-#include <termios.h>
+#include <glib.h>
+#include <strings.h>
 #include <unistd.h>
 
-#include <cstdio>
-#include <iostream>
+#include <algorithm>
+#include <cstdlib>
 
-#include "cli/command_error.h"
+#include "base/terminal_columns.h"
 
 namespace taviwireless::cli {
 
 namespace {
 
-// Switches the terminal's echo off while it lives.
-class NoEcho {
-  public:
-    NoEcho() : isTerminal_(tcgetattr(STDIN_FILENO, &settings_) == 0) {
-        if (isTerminal_) {
-            termios silent = settings_;
-            silent.c_lflag &= ~static_cast<tcflag_t>(ECHO);
-            tcsetattr(STDIN_FILENO, TCSAFLUSH, &silent);
-        }
-    }
-    ~NoEcho() {
-        if (isTerminal_) {
-            tcsetattr(STDIN_FILENO, TCSAFLUSH, &settings_);
-            std::cerr << '\n';
-        }
-    }
-    NoEcho(const NoEcho&) = delete;
-    NoEcho& operator=(const NoEcho&) = delete;
+std::string Environment(const char* name) {
+    const char* value = getenv(name);
+    return value == nullptr ? "" : value;
+}
 
-  private:
-    termios settings_{};
-    bool isTerminal_;
-};
+// Whether the character moves the cursor, or the text behind it to its front.
+bool Steers(gunichar code) {
+    const GUnicodeType type = g_unichar_type(code);
+    const bool isDirection = (code >= 0x200E && code <= 0x200F) ||
+                             (code >= 0x202A && code <= 0x202E) ||
+                             (code >= 0x2066 && code <= 0x2069);
+    return type == G_UNICODE_CONTROL || type == G_UNICODE_LINE_SEPARATOR ||
+           type == G_UNICODE_PARAGRAPH_SEPARATOR || isDirection;
+}
 
 }  // namespace
 
 std::string Printable(const std::string& text) {
+    const bool onlyASCII = isatty(STDOUT_FILENO) != 0 && !ShowsUTF8();
     std::string printable;
-    for (size_t i = 0; i < text.size(); ++i) {
-        const auto byte = static_cast<unsigned char>(text[i]);
-        const auto next = static_cast<unsigned char>(text[i + 1]);      // zero at the end
-        const bool isC1 = byte == 0xC2 && next >= 0x80 && next < 0xA0;  // in UTF-8, two bytes
-        printable += byte < 0x20 || byte == 0x7F || isC1 ? '?' : text[i];
-        i += isC1 ? 1 : 0;
+    for (size_t place = 0; place < text.size();) {
+        const char* next = &text[place];
+        const auto left = static_cast<gssize>(text.size() - place);
+        const gunichar code = g_utf8_get_char_validated(next, left);
+        const bool isValid = code < static_cast<gunichar>(-2);  // else one of two mistakes
+        const auto bytes = isValid ? static_cast<size_t>(g_utf8_next_char(next) - next) : 1;
+        const bool isShown = isValid && !Steers(code) && (bytes == 1 || !onlyASCII);
+        printable += isShown ? text.substr(place, bytes) : "?";
+        place += bytes;
     }
     return printable;
 }
 
-void ShowProgress(const std::string& text) {
-    if (isatty(STDERR_FILENO)) {
-        std::fprintf(stderr, "\r\033[K%s", text.c_str());
-    }
+int TerminalWidth() {
+    return ColumnsOf(STDOUT_FILENO);
 }
 
-std::string ReadSecret(const std::string& prompt) {
-    if (isatty(STDIN_FILENO)) {
-        ShowProgress("");
-        std::cerr << prompt << ": ";
+// The name of the locale tells, as the appliance may not have the one that a remote user has set. It
+// has set none itself, and then the terminal is most likely one that does.
+bool ShowsUTF8() {
+    std::string locale;
+    for (const char* name : {"LC_ALL", "LC_CTYPE", "LANG"}) {
+        locale = locale.empty() ? Environment(name) : locale;
     }
-    const NoEcho noEcho;
-    std::string secret;
-    if (!std::getline(std::cin, secret)) {
-        throw CommandError(kFailure, "standard input ended before there was a line for: " + prompt);
-    }
-    return secret;
+    std::string codeset = locale.substr(std::min(locale.find('.'), locale.size()));
+    codeset.erase(std::remove(codeset.begin(), codeset.end(), '-'), codeset.end());
+    return locale.empty() || strncasecmp(codeset.c_str(), ".utf8", 5) == 0;
 }
 
-std::string ReadNewSecret(const std::string& prompt) {
-    const std::string secret = ReadSecret(prompt);
-    if (isatty(STDIN_FILENO) && ReadSecret(prompt + " again") != secret) {
-        throw CommandError(kUsage, "the two differ; nothing was changed");
-    }
-    return secret;
+bool TakesEscapes(int descriptor) {
+    const std::string terminal = Environment("TERM");
+    return isatty(descriptor) != 0 && !terminal.empty() && terminal != "dumb" &&
+           terminal != "unknown";
 }
 
-bool Confirm(const std::string& question, const std::string& withoutTerminal) {
-    if (!isatty(STDIN_FILENO)) {
-        throw CommandError(kFailure, withoutTerminal);
+std::string Coloured(Colour colour, const std::string& text) {
+    constexpr const char* kCodes[] = {"32", "33", "31", "2", "1"};
+    if (!TakesEscapes(STDOUT_FILENO) || !Environment("NO_COLOR").empty()) {
+        return text;
     }
-    ShowProgress("");
-    std::cerr << question << " [yes/no] ";
-    std::string answer;
-    return std::getline(std::cin, answer) && answer == "yes";
+    return std::string("\033[") + kCodes[static_cast<int>(colour)] + "m" + text + "\033[0m";
 }
 
 }  // namespace taviwireless::cli

@@ -5,16 +5,35 @@
 
 namespace taviwireless::cli {
 
-// Returns text with control characters replaced by "?": what a modem sends may not steer the
-// terminal.
+// The text as the terminal can show it: what steers a terminal, is no UTF-8, or cannot be shown is
+// "?". All text that comes from elsewhere goes through this.
 std::string Printable(const std::string& text);
 
-// Shows on standard error what is being waited for, one line that each call replaces; the empty
-// text removes it. Nothing is shown unless standard error is a terminal.
+// Columns of the terminal that standard output is; 0 when it is none.
+int TerminalWidth();
+
+// Whether characters beyond ASCII can be shown, by LC_ALL, LC_CTYPE and LANG.
+bool ShowsUTF8();
+
+// Whether a descriptor is a terminal on which escape sequences move the cursor (TERM).
+bool TakesEscapes(int descriptor);
+
+enum class Colour { kGood, kWarning, kBad, kFaint, kBold };
+// The text in a colour, where standard output is a terminal that has some and its user wants them
+// (NO_COLOR, TERM); otherwise the text.
+std::string Coloured(Colour colour, const std::string& text);
+
+// Shows on standard error what is being waited for, such as "Joining HOME ...", and counts the
+// seconds behind it. Another text replaces it; the empty text removes it. Nothing is shown unless
+// standard error is a terminal.
 void ShowProgress(const std::string& text);
 
+// Removes it, and ends the thread that counts: a child that is forked would not have it.
+void EndProgress();
+
 // Reads one line from standard input: at a terminal behind a prompt and without echo, so that it
-// appears neither on the screen nor in a process list. Throws CommandError when there is none.
+// appears neither on the screen nor in a process list; a signal restores the echo. Throws
+// CommandError when there is none.
 std::string ReadSecret(const std::string& prompt);
 
 // ReadSecret, at a terminal twice: throws CommandError unless both are the same.

@@ -44,3 +44,6 @@ install(FILES packaging/taviwireless.tmpfiles.conf DESTINATION lib/tmpfiles.d
         RENAME taviwireless.conf)
 install(FILES packaging/taviwireless.modules-load.conf DESTINATION lib/modules-load.d
         RENAME taviwireless.conf)
+install(FILES packaging/taviwireless.bash DESTINATION share/bash-completion/completions
+        RENAME taviwireless)
+install(FILES packaging/taviwireless.zsh DESTINATION share/zsh/site-functions RENAME _taviwireless)

@@ -20,6 +20,7 @@
 #include "daemon/session_bus.h"
 #include "daemon/watchdog.h"
 #include "dbus/usbmodem_service.h"
+#include "usbmodem/rules/trace.h"
 
 using namespace taviwireless::daemon;
 using taviwireless::dbus::kUSBModemService;
@@ -44,6 +45,7 @@ constexpr char kDescription[] =
 struct Options {
     gboolean foreground = FALSE;
     gboolean version = FALSE;
+    gboolean debug = FALSE;
     gint refresh = 30;  // seconds
     gint probe = -1;
     gboolean isProbe = FALSE;
@@ -65,6 +67,8 @@ bool ParseOptions(int argc, char** argv) {
         {"refresh", 0, 0, G_OPTION_ARG_INT, &options.refresh,
          "Pause between looks at a modem while somebody listens, 30 if not given; 0: never look",
          "SECONDS"},
+        {"debug", 0, 0, G_OPTION_ARG_NONE, &options.debug,
+         "Log the dialogue with the modems as well, with PINs and PUKs masked", nullptr},
         {"version", 0, 0, G_OPTION_ARG_NONE, &options.version, "Show the version", nullptr},
         {"probe", 0, G_OPTION_FLAG_HIDDEN, G_OPTION_ARG_CALLBACK,
          reinterpret_cast<gpointer>(TakeProbe), nullptr, nullptr},
@@ -177,6 +181,9 @@ int main(int argc, char** argv) {
     if (options.version) {
         puts("usbmodemd " TAVI_VERSION);
         return EXIT_SUCCESS;
+    }
+    if (options.debug) {
+        taviwireless::usbmodem_lib::SwitchTraceOn();
     }
     openlog(kName, LOG_PID | (options.foreground ? LOG_PERROR : 0), LOG_DAEMON);
     if (options.isProbe) {

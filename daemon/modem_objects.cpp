@@ -116,6 +116,21 @@ std::string PathOf(const std::string& id) {
     return std::string(objects::kManager) + '/' + id;
 }
 
+std::string IdIn(GDBusMethodInvocation* call) {
+    const std::string path = g_dbus_method_invocation_get_object_path(call);
+    return path.substr(path.rfind('/') + 1);
+}
+
+void Return(GDBusMethodInvocation* call, const std::string& error, const std::string& sentence,
+            GVariant* value) {
+    if (error.empty()) {
+        g_dbus_method_invocation_return_value(call, value);
+    } else {
+        g_dbus_method_invocation_return_dbus_error(call, (kErrorPrefix + error).c_str(),
+                                                   sentence.c_str());
+    }
+}
+
 }  // namespace
 
 ModemState StateOf(const usbmodem_lib::USBModem& modem, time_t lastLook) {
@@ -135,8 +150,9 @@ ModemState StateOf(const usbmodem_lib::USBModem& modem, time_t lastLook) {
     return state;
 }
 
-ModemObjects::ModemObjects(OnLook onLook)
+ModemObjects::ModemObjects(OnLook onLook, OnCommand onCommand)
     : onLook_(std::move(onLook)),
+      onCommand_(std::move(onCommand)),
       context_(g_main_context_new(), g_main_context_unref),
       loop_(g_main_loop_new(context_.get(), FALSE), g_main_loop_unref) {
     connection_.reset(g_bus_get_sync(G_BUS_TYPE_SESSION, nullptr, nullptr));
@@ -200,6 +216,7 @@ void ModemObjects::Show(const std::vector<ModemState>& modems) {
 
 void ModemObjects::Export(const std::string& id, GDBusInterfaceSkeleton* modem) {
     g_signal_connect(modem, "handle-look", G_CALLBACK(HandleLook), this);
+    g_signal_connect(modem, "handle-command", G_CALLBACK(HandleCommand), this);
     const Owned<GDBusObjectSkeleton> object(g_dbus_object_skeleton_new(PathOf(id).c_str()),
                                             g_object_unref);
     g_dbus_object_skeleton_add_interface(object.get(), modem);
@@ -209,17 +226,23 @@ void ModemObjects::Export(const std::string& id, GDBusInterfaceSkeleton* modem) 
 gboolean ModemObjects::HandleLook(GDBusInterfaceSkeleton* /*modem*/, GDBusMethodInvocation* call,
                                   gpointer data) {
     auto* self = static_cast<ModemObjects*>(data);
-    const std::string path = g_dbus_method_invocation_get_object_path(call);
     const Reply reply = [call](const std::string& error, const std::string& sentence) {
-        if (error.empty()) {
-            g_dbus_method_invocation_return_value(call, nullptr);
-        } else {
-            g_dbus_method_invocation_return_dbus_error(call, (kErrorPrefix + error).c_str(),
-                                                       sentence.c_str());
-        }
+        Return(call, error, sentence, nullptr);
     };
-    Post(nullptr,
-         [self, id = path.substr(path.rfind('/') + 1), reply] { self->onLook_(id, reply); });
+    Post(nullptr, [self, id = IdIn(call), reply] { self->onLook_(id, reply); });
+    return TRUE;
+}
+
+gboolean ModemObjects::HandleCommand(GDBusInterfaceSkeleton* /*modem*/, GDBusMethodInvocation* call,
+                                     const char* command, gpointer data) {
+    auto* self = static_cast<ModemObjects*>(data);
+    const Reply reply = [call](const std::string& error, const std::string& text) {
+        Return(call, error, text,
+               error.empty() ? g_variant_new("(s)", Text(text).c_str()) : nullptr);
+    };
+    Post(nullptr, [self, id = IdIn(call), text = std::string(command), reply] {
+        self->onCommand_(id, text, reply);
+    });
     return TRUE;
 }
 

@@ -35,15 +35,17 @@ ModemState StateOf(const usbmodem_lib::USBModem& modem, time_t lastLook);
 // for the other.
 class ModemObjects {
   public:
-    // Ends a call of Look: an empty name is success, any other that of an error behind
-    // "com.merilond.usbmodem.Error.", with a sentence.
-    using Reply = std::function<void(const std::string& error, const std::string& sentence)>;
-    // Gets calls of Look, in the main loop.
+    // Ends a call of Look or Command: with an empty name it succeeded, and the text is what Command
+    // returns; any other is that of an error behind "com.merilond.usbmodem.Error.", with a sentence.
+    using Reply = std::function<void(const std::string& error, const std::string& text)>;
+    // Get calls of Look and Command, in the main loop.
     using OnLook = std::function<void(const std::string& id, const Reply& reply)>;
+    using OnCommand =
+        std::function<void(const std::string& id, const std::string& command, const Reply& reply)>;
 
     // Takes the name, at the latest when nobody else has it. Throws std::runtime_error when there is
     // no bus, or when its rules refuse the name.
-    explicit ModemObjects(OnLook onLook);
+    ModemObjects(OnLook onLook, OnCommand onCommand);
     ~ModemObjects();
     ModemObjects(const ModemObjects&) = delete;
     ModemObjects& operator=(const ModemObjects&) = delete;
@@ -57,6 +59,8 @@ class ModemObjects {
   private:
     static gboolean HandleLook(GDBusInterfaceSkeleton* modem, GDBusMethodInvocation* call,
                                gpointer self);
+    static gboolean HandleCommand(GDBusInterfaceSkeleton* modem, GDBusMethodInvocation* call,
+                                  const char* command, gpointer self);
     static GDBusMessage* NoteCaller(GDBusConnection* connection, GDBusMessage* message,
                                     gboolean isIncoming, gpointer self);
     void Run();
@@ -69,6 +73,7 @@ class ModemObjects {
     using Owned = std::unique_ptr<Object, Deleter>;
 
     OnLook onLook_;
+    OnCommand onCommand_;
     std::atomic<bool> hasClients_{false};
     Owned<GDBusConnection> connection_{nullptr, g_object_unref};
     guint filter_ = 0;

@@ -3,6 +3,7 @@
 #include <syslog.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <cerrno>
 #include <stdexcept>
 #include <system_error>
@@ -24,20 +25,29 @@ std::string FileName(const std::string& path) {
 }
 
 // The methods are served all the same when the objects cannot be.
-std::unique_ptr<ModemObjects> MakeObjects(ModemObjects::OnLook onLook) {
+std::unique_ptr<ModemObjects> MakeObjects(ModemObjects::OnLook onLook,
+                                          ModemObjects::OnCommand onCommand) {
     try {
-        return std::make_unique<ModemObjects>(std::move(onLook));
+        return std::make_unique<ModemObjects>(std::move(onLook), std::move(onCommand));
     } catch (const std::runtime_error& error) {
         syslog(LOG_WARNING, "the modems are not shown as objects: %s", error.what());
         return nullptr;
     }
 }
 
+bool HasControlCharacter(const std::string& text) {
+    return std::any_of(text.begin(), text.end(),
+                       [](unsigned char c) { return c < ' ' || c == 0x7F; });
+}
+
 }  // namespace
 
 ServedModems::ServedModems(USBModemList& list, unsigned int refresh)
     : list_(list),
-      objects_(MakeObjects([this](const auto& id, const auto& reply) { look_.Look(id, reply); })),
+      objects_(MakeObjects([this](const auto& id, const auto& reply) { look_.Look(id, reply); },
+                           [this](const auto& id, const auto& command, const auto& reply) {
+                               Command(id, command, reply);
+                           })),
       look_(
           list, objects_ ? refresh : 0, [this] { return objects_->HasClients(); },
           [this] { Update(); }),
@@ -61,6 +71,24 @@ void ServedModems::HasServed() {
     keeper_.LookAfterModems();
     look_.LookAtLinks();
     look_.GiveWay();
+}
+
+void ServedModems::Command(const std::string& id, const std::string& command,
+                           const ModemObjects::Reply& reply) {
+    USBModem& modem = list_.FindUSBModem(id);
+    std::string answer;
+    if (command.empty() || HasControlCharacter(command)) {
+        reply("BadCommand", "a command has characters, and no control characters");
+    } else if (!modem.IsInited()) {
+        reply("NotReady", id + " does not answer; its property Answers tells when it does");
+    } else if (modem.IsUSBModemBusy()) {
+        reply("Busy", "the dialler has " + id + ", until its connection is up or has failed");
+    } else if (modem.ModemCmd(command, answer) != 0) {
+        reply("NotReady", id + " did not answer the command");
+    } else {
+        reply("", answer);
+    }
+    HasServed();
 }
 
 // After everything that may have changed a record. Ports are not looked at: when a link goes because

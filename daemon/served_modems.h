@@ -31,6 +31,8 @@ class ServedModems {
     void FindDeadPorts() { keeper_.LookAfterModems(); }
 
   private:
+    void Command(const std::string& id, const std::string& command,
+                 const ModemObjects::Reply& reply);
     void Update();
 
     usbmodem_lib::USBModemList& list_;

@@ -37,29 +37,27 @@ std::string Footer() {
         known += " " + name;
     }
     return "A modem is written PERSONALITY[,NAME=VALUE]... Personalities:" + known +
-           ", or the path of a\n"
-           "JSON file like them (with a / in it). NAME is one of\n"
+           ", or the path of a JSON file like them (with a / in it). NAME is one of\n"
            "  id=N               the number in usbmodem.infoN (the next free one)\n"
            "  ports=N or ROLES   that many ports, or roles such as dial/mute/at, in order\n"
            "  pin=PIN            a SIM card that asks for this PIN; with lock=off it does not\n"
            "  puk=, attempts=, puk_attempts=, sim=ready|absent|busy|failure\n"
            "  fault=FAULT        misbehaves from the start\n"
-           "  imsi, operator, apn, signal, roaming=yes|no, vendor, product ... variables of the\n"
-           "                     personality\n"
+           "  imsi, operator, apn, signal, roaming=yes|no, vendor, product ... variables of the "
+           "personality\n"
            "Faults:\n" +
            FaultHelp() + "Commands with --control, each answered with ok or error:\n" +
            Control::Help() +
            "Examples:\n"
            "  modemsim                                 one modem; prints its ports\n"
            "  modemsim --modem 12d1,pin=1234 --log -   a locked SIM card; shows what is said\n"
-           "  modemsim --link-dir /dev --info-dir /tmp --modem 12d1 --modem 2001,id=5\n"
-           "                                           two modems as plugged into this machine\n"
-           "  modemsim --tty /dev/ttyGS0,/dev/ttyGS1   answers on a USB gadget's serial ports\n\n";
+           "  modemsim --link-dir /dev --info-dir /tmp --modem 12d1 --modem 2001,id=5  two modems "
+           "as plugged into this machine\n"
+           "  modemsim --tty /dev/ttyGS0,/dev/ttyGS1   answers on a USB gadget's serial ports\n";
 }
 
 void Define(const Command& program, Options& options) {
     program.SetFooter(Footer());
-    program.SetHelp("Print this help");
     program.AddOption("-m,--modem", options.modems, "A modem; may be repeated (one generic modem)",
                       "MODEM");
     program.AddOption(
@@ -182,14 +180,14 @@ void Run(const Options& options) {
 int main(int argc, char** argv) {
     Options options;
     try {
-        if (ReadCommandLine(argc, argv, "",
+        if (ReadCommandLine(argc, argv, "modemsim",
                             "Simulates USB 3G modems on serial lines, until a signal ends it.",
                             [&](const Command& program) { Define(program, options); })) {
             Run(options);
         }
         return 0;
     } catch (const UsageError& error) {
-        std::cerr << "modemsim: " << error.what() << " (see modemsim --help)\n";
+        std::cerr << "modemsim: " << error.what() << "\n";
         return kBadUsage;
     } catch (const std::invalid_argument& error) {
         std::cerr << "modemsim: " << error.what() << "\n";

@@ -6,6 +6,8 @@
 #include <cctype>
 #include <cstring>
 #include <iterator>
+#include <utility>
+#include <vector>
 
 #include "base/split.h"
 
@@ -19,7 +21,7 @@ constexpr char kMask[] = "***";
 constexpr struct {
     const char* name;
     int commas;
-} kWithCodes[] = {{"CPIN=", 0}, {"CPWD=", 1}, {"CLCK=", 2}};
+} kWithCodes[] = {{"CPIN", 0}, {"CPIN2", 0}, {"CPWD", 1}, {"CLCK", 2}};
 
 // How lines begin in which a modem says what went wrong, with numbers that are worth reading.
 constexpr const char* kDiagnostics[] = {"ERROR", "+CME ERROR", "+CMS ERROR", "+CPIN:", "+CLCK:"};
@@ -30,15 +32,28 @@ bool IsDiagnostic(const std::string& line) {
     });
 }
 
+// Returns what stands behind "NAME=" in the line, in whatever case and with whatever blanks a person
+// may write it; npos if that is not there.
+size_t FindArguments(const std::string& line, const std::string& name) {
+    const auto isSame = [](unsigned char a, char b) { return std::toupper(a) == b; };
+    for (auto from = line.begin();;) {
+        const auto found = std::search(from, line.end(), name.begin(), name.end(), isSame);
+        if (found == line.end()) {
+            return std::string::npos;
+        }
+        from = found + static_cast<std::ptrdiff_t>(name.size());
+        const size_t next = line.find_first_not_of(" \t", static_cast<size_t>(from - line.begin()));
+        if (next != std::string::npos && line[next] == '=') {
+            return next + 1;
+        }
+    }
+}
+
 // Returns where the first code stands in the line; npos if it holds none.
 size_t FindCode(const std::string& line) {
     size_t first = std::string::npos;
     for (const auto& command : kWithCodes) {
-        const char* const end = command.name + std::strlen(command.name);
-        const auto found =
-            std::search(line.begin(), line.end(), command.name, end,
-                        [](unsigned char a, char b) { return std::toupper(a) == b; });
-        size_t code = static_cast<size_t>(found - line.begin()) + std::strlen(command.name);
+        size_t code = FindArguments(line, command.name);
         for (int i = 0; i < command.commas && code < line.size(); ++i) {
             const size_t comma = line.find(',', code);
             code = comma == std::string::npos ? comma : comma + 1;
@@ -55,7 +70,7 @@ std::string MaskCommand(const std::string& line) {
     return code == std::string::npos ? line : line.substr(0, code) + kMask;
 }
 
-std::string MaskCodes(std::string line, std::initializer_list<std::string> codes) {
+std::string MaskCodes(std::string line, const std::vector<std::string>& codes) {
     for (const std::string& code : codes) {
         for (size_t at = line.find(code); !code.empty() && at != std::string::npos;
              at = line.find(code, at + std::strlen(kMask))) {
@@ -95,6 +110,25 @@ std::string LoggableReply(const std::string& reply) {
 }
 
 std::string LoggableReply(const std::string& reply, std::initializer_list<std::string> codes) {
+    return MaskLines(reply, ' ', [&codes](const std::string& line) {
+        return MaskCodes(MaskCommand(line), codes);
+    });
+}
+
+std::string LoggableReplyTo(const std::string& command, const std::string& reply) {
+    const size_t begin = FindCode(command);
+    if (begin == std::string::npos) {
+        return LoggableReply(reply);
+    }
+    std::vector<std::string> codes;
+    std::string code;
+    for (const char c : command.substr(begin) + ' ') {
+        if (std::isdigit(static_cast<unsigned char>(c)) != 0) {
+            code += c;
+        } else if (!code.empty()) {
+            codes.push_back(std::exchange(code, ""));
+        }
+    }
     return MaskLines(reply, ' ', [&codes](const std::string& line) {
         return MaskCodes(MaskCommand(line), codes);
     });

@@ -21,6 +21,9 @@ std::string LoggableReply(const std::string& reply);
 // digits are masked, except in lines that are diagnostics.
 std::string LoggableReply(const std::string& reply, std::initializer_list<std::string> codes);
 
+// Returns the reply to this command, whatever that is, as one line without the codes in it.
+std::string LoggableReplyTo(const std::string& command, const std::string& reply);
+
 }  // namespace taviwireless::usbmodem_lib
 
 #endif

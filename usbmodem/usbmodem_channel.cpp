@@ -13,6 +13,7 @@
 #include "base/split.h"
 #include "common/log.h"
 #include "usbmodem/loggable.h"
+#include "usbmodem/rules/trace.h"
 #include "usbmodem/wvstreams_log.h"
 
 namespace taviwireless::usbmodem_lib {
@@ -203,6 +204,10 @@ int USBModem::Exchange(const std::string& cmd, std::string& reply) {
         }
         return -1;
     }
+    const bool isTraced = IsTraced();
+    if (isTraced) {
+        TAVI_LOG_DEBUG("%s <- %s", GetDevId().c_str(), LoggableCommand(cmd).c_str());
+    }
     const std::string line = cmd + '\r';
     Write(*device_, line);
     const std::optional<std::string> data = ReadReply(*device_);
@@ -211,6 +216,9 @@ int USBModem::Exchange(const std::string& cmd, std::string& reply) {
         return -1;
     }
     reply = CleanReply(*data, cmd);
+    if (isTraced) {
+        TAVI_LOG_DEBUG("%s -> %s", GetDevId().c_str(), LoggableReplyTo(cmd, reply).c_str());
+    }
     return 0;
 }
 

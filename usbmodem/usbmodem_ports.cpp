@@ -11,6 +11,7 @@
 #include "base/split.h"
 #include "common/log.h"
 #include "usbmodem/info_file.h"
+#include "usbmodem/rules/dial_log.h"
 #include "usbmodem/rules/paths.h"
 #include "usbmodem/rules/status.h"
 #include "usbmodem/text.h"
@@ -18,8 +19,6 @@
 namespace taviwireless::usbmodem_lib {
 
 namespace {
-
-constexpr char kUsingInterface[] = "Using interface";
 
 // A modem that was just plugged in may need a few seconds until its ports answer.
 constexpr int kAttempts = 3;
@@ -32,21 +31,6 @@ void Retry(Assign assign, LogFailure logFailure) {
         logFailure(attempt);
         SleepOut(kAttemptPause);
     }
-}
-
-// Where the dialler's log names the interface; npos when it does not. The dialler marks its lines,
-// and what stands between them is what the modem answered. An answer may look like a line of the
-// dialler, so only what follows the last command that the modem was sent counts. A modem that
-// imitates the dialler in its last answer is believed: it could as well make a connection that
-// leads nowhere.
-size_t FindInterface(const std::string& log) {
-    const std::string lines = '\n' + log;
-    const size_t lastCommand = lines.rfind("\n--> Sending: ");
-    if (lastCommand == std::string::npos) {
-        return log.find(kUsingInterface);  // the modem was not asked anything
-    }
-    const size_t line = lines.find(std::string("\n--> ") + kUsingInterface, lastCommand);
-    return line == std::string::npos ? line : lines.find(kUsingInterface, line) - 1;
 }
 
 }  // namespace
@@ -113,14 +97,14 @@ int USBModem::AssignConnectInfo() {
     if (!Contains(log, "secondary DNS address")) {
         return 2;
     }
-    const size_t named = FindInterface(log);
-    if (named == std::string::npos && Contains(log, kUsingInterface)) {
+    const size_t named = dial_log::FindInterface(log);
+    if (named == std::string::npos && Contains(log, dial_log::kUsingInterface)) {
         return 2;  // only the modem spoke of one
     }
     // Without "Using interface" this wraps to index 14 and reads a word of some other line.
     // Compatible with earlier releases, and harmless: the dialler names the interface before the
     // addresses, so it writes no such log.
-    std::istringstream rest(log.substr(named + sizeof kUsingInterface - 1));
+    std::istringstream rest(log.substr(named + sizeof dial_log::kUsingInterface - 1));
     netIFName_.clear();
     rest >> netIFName_;
     if (!IsInterfaceName(netIFName_)) {

@@ -10,6 +10,7 @@
 #include <cerrno>
 #include <csignal>
 #include <cstdio>
+#include <new>
 #include <optional>
 #include <string>
 
@@ -69,7 +70,10 @@ WvLockDev::WvLockDev(WvString device) : devicename(device), lock_count(0) {
 WvLockDev::~WvLockDev() {
     if (lock_count > 0) {
         lock_count = 1;
-        unlock();
+        try {
+            unlock();
+        } catch (const std::bad_alloc&) {  // the file stays, and holds for as long as this process
+        }
     }
 }
 

@@ -1,15 +1,42 @@
 #include "base/command_line/command_line.h"
 
+#include <unistd.h>
+
 #include <CLI/CLI.hpp>
+#include <algorithm>
+#include <iostream>
 #include <optional>
+
+#include "base/command_line/position.h"
+#include "base/join.h"
+#include "base/split.h"
+#include "base/terminal_columns.h"
 
 namespace taviwireless {
 
 namespace {
 
-// Nothing in the help.
-CLI::Validator Silent(CLI::Validator validator) {
-    return validator.description("");
+using Words = const char*;
+
+// A check that says what is wrong with a value; nothing in the help.
+CLI::Validator Check(std::function<std::string(std::string&)> check) {
+    return CLI::Validator(std::move(check), "");
+}
+
+bool IsNumberBetween(const std::string& text, int first, int last) {
+    int number = 0;
+    return CLI::detail::lexical_cast(text, number) && number >= first && number <= last;
+}
+
+// As wide as can be read well.
+size_t HelpColumns() {
+    constexpr int kWidest = 100;
+    const int columns = ColumnsOf(STDOUT_FILENO);
+    return static_cast<size_t>(columns == 0 ? 80 : std::clamp(columns, 20, kWidest));
+}
+
+void PrintHelp(const CLI::App& command) {
+    std::cout << command_line::HelpText(command, HelpColumns());
 }
 
 }  // namespace
@@ -20,17 +47,33 @@ Argument& Argument::Required() {
 }
 
 Argument& Argument::Between(int first, int last) {
-    option_->check(Silent(CLI::Range(first, last)));
+    option_->check(Check([first, last](const std::string& text) {
+        return IsNumberBetween(text, first, last)
+                   ? ""
+                   : '"' + text + "\" is no number from " + std::to_string(first) + " to " +
+                         std::to_string(last);
+    }));
     return *this;
 }
 
 Argument& Argument::ExistingFolder() {
-    option_->check(Silent(CLI::ExistingDirectory));
+    option_->check(Check([](std::string& path) {
+        return CLI::ExistingDirectory(path).empty() ? "" : "there is no folder \"" + path + '"';
+    }));
     return *this;
 }
 
 Argument& Argument::OneOf(const std::vector<std::string>& words) {
-    option_->check(CLI::IsMember(words));
+    std::string list;
+    for (const std::string& word : words) {
+        AddItem(list, word);
+    }
+    const auto check = [words, list](const std::string& text) {
+        const bool isKnown = std::find(words.begin(), words.end(), text) != words.end();
+        return isKnown ? ""
+                       : '"' + text + "\" is none of " + list + command_line::Guess(text, words);
+    };
+    option_->check(check, list, command_line::kWordsName);
     return *this;
 }
 
@@ -55,6 +98,7 @@ Command Command::AddCommand(const char* name, const char* description,
                             std::function<void()> run) const {
     CLI::App* command = app_->add_subcommand(name, description);
     command->callback(std::move(run));
+    command->fallthrough();
     return Command(command);
 }
 
@@ -70,29 +114,27 @@ Argument Command::AddOption(const char* names, Value& value, const char* descrip
     if (!option->get_positional()) {
         option->allow_extra_args(false);  // one value each time
     }
+    if (option->get_items_expected_max() == 1) {
+        option->take_last();
+    }
     return Argument(option);
 }
 
-using Words = const char*;
 template Argument Command::AddOption(Words, std::string&, Words, Words) const;
 template Argument Command::AddOption(Words, std::vector<std::string>&, Words, Words) const;
 template Argument Command::AddOption(Words, std::optional<int>&, Words, Words) const;
 template Argument Command::AddOption(Words, unsigned&, Words, Words) const;
 
 Argument Command::AddFlag(const char* names, bool& value, const char* description) const {
-    return Argument(app_->add_flag(names, value, description));
+    return Argument(app_->add_flag(names, value, description)->disable_flag_override());
 }
 
 void Command::AddFlag(const char* names, std::function<void()> run, const char* description) const {
-    app_->add_flag_callback(names, std::move(run), description);
+    app_->add_flag_callback(names, std::move(run), description)->disable_flag_override();
 }
 
 void Command::SetVersion(const std::string& text) const {
-    app_->set_version_flag("--version", text);
-}
-
-void Command::SetHelp(const char* description) const {
-    app_->set_help_flag("-h,--help", description);
+    app_->set_version_flag("--version", text, "Print the version");
 }
 
 void Command::SetFooter(const std::string& text) const {
@@ -102,17 +144,28 @@ void Command::SetFooter(const std::string& text) const {
 bool ReadCommandLine(int argc, char** argv, const char* name, const char* description,
                      const std::function<void(const Command& program)>& define) {
     CLI::App app(description, name);
+    app.set_help_flag("-h,--help", "Print this help");
     define(Command(&app));
+    const std::vector<std::string> words(argv + 1, argv + argc);
+    const command_line::Position position = command_line::Find(app, words);
+    if (!position.unknown.empty()) {
+        throw UsageError(command_line::UnknownWord(app, position));
+    }
+    if (position.wantsHelp) {
+        PrintHelp(*position.command);
+        return false;
+    }
     try {
         app.parse(argc, argv);
         return true;
+    } catch (const CLI::CallForHelp&) {
+        PrintHelp(*position.command);
+    } catch (const CLI::CallForVersion& version) {
+        std::cout << version.what() << '\n';
     } catch (const CLI::ParseError& error) {
-        if (error.get_exit_code() != static_cast<int>(CLI::ExitCodes::Success)) {
-            throw UsageError(error.what());
-        }
-        app.exit(error);
-        return false;
+        throw UsageError(command_line::Mistake(position, error));
     }
+    return false;
 }
 
 }  // namespace taviwireless

@@ -2,6 +2,7 @@
 #define TAVIWIRELESS_BASE_COMMAND_LINE_COMMAND_LINE_H
 
 #include <functional>
+#include <map>
 #include <stdexcept>
 #include <string>
 #include <vector>
@@ -32,7 +33,11 @@ class Argument {
     CLI::Option* option_;
 };
 
-// The program itself, a group of commands, or a command.
+// What the arguments of a name may be now, such as the names of things that are there.
+using ArgumentValues = std::map<std::string, std::function<std::vector<std::string>()>>;
+
+// The program itself, a group of commands, or a command. What describes it is a sentence without
+// its full stop; lists show what stands before its first semicolon.
 class Command {
   public:
     explicit Command(CLI::App* app) : app_(app) {}
@@ -52,20 +57,24 @@ class Command {
     void AddFlag(const char* names, std::function<void()> run, const char* description) const;
 
     void SetVersion(const std::string& text) const;
-    void SetHelp(const char* description) const;
     void SetFooter(const std::string& text) const;  // of the help
+
+    // Adds a command that no help shows, which prints what the last of the words behind "--" may
+    // become, a line each: for the completion of a shell, which gives the words as they were typed.
+    void AddCompletion(const char* name, const ArgumentValues& valuesOf) const;
 
   private:
     CLI::App* app_;
 };
 
-// A command line that is not understood, and why.
+// A command line that is not understood: what is wrong, and which help tells more.
 struct UsageError : std::runtime_error {
     using runtime_error::runtime_error;
 };
 
-// Sets the values of the command line that `define` describes, then runs its command. With an empty
-// name, the program is called as it was started. Returns false when help or version was printed.
+// Sets the values of the command line that `define` describes, then runs its command. Options of
+// the program and of groups may stand behind their commands as well. Returns false when help or
+// version was printed, on standard output, whose state the caller looks at.
 bool ReadCommandLine(int argc, char** argv, const char* name, const char* description,
                      const std::function<void(const Command& program)>& define);
 

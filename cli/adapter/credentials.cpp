@@ -23,6 +23,13 @@ constexpr SecurityWord kSecurityWords[] = {
     {"wpa2-eap", WIRELESS_AUTH_WPA2_EAP, WIRELESS_ENCRYPT_TKIP_AES},
 };
 
+// The form in which some access points show their key.
+bool IsPreSharedKey(const std::string& key) {
+    constexpr size_t kDigits = 64;
+    return key.size() == kDigits &&
+           key.find_first_not_of("0123456789abcdefABCDEF") == std::string::npos;
+}
+
 const char* FormOf(Security security) {
     switch (security) {
         case Security::kWEP:
@@ -66,6 +73,12 @@ void CheckEssid(const std::string& essid) {
 }
 
 void CheckKey(Security security, const std::string& key) {
+    if (security == Security::kWPA && IsPreSharedKey(key)) {
+        throw CommandError(kUsage,
+                           "64 hexadecimal digits are the key that a pass phrase makes, "
+                           "and this system can keep pass phrases alone: give that one; "
+                           "nothing was tried");
+    }
     if (!wireless::IsKey(security, key)) {
         throw CommandError(kUsage, std::string(FormOf(security)) + "; nothing was tried");
     }

@@ -11,7 +11,10 @@
 #include <cstring>
 
 #include "base/file_name.h"
+#include "cli/ap/country.h"
 #include "cli/ap/dry_run.h"
+#include "cli/ap/failure_reason.h"
+#include "cli/ap/hostapd.h"
 #include "cli/ap/setting_words.h"
 #include "cli/command_error.h"
 #include "cli/terminal.h"
@@ -51,13 +54,6 @@ std::optional<WirelessAPSettings> FindSettings() {
     return settings;
 }
 
-// Whether the section says how the network is protected; an open network says that, too.
-bool IsStored(const WirelessAPSettings& settings) {
-    char kind[16];
-    return VEXACFileGetSectionValue(kAPSettings, settings.name, "encryption", kind, sizeof kind) ==
-           0;
-}
-
 void RequireStored(bool isDone) {
     if (!isDone) {
         throw CommandError(kFailure, std::string("cannot store the settings in ") + kAPSettings +
@@ -74,10 +70,11 @@ void StoreEnabled(const WirelessAPSettings& settings, const char* yesOrNo) {
 // Settings with which an access point may be served; throws when there are none.
 WirelessAPSettings SettingsToServe() {
     WirelessAPSettings settings = ReadAPSettings();
-    if (!IsStored(settings)) {
+    if (!AreStored(settings)) {
         throw CommandError(kFailure, "no settings are stored for the adapter " +
                                          Printable(settings.name) +
-                                         "; taviwireless ap set stores them");
+                                         "; taviwireless ap set stores them, and --open serves a "
+                                         "network that everybody can join");
     }
     if (SecurityWord(MainNetwork(settings.ap)).empty()) {
         throw CommandError(kFailure,
@@ -100,8 +97,9 @@ bool HasProgram(const char* name) {
            0;
 }
 
-// The library says only that it failed; these are what commonly stands behind that.
-std::string CauseOfFailure() {
+// The library says only that it failed; these are what commonly stands behind that, and then what
+// was written on standard error.
+std::string CauseOfFailure(const std::string& errors) {
     struct statvfs disk {};
     if (access("/etc", W_OK) != 0) {
         return std::string("/etc cannot be written: ") + strerror(errno);
@@ -115,7 +113,8 @@ std::string CauseOfFailure() {
     if (!HasChannels()) {
         return "the adapter offers no channel; is its radio switched off? (rfkill list)";
     }
-    return "the system log tells why, and --verbose shows it";
+    const std::string reason = ReasonIn(errors);
+    return reason.empty() ? "the system log tells why, and --verbose shows it" : reason;
 }
 
 std::string AddressOf(const char* interface) {
@@ -136,7 +135,29 @@ std::string FileOfTheAccessPoint() {
     return VEXACFileGetKeyValue(file.c_str(), "BRIDGE", bridge, sizeof bridge) > 0 ? file : "";
 }
 
+void SwitchOnAsStored() {
+    const ErrorKeeper errors;
+    if (TAVIWirelessAPEnable() != 1) {
+        throw CommandError(kFailure, "the access point could not be switched on: " +
+                                         CauseOfFailure(errors.Text()));
+    }
+}
+
+bool IsOffAlready() {
+    const auto settings = FindSettings();
+    return settings && settings->enabled == 0 && FileOfTheAccessPoint().empty() &&
+           TAVIWirelessOpmodeGet() != WIRELESS_OPMODE_MASTER &&
+           !ServesHostapd(TAVIWirelessAPInterfaceGet());
+}
+
 }  // namespace
+
+// An open network says how it is protected, too.
+bool AreStored(const WirelessAPSettings& settings) {
+    char kind[16];
+    return VEXACFileGetSectionValue(kAPSettings, settings.name, "encryption", kind, sizeof kind) ==
+           0;
+}
 
 APStatus LookAtAP() {
     APStatus status{};
@@ -170,7 +191,18 @@ void StoreAPSettings(WirelessAPSettings settings) {
         __LINE__));
 }
 
-void SwitchAPOn() {
+void StoreOpenNetwork() {
+    WirelessAPSettings settings = ReadAPSettings();
+    if (!AreStored(settings)) {
+        StoreAPSettings(settings);  // the defaults
+    } else if (settings.ap.security != WIRELESS_AP_OPEN) {
+        throw CommandError(kUsage, "--open is for an open network, and security " +
+                                       SecurityWord(MainNetwork(settings.ap)) +
+                                       " is stored; leave it out, or set security=open");
+    }
+}
+
+Switched SwitchAPOn(const std::optional<WirelessAPSettings>& changed) {
     if (TAVIWirelessAPIsConnecting() == 1) {
         // This is refused, but also removes the flag that an attempt may have left when it was
         // killed.
@@ -179,19 +211,28 @@ void SwitchAPOn() {
                            "an access point is being switched on already; if that was interrupted, "
                            "try again");
     }
-    const WirelessAPSettings settings = SettingsToServe();
+    WirelessAPSettings settings = changed ? *changed : SettingsToServe();
     const bool wasOff = settings.enabled == 0;
-    if (wasOff) {
+    settings.enabled = 1;
+    if (changed) {
+        StoreAPSettings(settings);
+    } else if (wasOff) {
         StoreEnabled(settings, "yes");
     }
-    if (TAVIWirelessAPEnable() != 1) {
-        const std::string cause = CauseOfFailure();
+    if (!wasOff && IsServed(settings.ap)) {
+        return {true, ""};
+    }
+    const std::string remark = EnforceCountry();
+    try {
+        SwitchOnAsStored();
+    } catch (const CommandError&) {
         if (wasOff) {
             TAVIWirelessAPDisable();  // of the last step, much may run already
             StoreEnabled(settings, "no");
         }
-        throw CommandError(kFailure, "the access point could not be switched on: " + cause);
+        throw;
     }
+    return {false, remark};
 }
 
 std::vector<std::string> PlanAP() {
@@ -203,7 +244,10 @@ std::vector<std::string> PlanAP() {
     return PlanOfEnabling(settings.ap);
 }
 
-void SwitchAPOff() {
+bool SwitchAPOff() {
+    if (IsOffAlready()) {
+        return false;
+    }
     if (TAVIWirelessAPDisable() != 1) {
         throw CommandError(kFailure,
                            "the access point could not be switched off; the system log tells why");
@@ -222,6 +266,7 @@ void SwitchAPOff() {
                            std::string("switched off, but not after a restart: cannot read ") +
                                wireless::kAdapterInfo + " or " + kAPSettings);
     }
+    return true;
 }
 
 }  // namespace taviwireless::cli

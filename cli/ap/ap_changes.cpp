@@ -2,11 +2,13 @@
 
 #include <arpa/inet.h>
 
+#include <algorithm>
 #include <set>
 
 #include "base/fixed_field.h"
-#include "base/join.h"
+#include "base/split.h"
 #include "cli/adapter/credentials.h"
+#include "cli/ap/country.h"
 #include "cli/ap/radio.h"
 #include "cli/ap/setting_words.h"
 #include "cli/command_error.h"
@@ -79,17 +81,24 @@ void RequireSecurity(const APNetwork& network, int security, const char* sentenc
     }
 }
 
-void SetPassphrase(APNetwork& network, const std::string& value) {
-    RequireSecurity(network, WIRELESS_AP_WPA,
-                    "a passphrase needs the security wpa, wpa2 or wpa-mixed");
-    CheckKey(Security::kWPA, value);
-    CopyField(network.secret.wpa.passphrase, value);
+// hostapd takes 64 hexadecimal digits for no passphrase; a station would.
+void CheckWPAKey(const std::string& key) {
+    CheckKey(Security::kWPA, key.substr(0, WIRELESS_AP_PASSPHRASE_SIZE));
+    if (key.size() > 63) {
+        throw CommandError(kUsage, "the key of an access point has at most 63 characters");
+    }
 }
 
-void SetWEPKey(APNetwork& network, const std::string& value) {
-    RequireSecurity(network, WIRELESS_AP_WEP, "a WEP key needs the security wep");
-    CheckKey(Security::kWEP, value);
-    CopyField(network.secret.wepKey, value);
+void SetKey(APNetwork& network, const std::string& value) {
+    if (network.security == WIRELESS_AP_WEP) {
+        CheckKey(Security::kWEP, value);
+        CopyField(network.secret.wepKey, value);
+        return;
+    }
+    RequireSecurity(network, WIRELESS_AP_WPA,
+                    "a key needs the security wep, wpa, wpa2 or wpa-mixed");
+    CheckWPAKey(value);
+    CopyField(network.secret.wpa.passphrase, value);
 }
 
 constexpr char kNeedsEAP[] =
@@ -117,39 +126,49 @@ void SetRadiusSecret(APNetwork& network, const std::string& value) {
     CopyField(network.secret.enterprise.radiusSecret, value);
 }
 
+// Stored apart from the others, of which none depends on it.
+void CheckCountry(APNetwork&, const std::string& value) {
+    CountryOf(value);
+}
+
 struct Setting {
     const char* key;
     bool isForGuests;
-    bool isSecret;
     void (*set)(APNetwork&, const std::string&);
+    const char* values;  // nullptr: a secret
 };
 // In the order in which they are set: what a setting depends on stands above it.
 constexpr Setting kSettings[] = {
-    {"bridge", false, false, SetBridge},
-    {"band", false, false, SetBandWord},
-    {"mode", false, false, SetModeWord},
-    {"channel", false, false, SetChannelWord},
-    {"width", false, false, SetWidthWord},
-    {"guest", false, false, SetGuest},
-    {"ssid", false, false, SetSsid},
-    {"hidden", false, false, SetHidden},
-    {"max-stations", false, false, SetMaxStations},
-    {"security", false, false, SetSecurityWord},
-    {"cipher", false, false, SetCipherWord},
-    {"passphrase", false, true, SetPassphrase},
-    {"wep-key", false, true, SetWEPKey},
-    {"radius-server", false, false, SetRadiusServer},
-    {"radius-port", false, false, SetRadiusPort},
-    {"radius-secret", false, true, SetRadiusSecret},
-    {"guest-isolate", true, false, SetIsolate},
-    {"guest-ssid", true, false, SetSsid},
-    {"guest-hidden", true, false, SetHidden},
-    {"guest-max-stations", true, false, SetMaxStations},
-    {"guest-security", true, false, SetSecurityWord},
-    {"guest-cipher", true, false, SetCipherWord},
-    {"guest-passphrase", true, true, SetPassphrase},
-    {"guest-wep-key", true, true, SetWEPKey},
+    {"country", false, CheckCountry, "where it is: DE, US ... (ISO 3166), or none"},
+    {"bridge", false, SetBridge, "lbr0 (a network of its own), or the bridge to join"},
+    {"band", false, SetBandWord, "2.4 or 5 (GHz)"},
+    {"mode", false, SetModeWord, "b, bg, bgn, n; a, an at 5 GHz"},
+    {"channel", false, SetChannelWord, "a number, or auto: the emptiest one now"},
+    {"width", false, SetWidthWord, "20 or 40 (MHz)"},
+    {"guest", false, SetGuest, "yes or no: a second network, for guests"},
+    {"ssid", false, SetSsid, "the name of the network, 1 to 32 bytes"},
+    {"hidden", false, SetHidden, "yes or no"},
+    {"max-stations", false, SetMaxStations, "1 to 2007"},
+    {"security", false, SetSecurityWord,
+     "open, wep, wpa, wpa2, wpa-mixed,\n"
+     "wpa-eap, wpa2-eap or wpa-mixed-eap"},
+    {"cipher", false, SetCipherWord, "tkip, aes or both (of WPA)"},
+    {"key", false, SetKey, nullptr},
+    {"radius-server", false, SetRadiusServer, "an IPv4 address"},
+    {"radius-port", false, SetRadiusPort, "1 to 65535"},
+    {"radius-secret", false, SetRadiusSecret, nullptr},
+    {"guest-isolate", true, SetIsolate, "yes or no: guests do not reach each other"},
+    {"guest-ssid", true, SetSsid, "as ssid"},
+    {"guest-hidden", true, SetHidden, "yes or no"},
+    {"guest-max-stations", true, SetMaxStations, "1 to 2007"},
+    {"guest-security", true, SetSecurityWord, "open, wep, wpa, wpa2 or wpa-mixed"},
+    {"guest-cipher", true, SetCipherWord, "tkip, aes or both (of WPA)"},
+    {"guest-key", true, SetKey, nullptr},
 };
+
+bool IsSecret(const Setting& setting) {
+    return setting.values == nullptr;
+}
 
 const Setting& FindSetting(const std::string& key) {
     for (const Setting& setting : kSettings) {
@@ -157,8 +176,8 @@ const Setting& FindSetting(const std::string& key) {
             return setting;
         }
     }
-    throw CommandError(kUsage, "an access point has no setting " + Printable(key) + "; there are " +
-                                   APSettingNames());
+    throw CommandError(kUsage, "an access point has no setting " + Printable(key) +
+                                   "; taviwireless ap set --help lists those there are");
 }
 
 void CheckForm(const std::string& key, bool isSecret, bool hasValue) {
@@ -182,11 +201,11 @@ void CheckSecret(const APNetwork& network) {
     };
     switch (network.security) {
         case WIRELESS_AP_WEP:
-            require(network.secret.wepKey, "wep-key");
+            require(network.secret.wepKey, "key");
             return CheckKey(Security::kWEP, network.secret.wepKey);
         case WIRELESS_AP_WPA:
-            require(network.secret.wpa.passphrase, "passphrase");
-            return CheckKey(Security::kWPA, network.secret.wpa.passphrase);
+            require(network.secret.wpa.passphrase, "key");
+            return CheckWPAKey(network.secret.wpa.passphrase);
         case WIRELESS_AP_WPA_ENTERPRISE:
             require(network.secret.enterprise.radiusAddr, "radius-server");
             return require(network.secret.enterprise.radiusSecret, "radius-secret");
@@ -205,12 +224,32 @@ void CheckNetwork(const APNetwork& network) {
 
 }  // namespace
 
-std::string APSettingNames() {
-    std::string names;
+std::string APSettingsHelp() {
+    constexpr int kColumn = 22;
+    std::string help = "Settings:";
     for (const Setting& setting : kSettings) {
-        AddItem(names, setting.key);
+        std::string key = setting.key;
+        const char* values = IsSecret(setting) ? "read from standard input" : setting.values;
+        for (const std::string& line : Split(values, '\n')) {
+            help += "\n  " + key + std::string(kColumn - key.size(), ' ') + line;
+            key.clear();
+        }
     }
-    return names;
+    return help;
+}
+
+std::vector<std::string> APSettingWords() {
+    std::vector<std::string> words;
+    for (const Setting& setting : kSettings) {
+        words.push_back(setting.key + std::string(IsSecret(setting) ? "" : "="));
+    }
+    return words;
+}
+
+const APChange* FindChange(const std::vector<APChange>& changes, const std::string& key) {
+    const auto found = std::find_if(changes.begin(), changes.end(),
+                                    [&](const APChange& change) { return change.key == key; });
+    return found == changes.end() ? nullptr : &*found;
 }
 
 std::vector<APChange> ReadAPChanges(const std::vector<std::string>& texts) {
@@ -219,7 +258,7 @@ std::vector<APChange> ReadAPChanges(const std::vector<std::string>& texts) {
     for (const std::string& text : texts) {
         const size_t equals = text.find('=');
         const std::string key = text.substr(0, equals);
-        const bool isSecret = FindSetting(key).isSecret;
+        const bool isSecret = IsSecret(FindSetting(key));
         CheckForm(key, isSecret, equals != std::string::npos);
         if (!names.insert(key).second) {
             throw CommandError(kUsage, key + " is given twice");
@@ -227,7 +266,7 @@ std::vector<APChange> ReadAPChanges(const std::vector<std::string>& texts) {
         changes.push_back({key, isSecret ? "" : text.substr(equals + 1)});
     }
     for (APChange& change : changes) {
-        if (FindSetting(change.key).isSecret) {
+        if (IsSecret(FindSetting(change.key))) {
             change.value = ReadNewSecret("New " + change.key);
         }
     }
@@ -237,17 +276,14 @@ std::vector<APChange> ReadAPChanges(const std::vector<std::string>& texts) {
 void ApplyAPChanges(const std::vector<APChange>& changes, WirelessAPConf& conf) {
     for (const Setting& setting : kSettings) {
         APNetwork network = setting.isForGuests ? GuestNetwork(conf) : MainNetwork(conf);
-        for (const APChange& change : changes) {
-            if (change.key == setting.key) {
-                setting.set(network, change.value);
-            }
+        if (const APChange* change = FindChange(changes, setting.key)) {
+            setting.set(network, change->value);
         }
     }
-    for (const APChange& change : changes) {
-        if (change.key == "band" && change.value != BandWord(conf)) {
-            throw CommandError(kUsage, "mode " + ModeWord(conf) + " is of the band " +
-                                           BandWord(conf) + ", not " + change.value);
-        }
+    const APChange* band = FindChange(changes, "band");
+    if (band != nullptr && band->value != BandWord(conf)) {
+        throw CommandError(kUsage, "mode " + ModeWord(conf) + " is of the band " + BandWord(conf) +
+                                       ", not " + band->value);
     }
 }
 

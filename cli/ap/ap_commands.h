@@ -12,6 +12,12 @@ void SetAP(const Options& options);
 void CheckAP(const Options& options);
 void EnableAP(const Options& options);
 void DisableAP(const Options& options);
+void ServeHotspot(const Options& options);
+void ShowAPCode(const Options& options);
+void ListStations(const Options& options);
+
+// Throws unless the user is root, and an adapter is plugged in that can be an access point.
+void RequireAPSupport();
 
 }  // namespace taviwireless::cli
 

@@ -1,7 +1,10 @@
 #include "cli/ap/ap_report.h"
 
+#include "cli/ap/country.h"
 #include "cli/ap/radio.h"
 #include "cli/ap/setting_words.h"
+#include "cli/terminal.h"
+#include "wireless/rules/radio.h"
 
 namespace taviwireless::cli {
 
@@ -20,9 +23,9 @@ struct Secret {
 Secret SecretOf(const APNetwork& network) {
     switch (network.security) {
         case WIRELESS_AP_WEP:
-            return {"wep_key", "WEP key", network.secret.wepKey};
+            return {"key", "Key", network.secret.wepKey};
         case WIRELESS_AP_WPA:
-            return {"passphrase", "Passphrase", network.secret.wpa.passphrase};
+            return {"key", "Key", network.secret.wpa.passphrase};
         case WIRELESS_AP_WPA_ENTERPRISE:
             return {"radius_secret", "RADIUS secret", network.secret.enterprise.radiusSecret};
         default:
@@ -51,6 +54,11 @@ void AddNetwork(Report& report, const APNetwork& network, bool showSecrets) {
                Cell(security) + (cipher.empty() ? "" : ", cipher " + cipher));
     report.document["cipher"] = TextOrNull(cipher);
     const Secret secret = SecretOf(network);
+    for (const char* key : {"key", "radius_server", "radius_port", "radius_secret"}) {
+        if (!network.isForGuests || key == std::string("key")) {
+            report.document[key] = Json::Value();
+        }
+    }
     if (secret.key != nullptr) {
         report.Add(secret.key, secret.title, SecretText(secret.text, showSecrets));
     }
@@ -62,14 +70,20 @@ void AddNetwork(Report& report, const APNetwork& network, bool showSecrets) {
     }
 }
 
-const char* StateText(const APStatus& status) {
+struct State {
+    const char* word;
+    const char* text;
+};
+State StateOf(const APStatus& status) {
     if (status.isConnecting) {
-        return "being switched on";
+        return {"connecting", "being switched on"};
     }
     if (status.isOn) {
-        return "on";
+        return {"on", "on"};
     }
-    return status.isSupported ? "off" : "the adapter, if there is one, cannot be an access point";
+    return status.isSupported
+               ? State{"off", "off"}
+               : State{"not_supported", "the adapter, if there is one, cannot be an access point"};
 }
 
 // Rows only while there is a network for guests.
@@ -90,10 +104,8 @@ Report Describe(const APStatus& status) {
     const std::string interface = TAVIWirelessAPInterfaceGet();
     Report report;
     report.Add("interface", "Interface", interface, interface);
-    report.rows.push_back({"State", StateText(status)});
-    report.document["supported"] = status.isSupported;
-    report.document["connecting"] = status.isConnecting;
-    report.document["on"] = status.isOn;
+    const State state = StateOf(status);
+    report.Add("state", "State", state.word, state.text);
     if (!status.settings) {
         for (const char* key : {"enabled", "ssid", "bridge", "address", "max_stations"}) {
             report.document[key] = Json::Value();
@@ -109,6 +121,20 @@ Report Describe(const APStatus& status) {
     return report;
 }
 
+Report DescribeSwitchedOn(const Switched& switched, WirelessAPConf conf) {
+    const APNetwork network = MainNetwork(conf);
+    const bool isOpen = network.security == WIRELESS_AP_OPEN;
+    Report report = Describe(LookAtAP());
+    std::string sentence =
+        TAVIWirelessAPInterfaceGet() + (": access point " + Printable(conf.ssid)) +
+        (switched.wasOn ? " is on already, " : " switched on, ") +
+        (isOpen ? "open: everybody can join" : "security " + SecurityWord(network));
+    report.document["remark"] = TextOrNull(switched.remark);
+    sentence += (switched.remark.empty() ? "" : "; ") + switched.remark;
+    report.rows = {{sentence}};
+    return report;
+}
+
 Report Describe(WirelessAPSettings settings, bool showSecrets) {
     WirelessAPConf& ap = settings.ap;
     const std::string band = BandWord(ap);
@@ -119,10 +145,11 @@ Report Describe(WirelessAPSettings settings, bool showSecrets) {
     AddFlag(report, "enabled", "To be on", settings.enabled != 0);
     AddNetwork(report, MainNetwork(ap), showSecrets);
     report.Add("bridge", "Bridge", ap.bridge);
+    report.Add("country", "Country", StoredCountry());
     report.Add("mode", "Mode", TextOrNull(mode), "802.11" + Cell(mode) + " at " + band + " GHz");
     report.document["band"] = band;
     report.Add("channel", "Channel",
-               ap.channel == 0 ? Json::Value(ChannelWord(ap)) : Json::Value(ap.channel),
+               ap.channel == wireless::kAnyChannel ? Json::Value() : Json::Value(ap.channel),
                ChannelWord(ap) + ", " + std::to_string(width) + " MHz");
     report.document["width"] = width;
     report.rows.push_back({"Guest network", YesNo(ap.guestEnabled != 0)});

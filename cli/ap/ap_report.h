@@ -7,6 +7,8 @@
 namespace taviwireless::cli {
 
 Report Describe(const APStatus& status);
+// What switching it on has come to: a sentence, or the state with "remark".
+Report DescribeSwitchedOn(const Switched& switched, WirelessAPConf conf);
 // Secrets are hidden unless showSecrets.
 Report Describe(WirelessAPSettings settings, bool showSecrets = false);
 

@@ -12,12 +12,10 @@
 #include "cli/ap/access_point.h"
 #include "cli/ap/ap_changes.h"
 #include "cli/ap/ap_commands.h"
+#include "cli/ap/hostapd.h"
 #include "cli/command_error.h"
 #include "cli/report.h"
 #include "cli/terminal.h"
-#include "wireless/rules/hostapd_conf.h"
-#include "wireless/rules/paths.h"
-#include "wireless/system/guest_network.h"
 #include "wireless/system/shell.h"
 
 namespace taviwireless::cli {
@@ -28,25 +26,9 @@ namespace {
 // names all other faults first.
 constexpr char kStopper[] = "taviwireless_only_checks";
 
-struct ConfFile {
-    std::string path;
-    wireless::HostapdConf conf;
-};
-
 // What may be shown of the file.
 const std::string& Shown(const ConfFile& file, bool showSecrets) {
     return showSecrets ? file.conf.Text() : file.conf.Shown();
-}
-
-// The files with which the access point would be started.
-std::vector<ConfFile> Render(const WirelessAPConf& conf) {
-    const std::string interface = TAVIWirelessAPInterfaceGet();
-    std::vector<ConfFile> files{
-        {wireless::HostapdHostConf(interface), wireless::RenderHostConf(interface, conf)}};
-    if (wireless::OffersGuestNetwork() && conf.guestEnabled != 0) {
-        files.push_back({wireless::HostapdGuestConf(interface), wireless::RenderGuestConf(conf)});
-    }
-    return files;
 }
 
 // The path by which programs that are started meanwhile can open the file.
@@ -63,7 +45,7 @@ struct Verdict {
 };
 
 // Returns what hostapd says of the text of both files. Its "Line 7: ..." counts through both.
-Verdict AskHostapd(const std::string& text) {
+Verdict AskNewHostapd(const std::string& text) {
     const UniqueFd file = MemoryFile(text + kStopper + "=1\n");
     const wireless::Pipe output(
         wireless::Command(128, {"hostapd ", wireless::Argument{PathOf(file)}, " 2>&1"}));
@@ -102,7 +84,7 @@ Verdict CheckWithHostapd(const std::vector<ConfFile>& files) {
     if (const size_t line = text.find(kNoBssid); line != text.npos) {
         text.erase(line, strlen(kNoBssid) - 1);
     }
-    Verdict verdict = AskHostapd(text);
+    Verdict verdict = AskNewHostapd(text);
     if (verdict.errors < 0) {
         throw CommandError(kFailure,
                            "hostapd cannot be asked; is it installed? " + Join(verdict.remarks));
@@ -146,7 +128,7 @@ Report Describe(const std::vector<ConfFile>& files, const Verdict& verdict, bool
 void CheckAP(const Options& options) {
     RequireWifiSettings();
     const WirelessAPSettings settings = ReadAPSettings();
-    const std::vector<ConfFile> files = Render(settings.ap);
+    const std::vector<ConfFile> files = RenderConfFiles(settings.ap);
     if (!options.json) {
         PrintText(files, options.showSecrets);
     }

@@ -23,7 +23,8 @@ void CheckChannel(const WirelessAPConf& conf) {
 }
 
 void CheckWidth(const WirelessAPConf& conf) {
-    const bool hasRoom = *wireless::SecondHalf(wireless::BandInUse(conf), conf.channel) != '\0';
+    const bool hasRoom = conf.channel == kAnyChannel ||
+                         *wireless::SecondHalf(wireless::BandInUse(conf), conf.channel) != '\0';
     if (ChannelWidth(conf) == 40 && !hasRoom) {
         throw CommandError(kUsage, "channel " + ChannelWord(conf) +
                                        " has no room for 40 MHz at 5 GHz; those of 36 to 64 have, "

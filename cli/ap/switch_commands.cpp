@@ -4,6 +4,8 @@
 #include "cli/ap/ap_changes.h"
 #include "cli/ap/ap_commands.h"
 #include "cli/ap/ap_report.h"
+#include "cli/ap/channel_choice.h"
+#include "cli/ap/country.h"
 #include "cli/ap/setting_words.h"
 #include "cli/command_error.h"
 #include "cli/terminal.h"
@@ -12,22 +14,6 @@
 namespace taviwireless::cli {
 
 namespace {
-
-void RequireAPSupport() {
-    RequireWifiSettings();
-    if (TAVIWirelessAPIsSupported() != 1) {
-        throw CommandError(kFailure,
-                           std::string("there is no adapter that can be an access point: none is "
-                                       "plugged in, or ") +
-                               wireless::kAdapterInfo + " does not say AP_SUPPORT=yes");
-    }
-}
-
-std::string WhoCanJoin(WirelessAPConf conf) {
-    const APNetwork network = MainNetwork(conf);
-    return network.security == WIRELESS_AP_OPEN ? "open: everybody can join"
-                                                : "security " + SecurityWord(network);
-}
 
 void ShowPlan(const Options& options) {
     Report report;
@@ -38,12 +24,27 @@ void ShowPlan(const Options& options) {
     Print(options, report);
 }
 
-void PrintOutcomeOfSwitching(const Options& options, const std::string& outcome) {
-    PrintOutcome(options, TAVIWirelessAPInterfaceGet() + (": access point " + outcome),
-                 [] { return Describe(LookAtAP()); });
+// A network that everybody can join has to be asked for: it is what one gets by default.
+void RequireSecuritySaid(const APNetwork& network, const std::vector<APChange>& changes) {
+    const std::string prefix = network.isForGuests ? "guest-" : "";
+    if (network.security == WIRELESS_AP_OPEN && !FindChange(changes, prefix + "security")) {
+        throw CommandError(kUsage, prefix + "security is not set: add " + prefix +
+                                       "security=wpa2 " + prefix + "key, or " + prefix +
+                                       "security=open for a network that everybody can join");
+    }
 }
 
 }  // namespace
+
+void RequireAPSupport() {
+    RequireWifiSettings();
+    if (TAVIWirelessAPIsSupported() != 1) {
+        throw CommandError(kFailure,
+                           std::string("there is no adapter that can be an access point: none is "
+                                       "plugged in, or ") +
+                               wireless::kAdapterInfo + " does not say AP_SUPPORT=yes");
+    }
+}
 
 // Needs no root.
 void ShowAP(const Options& options) {
@@ -58,11 +59,33 @@ void ShowAPSettings(const Options& options) {
 void SetAP(const Options& options) {
     RequireWifiSettings();
     WirelessAPSettings settings = ReadAPSettings();
-    ApplyAPChanges(ReadAPChanges(options.settings), settings.ap);
+    const std::vector<APChange> changes = ReadAPChanges(options.settings);
+    const bool hadGuests = settings.ap.guestEnabled != 0;
+    ApplyAPChanges(changes, settings.ap);
+    if (!AreStored(settings)) {
+        RequireSecuritySaid(MainNetwork(settings.ap), changes);
+    }
+    if (settings.ap.guestEnabled != 0 && !hadGuests) {
+        RequireSecuritySaid(GuestNetwork(settings.ap), changes);
+    }
     CheckAPConf(settings.ap);
+    const APChange* channel = FindChange(changes, "channel");
+    std::string remark;
+    if (channel != nullptr && channel->value == "auto") {
+        remark = TakeEmptiestChannel(settings.ap);
+    }
+    if (const APChange* country = FindChange(changes, "country")) {
+        StoreCountry(CountryOf(country->value));
+    }
     StoreAPSettings(settings);
-    PrintOutcome(options, "Stored; taviwireless ap enable puts it into force.",
-                 [&] { return Describe(settings); });
+    PrintOutcome(options,
+                 "Stored" + (remark.empty() ? "" : ", " + remark) +
+                     "; taviwireless ap enable puts it into force.",
+                 [&] {
+                     Report report = Describe(settings);
+                     report.document["remark"] = TextOrNull(remark);
+                     return report;
+                 });
 }
 
 void EnableAP(const Options& options) {
@@ -70,17 +93,20 @@ void EnableAP(const Options& options) {
     if (options.dryRun) {
         return ShowPlan(options);
     }
+    if (options.openNetwork) {
+        StoreOpenNetwork();
+    }
     ShowProgress("Switching the access point on ...");
-    SwitchAPOn();
-    const WirelessAPConf conf = ReadAPSettings().ap;
-    PrintOutcomeOfSwitching(options, Printable(conf.ssid) + " switched on, " + WhoCanJoin(conf));
+    const Switched switched = SwitchAPOn();
+    Print(options, DescribeSwitchedOn(switched, ReadAPSettings().ap));
 }
 
 void DisableAP(const Options& options) {
     RequireWifiSettings();
     ShowProgress("Switching the access point off ...");
-    SwitchAPOff();
-    PrintOutcomeOfSwitching(options, "switched off");
+    const char* outcome = SwitchAPOff() ? "switched off" : "is off already";
+    PrintOutcome(options, TAVIWirelessAPInterfaceGet() + std::string(": access point ") + outcome,
+                 [] { return Describe(LookAtAP()); });
 }
 
 }  // namespace taviwireless::cli

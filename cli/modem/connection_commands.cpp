@@ -3,10 +3,14 @@
 #include <iomanip>
 #include <sstream>
 #include <thread>
+#include <utility>
 
 #include "cli/deadline.h"
+#include "cli/modem/dial_failure.h"
+#include "cli/modem/dial_guard.h"
 #include "cli/modem/modem_access.h"
 #include "cli/modem/modem_commands.h"
+#include "cli/modem/modem_report.h"
 #include "cli/report.h"
 #include "cli/terminal.h"
 
@@ -19,20 +23,20 @@ using Clock = std::chrono::steady_clock;
 constexpr std::chrono::milliseconds kLookPause{250};
 constexpr int kConnectTimeout = 60;  // seconds
 
-std::string Sentence(const std::string& id, const Connection& connection) {
-    std::string text = id + ": " + connection.status;
+std::string Sentence(const std::string& id, const Connection& connection, const char* more = "") {
+    std::string text = id + ": " + StateCell(connection.status) + more;
     if (!connection.address.empty()) {
         text += ", " + connection.address + " on " + connection.interface;
     }
     return Printable(text);
 }
 
-Report Describe(const std::string& id, const Connection& connection) {
-    Report report{{{Sentence(id, connection)}}, {}};
+Report Describe(const std::string& id, const Connection& connection, const char* more = "") {
+    Report report{{{Sentence(id, connection, more)}}, {}};
     report.document["id"] = id;
-    report.document["net_status"] = connection.status;
-    report.document["interface"] = connection.interface;
-    report.document["ip"] = connection.address;
+    report.document["state"] = connection.status;
+    report.document["interface"] = TextOrNull(connection.interface);
+    report.document["address"] = TextOrNull(connection.address);
     return report;
 }
 
@@ -46,61 +50,69 @@ std::string Seconds(double seconds, int digits) {
     return text.str();
 }
 
-// Looks until the link is up or the dialler gave up; the deadline ends it otherwise.
-Connection WaitUntilConnected(ModemAccess& access, const std::string& id, bool noWait) {
-    const auto begin = Clock::now();
+// Looks until the link is up or the dialler gave up; a DialGuard ends it otherwise.
+Connection WaitUntilConnected(ModemAccess& access, const Options& options,
+                              const DialAttempt& attempt) {
     for (;;) {
-        const Connection connection = access.LookAtConnection(id);
+        const Connection connection = access.LookAtConnection(options.id);
         if (IsDisconnected(connection.status)) {
-            throw CommandError(kFailure, "the dialler of " + id +
-                                             " gave up, or could not be started; its log is in "
-                                             "/var/lib/usbmodem/, and the system log tells more");
+            throw attempt.Failure();
         }
-        if (noWait || connection.status == kConnected) {
+        if (options.noWait || connection.status == kConnected) {
             return connection;
         }
-        ShowProgress("Connecting " + id + " ... " + Seconds(SecondsSince(begin), 0));
+        ShowProgress("Connecting " + options.id + " ...");
         std::this_thread::sleep_for(kLookPause);
     }
 }
 
-Connection Dial(ModemAccess& access, const Options& options, Deadline& deadline) {
-    const ModemState state = access.Look(options.id);
+void RequireReadyToDial(const ModemState& state) {
     if (!IsDisconnected(state.netStatus)) {
-        throw CommandError(kBusy, options.id + " has a connection already; " +
-                                      "taviwireless modem disconnect ends it");
+        throw CommandError(kBusy, state.id + " is connecting already; taviwireless modem status " +
+                                      state.id + " shows it, disconnect ends it");
     }
     if (state.simStatus != kReady) {
-        throw CommandError(kFailure, "the SIM of " + options.id +
-                                         " is not ready; taviwireless modem show " + options.id +
+        throw CommandError(kFailure, "the SIM of " + state.id +
+                                         " is not ready; taviwireless modem show " + state.id +
                                          " tells what it waits for");
     }
+}
+
+// What is there when it is connected, with what a person is told behind its state.
+std::pair<Connection, std::string> Dial(ModemAccess& access, const Options& options) {
+    DialGuard guard(options, kConnectTimeout, [&] { access.HangUp(options.id); });
+    const auto begin = Clock::now();
+    const ModemState state = access.Look(options.id);
+    if (state.netStatus == kConnected) {
+        return {{state.netStatus, state.interface, state.ip}, " already"};
+    }
+    RequireReadyToDial(state);
+    const DialAttempt attempt(access, state);
+    guard.HasDialled();
     access.Connect(options.id);
-    deadline.SetSentence(options.id + " is not connected after " +
-                         std::to_string(deadline.Seconds()) +
-                         " s; it goes on trying until it is disconnected");
-    return WaitUntilConnected(access, options.id, options.noWait);
+    const Connection connection = WaitUntilConnected(access, options, attempt);
+    return {connection, " after " + Seconds(SecondsSince(begin), 1)};
 }
 
 }  // namespace
 
 void ConnectModem(const Options& options) {
     const auto access = MakeAccess(options);
-    Deadline deadline(options, kConnectTimeout);
     const auto begin = Clock::now();
-    const Connection connection = deadline.Limit([&] { return Dial(*access, options, deadline); });
-    const double seconds = SecondsSince(begin);
-    Report report = Describe(options.id, connection);
-    report.rows = {{Sentence(options.id, connection) + " after " + Seconds(seconds, 1)}};
-    report.document["seconds"] = seconds;
+    const auto& [connection, more] = Dial(*access, options);
+    Report report = Describe(options.id, connection, more.c_str());
+    report.document["seconds"] = SecondsSince(begin);
     Print(options, report);
 }
 
 void DisconnectModem(const Options& options) {
     const auto access = MakeAccess(options);
+    const char* more = "";
     const auto hangUp = [&] {
-        if (IsDisconnected(access->LookAtConnection(options.id).status)) {
-            throw CommandError(kFailure, options.id + " is not connected");
+        const Connection before = access->LookAtConnection(options.id);
+        if (IsDisconnected(before.status)) {
+            more = " already";
+            return before;
         }
         access->Disconnect(options.id);
         const Connection connection = access->LookAtConnection(options.id);
@@ -111,7 +123,7 @@ void DisconnectModem(const Options& options) {
         return connection;
     };
     const Connection connection = Deadline(options).Limit(hangUp);
-    Print(options, Describe(options.id, connection));
+    Print(options, Describe(options.id, connection, more));
 }
 
 void ShowConnection(const Options& options) {

@@ -1,11 +1,15 @@
 // The modems themselves, through the layer that the service uses too.
 #include <taviwireless/usbmodem_list.h>
+#include <unistd.h>
 
 #include <algorithm>
 #include <set>
 
 #include "cli/modem/modem_access.h"
+#include "cli/modem/port_trouble.h"
+#include "cli/modem/trace.h"
 #include "cli/terminal.h"
+#include "usbmodem/rules/paths.h"
 
 namespace taviwireless::cli {
 
@@ -24,6 +28,12 @@ Profile ReadStoredProfile(USBModem& modem, bool& failed) {
     return values;
 }
 
+// As of the last time that it was asked.
+bool IsReady(USBModem& modem) {
+    bool ignored = false;
+    return modem.IsPINReady(ignored);
+}
+
 class DirectAccess : public ModemAccess {
   public:
     ModemState Look(const std::string& id) override {
@@ -35,6 +45,7 @@ class DirectAccess : public ModemAccess {
         state.id = id;
         state.netStatus = connection.status;
         state.ip = connection.address;
+        state.interface = connection.interface;
         state.vendor = modem.GetVendorName(ignored);
         state.product = modem.GetProductName(ignored);
         state.simStatus = modem.GetPINStatus(ignored);
@@ -44,7 +55,28 @@ class DirectAccess : public ModemAccess {
         state.pinRemains = modem.PINGetAttemptRemain();
         state.pukRemains = modem.PUKGetAttemptRemain();
         state.profile = ReadStoredProfile(modem, ignored);
+        const usbmodem_lib::KnownModem known = modem.Known();
+        state.imsi = known.imsi;
+        state.ports = {known.connectNode, known.queryNode};
         return state;
+    }
+
+    // The dialler's files alone tell it.
+    Connection KnownConnection(const std::string& id) override {
+        Refresh();
+        USBModem& modem = list_.FindUSBModem(id);
+        if (modem.IsNull()) {
+            throw NotReadyError(id);
+        }
+        bool failed = modem.RecallConnection() < 0;
+        Connection connection{modem.GetNetStatus(failed), modem.GetNetIFName(failed),
+                              modem.GetNetLocalIP(failed)};
+        if (failed) {
+            const std::string trouble = StateFolderTrouble();
+            throw CommandError(kFailure, "cannot tell the state of the connection of " + id +
+                                             (trouble.empty() ? "" : ": " + trouble));
+        }
+        return connection;
     }
 
     // A new process knows nothing of a running connection: the first look finds the interface in
@@ -68,10 +100,19 @@ class DirectAccess : public ModemAccess {
 
     std::vector<Interface> Interfaces() override {
         std::vector<Interface> interfaces;
-        for (const std::string& id : ReadyModems()) {
-            interfaces.push_back({id, LookAtConnection(id).interface});
+        for (const std::string& id : PluggedModems()) {
+            interfaces.push_back({id, KnownConnection(id).interface});
         }
         return interfaces;
+    }
+
+    std::string Command(const std::string& id, const std::string& command) override {
+        USBModem& modem = Initialised(id);
+        std::string reply;
+        if (modem.ModemCmd(command, reply) != 0) {
+            throw CommandError(kFailure, id + " did not answer the command");
+        }
+        return reply;
     }
 
     int EnterPIN(const std::string& id, const std::string& pin) override {
@@ -90,9 +131,10 @@ class DirectAccess : public ModemAccess {
 
     Profile ReadProfile(const std::string& id) override {
         bool failed = false;
-        Profile profile = ReadStoredProfile(Initialised(id), failed);
+        USBModem& modem = Initialised(id);
+        Profile profile = ReadStoredProfile(modem, failed);
         if (failed) {
-            throw ProfileUnreadableError(id);
+            throw ProfileError("cannot read the profile of " + id, IsReady(modem));
         }
         return profile;
     }
@@ -102,9 +144,7 @@ class DirectAccess : public ModemAccess {
         USBModem& modem = Initialised(id);
         for (const profile::Setting& setting : settings) {
             if (modem.SetProfileWithKey(setting.key, setting.value) != 0) {
-                throw CommandError(kFailure,
-                                   "cannot set " + setting.key + " in the profile of " + id +
-                                       "; is the SIM ready, and /var/lib/usbmodem writable?");
+                throw ProfileError("cannot change the profile of " + id, IsReady(modem));
             }
         }
     }
@@ -113,36 +153,37 @@ class DirectAccess : public ModemAccess {
         USBModem& modem = Initialised(id);
         ShowProgress("Reading defaults from " + id + " ...");
         if (modem.SetProfileToDefault() != 0) {
-            throw CommandError(kFailure, "cannot reset the profile of " + id +
-                                             "; is the SIM ready, and /var/lib/usbmodem writable?");
+            throw ProfileError("cannot reset the profile of " + id, IsReady(modem));
         }
     }
 
-    void Connect(const std::string& id) override {
-        if (Initialised(id).NetConnect() != 1) {
-            throw CommandError(kFailure, "cannot connect " + id + "; --verbose shows the reason");
-        }
-    }
+    // A failure shows in the state of the connection.
+    void Connect(const std::string& id) override { Initialised(id).NetConnect(); }
 
     void Disconnect(const std::string& id) override {
-        if (Initialised(id).NetDisconnect() != 0) {
-            throw CommandError(kFailure,
-                               "cannot disconnect " + id + "; --verbose shows the reason");
+        if (Initialised(id).NetDisconnect() == 0) {
+            return;
+        }
+        const bool isUp = !IsDisconnected(LookAtConnection(id).status);
+        const char* why = geteuid() != 0 ? "that takes root" : "the system log tells why";
+        throw CommandError(
+            kFailure, isUp ? std::string("cannot end the dialler of ") + id + "; " + why
+                           : id + " is hung up, but the default route could not be given back; "
+                                  "set it anew");
+    }
+
+    // By the dialler's files, with a record of its own.
+    void HangUp(const std::string& id) override {
+        if (const auto number = usbmodem_lib::InterfaceIdIn(id, "usbmodem")) {
+            USBModem(static_cast<unsigned int>(*number), usbmodem_lib::InfoPath(*number))
+                .EndConnection();
         }
     }
 
   protected:
-    // Each modem is initialised on its own: one that is dead does not hide those behind it.
-    std::vector<std::string> ReadyModems() override {
-        Refresh();
-        std::vector<std::string> ready;
-        for (USBModem& modem : list_) {
-            if (Initialise(modem)) {
-                ready.push_back(modem.GetDevId());
-            }
-        }
-        return ready;
-    }
+    // Each modem is initialised when it is looked at: one that is dead does not hide those behind
+    // it.
+    std::vector<std::string> ReadyModems() override { return PluggedModems(); }
 
   private:
     // Follows what was plugged in and unplugged meanwhile.
@@ -157,11 +198,20 @@ class DirectAccess : public ModemAccess {
         }
     }
 
-    // Costs a modem that does not answer up to six seconds.
+    // Costs a modem that does not answer up to six seconds, and one whose ports cannot be opened
+    // none.
     bool Initialise(USBModem& modem) {
         if (modem.IsInited()) {
             return true;
         }
+        const auto holder = HolderOfPorts(modem.GetDevId());
+        if (holder && holder->isService) {
+            throw CommandError(kBusy, holder->sentence);
+        }
+        if (holder || PortTrouble(modem.GetDevId())) {
+            return false;
+        }
+        Trace("finding the ports of " + modem.GetDevId());
         ShowProgress("Finding the ports of " + modem.GetDevId() + " ...");
         return modem.InitInfo() == 0;
     }
@@ -171,7 +221,8 @@ class DirectAccess : public ModemAccess {
         Refresh();
         USBModem& modem = list_.FindUSBModem(id);
         if (modem.IsNull() || !Initialise(modem)) {
-            throw NotReadyError(id);
+            const auto holder = HolderOfPorts(id);
+            throw holder ? CommandError(kFailure, holder->sentence) : NotReadyError(id);
         }
         if (hasIMSI_.count(id) == 0) {
             bool failed = false;

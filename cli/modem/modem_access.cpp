@@ -6,7 +6,9 @@
 #include <chrono>
 #include <thread>
 
+#include "cli/modem/port_trouble.h"
 #include "cli/terminal.h"
+#include "usbmodem/rules/paths.h"
 
 namespace taviwireless::cli {
 
@@ -22,7 +24,7 @@ bool IsDisconnected(const std::string& netStatus) {
     return netStatus == kDisconnected || netStatus == kConnectionLost;
 }
 
-std::vector<ModemState> ModemAccess::KnownModems(bool withProfiles) {
+std::vector<ModemState> ModemAccess::KnownModems(bool withProfiles, const OnModem& onModem) {
     const std::vector<std::string> ready = ReadyModems();
     std::vector<ModemState> states;
     for (const std::string& id : PluggedModems()) {
@@ -33,10 +35,11 @@ std::vector<ModemState> ModemAccess::KnownModems(bool withProfiles) {
                 state = ReadyModem(id, withProfiles);
             }
         } catch (const CommandError& error) {
-            if (error.Status() == kNoService) {
+            if (error.Status() == kNoService || error.Status() == kBusy) {
                 throw;
             }  // unplugged, or fallen silent, a moment ago: no reason to hide the others
         }
+        onModem(state);
         states.push_back(state);
     }
     return states;
@@ -48,8 +51,17 @@ void ModemAccess::WaitForChange() {
     std::this_thread::sleep_for(std::chrono::seconds(2));
 }
 
+std::string ModemAccess::LogFile(const ModemState& state) {
+    return state.imsi.empty() ? "" : usbmodem_lib::DialLogPath(state.imsi);
+}
+
 std::unique_ptr<ModemAccess> MakeAccess(const Options& options) {
     return options.direct ? MakeDirectAccess() : MakeServiceAccess();
+}
+
+std::string FullId(const std::string& id) {
+    const bool isNumber = !id.empty() && id.find_first_not_of("0123456789") == std::string::npos;
+    return isNumber ? "usbmodem" + id : id;
 }
 
 std::vector<std::string> PluggedModems() {
@@ -66,6 +78,9 @@ std::vector<std::string> PluggedModems() {
 
 CommandError NotReadyError(const std::string& id) {
     if (Contains(PluggedModems(), id)) {
+        if (auto trouble = PortTrouble(id)) {
+            return *trouble;
+        }
         return {kFailure, "modem " + id +
                               " is not ready: no port of it has answered yet; wait a moment, or "
                               "unplug it and plug it in again"};
@@ -74,9 +89,12 @@ CommandError NotReadyError(const std::string& id) {
                            "; taviwireless modem list shows those that are plugged in"};
 }
 
-CommandError ProfileUnreadableError(const std::string& id) {
-    return {kFailure, "cannot read the profile of " + id +
-                          "; is the SIM ready, and /var/lib/usbmodem readable?"};
+CommandError ProfileError(const std::string& whatFailed, bool isSIMReady) {
+    const std::string trouble = StateFolderTrouble();
+    return {kFailure, whatFailed + "; " +
+                          (!isSIMReady       ? "its SIM is not ready"
+                           : trouble.empty() ? "the system log tells why"
+                                             : trouble)};
 }
 
 }  // namespace taviwireless::cli

@@ -1,6 +1,7 @@
 #ifndef TAVIWIRELESS_CLI_MODEM_MODEM_ACCESS_H
 #define TAVIWIRELESS_CLI_MODEM_MODEM_ACCESS_H
 
+#include <functional>
 #include <map>
 #include <memory>
 #include <string>
@@ -18,21 +19,23 @@ namespace profile = usbmodem_lib::profile;
 // The connection profile of a SIM: its values by key, all as text.
 using Profile = std::map<std::string, std::string>;
 
-// Its keys, in the order in which they are shown. One that is not stored is asked of the modem.
+// Its keys, in the order in which they are shown, and how they are called in documents; a person
+// sets them by that name with "-" for "_". One that is not stored is asked of the modem.
 struct ProfileKey {
     const char* name;
+    const char* shown;
     const char* title;
     bool isStored = true;
 };
 constexpr ProfileKey kProfileKeys[] = {
-    {profile::kNumber, "Number"},
-    {profile::kUser, "User"},
-    {profile::kPassword, "Password"},
-    {profile::kAPN, "APN"},
-    {profile::kISP, "ISP"},
-    {profile::kLocation, "Location"},
-    {profile::kRoaming, "Roaming", false},
-    {profile::kDefaultGateway, "Default route"},
+    {profile::kNumber, "number", "Number"},
+    {profile::kUser, "user", "User"},
+    {profile::kPassword, "password", "Password"},
+    {profile::kAPN, "apn", "APN"},
+    {profile::kISP, "isp", "ISP"},
+    {profile::kLocation, "location", "Location"},
+    {profile::kRoaming, "roaming", "Roaming", false},
+    {profile::kDefaultGateway, "default_route", "Default route"},
 };
 
 // Statuses of a SIM. "no_answer" is that of a modem that is plugged in but not ready for use.
@@ -63,6 +66,10 @@ struct ModemState {
     bool pinProtected = false;
     int pinRemains = -1;  // attempts left; below 0 when not known
     int pukRemains = -1;
+    std::string imsi;
+    std::string interface;           // of the connection; empty unless connected
+    std::vector<std::string> ports;  // device paths: the dialler's, then that of questions
+    std::string trend;               // of the signal, drawn
     Profile profile;
 };
 
@@ -91,9 +98,15 @@ class ModemAccess {
 
     virtual ~ModemAccess() = default;
 
+    // Gets a modem when it is known.
+    using OnModem = std::function<void(const ModemState& state)>;
+
     // All modems that are plugged in, in the order of their numbers, as they are known: a modem
     // that was looked at lately is not asked. Profiles cost a call for each.
-    std::vector<ModemState> KnownModems(bool withProfiles);
+    std::vector<ModemState> KnownModems(
+        bool withProfiles, const OnModem& onModem = [](const ModemState&) {});
+    // Whether KnownModems has modems to ask, which takes about two seconds for each.
+    virtual bool HasToAsk() { return true; }
     // One of them, with its profile.
     virtual ModemState Known(const std::string& id) { return Look(id); }
     virtual Connection KnownConnection(const std::string& id) { return LookAtConnection(id); }
@@ -103,8 +116,14 @@ class ModemAccess {
     // Asks the modem everything: about two seconds.
     virtual ModemState Look(const std::string& id) = 0;
     virtual Connection LookAtConnection(const std::string& id) = 0;
-    // The network interfaces of the modems that are ready for use.
+    // Adds what Look may leave out: IMSI and ports.
+    virtual void AddDetails(ModemState& /*state*/) {}
+    // The dialler's log of a modem that was looked at; empty when it cannot be told.
+    virtual std::string LogFile(const ModemState& state);
+    // The network interfaces of the modems that are ready for use. Asks no modem.
     virtual std::vector<Interface> Interfaces() = 0;
+    // Sends the modem an AT command, and returns what it answers.
+    virtual std::string Command(const std::string& id, const std::string& command) = 0;
 
     // The operations on PIN and PUK want a modem that was looked at before.
     virtual int EnterPIN(const std::string& id, const std::string& pin) = 0;
@@ -122,6 +141,8 @@ class ModemAccess {
     // Start dialling and hanging up; LookAtConnection tells what came of it.
     virtual void Connect(const std::string& id) = 0;
     virtual void Disconnect(const std::string& id) = 0;
+    // Disconnect for a program that is about to end: at once, from any thread, and without a word.
+    virtual void HangUp(const std::string& id) = 0;
 
   protected:
     // The modems of KnownModems that can be looked at.
@@ -134,13 +155,15 @@ std::unique_ptr<ModemAccess> MakeServiceAccess();
 std::unique_ptr<ModemAccess> MakeDirectAccess();
 std::unique_ptr<ModemAccess> MakeAccess(const Options& options);
 
-// Helpers of the implementations of ModemAccess.
+// The device id that a person means who may give the number alone: "1" is "usbmodem1".
+std::string FullId(const std::string& id);
 
 // Device ids by the info files in "/tmp/"; touches no modem.
 std::vector<std::string> PluggedModems();
 // The error for a modem that is not among the ready ones: unplugged, unknown or not ready.
 CommandError NotReadyError(const std::string& id);
-CommandError ProfileUnreadableError(const std::string& id);
+// What failed with a profile, and why as far as that can be told.
+CommandError ProfileError(const std::string& whatFailed, bool isSIMReady);
 
 }  // namespace taviwireless::cli
 

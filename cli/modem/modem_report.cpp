@@ -1,6 +1,11 @@
 #include "cli/modem/modem_report.h"
 
+#include <algorithm>
+#include <iostream>
+
+#include "base/join.h"
 #include "cli/terminal.h"
+#include "usbmodem/rules/paths.h"
 
 namespace taviwireless::cli {
 
@@ -21,11 +26,12 @@ std::string WithoutBlanks(const std::string& text) {
 }
 
 std::string SignalCell(const ModemState& state) {
-    return state.simStatus == kReady ? std::to_string(state.signal) + "%" : "-";
+    const std::string drawn = state.trend.empty() ? "" : " " + state.trend;
+    return state.simStatus == kReady ? std::to_string(state.signal) + "%" + drawn : "-";
 }
 
 std::string ProtectionCell(const ModemState& state) {
-    return HasSIM(state) ? (state.pinProtected ? "on" : "off") : "-";
+    return HasSIM(state) ? (state.pinProtected ? "yes" : "no") : "-";
 }
 
 bool AreKnown(const ModemState& state, int attempts) {
@@ -46,10 +52,6 @@ std::string SIMCell(const std::string& status) {
     return text == texts.end() ? Cell(status) : text->second;
 }
 
-std::string NetworkCell(const std::string& status) {
-    return status == kConnectionLost ? "connection lost" : Cell(status);
-}
-
 std::string ProfileValue(const Profile& profile, const std::string& key, bool showSecrets) {
     const auto found = profile.find(key);
     if (found == profile.end()) {
@@ -58,63 +60,131 @@ std::string ProfileValue(const Profile& profile, const std::string& key, bool sh
     return key == profile::kPassword ? SecretText(found->second, showSecrets) : found->second;
 }
 
-}  // namespace
-
-Report Describe(const Profile& profile, bool showSecrets) {
-    Report report;
-    for (const ProfileKey& key : kProfileKeys) {
-        const std::string value = ProfileValue(profile, key.name, showSecrets);
-        report.Add(key.name, key.title, value, Printable(value));
-    }
-    Json::Value& isDefault = report.document[profile::kDefaultGateway];
-    isDefault = isDefault == "true";
-    Json::Value& roaming = report.document[profile::kRoaming];
-    roaming = roaming.asString().empty() ? Json::Value() : roaming == "true";
-    return report;
+Json::Value YesOrNull(const std::string& value) {
+    return value.empty() ? Json::Value() : Json::Value(value == "true");
 }
 
-Report Describe(const ModemState& state, bool showSecrets) {
+std::string YesCell(const std::string& value) {
+    return value.empty() ? "-" : value == "true" ? "yes" : "no";
+}
+
+void AddPorts(Report& report, const std::vector<std::string>& ports) {
+    std::string names;
+    Json::Value list = Json::arrayValue;
+    for (const std::string& port : ports) {
+        AddItem(names, port);
+        list.append(port);
+    }
+    report.Add("ports", "Ports", ports.empty() ? Json::Value() : list, Cell(names));
+}
+
+Report DescribeModem(const ModemState& state) {
     const Json::Value unknown;
-    const bool isReady = state.simStatus == kReady;
     Report report;
     const auto addAttempts = [&](const char* key, const char* title, int attempts) {
         report.Add(key, title, AreKnown(state, attempts) ? Json::Value(attempts) : unknown,
                    AttemptsCell(state, attempts));
     };
     report.Add("id", "Device", state.id, state.id);
+    report.document["answers"] = IsAnswering(state);
     report.Add("vendor", "Vendor", WithoutBlanks(state.vendor));
     report.Add("product", "Product", WithoutBlanks(state.product));
-    report.Add("carrier", "Operator", WithoutBlanks(state.carrier));
-    report.Add("signal", "Signal", isReady ? Json::Value(state.signal) : unknown,
+    AddPorts(report, state.ports);
+    report.Add("operator", "Operator", WithoutBlanks(state.carrier));
+    report.Add("signal", "Signal", state.simStatus == kReady ? Json::Value(state.signal) : unknown,
                SignalCell(state));
-    report.Add("sim_status", "SIM", state.simStatus, SIMCell(state.simStatus));
-    report.Add("pin_protected", "PIN lock",
-               HasSIM(state) ? Json::Value(state.pinProtected) : unknown, ProtectionCell(state));
-    addAttempts("pin_remains", "PIN attempts", state.pinRemains);
-    addAttempts("puk_remains", "PUK attempts", state.pukRemains);
-    report.Add("net_status", "Network", TextOrNull(state.netStatus), NetworkCell(state.netStatus));
-    report.Add("ip", "Address", state.ip);
+    report.Add("sim_state", "SIM", IsAnswering(state) ? TextOrNull(state.simStatus) : unknown,
+               SIMCell(state.simStatus));
+    report.Add("imsi", "IMSI", WithoutBlanks(state.imsi));
+    report.Add("pin_lock", "PIN lock", HasSIM(state) ? Json::Value(state.pinProtected) : unknown,
+               ProtectionCell(state));
+    addAttempts("pin_attempts", "PIN attempts", state.pinRemains);
+    addAttempts("puk_attempts", "PUK attempts", state.pukRemains);
+    report.Add("state", "State", TextOrNull(state.netStatus), StateCell(state.netStatus));
+    report.Add("interface", "Interface", state.interface);
+    report.Add("address", "Address", state.ip);
+    return report;
+}
+
+void AddProfile(Report& report, const ModemState& state, bool showSecrets) {
+    const bool isReady = state.simStatus == kReady;
     report.AddPart("profile",
                    "Profile: ", isReady ? Describe(state.profile, showSecrets) : Report());
+}
+
+}  // namespace
+
+const std::vector<Column> kModemColumns = {{"DEVICE", !kText, 9},
+                                           {"VENDOR", kText, 10, kExtra},
+                                           {"PRODUCT", kText, 12},
+                                           {"OPERATOR", kText, 14},
+                                           {"SIGNAL"},
+                                           {"SIM", kText, 15},
+                                           {"PIN LOCK", !kText, 0, kExtra},
+                                           {"PIN/PUK LEFT", !kText, 0, kExtra},
+                                           {"STATE", kText, 15},
+                                           {"ADDRESS", !kText, 15}};
+
+std::vector<std::string> ModemRow(const ModemState& state) {
+    return {state.id,
+            Cell(WithoutBlanks(state.vendor)),
+            Cell(WithoutBlanks(state.product)),
+            Cell(WithoutBlanks(state.carrier)),
+            SignalCell(state),
+            SIMCell(state.simStatus),
+            ProtectionCell(state),
+            AttemptsCell(state, state.pinRemains) + " / " + AttemptsCell(state, state.pukRemains),
+            StateCell(state.netStatus),
+            Cell(state.ip)};
+}
+
+std::string StateCell(const std::string& status) {
+    return status == kConnectionLost ? "connection lost" : Cell(status);
+}
+
+Report Describe(const Profile& profile, bool showSecrets) {
+    Report report;
+    for (const ProfileKey& key : kProfileKeys) {
+        const std::string value = ProfileValue(profile, key.name, showSecrets);
+        const bool isSwitch = key.name == std::string(profile::kDefaultGateway) ||
+                              key.name == std::string(profile::kRoaming);
+        report.Add(key.shown, key.title, isSwitch ? YesOrNull(value) : TextOrNull(value),
+                   isSwitch ? YesCell(value) : Cell(value));
+    }
+    return report;
+}
+
+Report Describe(const ModemState& state, bool showSecrets) {
+    Report report = DescribeModem(state);
+    AddProfile(report, state, showSecrets);
+    return report;
+}
+
+Report Describe(const ModemState& state, const ModemDetails& details, bool showSecrets) {
+    Report report = DescribeModem(state);
+    const LinkUsage& usage = details.usage;
+    report.Add("registration", "Registration", details.registration);
+    report.Add("dialled_at", "Dialled at", NumberOrNull(usage.since), TimeCell(usage.since));
+    report.Add("bytes_sent", "Sent", NumberOrNull(usage.sent), BytesCell(usage.sent));
+    report.Add("bytes_received", "Received", NumberOrNull(usage.received),
+               BytesCell(usage.received));
+    const std::string imsi = WithoutBlanks(state.imsi);
+    report.Add("log_file", "Log file", imsi.empty() ? "" : usbmodem_lib::DialLogPath(imsi));
+    AddProfile(report, state, showSecrets);
     return report;
 }
 
 Report DescribeAll(const std::vector<ModemState>& states) {
     if (states.empty()) {
-        return {{{"No modem is plugged in: there is no usbmodem.info file in /tmp/."}},
-                Json::arrayValue};
+        return {{{kNoModems}}, Json::arrayValue};
     }
-    Report all{{{"DEVICE", "VENDOR", "PRODUCT", "OPERATOR", "SIGNAL", "SIM", "PIN LOCK",
-                 "PIN/PUK LEFT", "NETWORK", "ADDRESS"}},
-               Json::arrayValue};
+    Report all{{}, Json::arrayValue, kModemColumns};
+    for (Column& column : all.columns) {
+        column.width = 0;  // all rows are known
+    }
     for (const ModemState& state : states) {
         all.document.append(Describe(state).document);
-        all.rows.push_back(
-            {state.id, Cell(WithoutBlanks(state.vendor)), Cell(WithoutBlanks(state.product)),
-             Cell(WithoutBlanks(state.carrier)), SignalCell(state), SIMCell(state.simStatus),
-             ProtectionCell(state),
-             AttemptsCell(state, state.pinRemains) + " / " + AttemptsCell(state, state.pukRemains),
-             NetworkCell(state.netStatus), Cell(state.ip)});
+        all.rows.push_back(ModemRow(state));
     }
     return all;
 }

@@ -1,5 +1,7 @@
 // taviwireless modem profile: the connection profile of the SIM in a modem.
 #include <algorithm>
+#include <cctype>
+#include <cstring>
 
 #include "base/join.h"
 #include "cli/deadline.h"
@@ -14,43 +16,97 @@ namespace {
 
 constexpr size_t kMaxValue = profile::kValueSize - 1;  // bytes; what the library reads back
 
-bool CanBeSet(const std::string& key) {
-    return std::any_of(std::begin(kProfileKeys), std::end(kProfileKeys),
-                       [&key](const auto& known) { return known.isStored && key == known.name; });
+constexpr size_t kMaxAPN = 100;                // bytes (3GPP TS 23.003, 9.1)
+constexpr char kDialled[] = "0123456789*#+,";  // what a modem dials
+constexpr char kPunctuation[] = "-._";
+
+// As a person writes it.
+std::string Word(const ProfileKey& key) {
+    std::string word = key.shown;
+    std::replace(word.begin(), word.end(), '_', '-');
+    return word;
+}
+
+const ProfileKey* FindKey(const std::string& word) {
+    const auto found =
+        std::find_if(std::begin(kProfileKeys), std::end(kProfileKeys),
+                     [&word](const auto& key) { return key.isStored && word == Word(key); });
+    return found == std::end(kProfileKeys) ? nullptr : found;
 }
 
 std::string SettableKeys() {
     std::string names;
     for (const ProfileKey& key : kProfileKeys) {
         if (key.isStored) {
-            AddItem(names, key.name);
+            AddItem(names, Word(key));
         }
     }
     return names;
 }
 
-// "KEY=VALUE", or "KEY" alone to read the value from standard input. Everything is checked before
+// Refuses what no modem could do anything with.
+void CheckNumber(const std::string& number) {
+    if (number.find_first_not_of(kDialled) != std::string::npos) {
+        throw CommandError(
+            kUsage, "number is what the modem dials: digits, *, #, + and commas, such as *99#");
+    }
+}
+
+void CheckAPN(const std::string& apn) {
+    const bool isName = std::all_of(apn.begin(), apn.end(), [](char c) {
+        return isalnum(static_cast<unsigned char>(c)) != 0 || strchr(kPunctuation, c) != nullptr;
+    });
+    if (!isName || apn.size() > kMaxAPN) {
+        throw CommandError(kUsage,
+                           "apn is a name of the provider's, of at most 100 letters, digits, "
+                           "\"-\", \".\" and \"_\", such as internet");
+    }
+}
+
+std::string ReadSwitch(const std::string& value) {
+    if (value != "yes" && value != "no") {
+        throw CommandError(kUsage, "default-route is yes or no");
+    }
+    return value == "yes" ? "true" : "false";
+}
+
+void CheckText(const std::string& word, const std::string& value) {
+    if (value.find_first_of(profile::kLineEnds) != std::string::npos) {
+        throw CommandError(
+            kUsage, "the value of " + word + " holds a line break, which a profile cannot keep");
+    }
+    if (value.size() > kMaxValue) {
+        throw CommandError(kUsage, "the value of " + word + " is longer than " +
+                                       std::to_string(kMaxValue) + " bytes");
+    }
+}
+
+// "KEY=VALUE", or "password" alone, which is read from standard input. Everything is checked before
 // anything is set, so that a mistake changes nothing.
 profile::Setting ParseSetting(const std::string& text) {
     const size_t equals = text.find('=');
-    profile::Setting setting{text.substr(0, equals), ""};
-    if (!CanBeSet(setting.key)) {
-        throw CommandError(kUsage, "a profile has no setting " + Printable(setting.key) +
-                                       "; there are " + SettableKeys());
+    const std::string word = text.substr(0, equals);
+    const ProfileKey* key = FindKey(word);
+    if (key == nullptr) {
+        throw CommandError(kUsage, "a profile has no setting " + Printable(word) + "; there are " +
+                                       SettableKeys());
     }
-    setting.value = equals == std::string::npos ? ReadSecret("Value of " + setting.key)
-                                                : text.substr(equals + 1);
-    if (setting.value.find_first_of(profile::kLineEnds) != std::string::npos) {
-        throw CommandError(kUsage, "the value of " + setting.key +
-                                       " holds a line break, which a profile cannot keep");
+    const bool isSecret = key->name == std::string(profile::kPassword);
+    if (isSecret != (equals == std::string::npos)) {
+        throw CommandError(kUsage, isSecret
+                                       ? "password stands alone: it is read from standard input, "
+                                         "where nobody sees it"
+                                       : word + " needs a value: " + word + "=VALUE");
     }
-    if (setting.value.size() > kMaxValue) {
-        throw CommandError(kUsage, "the value of " + setting.key + " is longer than " +
-                                       std::to_string(kMaxValue) + " bytes");
-    }
-    if (setting.key == profile::kDefaultGateway && setting.value != "true" &&
-        setting.value != "false") {
-        throw CommandError(kUsage, "default_gw is true or false");
+    profile::Setting setting{key->name,
+                             isSecret ? ReadSecret("Password") : text.substr(equals + 1)};
+    CheckText(word, setting.value);
+    if (setting.key == profile::kNumber) {
+        CheckNumber(setting.value);
+    } else if (setting.key == profile::kAPN) {
+        CheckAPN(setting.value);
+    } else if (setting.key == profile::kDefaultGateway) {
+        setting.value = ReadSwitch(setting.value);
     }
     return setting;
 }
@@ -74,6 +130,16 @@ void ShowProfile(const Options& options) {
     const Profile profile =
         Deadline(options).Limit([&] { return access->ReadProfile(options.id); });
     Print(options, Describe(profile, options.showSecrets));
+}
+
+std::vector<std::string> ProfileSettingWords() {
+    std::vector<std::string> words;
+    for (const ProfileKey& key : kProfileKeys) {
+        if (key.isStored) {
+            words.push_back(Word(key) + (key.name == std::string(profile::kPassword) ? "" : "="));
+        }
+    }
+    return words;
 }
 
 void SetProfile(const Options& options) {

@@ -3,12 +3,17 @@
 #include <taviwireless/usbmodem_ui.h>
 
 #include <algorithm>
+#include <chrono>
 #include <cstdlib>
 #include <ctime>
+#include <thread>
+#include <utility>
 
 #include "cli/modem/modem_access.h"
 #include "cli/modem/service_document.h"
 #include "cli/modem/service_objects.h"
+#include "cli/modem/session_bus.h"
+#include "cli/modem/trace.h"
 #include "cli/terminal.h"
 
 namespace taviwireless::cli {
@@ -35,7 +40,35 @@ int PINResult(int result) {
     return Reached(result) > 0 ? ModemAccess::kDone : result;
 }
 
+// A service that was just started looks for its modems first.
+void WaitForModems() {
+    constexpr auto kPatience = std::chrono::seconds(10);
+    const auto end = std::chrono::steady_clock::now() + kPatience;
+    std::vector<std::string> ready;
+    while (usbmodem_ui::GetUSBModemList(ready) > 0 && ready.size() < PluggedModems().size() &&
+           std::chrono::steady_clock::now() < end) {
+        std::this_thread::sleep_for(std::chrono::milliseconds(100));
+        ready.clear();
+    }
+}
+
+// To be called before the service is asked anything. Only the first time: a service that ends
+// meanwhile is not started again.
+void EnsureService() {
+    static bool isDone = false;
+    if (std::exchange(isDone, true)) {
+        return;
+    }
+    if (RequireService()) {
+        WaitForModems();
+    }
+    Trace(
+        "asking the modem service; its side is in the system log, with the AT dialogue if it runs "
+        "as usbmodemd --debug");
+}
+
 std::vector<std::string> Lines(int (*get)(std::vector<std::string>& list)) {
+    EnsureService();
     std::vector<std::string> lines;
     // A service that ends within the call gives no answer, and is not there the second time.
     if (Reached(get(lines)) < 0 && Reached(get(lines)) < 0) {
@@ -59,6 +92,7 @@ void RequireReady(const std::string& id) {
 std::string Document(std::string (*get)(const std::string& id), const std::string& id) {
     RequireReady(id);
     ShowProgress("Asking " + id + " ...");
+    Trace("asking the service about " + id);
     std::string document = get(id);
     if (document.empty()) {
         RequireReady(id);  // the service or the modem may have gone meanwhile
@@ -69,6 +103,7 @@ std::string Document(std::string (*get)(const std::string& id), const std::strin
 }
 
 void CheckSetting(const profile::Setting& setting) {
+    // Compatible with a service that finds its keys anywhere in a line.
     const std::string line = setting.key + "=" + setting.value;
     if (!dbus_validate_utf8(line.c_str(), nullptr)) {
         throw CommandError(kUsage, "the value of " + setting.key +
@@ -104,8 +139,15 @@ class ServiceAccess : public ModemAccess {
             return LookAtConnection(id);
         }
         RequireAmong(ready, id);
-        const KnownModem& modem = known_->at(id);
-        return {modem.state.netStatus, modem.interface, modem.state.ip};
+        const ModemState& state = known_->at(id).state;
+        return {state.netStatus, state.interface, state.ip};
+    }
+
+    bool HasToAsk() override {
+        const auto ready = ReadyModems();
+        return std::any_of(ready.begin(), ready.end(), [this](const std::string& id) {
+            return !known_ || !IsRecent(known_->at(id));
+        });
     }
 
     void WaitForChange() override {
@@ -123,39 +165,67 @@ class ServiceAccess : public ModemAccess {
         if (state.netStatus == kConnected && state.ip.empty()) {
             state = ReadModemDocument(Document(usbmodem_ui::GetUSBModem, id));
         }
+        if (!state.ip.empty()) {
+            for (const Interface& interface : Interfaces()) {
+                state.interface = interface.id == id ? interface.name : state.interface;
+            }
+        }
         return state;
+    }
+
+    void AddDetails(ModemState& state) override {
+        const auto known = objects_.Read();
+        if (known && known->count(state.id) != 0) {
+            state.imsi = known->at(state.id).state.imsi;
+            state.ports = known->at(state.id).state.ports;
+        }
+    }
+
+    std::string LogFile(const ModemState& state) override {
+        return TextProperty(state.id, "LogFile");
     }
 
     Connection LookAtConnection(const std::string& id) override {
         const ModemState state = Look(id);
-        Connection connection{state.netStatus, "", state.ip};
-        if (!connection.address.empty()) {
-            for (const Interface& interface : KnownInterfaces()) {
-                connection.interface = interface.id == id ? interface.name : connection.interface;
-            }
-        }
-        return connection;
+        return {state.netStatus, state.interface, state.ip};
     }
 
-    // The service knows an interface once it looked at the connection.
+    // The service lists ids and interfaces in the same order, in two calls.
     std::vector<Interface> Interfaces() override {
-        for (const std::string& id : Lines(usbmodem_ui::GetUSBModemList)) {
-            Look(id);
+        const auto ids = Lines(usbmodem_ui::GetUSBModemList);
+        const auto names = Lines(usbmodem_ui::GetUSBModemIfList);
+        if (ids.size() != names.size()) {
+            throw CommandError(kFailure,
+                               "a modem was plugged in or unplugged meanwhile; try again");
         }
-        return KnownInterfaces();
+        std::vector<Interface> interfaces;
+        for (size_t i = 0; i < ids.size(); ++i) {
+            interfaces.push_back({ids[i], names[i]});
+        }
+        return interfaces;
+    }
+
+    std::string Command(const std::string& id, const std::string& command) override {
+        RequireReady(id);
+        ShowProgress("Asking " + id + " ...");
+        return objects_.Command(id, command);
     }
 
     int EnterPIN(const std::string& id, const std::string& pin) override {
+        Trace("telling the service the PIN");
         return PINResult(usbmodem_ui::UnlockSIM(id, pin));
     }
 
     int EnterPUK(const std::string& id, const std::string& puk,
                  const std::string& newPin) override {
+        Trace("telling the service the PUK and a new PIN");
         return PINResult(usbmodem_ui::UnlockPIN(id, puk, newPin));
     }
 
     int SetPIN(const std::string& id, const std::string& pin, const std::string& newPin,
                bool protection) override {
+        Trace(std::string("telling the service to switch the PIN lock ") +
+              (protection ? "on" : "off") + (newPin.empty() ? "" : ", and a new PIN"));
         return PINResult(usbmodem_ui::SetPIN(id, pin, newPin, protection));
     }
 
@@ -168,7 +238,7 @@ class ServiceAccess : public ModemAccess {
                    entry.first == profile::kRoaming;
         });
         if (isEmpty && Look(id).simStatus != kReady) {
-            throw ProfileUnreadableError(id);
+            throw ProfileError("cannot read the profile of " + id, false);
         }
         return profile;
     }
@@ -183,6 +253,7 @@ class ServiceAccess : public ModemAccess {
         }
         RequireReady(id);
         ShowProgress("Setting the profile of " + id + " ...");
+        Trace("telling the service the settings");
         Sent(usbmodem_ui::SetProfile(id, lines));
         Profile wanted = ReadProfileDocument(Document(usbmodem_ui::GetProfile, id));
         const Profile now = wanted;
@@ -190,8 +261,8 @@ class ServiceAccess : public ModemAccess {
             wanted[setting.key] = setting.value;
         }
         if (wanted != now) {
-            throw CommandError(kFailure, "the modem service did not set the profile of " + id +
-                                             "; is the SIM ready? The system log tells more");
+            throw ProfileError("the modem service did not set the profile of " + id,
+                               Look(id).simStatus == kReady);
         }
     }
 
@@ -199,12 +270,22 @@ class ServiceAccess : public ModemAccess {
         throw CommandError(kUsage, "the modem service cannot reset a profile; add --direct");
     }
 
-    void Connect(const std::string& id) override { Sent(usbmodem_ui::Connect(id)); }
+    void Connect(const std::string& id) override {
+        Trace("telling the service to dial");
+        Sent(usbmodem_ui::Connect(id));
+    }
 
-    void Disconnect(const std::string& id) override { Sent(usbmodem_ui::Disconnect(id)); }
+    void Disconnect(const std::string& id) override {
+        Trace("telling the service to hang up");
+        Sent(usbmodem_ui::Disconnect(id));
+    }
+
+    // By a connection that is not the one on which a reply may be awaited meanwhile.
+    void HangUp(const std::string& id) override { HangUpByBus(id); }
 
   protected:
     std::vector<std::string> ReadyModems() override {
+        EnsureService();
         known_ = objects_.Read();
         if (!known_) {
             return Lines(usbmodem_ui::GetUSBModemList);
@@ -220,7 +301,9 @@ class ServiceAccess : public ModemAccess {
 
     ModemState ReadyModem(const std::string& id, bool withProfile) override {
         if (!known_ || !IsRecent(known_->at(id))) {
-            return Look(id);
+            ModemState state = Look(id);
+            AddDetails(state);
+            return state;
         }
         ModemState state = known_->at(id).state;
         if (withProfile && state.simStatus == kReady) {
@@ -230,21 +313,6 @@ class ServiceAccess : public ModemAccess {
     }
 
   private:
-    // The service lists ids and interfaces in the same order, in two calls.
-    std::vector<Interface> KnownInterfaces() {
-        const auto ids = Lines(usbmodem_ui::GetUSBModemList);
-        const auto names = Lines(usbmodem_ui::GetUSBModemIfList);
-        if (ids.size() != names.size()) {
-            throw CommandError(kFailure,
-                               "a modem was plugged in or unplugged meanwhile; try again");
-        }
-        std::vector<Interface> interfaces;
-        for (size_t i = 0; i < ids.size(); ++i) {
-            interfaces.push_back({ids[i], names[i]});
-        }
-        return interfaces;
-    }
-
     ServiceObjects objects_;
     std::optional<std::map<std::string, KnownModem>> known_;  // as of the last ReadyModems
 };

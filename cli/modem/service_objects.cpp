@@ -2,6 +2,7 @@
 
 #include <cstring>
 
+#include "cli/terminal.h"
 #include "usbmodem/rules/objects.h"
 
 namespace taviwireless::cli {
@@ -21,6 +22,17 @@ std::string TextOf(GVariant* properties, const char* name) {
     return text;
 }
 
+std::vector<std::string> TextsOf(GVariant* properties, const char* name) {
+    const Variant value(g_variant_lookup_value(properties, name, G_VARIANT_TYPE_STRING_ARRAY));
+    std::vector<std::string> texts;
+    for (gsize i = 0; value && i < g_variant_n_children(value.get()); ++i) {
+        const char* text = nullptr;
+        g_variant_get_child(value.get(), i, "&s", &text);
+        texts.emplace_back(text);
+    }
+    return texts;
+}
+
 bool IsSet(GVariant* properties, const char* name) {
     gboolean value = FALSE;
     g_variant_lookup(properties, name, "b", &value);
@@ -29,11 +41,13 @@ bool IsSet(GVariant* properties, const char* name) {
 
 KnownModem ReadProperties(const std::string& id, GVariant* properties) {
     KnownModem modem;
-    modem.interface = TextOf(properties, "Interface");
     modem.answers = IsSet(properties, "Answers");
     g_variant_lookup(properties, "LastLook", "t", &modem.lastLook);
     ModemState& state = modem.state;
     state.id = id;
+    state.imsi = TextOf(properties, "Imsi");
+    state.interface = TextOf(properties, "Interface");
+    state.ports = TextsOf(properties, "Ports");
     state.vendor = TextOf(properties, "Vendor");
     state.product = TextOf(properties, "Product");
     state.ip = TextOf(properties, "Address");
@@ -57,13 +71,19 @@ ServiceObjects::~ServiceObjects() {
     }
 }
 
-std::optional<std::map<std::string, KnownModem>> ServiceObjects::Read() {
+bool ServiceObjects::Connect() {
     if (!connection_) {
         connection_.reset(g_bus_get_sync(G_BUS_TYPE_SESSION, nullptr, nullptr));
-        if (!connection_) {
-            return std::nullopt;
+        if (connection_) {
+            g_dbus_connection_set_exit_on_close(connection_.get(), FALSE);
         }
-        g_dbus_connection_set_exit_on_close(connection_.get(), FALSE);
+    }
+    return connection_ != nullptr;
+}
+
+std::optional<std::map<std::string, KnownModem>> ServiceObjects::Read() {
+    if (!Connect()) {
+        return std::nullopt;
     }
     const Variant reply(g_dbus_connection_call_sync(
         connection_.get(), objects::kService, objects::kManager,
@@ -87,6 +107,33 @@ std::optional<std::map<std::string, KnownModem>> ServiceObjects::Read() {
         }
     }
     return modems;
+}
+
+std::string ServiceObjects::Command(const std::string& id, const std::string& command) {
+    GError* error = nullptr;
+    const Variant reply(
+        Connect() ? g_dbus_connection_call_sync(
+                        connection_.get(), objects::kService,
+                        (std::string(objects::kManager) + '/' + id).c_str(), objects::kModem,
+                        "Command", g_variant_new("(s)", command.c_str()), G_VARIANT_TYPE("(s)"),
+                        G_DBUS_CALL_FLAGS_NO_AUTO_START, G_MAXINT, nullptr, &error)
+                  : nullptr);
+    if (reply) {
+        const char* text = nullptr;
+        g_variant_get(reply.get(), "(&s)", &text);
+        return text;
+    }
+    const std::unique_ptr<GError, void (*)(GError*)> failure(error, g_error_free);
+    char* remote = failure ? g_dbus_error_get_remote_error(failure.get()) : nullptr;
+    const std::string name = remote != nullptr ? remote : "";
+    g_free(remote);
+    if (name.rfind("com.merilond.usbmodem.Error.", 0) != 0) {
+        throw CommandError(kUsage,
+                           "this modem service sends no AT commands; end it, and add --direct");
+    }
+    g_dbus_error_strip_remote_error(failure.get());
+    const bool isBusy = name.rfind("Busy") != std::string::npos;
+    throw CommandError(isBusy ? kBusy : kFailure, Printable(failure->message));
 }
 
 void ServiceObjects::WaitForChange() {

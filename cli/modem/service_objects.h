@@ -16,7 +16,6 @@ namespace taviwireless::cli {
 
 struct KnownModem {
     ModemState state;  // without the profile
-    std::string interface;
     bool answers = false;
     std::uint64_t lastLook = 0;  // Unix time; 0: never
 };
@@ -34,11 +33,17 @@ class ServiceObjects {
     // objects.
     std::optional<std::map<std::string, KnownModem>> Read();
 
+    // Has the service send one of them an AT command, and returns what it answers. Throws
+    // CommandError.
+    std::string Command(const std::string& id, const std::string& command);
+
     // Returns when a modem, or the service, may have changed since this was called last; the first
     // time at once.
     void WaitForChange();
 
   private:
+    bool Connect();
+
     struct Release {
         void operator()(gpointer object) const { g_object_unref(object); }
     };

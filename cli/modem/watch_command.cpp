@@ -3,12 +3,14 @@
 #include <unistd.h>
 
 #include <iostream>
+#include <map>
 
 #include "cli/command_error.h"
 #include "cli/deadline.h"
 #include "cli/modem/modem_access.h"
 #include "cli/modem/modem_commands.h"
 #include "cli/modem/modem_report.h"
+#include "cli/modem/sparkline.h"
 #include "cli/terminal.h"
 
 namespace taviwireless::cli {
@@ -20,18 +22,49 @@ void EndWithSuccess(int) {
     _exit(kSuccess);
 }
 
-Report LookAgain(ModemAccess& access, const Options& options) {
-    return options.id.empty() ? DescribeAll(access.KnownModems(options.json))
-                              : Describe(access.Known(options.id));
-}
+// What is shown, with the signals as they were at the changes before.
+class Watched {
+  public:
+    Watched(ModemAccess& access, const Options& options) : access_(access), options_(options) {}
+
+    Report LookAgain() {
+        if (!options_.id.empty()) {
+            ModemState state = access_.Known(options_.id);
+            AddTrend(state);
+            return Describe(state);
+        }
+        std::vector<ModemState> states = access_.KnownModems(options_.json);
+        for (ModemState& state : states) {
+            AddTrend(state);
+        }
+        return DescribeAll(states);
+    }
+
+  private:
+    // A value that comes again is no news.
+    void AddTrend(ModemState& state) {
+        Signal& signal = signals_[state.id];
+        if (signal.last != state.signal && state.simStatus == kReady) {
+            signal.last = state.signal;
+            signal.trend.Add(state.signal);
+        }
+        state.trend = signal.trend.Draw();
+    }
+
+    struct Signal {
+        int last = -1;  // percent
+        Trend trend;
+    };
+    ModemAccess& access_;
+    const Options& options_;
+    std::map<std::string, Signal> signals_;
+};
 
 void Show(const std::string& text, bool inPlace) {
     constexpr char kClearScreen[] = "\033[H\033[2J";
     ShowProgress("");
     std::cout << (inPlace ? kClearScreen : "") << text;
-    if (!std::cout.flush()) {
-        throw CommandError(kFailure, "cannot write the output");
-    }
+    FlushOutput();
 }
 
 }  // namespace
@@ -39,14 +72,15 @@ void Show(const std::string& text, bool inPlace) {
 void WatchModems(const Options& options) {
     signal(SIGINT, EndWithSuccess);
     signal(SIGTERM, EndWithSuccess);
-    const bool inPlace = !options.json && isatty(STDOUT_FILENO);
+    const bool inPlace = !options.json && TakesEscapes(STDOUT_FILENO);
     const auto access = MakeAccess(options);
     Deadline deadline(options);
     constexpr bool kInOneLine = true;
+    Watched watched(*access, options);
     std::string shown;
     for (;;) {
         deadline.Restart();
-        const Report report = deadline.Limit([&] { return LookAgain(*access, options); });
+        const Report report = deadline.Limit([&] { return watched.LookAgain(); });
         const std::string text = Render(options, report, kInOneLine);
         if (text != shown) {
             const bool isNextTable = !options.json && !inPlace && !shown.empty();

@@ -4,8 +4,15 @@
 #include "base/fixed_field.h"
 #include "cli/adapter/credentials.h"
 #include "cli/adapter/requirements.h"
+#include "cli/deadline.h"
+#include "cli/interrupt.h"
 #include "cli/terminal.h"
+#include "cli/wifi/channels.h"
+#include "cli/wifi/ip_address.h"
+#include "cli/wifi/joining.h"
+#include "cli/wifi/saved_networks.h"
 #include "cli/wifi/station.h"
+#include "cli/wifi/supplicant_events.h"
 #include "cli/wifi/wifi_commands.h"
 #include "cli/wifi/wifi_report.h"
 #include "wireless/rules/paths.h"
@@ -22,28 +29,36 @@ void CheckOneWord(const std::string& text, const char* what) {
     }
 }
 
+// Those of a network with a static address, of which the library knows nothing.
+void UseSavedNameServers() {
+    const std::vector<WirelessConf> all = SavedNetworks();
+    const WirelessConf* saved = FindSaved(all, LookAtWifi().network);
+    if (saved != nullptr && !IsDHCP(*saved) && !SetNameServers(SavedNameServers(*saved))) {
+        throw CommandError(kFailure, std::string("connected, but could not set the name servers "
+                                                 "in ") +
+                                         wireless::kResolver);
+    }
+}
+
 }  // namespace
 
 // Needs no root and no adapter: that there is none is an answer here.
 void ShowWifi(const Options& options) {
-    const WirelessStatus status = LookAtWifi();
-    Print(options, Describe(status, WifiAddress()));
+    Print(options, DescribeConnection());
 }
 
 void ListNetworks(const Options& options) {
     RequireAdapter();
+    RequireScanner();
     ShowProgress("Looking for networks ...");
-    Print(options, DescribeAll(Scan()));
+    const std::vector<NetworkInRange> networks = Deadline(options).Limit(Scan);
+    Print(options, options.channels ? DescribeChannels(networks) : DescribeAll(networks));
 }
 
 // Disconnects also when the adapter was unplugged: the connection has then left its address and its
 // resolver file behind.
 void DisconnectWifi(const Options& options) {
     RequireWifiSettings();
-    const WirelessStatus status = LookAtWifi();
-    if (!IsInNetwork(status.status) && status.status != WIRELESS_STATUS_NO_ADAPTER) {
-        throw CommandError(kFailure, WifiInterface() + " is not connected");
-    }
     ShowProgress("Disconnecting ...");
     EndConnection();
     PrintConnection(options);
@@ -52,27 +67,34 @@ void DisconnectWifi(const Options& options) {
 void ConnectAutomatically(const Options& options) {
     RequireAdapter();
     RequireRadio();
+    RequireScanner();
+    RequireSupplicant();
     RequireNobodyJoins();
     // The library would end the connection that exists.
     if (IsInNetwork(TAVIWirelessConnStatusGet())) {
-        throw CommandError(kBusy, WifiInterface() +
-                                      " has a connection already; taviwireless wifi disconnect "
-                                      "ends it");
+        PrintConnection(options);
+        return;
     }
     if (SavedNetworks().empty()) {
         throw CommandError(kNotFound, "no network is saved; taviwireless wifi connect saves one");
     }
     ShowProgress("Joining a saved network ...");
+    const FormerConnection none;
+    const UndoneBySignal guard([&](const auto& why) { none.Undo(options, why); }, options.timeout);
+    SupplicantEvents events;
     // The library reports success, too, when it cannot tell whether the radio may be used.
     if (TAVIWirelessAutoConnect() != 0 || !IsInNetwork(TAVIWirelessConnStatusGet())) {
+        const std::string reason = events.WhyNotJoined();
         throw CommandError(kFailure,
-                           "none of the saved networks could be joined; is one in range, and its "
-                           "key still right?");
+                           "none of the saved networks could be joined; " +
+                               (reason.empty() ? "is one in range, and its key still right?"
+                                               : "of one of them, " + reason));
     }
     if (!UseLeasedGateway()) {
         throw CommandError(kFailure, "connected, but could not make " + ConnectionGateway() +
-                                         " the default gateway; the system log tells why");
+                                         " the default gateway: no route leads to it");
     }
+    UseSavedNameServers();
     PrintConnection(options);
 }
 
@@ -90,11 +112,15 @@ void CreateAdhoc(const Options& options) {
         CheckOneWord(key, "the key");
         CopyField(conf.key, key);
     }
+    FormerConnection former;
+    const UndoneBySignal guard([&](const auto& why) { former.Undo(options, why); },
+                               options.timeout);
     LeaveNetwork();
     ShowProgress("Creating " + Printable(options.network) + " ...");
     if (TAVIWirelessAdhocCreate(&conf) != 0) {
-        throw CommandError(kFailure, "cannot create the ad-hoc network " +
-                                         Printable(options.network) + "; the system log tells why");
+        throw CommandError(kFailure,
+                           "cannot create the ad-hoc network " + Printable(options.network) +
+                               ": the adapter may know no such networks" + former.ComeBack());
     }
     PrintConnection(options);
 }

@@ -1,55 +1,57 @@
 // taviwireless wifi connect: joins a network, and remembers it.
-#include <tavisdk/wireless.h>
-
 #include <algorithm>
 #include <optional>
 
 #include "base/fixed_field.h"
 #include "cli/adapter/credentials.h"
 #include "cli/adapter/requirements.h"
+#include "cli/deadline.h"
+#include "cli/interrupt.h"
 #include "cli/terminal.h"
 #include "cli/wifi/ip_address.h"
+#include "cli/wifi/joining.h"
+#include "cli/wifi/network_name.h"
+#include "cli/wifi/saved_networks.h"
 #include "cli/wifi/station.h"
 #include "cli/wifi/wifi_commands.h"
 #include "cli/wifi/wifi_report.h"
+#include "wireless/rules/supplicant.h"
 
 namespace taviwireless::cli {
 
 namespace {
 
 // One connection that is asked for: what is known of the network, then the attempt.
-class Joining {
+class Connecting {
   public:
-    explicit Joining(const Options& options)
-        : options_(options), name_(Printable(options.network)), saved_(SavedNetworks()) {}
+    explicit Connecting(const Options& options)
+        : options_(options),
+          wanted_(options.network),
+          name_(Printable(options.network)),
+          saved_(SavedNetworks()) {}
 
     void Run() {
-        WirelessConf conf = Describe(options_.hidden ? HiddenNetwork() : NetworkInRange());
-        ShowProgress("Joining " + name_ + " ...");
+        WirelessConf conf = Describe(options_.hidden ? HiddenNetwork() : NetworkInReach());
+        FormerConnection former;
+        const UndoneBySignal guard([&](const auto& why) { former.Undo(options_, why); },
+                                   options_.timeout);
         LeaveNetwork();
-        if (TAVIWirelessNetworkConnect(&conf) != 0) {
-            GiveUp(WhyNotJoined(conf));
+        const std::string fault = Join(conf, nameServers_);
+        if (!fault.empty()) {
+            const std::string comeBack = former.ComeBack();
+            throw CommandError(
+                kFailure,
+                fault + (isSavedKey_ ? "; --new-key asks for another key" : "") + comeBack);
         }
-        SetAddress(conf);
         Save(conf);
     }
 
   private:
-    using Conf = std::optional<WirelessConf>;
-
-    Conf FindSaved(std::optional<Security> security) const {
-        const auto found = std::find_if(saved_.begin(), saved_.end(), [&](const auto& conf) {
-            return options_.network == conf.network.essid &&
-                   (!security || *security == SecurityOf(conf.network));
-        });
-        return found == saved_.end() ? Conf() : Conf(*found);
-    }
-
-    WirelessNetwork NetworkInRange() const {
+    WirelessNetwork NetworkInReach() const {
         ShowProgress("Looking for " + name_ + " ...");
         WirelessNetwork network{};
-        const int count =
-            TAVIWirelessNetworkGet(options_.network.c_str(), WIRELESS_KEY_ESSID, &network);
+        const int count = Deadline(options_).Limit(
+            [&] { return TAVIWirelessNetworkGet(wanted_.Key(), wanted_.KeyKind(), &network); });
         if (count < 0) {
             throw ScanError();
         }
@@ -64,13 +66,18 @@ class Joining {
 
     WirelessNetwork HiddenNetwork() const {
         WirelessNetwork network{};
+        if (wanted_.IsBssid()) {
+            throw CommandError(kUsage, "a hidden network is joined by its name");
+        }
         CopyField(network.essid, options_.network);
         if (!options_.security.empty()) {
             SetSecurity(network, options_.security);
             return network;
         }
-        const Conf saved = FindSaved(std::nullopt);
-        if (!saved) {
+        const auto saved = std::find_if(saved_.begin(), saved_.end(), [&](const auto& conf) {
+            return wanted_.IsOf(conf.network);
+        });
+        if (saved == saved_.end()) {
             throw CommandError(kUsage, "--hidden needs --security for a network that is not saved");
         }
         return saved->network;
@@ -79,21 +86,32 @@ class Joining {
     WirelessConf Describe(const WirelessNetwork& network) {
         const Security security = SecurityOf(network);
         if (security == Security::kUnknown) {
-            throw CommandError(kFailure,
-                               "the security of " + name_ + " is of a kind that cannot be joined");
+            throw CommandError(kFailure, WhyNotJoinable(network));
         }
-        const Conf saved = FindSaved(security);
-        WirelessConf conf = saved.value_or(WirelessConf{});
+        const WirelessConf* saved = FindSaved(saved_, network);
+        WirelessConf conf = saved != nullptr ? *saved : WirelessConf{};
         conf.network = network;
         conf.network.opmode = WIRELESS_OPMODE_MANAGED;
-        conf.anyBssid = 1;
-        DescribeAddress(conf);
+        conf.anyBssid = wanted_.IsBssid() ? 0 : 1;
+        DescribeAddress(conf, saved);
         DescribeUser(conf, security);
-        isSavedKey_ = saved && HasUsableKey(*saved);
+        isSavedKey_ = saved != nullptr && HasUsableKey(*saved);
         if (security != Security::kOpen && !isSavedKey_) {
-            CopyField(conf.key, ReadKey(security, options_.network));
+            CopyField(conf.key, ReadKey(security, network.essid));
         }
+        CheckReadable(conf);
         return conf;
+    }
+
+    std::string WhyNotJoinable(const WirelessNetwork& network) const {
+        const std::string newer = NewerSecurityOf(network);
+        return name_ + " wants " +
+               (newer.empty() ? "protection of a kind that has no name here: WPA3, OWE, or another "
+                                "newer than WPA2"
+                              : newer) +
+               "; the adapter is driven by the wireless extensions, which know WPA2 at most, so "
+               "its "
+               "access point has to offer WPA2 as well";
     }
 
     // Whether the saved key can be used. An EAP password belongs to its user.
@@ -102,12 +120,18 @@ class Joining {
         return saved.key[0] != '\0' && isOfUser && !options_.newKey;
     }
 
-    void DescribeAddress(WirelessConf& conf) const {
+    void DescribeAddress(WirelessConf& conf, const WirelessConf* saved) {
         if (!options_.staticAddress.empty()) {
             SetStaticAddress(conf, options_.staticAddress);
         } else if (options_.dhcp || conf.ipAddr[0] == '\0') {
             SetDHCP(conf);
+        } else if (saved != nullptr) {
+            nameServers_ = SavedNameServers(*saved);
         }
+        if (!options_.nameServers.empty()) {
+            nameServers_ = options_.nameServers;
+        }
+        CheckAddress(conf, nameServers_);
     }
 
     void DescribeUser(WirelessConf& conf, Security security) const {
@@ -119,32 +143,23 @@ class Joining {
         }
     }
 
-    std::string WhyNotJoined(const WirelessConf& conf) const {
-        const bool isOpen = SecurityOf(conf.network) == Security::kOpen;
-        const std::string sentence =
-            "could not join " + name_ +
-            (isOpen ? ": its access point may be too far away"
-                    : ": the key may be wrong, or its access point too far away");
-        return sentence +
-               (isSavedKey_ ? "; --new-key asks for another key" : "; the system log tells more");
-    }
-
-    void SetAddress(const WirelessConf& conf) const {
-        ShowProgress("Setting the address ...");
-        const bool isSet = TAVIWirelessIfconfigSet(WifiInterface().c_str(), &conf) == 0;
-        // The library may report success although there was no lease.
-        if (IsDHCP(conf) && (!isSet || WifiAddress().empty())) {
-            GiveUp("joined " + name_ + " but got no address by DHCP; --static sets one");
-        }
-        if (!isSet) {
-            GiveUp("joined " + name_ + " but could not set the address " + conf.ipAddr);
-        }
-        if (IsDHCP(conf) && !UseLeasedGateway()) {
-            GiveUp("joined " + name_ + " but could not make " + ConnectionGateway() +
-                   " the gateway");
-        }
-        if (!IsDHCP(conf) && conf.gateway[0] != '\0' && !SetDefaultGateway(conf.gateway)) {
-            GiveUp("joined " + name_ + " but could not make " + conf.gateway + " the gateway");
+    // The supplicant would be given other texts than were meant, and the key be blamed.
+    static void CheckReadable(const WirelessConf& conf) {
+        const Security security = SecurityOf(conf.network);
+        const struct {
+            const char* what;
+            const char* text;
+            bool isUsed;
+        } kTexts[] = {{"the name", conf.network.essid, true},
+                      {"the user name", conf.user, security == Security::kEAP},
+                      {"the key", conf.key, security != Security::kOpen}};
+        for (const auto& [what, text, isUsed] : kTexts) {
+            if (isUsed && wireless::IsCutBySupplicant(text)) {
+                throw CommandError(kUsage, std::string(what) +
+                                               " of this network holds a # behind a quote (\"), "
+                                               "where wpa_supplicant takes it for a comment, so it "
+                                               "cannot be joined; nothing was tried");
+            }
         }
     }
 
@@ -165,16 +180,16 @@ class Joining {
             throw CommandError(kFailure, "connected to " + name_ +
                                              " but could not save it; the system log tells why");
         }
-    }
-
-    [[noreturn]] static void GiveUp(const std::string& sentence) {
-        TAVIWirelessNetworkDisconnect();
-        throw CommandError(kFailure, sentence);
+        if (SavedNameServers(conf) != nameServers_) {
+            SaveValues(conf, AddressValues(conf, nameServers_));
+        }
     }
 
     const Options& options_;
+    const NetworkName wanted_;
     const std::string name_;
     const std::vector<WirelessConf> saved_;
+    std::string nameServers_;
     bool isSavedKey_ = false;
 };
 
@@ -182,15 +197,18 @@ class Joining {
 
 void ConnectWifi(const Options& options) {
     CheckEssid(options.network);
+    WirelessConf ignored{};
     if (!options.staticAddress.empty()) {
-        WirelessConf ignored{};
         SetStaticAddress(ignored, options.staticAddress);
     }
+    CheckNameServers(options.nameServers);
     CheckUser(options.user);
     RequireAdapter();
     RequireRadio();
+    RequireScanner();
+    RequireSupplicant();
     RequireNobodyJoins();
-    Joining(options).Run();
+    Connecting(options).Run();
     PrintConnection(options);
 }
 

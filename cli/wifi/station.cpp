@@ -1,32 +1,30 @@
 #include "cli/wifi/station.h"
 
+#include <arpa/inet.h>
 #include <tavisdk/network.h>
 #include <tavisdk/wireless.h>
+#include <unistd.h>
 
 #include <algorithm>
-#include <cstdlib>
-#include <memory>
+#include <climits>
+#include <cstdio>
+#include <cstring>
+#include <fstream>
 
+#include "base/join.h"
+#include "base/split.h"
 #include "cli/adapter/requirements.h"
+#include "cli/wifi/library_list.h"
+#include "cli/wifi/raw_scan.h"
+#include "cli/wifi/saved_networks.h"
 #include "wireless/rules/paths.h"
 #include "wireless/system/driver_request.h"
 #include "wireless/system/files.h"
+#include "wireless/system/shell.h"
 
 namespace taviwireless::cli {
 
 namespace {
-
-// The members of a list that the library made, which are freed.
-template <typename Record>
-std::vector<Record> Take(WirelessLink& head) {
-    std::vector<Record> records;
-    for (WirelessLink* link = head.next; link != &head;) {
-        const std::unique_ptr<Record, decltype(&free)> record(WIRELESS_RECORD(link, Record), free);
-        link = link->next;
-        records.push_back(*record);
-    }
-    return records;
-}
 
 // The access point that the driver is associated with, as it says. What the library wrote down when
 // it joined knows no address of a hidden network, and not which of several of one name it became.
@@ -37,6 +35,25 @@ void UpdateBssid(unsigned char (&bssid)[6]) {
     }
 }
 
+bool HasSameBssid(const NetworkInRange& one, const WirelessNetwork& network) {
+    return memcmp(one.network.bssid, network.bssid, sizeof network.bssid) == 0;
+}
+
+// Adds what only the raw scan knows: networks without a name, and newer kinds of protection.
+void AddRaw(std::vector<NetworkInRange>& all, const std::vector<RawNetwork>& rawOnes) {
+    for (const RawNetwork& raw : rawOnes) {
+        const auto known = std::find_if(all.begin(), all.end(), [&](const auto& one) {
+            return HasSameBssid(one, raw.network);
+        });
+        if (known != all.end()) {
+            known->newerSecurity = raw.newerSecurity;
+        } else if (raw.network.essid[0] == '\0') {
+            all.emplace_back().network = raw.network;
+            all.back().newerSecurity = raw.newerSecurity;
+        }
+    }
+}
+
 }  // namespace
 
 CommandError ScanError() {
@@ -44,27 +61,35 @@ CommandError ScanError() {
             "cannot look for networks on " + WifiInterface() + "; the system log tells why"};
 }
 
-std::vector<WirelessNetwork> Scan() {
+std::vector<NetworkInRange> Scan() {
     WirelessLink networks{&networks, &networks};
     if (TAVIWirelessNetworkScan(1, &networks) != 0) {
         throw ScanError();
     }
-    std::vector<WirelessNetwork> all = Take<WirelessNetwork>(networks);
-    std::stable_sort(all.begin(), all.end(),
-                     [](const auto& a, const auto& b) { return a.signal > b.signal; });
+    std::vector<NetworkInRange> all;
+    for (const WirelessNetwork& network : TakeList<WirelessNetwork>(networks)) {
+        all.emplace_back().network = network;
+    }
+    AddRaw(all, LastRawScan());
+    const std::vector<WirelessConf> saved = SavedNetworks();
+    const WirelessStatus now = LookAtWifi();
+    for (NetworkInRange& one : all) {
+        one.isInUse = now.status == WIRELESS_STATUS_CONNECTED && HasSameBssid(one, now.network);
+        one.isSaved = one.network.essid[0] != '\0' && FindSaved(saved, one.network) != nullptr;
+    }
+    std::stable_sort(all.begin(), all.end(), [](const auto& a, const auto& b) {
+        return a.network.signal > b.network.signal;
+    });
     return all;
 }
 
-std::vector<WirelessConf> SavedNetworks() {
-    if (wireless::IsMissing(wireless::kSavedNetworks)) {
-        return {};  // none was ever saved
+std::string NewerSecurityOf(const WirelessNetwork& network) {
+    for (const RawNetwork& raw : LastRawScan()) {
+        if (memcmp(raw.network.bssid, network.bssid, sizeof network.bssid) == 0) {
+            return raw.newerSecurity;
+        }
     }
-    WirelessLink confs{&confs, &confs};
-    if (TAVIWirelessConfEnumByAtime(&confs) != 0) {
-        throw CommandError(kFailure, std::string("cannot read the saved networks in ") +
-                                         wireless::kSavedNetworks + "; the system log tells why");
-    }
-    return Take<WirelessConf>(confs);
+    return "";
 }
 
 bool IsInNetwork(int status) {
@@ -96,6 +121,46 @@ bool UseLeasedGateway() {
            SetDefaultGateway(gateway.c_str());
 }
 
+std::string GatewayInForce() {
+    std::ifstream routes("/proc/net/route");
+    std::string line;
+    while (std::getline(routes, line)) {
+        char interface[TAVI_NET_IF_NAME_SIZE];
+        unsigned destination = 0;
+        in_addr gateway{};
+        if (sscanf(line.c_str(), "%15s %x %x", interface, &destination, &gateway.s_addr) == 3 &&
+            interface == WifiInterface() && destination == 0 && gateway.s_addr != 0) {
+            return inet_ntoa(gateway);
+        }
+    }
+    return "";
+}
+
+std::string NameServersInForce() {
+    std::ifstream resolver(wireless::kResolver);
+    std::string servers;
+    for (std::string word, server; resolver >> word; resolver.ignore(SSIZE_MAX, '\n')) {
+        if (word == "nameserver" && resolver >> server) {
+            AddItem(servers, server, ",");
+        }
+    }
+    return servers;
+}
+
+bool SetNameServers(const std::string& nameServers) {
+    if (nameServers.empty()) {
+        return true;
+    }
+    // Leaving the network puts the copy back that was made when it was joined. Where there was
+    // nothing to copy, an empty one takes these away again.
+    const std::ofstream backup(wireless::kResolverBackup, std::ios::app);
+    std::ofstream resolver(wireless::kResolver);
+    for (const std::string& server : Split(nameServers, ',')) {
+        resolver << "nameserver " << server << '\n';
+    }
+    return static_cast<bool>(resolver.flush());
+}
+
 bool SetDefaultGateway(const char* gateway) {
     // The library does not look at what the tool that it runs returned.
     char inForce[TAVI_NET_ADDRESS_SIZE];
@@ -113,6 +178,29 @@ void EndConnection() {
 void LeaveNetwork() {
     if (IsInNetwork(TAVIWirelessConnStatusGet())) {
         EndConnection();
+    }
+}
+
+// Most of it is the library's to undo, but it leaves alone what is not associated yet.
+void CleanUpAttempt() {
+    TAVIWirelessNetworkDisconnect();
+    if (TAVIWirelessOpmodeGet() == WIRELESS_OPMODE_ADHOC) {
+        TAVIWirelessOpmodeSet(WIRELESS_OPMODE_MANAGED);
+    }
+    // A supplicant that had to be killed leaves its own.
+    const std::string control = wireless::kSupplicantSockets + ("/" + WifiInterface());
+    for (const char* file : {wireless::kCurrentConnection, wireless::kSupplicantConf,
+                             wireless::kSupplicantPidFile, control.c_str()}) {
+        unlink(file);
+    }
+    if (!wireless::IsMissing(wireless::kResolverBackup)) {
+        rename(wireless::kResolverBackup, wireless::kResolver);
+    }
+    if (!WifiAddress().empty()) {
+        constexpr size_t kCommandSize = 128;
+        const wireless::Command release(
+            kCommandSize, {"/sbin/ifconfig ", wireless::Argument{WifiInterface()}, " 0.0.0.0"});
+        release.Run(wireless::Output::kDropped, __FILE_NAME__, __LINE__);
     }
 }
 

@@ -1,6 +1,9 @@
 #ifndef TAVIWIRELESS_CLI_WIFI_WIFI_COMMANDS_H
 #define TAVIWIRELESS_CLI_WIFI_WIFI_COMMANDS_H
 
+#include <string>
+#include <vector>
+
 #include "cli/options.h"
 
 // What the commands about the Wi-Fi adapter do. Each throws CommandError when it fails.
@@ -13,6 +16,13 @@ void DisconnectWifi(const Options& options);
 void ConnectAutomatically(const Options& options);
 void ListSavedNetworks(const Options& options);
 void ShowSavedNetwork(const Options& options);
+void EditSavedNetwork(const Options& options);
+// How the changes that it takes begin: "user=", and "key" for what is read.
+std::vector<std::string> SavedSettingWords();
+void ForgetNetwork(const Options& options);
+void SwitchRadio(const Options& options);
+void WatchWifi(const Options& options);
+void ShowSavedCode(const Options& options);
 void CreateAdhoc(const Options& options);
 void ChangeWifiMode(const Options& options);
 void ShowWifiGateway(const Options& options);

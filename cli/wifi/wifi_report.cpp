@@ -7,7 +7,8 @@
 #include "cli/adapter/requirements.h"
 #include "cli/terminal.h"
 #include "cli/wifi/ip_address.h"
-#include "cli/wifi/station.h"
+#include "cli/wifi/network_name.h"
+#include "cli/wifi/saved_networks.h"
 
 namespace taviwireless::cli {
 
@@ -84,7 +85,10 @@ std::string AddressText(const WirelessConf& conf) {
     return IsDHCP(conf) ? "by DHCP" : conf.ipAddr;
 }
 
-std::string SecurityText(const WirelessNetwork& network) {
+std::string SecurityText(const WirelessNetwork& network, const std::string& newer = "") {
+    if (!newer.empty()) {
+        return newer;
+    }
     switch (SecurityOf(network)) {
         case Security::kOpen:
             return "open";
@@ -99,18 +103,24 @@ std::string SecurityText(const WirelessNetwork& network) {
     return AuthText(network) + (cipher.empty() ? "" : "/" + cipher);
 }
 
+void AddSecurity(Report& report, const WirelessNetwork& network) {
+    report.Add("security", "Security", SecurityText(network));
+    report.document["auth"] = TextOrNull(AuthText(network));
+    report.document["encrypt"] = TextOrNull(EncryptText(network));
+}
+
 void AddNetwork(Report& report, const WirelessNetwork& network) {
-    report.Add("essid", "Network", network.essid);
+    report.Add("ssid", "Network", network.essid);
     report.Add("bssid", "BSSID", BssidText(network.bssid));
     report.Add("channel", "Channel", NumberOrNull(network.channel), ChannelCell(network));
     report.Add("protocol", "Protocol", ProtocolText(network));
-    report.rows.push_back({"Security", Cell(SecurityText(network))});
-    report.document["auth"] = TextOrNull(AuthText(network));
-    report.document["encrypt"] = TextOrNull(EncryptText(network));
+    AddSecurity(report, network);
     report.Add("signal", "Signal", NumberOrNull(network.signal), SignalCell(network.signal));
 }
 
-std::string StatusLine(const WirelessStatus& status, const std::string& address) {
+}  // namespace
+
+std::string ConnectionLine(const WirelessStatus& status, const std::string& address) {
     std::string line = WifiInterface() + ": " + WordsOf(status).text;
     const std::string essid = status.network.essid;
     if (IsInNetwork(status.status) && !essid.empty()) {
@@ -120,27 +130,33 @@ std::string StatusLine(const WirelessStatus& status, const std::string& address)
     return Printable(line);
 }
 
-}  // namespace
-
-std::string BssidText(const unsigned char (&bssid)[6]) {
-    const bool isKnown = std::any_of(std::begin(bssid), std::end(bssid), [](int b) { return b; });
-    char text[18];
-    return isKnown ? TAVIWirelessBssidStringGet(bssid, text, sizeof text) : "";
-}
-
-Report DescribeAll(const std::vector<WirelessNetwork>& networks) {
+Report DescribeAll(const std::vector<NetworkInRange>& networks) {
     if (networks.empty()) {
         return {{{"No network is in range."}}, Json::arrayValue};
     }
-    Report all{{{"NETWORK", "SIGNAL", "SECURITY", "CHANNEL", "BSSID"}}, Json::arrayValue};
-    for (const WirelessNetwork& network : networks) {
+    Report all{{},
+               Json::arrayValue,
+               {{" "},
+                {"NETWORK", kText},
+                {"SIGNAL"},
+                {"SECURITY", kText},
+                {"CHANNEL"},
+                {"BSSID"},
+                {"SAVED"}}};
+    for (const NetworkInRange& one : networks) {
+        const WirelessNetwork& network = one.network;
         const std::string essid = network.essid;
-        Report one;
-        AddNetwork(one, network);
-        all.document.append(one.document);
-        all.rows.push_back({essid.empty() ? "(hidden)" : Printable(essid),
-                            SignalCell(network.signal), Cell(SecurityText(network)),
-                            ChannelCell(network), BssidText(network.bssid)});
+        Report report;
+        AddNetwork(report, network);
+        const std::string security = SecurityText(network, one.newerSecurity);
+        report.document["security"] = security.empty() ? "other" : security;
+        report.document["in_use"] = one.isInUse;
+        report.document["saved"] = one.isSaved;
+        all.document.append(report.document);
+        all.rows.push_back({one.isInUse ? "*" : "", essid.empty() ? "(hidden)" : Printable(essid),
+                            SignalCell(network.signal), security.empty() ? "other" : security,
+                            ChannelCell(network), BssidText(network.bssid),
+                            one.isSaved ? "yes" : "-"});
     }
     return all;
 }
@@ -149,7 +165,9 @@ Report DescribeAll(const std::vector<WirelessConf>& confs) {
     if (confs.empty()) {
         return {{{"No network is saved."}}, Json::arrayValue};
     }
-    Report all{{{"NETWORK", "SECURITY", "BSSID", "ADDRESS", "LAST USED"}}, Json::arrayValue};
+    Report all{{},
+               Json::arrayValue,
+               {{"NETWORK", kText}, {"SECURITY", kText}, {"BSSID"}, {"ADDRESS"}, {"LAST USED"}}};
     for (const WirelessConf& conf : confs) {
         all.document.append(Describe(conf).document);
         all.rows.push_back({Cell(conf.network.essid), Cell(SecurityText(conf.network)),
@@ -163,40 +181,53 @@ Report Describe(const WirelessConf& conf, bool showSecrets) {
     const WirelessNetwork& network = conf.network;
     const bool isDHCP = IsDHCP(conf);
     Report report;
-    report.Add("essid", "Network", network.essid);
+    report.Add("ssid", "Network", network.essid);
     report.Add("bssid", "BSSID", BssidText(network.bssid));
-    report.rows.push_back({"Security", Cell(SecurityText(network))});
-    report.document["auth"] = TextOrNull(AuthText(network));
-    report.document["encrypt"] = TextOrNull(EncryptText(network));
+    AddSecurity(report, network);
     report.Add("key", "Key", SecretText(conf.key, showSecrets));
     report.Add("user", "User", conf.user);
     report.document["dhcp"] = isDHCP;
-    report.Add("ip", "Address", TextOrNull(isDHCP ? "" : conf.ipAddr), Cell(AddressText(conf)));
+    report.Add("address", "Address", TextOrNull(isDHCP ? "" : conf.ipAddr),
+               Cell(AddressText(conf)));
     report.Add("netmask", "Netmask", conf.netmask);
     report.Add("gateway", "Gateway", conf.gateway);
+    report.Add("dns", "DNS", SavedNameServers(conf));
     report.Add("last_used", "Last used", NumberOrNull(conf.accessTime),
                Cell(TimeText(conf.accessTime)));
     return report;
 }
 
+namespace {
+
 Report Describe(const WirelessStatus& status, const std::string& address) {
     const StatusWord& words = WordsOf(status);
+    const bool isInNetwork = IsInNetwork(status.status);
     Report report;
     report.Add("interface", "Interface", WifiInterface());
-    report.Add("status", "State", words.word, words.text);
-    const Table outsideNetworks = report.rows;
+    report.Add("state", "State", words.word, words.text);
+    Table rows = report.rows;
     AddNetwork(report, status.network);
-    if (!IsInNetwork(status.status)) {
-        report.rows = outsideNetworks;
+    report.Add("address", "Address", address);
+    report.Add("gateway", "Gateway", isInNetwork ? GatewayInForce() : "");
+    report.Add("dns", "DNS", isInNetwork ? NameServersInForce() : "");
+    if (!isInNetwork) {
+        rows.push_back({"Address", Cell(address)});
+        report.rows = rows;
     }
-    report.Add("ip", "Address", address);
     return report;
+}
+
+}  // namespace
+
+Report DescribeConnection() {
+    return Describe(LookAtWifi(), WifiAddress());
 }
 
 void PrintConnection(const Options& options) {
     const WirelessStatus status = LookAtWifi();
     const std::string address = WifiAddress();
-    PrintOutcome(options, StatusLine(status, address), [&] { return Describe(status, address); });
+    PrintOutcome(options, ConnectionLine(status, address),
+                 [&] { return Describe(status, address); });
 }
 
 }  // namespace taviwireless::cli

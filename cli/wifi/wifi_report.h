@@ -7,19 +7,20 @@
 #include <vector>
 
 #include "cli/report.h"
+#include "cli/wifi/station.h"
 
 namespace taviwireless::cli {
 
-std::string BssidText(const unsigned char (&bssid)[6]);
-
 // A row for each in the order that they have, or the sentence that there is none.
-Report DescribeAll(const std::vector<WirelessNetwork>& networks);
+Report DescribeAll(const std::vector<NetworkInRange>& networks);
 Report DescribeAll(const std::vector<WirelessConf>& confs);
 // The key is hidden unless showSecrets.
 Report Describe(const WirelessConf& conf, bool showSecrets = false);
 
-// The adapter as it is now; address is that of its interface.
-Report Describe(const WirelessStatus& status, const std::string& address);
+// The adapter and its connection as they are now.
+Report DescribeConnection();
+// "wlan0: connected to HOME, 192.168.1.20"
+std::string ConnectionLine(const WirelessStatus& status, const std::string& address);
 // What a command that changed something ends with: "wlan0: connected to HOME, 192.168.1.20",
 // or the document.
 void PrintConnection(const Options& options);

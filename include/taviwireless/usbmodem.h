@@ -175,7 +175,8 @@ class TAVIWIRELESS_API USBModem {
     // The modem is drained first. A reply ends when 200 ms pass without input, after 2 s or 1024
     // bytes. Returns -1 when no reply begins within 1000 ms, when the modem is not quiet before it,
     // when it is unplugged within a line, or when the semaphore is not free within 5 s. A call
-    // takes 9 s at most. PINs and PUKs in the command are not logged.
+    // takes 9 s at most. PINs and PUKs in the command are not logged. With TAVIWIRELESS_TRACE in the
+    // environment, command and reply are in the log at debug priority, these codes masked.
     int ModemCmd(const std::string& cmd, std::string& reply);
     // Opens the port at node, sends cmd and prints the dialogue on standard output, codes masked.
     // Returns -1 when the port cannot be opened, else the result of ModemCmd. Closes the channel.

@@ -95,7 +95,9 @@ struct ShownModem {
 
     PrivateBus bus;
     ModemState modem;
-    ModemObjects objects{[](const auto& id, const auto& reply) { reply("Busy", id + " dials"); }};
+    ModemObjects objects{
+        [](const auto& id, const auto& reply) { reply("Busy", id + " dials"); },
+        [](const auto&, const auto& command, const auto& reply) { reply("", command); }};
 };
 
 TEST(ModemObjects, WhatDoesNotChangeIsNotSent) {

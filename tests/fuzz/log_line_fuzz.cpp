@@ -61,6 +61,11 @@ void CheckCodes(const std::string& before, const std::string& command, const std
         Demand(logged.find(kPIN) == logged.npos && logged.find(kPUK) == logged.npos,
                "codes are masked", logged);
     }
+    for (const char* code : {kPIN, kPUK}) {
+        const std::string logged = LoggableReplyTo(command, before + code + after);
+        Demand(command.find(code) == command.npos || logged.find(code) == logged.npos,
+               "the codes of the command are masked", logged);
+    }
     const std::string line = before.substr(0, before.find_first_of("\r\n"));
     const std::string damaged = LoggableReply("A" + line, {kPIN});
     Demand(damaged.find_first_of("0123456789") == damaged.npos, "no digit is left", damaged);

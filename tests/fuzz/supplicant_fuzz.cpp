@@ -10,10 +10,13 @@ namespace taviwireless::fuzz {
 namespace {
 
 // A line as the supplicant takes it: without blanks around it and its comment, which nothing is
-// that stands between its first quote and its last one.
+// that stands between quotes.
 std::string WithoutComment(std::string line) {
-    const size_t first = line.find('"'), last = line.rfind('"');
-    line = line.substr(0, line.find('#', first == last ? 0 : last));
+    size_t end = 0;
+    for (bool isQuoted = false; end < line.size() && (isQuoted || line[end] != '#'); ++end) {
+        isQuoted = isQuoted != (line[end] == '"');
+    }
+    line.resize(end);
     line.erase(0, line.find_first_not_of(" \t\r"));
     return line.substr(0, line.find_last_not_of(" \t\r") + 1);
 }
@@ -43,7 +46,9 @@ void Fuzz(Input input) {
         const bool isNumber =
             line.find("\twep_key0=") == 0 && (value.size() == 10 || value.size() == 26);
         const bool isText = value[0] == '"' && !isNumber;
-        Demand(!isText || WithoutComment(line) == line.substr(1), "a text is read whole", text);
+        const bool isWhole = WithoutComment(line) == line.substr(1);
+        const bool isCut = isText && wireless::IsCutBySupplicant(value.substr(1, value.size() - 2));
+        Demand(!isText || isWhole != isCut, "a text is read whole, or known to be cut", text);
         Demand(!isText || (value.size() > 1 && value.back() == '"'), "a text has an end", text);
     }
     const bool isClosed = text.size() > 2 && text.substr(text.size() - 3) == "\n}\n";

@@ -292,11 +292,11 @@ TEST_F(StoppedHolder, OfAProfileOrAPortKeepsOthersForASentence) {
     const Surroundings surroundings(Needs::kPlugged);
     EXPECT_THAT(OthersIn("/var/lib/usbmodem/.usbmodem.profile.001010123456789.lock",
                          {cli, "modem", "--direct", "profile", "set", "usbmodem1", "apn=new"}),
-                testing::HasSubstr("cannot set apn in the profile of usbmodem1; "));
+                testing::HasSubstr("cannot change the profile of usbmodem1; the system log"));
     usbmodem_lib::USBModem modem(1, "/tmp/usbmodem.info1");
     EXPECT_THAT(Others([&modem] { modem.OpenFileDevice("/dev/ttyUSB1"); },
                        {cli, "modem", "--direct", "show", "usbmodem1"}),
-                testing::HasSubstr("modem usbmodem1 is not ready: "));
+                testing::HasSubstr(") holds /dev/ttyUSB1 of usbmodem1; end it"));
 }
 
 }  // namespace

@@ -119,8 +119,8 @@ TEST_F(ServedBus, AMessageOfAWrongShapeIsRefusedOrLeftAlone) {
         }
     }
     for (const char* path : {"/", kManager, kModem, "/com/merilond/usbmodem/usbmodem9"}) {
-        for (const char* method :
-             {"GetManagedObjects", "Look", "Get", "Set", "GetAll", "Introspect", "Fly"}) {
+        for (const char* method : {"GetManagedObjects", "Look", "Command", "Get", "Set", "GetAll",
+                                   "Introspect", "Fly"}) {
             for (const char* types : {"", "s", "ss", "ssv", "sv", "i", "a", "h"}) {
                 caller.Send(With(Call(method, nullptr, path, kObjects), types));
             }

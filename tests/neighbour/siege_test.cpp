@@ -157,8 +157,9 @@ std::string Result(const CommandCall& command, Surroundings&) {
     argv.insert(argv.begin(), {"timeout", kSeconds});
     const RunResult result = RunProgram(argv, command.input);
     EXPECT_LT(result.status, 6);
-    if (command.name == "modem watch") {
-        return "";  // it may be ended before it has found a modem
+    // The first two may be ended before they have shown anything, the third tells of obstacles.
+    if (command.name == "modem watch" || command.name == "wifi watch" || command.name == "doctor") {
+        return "";
     }
     // A failure looks like that of a function.
     const std::string text = std::to_string(-result.status) + ' ' + result.out + result.err;
@@ -216,7 +217,8 @@ struct Besieged : BesiegedMachine, testing::WithParamInterface<std::tuple<Needs,
     template <typename Call>
     std::string Try(const Call& call, Surroundings& around, const std::set<std::string>& paths) {
         const std::string expected = Result(call, around);
-        const bool isRepeatable = Result(call, around) == expected;
+        // Where a network is joined already, there is nothing to join.
+        const bool isRepeatable = Result(call, around) == expected && call.name != "wifi auto";
         for (const Obstacle& obstacle : kObstacles) {
             if (!kAll && ++turn % kEachOf != 0) {
                 continue;
@@ -275,8 +277,8 @@ TEST(OurPaths, HoldAllThatStandsInTheSources) {
         " grep -oE '/(tmp|var/tmp|var/lock|var/run|run|dev/shm)/[a-zA-Z0-9._-]*[a-zA-Z0-9]' | sort "
         "-u");
     for (const std::string& path : Lines(named)) {
-        if (path.find("XXXXXX") != path.npos) {
-            continue;  // a name that nobody knows before
+        if (path.find("XXXXXX") != path.npos || path == "/run/user") {
+            continue;  // a name that nobody knows before; where everybody has a folder of his own
         }
         const auto next = paths.lower_bound(path);
         EXPECT_TRUE(next != paths.end() && next->rfind(path, 0) == 0) << path;

@@ -300,8 +300,12 @@ const CommandCall kCommands[] = {
     {"modem connect", Needs::kPlugged, true, {kId}},
     {"modem disconnect", Needs::kDialled, true, {kId}},
     {"modem status", Needs::kPlugged, false, {kId}},
-    {"modem interfaces", Needs::kPlugged, false, {}}, {"wifi status", Needs::kAdapter, false, {}},
-    {"wifi scan", Needs::kAdapter, false, {}},
+    {"modem interfaces", Needs::kPlugged, false, {}}, {"modem usage", Needs::kPlugged, false, {}},
+    {"modem at", Needs::kPlugged, false, {kId, "AT+CSQ"}}, {"wifi status", Needs::kAdapter, false, {}},
+    {"wifi scan", Needs::kAdapter, false, {}}, {"wifi watch", Needs::kJoined, false, {}},
+    {"wifi saved edit", Needs::kAdapter, true, {"My Net", "dhcp=yes"}},
+    {"wifi forget", Needs::kAdapter, true, {"My Net"}},
+    {"wifi radio", Needs::kAdapter, true, {"off"}},
     {"wifi connect", Needs::kAdapter, true, {"My Net", "--new-key"}, "another key\n"},
     {"wifi disconnect", Needs::kJoined, true, {}}, {"wifi auto", Needs::kAdapter, true, {}},
     {"wifi saved list", Needs::kAdapter, false, {}},
@@ -311,6 +315,9 @@ const CommandCall kCommands[] = {
     {"ap status", Needs::kAdapter, false, {}}, {"ap show", Needs::kAdapter, false, {}},
     {"ap set", Needs::kAdapter, true, {"ssid=Other"}}, {"ap check", Needs::kAdapter, false, {}},
     {"ap enable", Needs::kAdapter, true, {}}, {"ap disable", Needs::kAccessPoint, true, {}},
+    {"ap hotspot", Needs::kAdapter, true, {}}, {"ap qr", Needs::kAdapter, false, {}},
+    {"ap stations", Needs::kAccessPoint, false, {}},
+    {"wifi qr", Needs::kAdapter, false, {"My Net"}}, {"doctor", Needs::kAdapter, false, {}},
 };
 // clang-format on
 
@@ -362,7 +369,7 @@ std::vector<std::string> CommandCall::Argv() const {
     if (needs == Needs::kPlugged || needs == Needs::kDialled) {
         argv.insert(argv.begin() + 2, "--direct");
     }
-    if (name == "modem watch") {
+    if (name == "modem watch" || name == "wifi watch") {
         argv.insert(argv.begin(), {"timeout", "--preserve-status", "--signal=INT", "0.5"});
     }
     return WithShortWaits(argv);

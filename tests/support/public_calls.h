@@ -29,7 +29,8 @@ struct CommandCall {
     std::string sim = kReadySim;
 
     bool IsOfModems() const { return name.rfind("modem", 0) == 0; }
-    // How it is started, with its waits cut. "modem watch" gets SIGINT after half a second.
+    // How it is started, with its waits cut. Those that watch get SIGINT after half a
+    // second.
     std::vector<std::string> Argv() const;
 };
 

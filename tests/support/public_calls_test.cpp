@@ -25,17 +25,15 @@ void AddCommands(const std::string& command, std::set<std::string>& names) {
     argv.insert(argv.begin(), BuiltProgram("taviwireless"));
     argv.emplace_back("--help");
     const std::string help = RunProgram(argv).out;
-    const size_t list = help.find("\nSubcommands:\n");
+    const size_t list = help.find("\nCommands:\n");
     if (list == std::string::npos) {
         names.insert(command);
         return;
     }
     std::istringstream lines(help.substr(help.find('\n', list + 1) + 1));
     for (std::string line; std::getline(lines, line) && line.rfind("  ", 0) == 0;) {
-        if (line[2] != ' ') {  // else more of the description
-            const std::string name = line.substr(2, line.find(' ', 2) - 2);
-            AddCommands(command.empty() ? name : command + ' ' + name, names);
-        }
+        const std::string name = line.substr(2, line.find(' ', 2) - 2);
+        AddCommands(command.empty() ? name : command + ' ' + name, names);
     }
 }
 

@@ -51,6 +51,7 @@ void PrepareAdapter(ToolStandIns& tools) {
               "printf 'IPADDR=192.168.9.30\\nNETMASK=255.255.255.0\\nGATEWAY=192.168.9.1\\n'"
               " > /etc/dhcpc/dhcpcd-wlan0.info\n"
               "/tmp/udhcpc 1000 > /dev/null 2>&1 & echo $! > /etc/dhcpc/dhcpcd-wlan0.pid");
+    tools.Add("/usr/sbin/hostapd_cli", "[ -e /tmp/master ] && echo PONG");
     tools.Add("/usr/tavi/hotplug/usb.wireless.function");
     tools.Add("/etc/rc.network",
               "rm -f /tmp/master\n"

@@ -14,7 +14,7 @@ status_of() {
     ap status | sed -n "s/^$1  *//p"
 }
 
-# join NETWORK PASSPHRASE: what a station does at home.
+# join NETWORK KEY: what a station does at home.
 join() {
     leave
     printf '%s\n' ctrl_interface=/run/station "network={" "ssid=\"$1\"" "psk=\"$2\"" scan_ssid=1 "}" >/run/station.conf
@@ -55,7 +55,7 @@ set_up() {
 }
 
 sets_and_checks() {
-    ap set ssid="My Home" security=wpa2 passphrase channel=6 <<<"correct horse"
+    ap set ssid="My Home" security=wpa2 key channel=6 <<<"correct horse"
     same 600 "$(stat -c %a /usr/tavi/etc/wireless_ap.conf)"
     must_fail grep -F "correct horse" <<<"$(ap show)"
     ap check
@@ -83,7 +83,7 @@ serves_station() {
     leased=$(lease)
     holds "$leased" "^ip=10\.1\.14\.([2-9]|[1-9][0-9]|1[0-9][0-9]|2[0-4][0-9]|25[0-4]) mask=24 router=10.1.14.1 "
     in_air ping -c 2 -i 0.2 -W 2 10.1.14.1
-    iw dev wlan0 station dump | grep "^Station $(in_air cat /sys/class/net/wlan1/address)"
+    holds "$(ap stations)" "^$(in_air cat /sys/class/net/wlan1/address) +.* +10\.1\.14\.[0-9]+ +[0-9]+% .* My Home$"
 }
 
 disables() {
@@ -98,6 +98,13 @@ disables() {
     must_fail is_on_air
 }
 
+# The neighbour is on channel 1.
+chooses_emptiest_channel() {
+    start_ap wlan2
+    holds "$(ap set channel=auto)" "^Stored, channel 6: no networks; 1 has 1; "
+    stop_ap wlan2
+}
+
 # The guests' bridge and its addresses are the model's own.
 serves_guests() {
     echo support_pci_wifi=yes >>/etc.defaults/taviinfo.conf
@@ -105,7 +112,7 @@ serves_guests() {
         >/etc/sysconfig/network-scripts/ifcfg-gbr
     printf '%s\n' enable=yes reserved=30 lease=3600 start=10.1.15.50 end=10.1.15.59 interface=gbr bridge=gbr \
         gateway=10.1.15.1 nameserver=10.1.15.1 netmask=255.255.255.0 >/etc/dhcpd/dhcpd-gbr-gbr.info
-    ap set guest=yes guest-ssid=Visitors guest-security=wpa2 guest-passphrase <<<"welcome friend"
+    ap set guest=yes guest-ssid=Visitors guest-security=wpa2 guest-key <<<"welcome friend"
     ap enable
     join Visitors "welcome friend"
     holds "$(lease)" "^ip=10.1.15.5[0-9] "
@@ -152,7 +159,7 @@ enables_twice_at_once() {
 is_station_again() {
     start_ap wlan2
     taviwireless wifi mode client
-    holds "$(taviwireless wifi scan)" "^Neighbour .* 02:00:00:00:02:00$"
+    holds "$(taviwireless wifi scan)" "^ +Neighbour .* 02:00:00:00:02:00 +-$"
 }
 
 mkdir -p /etc.defaults
@@ -164,6 +171,7 @@ scenario "takes settings, and hostapd understands them" sets_and_checks
 scenario "switches on, with bridge and address" enables
 scenario "a station joins, gets a lease and reaches it" serves_station
 scenario "switches off, and leaves nothing" disables
+scenario "chooses the emptiest channel" chooses_emptiest_channel
 scenario "serves guests on a network of their own" serves_guests
 scenario "is on again after a restart" comes_back_after_restart
 scenario "two enable it at once" enables_twice_at_once

@@ -39,8 +39,8 @@ default_route_is() {
 # As the modem's user sees it, and as it is.
 is_connected() {
     look
-    says net_status '"connected"'
-    says ip "\"$near_address\""
+    says state '"connected"'
+    says address "\"$near_address\""
     holds "$(modem interfaces)" '^usbmodem0 +ppp0$'
     holds "$(ip -4 addr show ppp0)" "inet $near_address peer $far_address/32"
     reaches $far_address
@@ -69,7 +69,7 @@ lists_modem() {
     # The first call starts the service.
     gdbus call --session -d com.merilond.usbmodem -o / -m com.merilond.usbmodem.GetUSBModemList
     pgrep -x usbmodemd
-    wait_for 20 is_value sim_status '"pin_protect"'
+    wait_for 20 is_value sim_state '"pin_protect"'
     holds "$(modem list)" '^usbmodem0 +huawei +E1752 +- +- +wants PIN +'
 }
 
@@ -78,14 +78,14 @@ takes_pin() {
     modem unlock usbmodem0 <<<9999 || status=$?
     same 1 $status
     look
-    says sim_status '"pin_protect"'
-    says pin_remains 2
+    says sim_state '"pin_protect"'
+    says pin_attempts 2
     modem unlock usbmodem0 <<<1234
     look
-    says sim_status '"ready"'
-    says pin_protected true
+    says sim_state '"ready"'
+    says pin_lock true
     says signal 90
-    says carrier '"Nordnetz"'
+    says operator '"Nordnetz"'
     must_fail grep -E '1234|9999' $system_log
 }
 
@@ -105,7 +105,7 @@ disconnects() {
 }
 
 reconnects() {
-    modem profile set usbmodem0 default_gw=true
+    modem profile set usbmodem0 default-route=yes
     modem connect usbmodem0
     is_connected
     ip netns pids mobile | xargs kill
@@ -135,7 +135,7 @@ no_modem_listed() {
 
 works_again() {
     plug
-    wait_for 30 is_value sim_status '"pin_protect"' # it had no power
+    wait_for 30 is_value sim_state '"pin_protect"' # it had no power
     modem unlock usbmodem0 <<<1234
     modem connect usbmodem0
     is_connected

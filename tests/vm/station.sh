@@ -78,6 +78,7 @@ nothing_is_left() {
 # Removes whatever the scenario before has left, save the saved networks. Not by the product's own means, which
 # may be what is broken.
 start_afresh() {
+    pkill -9 taviwireless || true
     pkill wpa_supplicant || true
     pkill -9 udhcpc || true
     wait_for 10 ended wpa_supplicant
@@ -90,11 +91,12 @@ lists_networks() {
     start_afresh
     local list
     list=$(wifi scan)
-    holds "$list" '^My Net +\[####\] 100% +WPA2PSK/AES +6 +02:00:00:00:01:00$'
-    holds "$list" '^Old +\[####\] 100% +WPAPSK/TKIP +1 +02:00:00:00:02:00$'
-    holds "$list" '^Café 24/7 +\[####\] 85% +open +11 +02:00:00:00:03:00$'
+    holds "$list" '^ +My Net +\[####\] 100% +WPA2PSK/AES +6 +02:00:00:00:01:00 +-$'
+    holds "$list" '^ +Old +\[####\] 100% +WPAPSK/TKIP +1 +02:00:00:00:02:00 +-$'
+    holds "$list" '^ +Café 24/7 +\[####\] 85% +open +11 +02:00:00:00:03:00 +-$'
+    holds "$list" '^ +\(hidden\) +\[####\] 100% +WPA2PSK +3 +02:00:00:00:04:00 +-$'
     must_fail grep Unseen <<<"$list"
-    same 4 "$(wc -l <<<"$list")" # with the heading
+    same 5 "$(wc -l <<<"$list")" # with the heading
 }
 
 joins_wpa2() {
@@ -116,6 +118,32 @@ disconnects() {
     wifi connect "My Net" </dev/null # the key is known now
     connected_to "My Net" 1 11b/g/n WPA2PSK/AES
     wifi disconnect
+    nothing_is_left
+}
+
+# The supplicant tells why, and the network before is joined again.
+goes_back() {
+    start_afresh
+    wifi connect "My Net" </dev/null
+    holds "$(wifi connect Old --new-key <<<'a wrong key' 2>&1)" \
+        ': its access point refused the key.*; back on My Net$'
+    connected_to "My Net" 1 11b/g/n WPA2PSK/AES
+    leased_address_of 1
+    holds "$(wifi scan)" '^\* +My Net .* yes$'
+}
+
+# A second is enough for all of it, on a machine that is not busy.
+is_interrupted() {
+    start_afresh
+    taviwireless wifi connect "My Net" --new-key <<<'a wrong key' &
+    local connect=$! status=0
+    wait_for 60 test -e /var/tmp/.wireless_connecting
+    wait_for 10 pgrep -x wpa_supplicant
+    local start=$EPOCHREALTIME
+    kill -TERM $connect
+    wait $connect || status=$?
+    same 143 $status
+    same 1 "$(awk "BEGIN { print ($EPOCHREALTIME - $start < 3) }")"
     nothing_is_left
 }
 
@@ -172,5 +200,7 @@ scenario "joins a WPA-TKIP network" joins_wpa_tkip
 scenario "joins an open network" joins_open
 scenario "joins a WPA2 network by DHCP" joins_wpa2
 scenario "disconnects, and joins the saved network without a key" disconnects
+scenario "goes back on the network that it left for a wrong key" goes_back
+scenario "undoes an attempt at once that a signal ends" is_interrupted
 scenario "joins the reachable saved network that was used last" joins_automatically
 scenario "joins a hidden network" joins_hidden

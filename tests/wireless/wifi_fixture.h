@@ -64,7 +64,8 @@ inline std::string ScanLine(int channel, const std::string& essid, const std::st
 }
 
 // A stand-in for iwlist. Run k of the table form, from 0, prints the k-th of the given tables, and
-// the last one when there are no more; other forms print nothing.
+// the last one when there are no more. The form "last" prints /tmp/scan/last if there is such a
+// file; others print nothing.
 inline void AddScanner(ToolStandIns& tools, const std::vector<std::string>& tables) {
     const std::string headings =
         "Ch   ESSID                            BSSID             Signal Protocol Security\n" +
@@ -74,7 +75,7 @@ inline void AddScanner(ToolStandIns& tools, const std::vector<std::string>& tabl
         WriteFile("/tmp/scan/" + std::to_string(k), headings + tables[k]);
     }
     tools.Add("/sbin/iwlist",
-              "[ \"$3\" = tavi ] || exit 0\n"
+              "[ \"$3\" = tavi ] || { cat \"/tmp/scan/$3\" 2> /dev/null; exit 0; }\n"
               "k=$(cat /tmp/scan/next 2> /dev/null || echo 0)\n"
               "cat /tmp/scan/$k\n"
               "if [ -e /tmp/scan/$((k + 1)) ]; then echo $((k + 1)) > /tmp/scan/next; fi");

@@ -16,6 +16,9 @@ constexpr char kSectionLine[] = "\t%s=%s\n";
 constexpr char kSavedNetworks[] = "/usr/tavi/etc/wireless.conf";
 constexpr char kAPSettings[] = "/usr/tavi/etc/wireless_ap.conf";
 
+// Key/value: "country". Not in the store above, whose sections hold what the library knows.
+constexpr char kCountry[] = "/usr/tavi/etc/wireless_country.conf";
+
 constexpr char kAdapterInfo[] = "/tmp/wireless.info";         // key/value; of the plugged adapter
 constexpr char kModelInfo[] = "/etc.defaults/taviinfo.conf";  // key/value; what the model can do
 
@@ -70,6 +73,10 @@ inline std::string HostapdGuestInfo(const std::string& interface) {
 // The bridge's DHCP service.
 inline std::string DhcpServerInfo(const std::string& bridge) {
     return "/etc/dhcpd/dhcpd-" + bridge + "-" + bridge + ".info";
+}
+
+inline std::string DhcpServerLeases(const std::string& bridge) {
+    return "/etc/dhcpd/dhcpd-" + bridge + "-" + bridge + ".leases";
 }
 
 // Where the bridge's DHCP service is kept while the access point is off.

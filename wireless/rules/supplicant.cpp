@@ -12,7 +12,8 @@ namespace taviwireless::wireless {
 namespace {
 
 // The supplicant takes what stands between the first and the last quote of a line, so quotes and
-// backslashes within need no escaping, and must not have any.
+// backslashes within need no escaping, and must not have any. Before that it drops comments, for
+// which each quote begins or ends a text: see IsCutBySupplicant.
 std::string Quoted(const char* text) {
     return std::string("\"") + text + "\"";
 }
@@ -66,6 +67,17 @@ void AddOpenOrWep(SupplicantConf& rendered, const WirelessConf& conf) {
 }
 
 }  // namespace
+
+bool IsCutBySupplicant(const std::string& text) {
+    bool isWithinQuotes = true;
+    for (const char c : text) {
+        if (c == '#' && !isWithinQuotes) {
+            return true;
+        }
+        isWithinQuotes = isWithinQuotes != (c == '"');
+    }
+    return false;
+}
 
 SupplicantConf RenderSupplicantConf(const WirelessConf& conf) {
     SupplicantConf rendered;

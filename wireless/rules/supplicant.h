@@ -17,6 +17,11 @@ struct SupplicantConf {
     bool holdsLineBreak = false;
 };
 
+// Whether the supplicant takes a part of the text, as it stands in quotes, for a comment: one that
+// holds a "#" behind one quote, or behind three. There are forms of other digits for such texts, but
+// this system writes none of them.
+bool IsCutBySupplicant(const std::string& text);
+
 // What wpa_supplicant is given to join the network of conf.
 SupplicantConf RenderSupplicantConf(const WirelessConf& conf);
 

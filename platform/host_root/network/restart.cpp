@@ -8,6 +8,7 @@
 #include <algorithm>
 #include <cstdio>
 
+#include "base/split.h"
 #include "platform/host_root/network/error.h"
 #include "platform/host_root/network/hostapd.h"
 #include "platform/host_root/network/journal.h"
@@ -110,6 +111,12 @@ void StartHostapd(const Settings& settings) {
     }
 }
 
+// What a program said last; it may have said nothing.
+std::string LastLine(const std::string& output) {
+    const std::vector<std::string> lines = Lines(output);
+    return lines.empty() ? "the system log says why" : lines.back();
+}
+
 // Starts the server with the settings as they are now, whoever changed them.
 void StartDhcpServer(const std::string& bridge) {
     const Program server = DhcpServer(bridge);
@@ -121,8 +128,8 @@ void StartDhcpServer(const std::string& bridge) {
     }
     try {
         Start(server);
-    } catch (const Error&) {
-        throw Error("cannot start the DHCP server on " + bridge + "; the system log says why");
+    } catch (const Error& error) {
+        throw Error("cannot start the DHCP server on " + bridge + ": " + LastLine(error.what()));
     }
 }
 

@@ -66,6 +66,13 @@ TAVI_SDK_API int VEXACFileSetSection(const char* file, const char* section, cons
                                      const VEXACSzHash* hash, const char* format);
 
 /*
+ * Removes all sections of this name; comments below their last keys stay. The host edition alone has
+ * this call: look it up at run time. Returns 1, 0 when the file has no such section
+ * (VEXAC_ERR_NOT_FOUND), or -1.
+ */
+TAVI_SDK_API int VEXACFileRemoveSection(const char* file, const char* section);
+
+/*
  * Copies the value of key in the section, with a terminating zero, into value, a buffer of size
  * bytes. Returns 0, or -1, also when the section or the key is not there (VEXAC_ERR_NOT_FOUND) or
  * the value does not fit (VEXAC_ERR_TOO_LONG); the buffer, if there is one, then holds the empty

@@ -139,6 +139,25 @@ bool ChangeSection(std::string* text, const char* name,
     return true;
 }
 
+// Takes a section away: its header and the lines up to its last pair, since what stands below
+// mostly belongs to the section that follows. False when the text has no such section.
+bool RemoveSection(std::string* text, const char* name) {
+    const SectionIndex index(*text);
+    const Section* section = index.Find(name);
+    if (section == nullptr) {
+        return false;
+    }
+    const size_t header = text->rfind('\n', section->begin - 2) + 1;
+    Lines lines =
+        Split(std::string_view(*text).substr(section->begin, section->end - section->begin));
+    const auto lastPair = std::find_if(lines.rbegin(), lines.rend(), [](const std::string& line) {
+        return ReadKey(line).has_value();
+    });
+    lines.erase(lines.begin(), lastPair.base());
+    *text = text->substr(0, header) + Join(lines) + text->substr(section->end);
+    return true;
+}
+
 // Sets the section's pairs in *hash. False when the file has no such section.
 bool ReadSection(const char* file, const char* name, VEXACSzHash** hash) {
     const TextFile text(file);
@@ -215,6 +234,23 @@ int VEXACFileSetSection(const char* file, const char* section, const char* newNa
                 ChangeSection(text, section, [&](Lines& lines) { ReplacePairs(lines, pairs); });
             if (!exists) {
                 throw Failure{VEXAC_ERR_NOT_FOUND};
+            }
+        });
+        return 1;
+    });
+    return exists ? result : 0;
+}
+
+int VEXACFileRemoveSection(const char* file, const char* section) {
+    bool exists = true;
+    const int result = Guarded(-1, [&] {
+        RequireAll(file, section);
+        ChangeText(file, IfMissing::kFail, [&](std::string* text) {
+            exists = RemoveSection(text, section);
+            if (!exists) {
+                throw Failure{VEXAC_ERR_NOT_FOUND};
+            }
+            while (RemoveSection(text, section)) {  // or the next one of this name would count
             }
         });
         return 1;

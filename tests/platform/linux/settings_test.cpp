@@ -41,6 +41,18 @@ TEST(Section, ShowsEveryChangeOfTheFileAtOnce) {
     umount("/tmp");
 }
 
+TEST(Section, IsRemovedAndNothingElse) {
+    const std::string before = "# all\n[A]\n\tKEY=1\n", after = "# of c\n\n[c]\n\tKEY=3";
+    WriteFile(kFile, before + "[b]\n# of b\n\tKEY=2\n" + after);
+    EXPECT_EQ(VEXACFileRemoveSection(kFile, "B"), 1);
+    EXPECT_EQ(ReadFile(kFile), before + after);
+    WriteFile(kFile, "[b]\n\tKEY=1\n[A]\n[b]\n\tKEY=2");  // the second one would count then
+    EXPECT_EQ(VEXACFileRemoveSection(kFile, "b"), 1);
+    EXPECT_EQ(ReadFile(kFile), "[A]\n");
+    EXPECT_EQ(VEXACFileRemoveSection(kFile, "b"), 0);
+    EXPECT_EQ(VEXACErrGet(), VEXAC_ERR_NOT_FOUND);
+}
+
 constexpr char kSettings[] = "/tmp/settings";
 
 TEST(KeyValue, ReadsValuesAsAShellWould) {
