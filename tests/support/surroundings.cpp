@@ -1,11 +1,10 @@
 #include "tests/support/surroundings.h"
 
-#include <poll.h>
-#include <sys/syscall.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
 #include "base/memory_file.h"
+#include "base/process_handle.h"
 #include "tests/support/wait.h"
 
 namespace taviwireless::test {
@@ -171,10 +170,9 @@ ChildResult InChild(const std::function<std::string()>& call, std::chrono::milli
         const std::string result = call();
         _exit(write(text.Get(), result.data(), result.size()) < 0 ? 1 : 0);
     }
-    pollfd end{static_cast<int>(syscall(SYS_pidfd_open, child, 0)), POLLIN, 0};
-    const UniqueFd handle(end.fd);
-    if (poll(&end, 1, static_cast<int>(patience.count())) != 1) {
-        kill(child, SIGKILL);
+    const ProcessHandle process(child);
+    if (!process.AwaitEnd(patience)) {
+        process.Signal(SIGKILL);
     }
     int status = 0;
     waitpid(child, &status, 0);
