@@ -110,8 +110,7 @@ class Connecting {
                                 "newer than WPA2"
                               : newer) +
                "; the adapter is driven by the wireless extensions, which know WPA2 at most, so "
-               "its "
-               "access point has to offer WPA2 as well";
+               "its access point has to offer WPA2 as well";
     }
 
     // Whether the saved key can be used. An EAP password belongs to its user.
