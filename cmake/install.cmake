@@ -3,9 +3,11 @@
 include(CMakePackageConfigHelpers)
 set(package_dir ${CMAKE_INSTALL_LIBDIR}/cmake/taviwireless)
 
+set_target_properties(taviwireless PROPERTIES INSTALL_RPATH $ORIGIN)
 install(TARGETS taviwireless EXPORT taviwireless)
 install(DIRECTORY include/taviwireless DESTINATION ${CMAKE_INSTALL_INCLUDEDIR})
 if(NOT TAVI_SDK_ROOT)
+  set_target_properties(tavicore tavisdk PROPERTIES INSTALL_RPATH $ORIGIN)
   install(TARGETS tavicore tavisdk EXPORT taviwireless)
   install(DIRECTORY platform/include/ DESTINATION ${CMAKE_INSTALL_INCLUDEDIR})
 endif()
