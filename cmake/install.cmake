@@ -21,6 +21,10 @@ install(FILES packaging/taviwirelessConfig.cmake DESTINATION ${package_dir})
 write_basic_package_version_file(taviwirelessConfigVersion.cmake COMPATIBILITY SameMajorVersion)
 install(FILES ${CMAKE_CURRENT_BINARY_DIR}/taviwirelessConfigVersion.cmake
         DESTINATION ${package_dir})
+# What has to go with every copy, and programs to begin with.
+install(FILES LICENSE THIRD-PARTY.md DESTINATION ${CMAKE_INSTALL_DOCDIR})
+install(DIRECTORY LICENSES DESTINATION ${CMAKE_INSTALL_DOCDIR})
+install(DIRECTORY examples DESTINATION ${CMAKE_INSTALL_DOCDIR} USE_SOURCE_PERMISSIONS)
 
 # These hold the prefix, which "cmake --install --prefix" may still change: so they are written when
 # the project is installed.
