@@ -39,6 +39,7 @@ function(tavi_install_configured file folder)
                    \"\$ENV{DESTDIR}\${CMAKE_INSTALL_PREFIX}/${folder}/${file}\" @ONLY)")
 endfunction()
 tavi_install_configured(taviwireless.pc ${CMAKE_INSTALL_LIBDIR}/pkgconfig)
+tavi_install_configured(taviwireless-wifi.pc ${CMAKE_INSTALL_LIBDIR}/pkgconfig)
 tavi_install_configured(com.merilond.usbmodem.service share/dbus-1/services)
 tavi_install_configured(com.merilond.usbmodem.Objects.service share/dbus-1/services)
 install(FILES daemon/modem_objects.xml DESTINATION share/dbus-1/interfaces
