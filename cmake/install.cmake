@@ -23,6 +23,10 @@ install(FILES packaging/taviwirelessConfig.cmake DESTINATION ${package_dir})
 write_basic_package_version_file(taviwirelessConfigVersion.cmake COMPATIBILITY SameMajorVersion)
 install(FILES ${CMAKE_CURRENT_BINARY_DIR}/taviwirelessConfigVersion.cmake
         DESTINATION ${package_dir})
+# What has to go with every copy, and programs to begin with.
+install(FILES LICENSE THIRD-PARTY.md DESTINATION ${CMAKE_INSTALL_DOCDIR})
+install(DIRECTORY LICENSES DESTINATION ${CMAKE_INSTALL_DOCDIR})
+install(DIRECTORY examples DESTINATION ${CMAKE_INSTALL_DOCDIR} USE_SOURCE_PERMISSIONS)
 
 # These hold the prefix, which "cmake --install --prefix" may still change: so they are written when
 # the project is installed.
@@ -38,6 +42,7 @@ function(tavi_install_configured file folder)
     list(APPEND CMAKE_INSTALL_MANIFEST_FILES \"\${file}\")")
 endfunction()
 tavi_install_configured(taviwireless.pc ${CMAKE_INSTALL_LIBDIR}/pkgconfig)
+tavi_install_configured(taviwireless-wifi.pc ${CMAKE_INSTALL_LIBDIR}/pkgconfig)
 tavi_install_configured(com.merilond.usbmodem.service share/dbus-1/services)
 tavi_install_configured(com.merilond.usbmodem.Objects.service share/dbus-1/services)
 install(FILES daemon/modem_objects.xml DESTINATION share/dbus-1/interfaces
