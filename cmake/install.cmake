@@ -45,6 +45,8 @@ tavi_install_configured(taviwireless.pc ${CMAKE_INSTALL_LIBDIR}/pkgconfig)
 tavi_install_configured(taviwireless-wifi.pc ${CMAKE_INSTALL_LIBDIR}/pkgconfig)
 tavi_install_configured(com.merilond.usbmodem.service share/dbus-1/services)
 tavi_install_configured(com.merilond.usbmodem.Objects.service share/dbus-1/services)
+install(FILES dbus/usbmodem.xml DESTINATION share/dbus-1/interfaces
+        RENAME com.merilond.usbmodem.xml)
 install(FILES daemon/modem_objects.xml DESTINATION share/dbus-1/interfaces
         RENAME com.merilond.usbmodem.Objects.xml)
 tavi_install_configured(usbmodemd.service lib/systemd/user)
