@@ -22,10 +22,16 @@ namespace {
 
 constexpr char kFooter[] =
     "taviwireless help COMMAND tells more of a command.\n"
-    "Exit status: 0 done, 1 failed, 2 wrong usage, 3 no such modem or network, 4 busy: it "
-    "has a connection already, or is connecting; 5 the modem service is not running.\n"
     "With --json, a failure is {\"error\": SENTENCE} on standard output.\n"
-    "Details of failures are in the system log; --verbose shows them here as well.\n";
+    "Details of failures are in the system log; --verbose shows them here as well.\n"
+    "\n"
+    "Exit status:\n"
+    "  0  done\n"
+    "  1  failed\n"
+    "  2  wrong usage\n"
+    "  3  no such modem or network\n"
+    "  4  busy: it has a connection already, or is connecting\n"
+    "  5  the modem service is not running\n";
 
 void Define(const Command& program, Options& options) {
     program.SetVersion("taviwireless " TAVI_VERSION);

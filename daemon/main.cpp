@@ -40,7 +40,10 @@ constexpr char kDescription[] =
     "A modem is plugged in while there is an info file \"/tmp/usbmodem.info\" and a number.\n"
     "taviwireless modem shows what it serves; SIGTERM ends it, connections stay up.\n"
     "\n"
-    "Exit status: 0 ended by SIGTERM or SIGINT, 1 failed, 2 wrong usage.";
+    "Exit status:\n"
+    "  0  ended by SIGTERM or SIGINT\n"
+    "  1  failed\n"
+    "  2  wrong usage";
 
 struct Options {
     gboolean foreground = FALSE;

@@ -43,11 +43,15 @@ std::string Footer() {
            "  pin=PIN            a SIM card that asks for this PIN; with lock=off it does not\n"
            "  puk=, attempts=, puk_attempts=, sim=ready|absent|busy|failure\n"
            "  fault=FAULT        misbehaves from the start\n"
-           "  imsi, operator, apn, signal, roaming=yes|no, vendor, product ... variables of the "
+           "  imsi, operator, apn, signal, roaming=yes|no, vendor, product ...  variables of the "
            "personality\n"
            "Faults:\n" +
-           FaultHelp() + "Commands with --control, each answered with ok or error:\n" +
-           Control::Help() +
+           FaultHelp() + "Control commands:\n" + Control::Help() +
+           "Each is answered with ok or error.\n"
+           "Exit status:\n"
+           "  0  ended by a signal, or with --control by quit or the end of the input\n"
+           "  1  failed\n"
+           "  2  wrong usage\n"
            "Examples:\n"
            "  modemsim                                 one modem; prints its ports\n"
            "  modemsim --modem 12d1,pin=1234 --log -   a locked SIM card; shows what is said\n"
@@ -86,7 +90,7 @@ void Define(const Command& program, Options& options) {
         .Needs(linkDir);
     program.AddOption("--fault", options.faults, "Make modem ID misbehave from the start",
                       "ID:FAULT");
-    program.AddFlag("--control", options.control, "Take commands from standard input");
+    program.AddFlag("--control", options.control, "Take control commands from standard input");
     program.AddOption("--log", options.log,
                       "Append what is said to FILE (- for standard error), PINs included", "FILE");
 }

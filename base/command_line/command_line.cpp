@@ -4,6 +4,7 @@
 
 #include <CLI/CLI.hpp>
 #include <algorithm>
+#include <cstdlib>
 #include <iostream>
 #include <optional>
 
@@ -28,11 +29,16 @@ bool IsNumberBetween(const std::string& text, int first, int last) {
     return CLI::detail::lexical_cast(text, number) && number >= first && number <= last;
 }
 
-// As wide as can be read well.
+// On a terminal as wide as can be read well; elsewhere what COLUMNS says, which manual pages use.
 size_t HelpColumns() {
-    constexpr int kWidest = 100;
+    constexpr int kNarrowest = 20;
     const int columns = ColumnsOf(STDOUT_FILENO);
-    return static_cast<size_t>(columns == 0 ? 80 : std::clamp(columns, 20, kWidest));
+    if (columns > 0) {
+        return static_cast<size_t>(std::clamp(columns, kNarrowest, 100));
+    }
+    const char* text = getenv("COLUMNS");
+    const int wanted = text == nullptr ? 0 : atoi(text);
+    return static_cast<size_t>(wanted <= 0 ? 80 : std::clamp(wanted, kNarrowest, 9999));
 }
 
 void PrintHelp(const CLI::App& command) {

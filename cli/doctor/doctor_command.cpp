@@ -79,7 +79,8 @@ void Examine(const Options& options) {
 
 void AddDoctorCommand(const Command& program, Options& options) {
     Add(program, "doctor", "Look for what keeps modems and Wi-Fi from working, and say what to do",
-        options, Examine);
+        options, Examine)
+        .SetFooter("Exit status:\n  0  nothing has failed\n  1  something has failed");
 }
 
 }  // namespace taviwireless::cli

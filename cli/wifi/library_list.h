@@ -3,8 +3,6 @@
 
 #include <taviwireless/wireless.h>
 
-#include <cstdlib>
-#include <memory>
 #include <vector>
 
 namespace taviwireless::cli {
@@ -13,11 +11,10 @@ namespace taviwireless::cli {
 template <typename Record>
 std::vector<Record> TakeList(WirelessLink& head) {
     std::vector<Record> records;
-    for (WirelessLink* link = head.next; link != &head;) {
-        const std::unique_ptr<Record, decltype(&free)> record(WIRELESS_RECORD(link, Record), free);
-        link = link->next;
+    WIRELESS_FOR_EACH(record, &head, Record) {
         records.push_back(*record);
     }
+    WIRELESS_FREE_LIST(&head, Record);
     return records;
 }
 

@@ -443,6 +443,7 @@ class TAVIWIRELESS_API USBModem {
 // initialised; its operations fail as those of a modem without a channel.
 class TAVIWIRELESS_API USBModemNull : public USBModem {
   public:
+    // None of these looks at a file or a device.
     USBModemNull();
     ~USBModemNull() override;
     std::string GetDevId() const override;

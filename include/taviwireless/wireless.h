@@ -14,8 +14,9 @@
  *   and the offsets of their members are given in bytes; of two numbers the first is for 32-bit
  *   processors, the second for 64-bit ones. The library is not built where they are others.
  * - Lists are circular queues of links, as insque() knows them. The caller owns the head, which the
- *   functions make empty first, and the members: unlink each and free() it. Members are records of
- *   which `link` is a part; WIRELESS_RECORD gives the record.
+ *   functions make empty first, and the members, records of which `link` is a part:
+ *   WIRELESS_FOR_EACH goes through them, WIRELESS_FREE_LIST frees them. A program in a language
+ *   without these macros calls free() for each record.
  * - They wait with sleep(), block while tools run, and must not be called from two threads at once.
  */
 #ifndef TAVIWIRELESS_WIRELESS_H
@@ -23,6 +24,7 @@
 
 #include <stddef.h>
 #include <stdint.h>
+#include <stdlib.h>
 #include <taviwireless/export.h>
 
 #ifdef __cplusplus
@@ -151,13 +153,40 @@ typedef struct WirelessLink {
     struct WirelessLink* previous;
 } WirelessLink;
 
-/*
- * The record of this type that a link is a part of:
- *   for (l = head.next; l != &head; l = l->next)
- *       use(WIRELESS_RECORD(l, WirelessNetwork)->essid);
- */
+/* The record of this type that a link is a part of. */
 #define WIRELESS_RECORD(wirelessLink, type) \
     ((type*)(void*)((char*)(wirelessLink)-offsetof(type, link)))
+
+/* Likewise, but null for the head of a list, that is, behind its last member. */
+#define WIRELESS_RECORD_OR_NULL(wirelessLink, head, type) \
+    ((wirelessLink) == (head) ? NULL : WIRELESS_RECORD(wirelessLink, type))
+
+/*
+ * Goes through the records of a list. head is the list's address, type that of its records, record
+ * the name of the pointer that the loop declares:
+ *   WIRELESS_FOR_EACH(network, &networks, WirelessNetwork)
+ *       puts(network->essid);
+ * The record must stay in the list while its turn lasts.
+ */
+#define WIRELESS_FOR_EACH(record, head, type) /* NOLINTNEXTLINE(bugprone-macro-parentheses) */ \
+    for (type* record = WIRELESS_RECORD_OR_NULL((head)->next, head, type); (record) != NULL;   \
+         (record) = WIRELESS_RECORD_OR_NULL((record)->link.next, head, type))
+
+/*
+ * Frees the records of a list and leaves it empty: WIRELESS_FREE_LIST(&networks, WirelessNetwork).
+ */
+#define WIRELESS_FREE_LIST(head, type) TAVIWirelessListFree(head, offsetof(type, link))
+
+/* What WIRELESS_FREE_LIST calls: linkOffset is that of the link in the records. */
+static inline void TAVIWirelessListFree(WirelessLink* head, size_t linkOffset) {
+    WirelessLink* member = head->next;
+    while (member != head) {
+        WirelessLink* next = member->next;
+        free((char*)member - linkOffset);
+        member = next;
+    }
+    head->next = head->previous = head;
+}
 
 /* Sizes of texts, their zero byte counted: an ESSID has 32 bytes at most. */
 enum { WIRELESS_ESSID_SIZE = 33, WIRELESS_KEY_SIZE = 257, WIRELESS_ADDRESS_SIZE = 20 };

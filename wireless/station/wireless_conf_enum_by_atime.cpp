@@ -14,8 +14,8 @@ namespace {
 // list as it was, when there is no memory for that.
 bool SortByTime(WirelessLink& head) {
     std::vector<WirelessConf*> confs;
-    for (WirelessLink* member = head.next; member != &head; member = member->next) {
-        confs.push_back(WIRELESS_RECORD(member, WirelessConf));
+    WIRELESS_FOR_EACH(conf, &head, WirelessConf) {
+        confs.push_back(conf);
     }
     std::stable_sort(confs.begin(), confs.end(), [](WirelessConf* a, WirelessConf* b) {
         return a->accessTime > b->accessTime;

@@ -185,7 +185,7 @@ int ListUntilStable(const char* interface, WirelessLink& networks) {
         if (isLast && count >= 0) {
             return 0;
         }
-        FreeMembers<WirelessNetwork>(networks);
+        WIRELESS_FREE_LIST(&networks, WirelessNetwork);
         if (isLast) {
             TAVI_LOG_ERROR("Failed to get network scanning result");
             return -1;
@@ -231,7 +231,7 @@ int TAVIWirelessNetworkScan(int trigger, WirelessLink* networks) {
     const int result =
         TAVI_GUARDED(-1, [=] { return taviwireless::wireless::Scan(trigger, networks); });
     if (result < 0 && networks != nullptr) {
-        FreeMembers<WirelessNetwork>(*networks);
+        WIRELESS_FREE_LIST(networks, WirelessNetwork);
     }
     return result;
 }

@@ -3,8 +3,6 @@
 
 #include <taviwireless/wireless.h>
 
-#include <cstdlib>
-
 // Circular queues of links; an empty one is a head that leads to itself.
 namespace taviwireless::wireless {
 
@@ -24,23 +22,12 @@ inline void InsertBefore(WirelessLink& place, WirelessLink& member) {
     place.previous = &member;
 }
 
-// Frees the members, records of type T, which were allocated with calloc().
-template <typename T>
-void FreeMembers(WirelessLink& head) {
-    for (WirelessLink* member = head.next; member != &head;) {
-        T* record = WIRELESS_RECORD(member, T);
-        member = member->next;
-        free(record);
-    }
-    MakeEmpty(head);
-}
-
 // A list that frees its members when it goes.
 template <typename T>
 class OwnedList {
   public:
     OwnedList() { MakeEmpty(head_); }
-    ~OwnedList() { FreeMembers<T>(head_); }
+    ~OwnedList() { WIRELESS_FREE_LIST(&head_, T); }
     OwnedList(const OwnedList&) = delete;
     OwnedList& operator=(const OwnedList&) = delete;
 

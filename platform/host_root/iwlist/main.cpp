@@ -5,7 +5,7 @@
 //   iwlist INTERFACE active_channel    the channels that may be used, one a line
 //
 // It stands where the stock tool does, so that has to be moved: to "/usr/sbin/iwlist.distrib", as
-// "dpkg-divert --rename /usr/sbin/iwlist" does it.
+// dpkg-divert does it.
 #include <sys/stat.h>
 #include <unistd.h>
 

@@ -1,10 +1,4 @@
-// The network program of the host root, at /etc/rc.network:
-//   rc.network restart INTERFACE BRIDGE
-//   rc.network --dry-run restart INTERFACE BRIDGE
-//   rc.network --dry-run enable INTERFACE BRIDGE GUESTS MEMBER ADDRESS LEASES
-// Makes the bridge, the access point on the interface and the bridge's DHCP server what the saved
-// settings say, whatever they were before. An empty BRIDGE is the one that the interface is in, if
-// any. --dry-run prints what would be done.
+// The network program of the host root, at /etc/rc.network.
 #include <core/failure.h>
 #include <sys/stat.h>
 
@@ -42,23 +36,45 @@ void Restart(const std::string& interface, const std::string& bridge) {
     BringAbout(plan);
 }
 
-int Usage() {
-    fputs(
-        "usage: rc.network restart INTERFACE BRIDGE\n"
-        "       rc.network --dry-run restart INTERFACE BRIDGE\n"
-        "       rc.network --dry-run enable INTERFACE BRIDGE GUESTS MEMBER ADDRESS LEASES\n",
-        stderr);
-    return kUsage;
-}
+constexpr char kHelp[] =
+    "Usage:\n"
+    "  rc.network restart INTERFACE BRIDGE\n"
+    "  rc.network --dry-run restart INTERFACE BRIDGE\n"
+    "  rc.network --dry-run enable INTERFACE BRIDGE GUESTS MEMBER ADDRESS LEASES\n"
+    "\n"
+    "Makes the bridge, the access point and the bridge's DHCP server what the saved\n"
+    "settings say, whatever they were before. What would cut the machine off is refused,\n"
+    "and after a failure everything is as it was.\n"
+    "\n"
+    "Arguments:\n"
+    "  INTERFACE  of the access point, such as wlan0\n"
+    "  BRIDGE     such as lbr0; empty: the one that the interface is in, if any\n"
+    "  GUESTS     yes or no: whether there will be a network for guests\n"
+    "  MEMBER     interface that a new bridge will have; may be empty\n"
+    "  ADDRESS    that the bridge will have, such as 10.1.14.1/24; may be empty\n"
+    "  LEASES     yes or no: whether a DHCP server will run on the bridge\n"
+    "\n"
+    "Options:\n"
+    "  --dry-run  print what would be done; enable: after the access point is enabled\n"
+    "  --help     print this help\n"
+    "\n"
+    "Exit status:\n"
+    "  0  done\n"
+    "  1  failed\n"
+    "  2  wrong usage\n";
 
 int Main(const std::vector<std::string>& words) {
+    if (words == std::vector<std::string>{"--help"}) {
+        return fputs(kHelp, stdout) < 0 || fflush(stdout) != 0 ? kFailure : 0;
+    }
     const bool isDryRun = !words.empty() && words[0] == "--dry-run";
     const size_t first = isDryRun ? 1 : 0;
     const std::string what = words.size() > first ? words[first] : "";
     const bool isRestart = what == "restart" && words.size() == first + 3;
     const bool isEnable = isDryRun && what == "enable" && words.size() == 8;
     if (!isRestart && !isEnable) {
-        return Usage();
+        fputs(kHelp, stderr);
+        return kUsage;
     }
     if (!isDryRun) {
         Restart(words[1], words[2]);
