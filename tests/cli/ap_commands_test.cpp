@@ -450,7 +450,7 @@ TEST_F(APCommands, WhatWasSwitchedOnIsOnAgainAfterARestart) {
                   enabled == std::string("yes"));
     }
     WriteFile("/tmp/no-network", "");
-    Shell("pkill -x hostapd");
+    Shell("pkill -x hostapd; while pgrep -x hostapd > /dev/null; do sleep 0.01; done");
     EXPECT_EQ(RunProgram(boot).status, 1);
     WriteFile("/usr/tavi/etc/wireless.conf", "[Home_00:11:22:33:44:55]\n\tessid=Home\n");
     EXPECT_EQ(RunProgram(boot).status, 1);
