@@ -78,6 +78,8 @@ boots() {
     same "active active" "$(systemctl is-active ModemManager NetworkManager | paste -sd ' ')"
     nmcli connection add type dummy ifname lan0 con-name lan ipv4.method manual ipv4.addresses 10.20.0.2/24 \
         ipv4.gateway 10.20.0.1 ipv4.dns 192.0.2.53
+    nmcli connection up lan
+    wait_for 10 grep -q 192.0.2.53 /etc/resolv.conf
     is_at_home
 }
 
