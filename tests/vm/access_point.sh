@@ -14,38 +14,6 @@ status_of() {
     ap status | sed -n "s/^$1  *//p"
 }
 
-# join NETWORK KEY: what a station does at home.
-join() {
-    leave
-    printf '%s\n' ctrl_interface=/run/station "network={" "ssid=\"$1\"" "psk=\"$2\"" scan_ssid=1 "}" >/run/station.conf
-    in_air wpa_supplicant -B -Dnl80211 -iwlan1 -c/run/station.conf -P/run/station.pid
-    wait_for 30 has_joined
-}
-has_joined() {
-    in_air wpa_cli -p /run/station -i wlan1 status | grep -qx wpa_state=COMPLETED
-}
-
-# Everything that the station has of the access point, if it has something.
-leave() {
-    [ ! -e /run/station.pid ] || kill "$(cat /run/station.pid)"
-    wait_for 5 test ! -e /run/station.pid
-    in_air ip addr flush dev wlan1
-}
-
-# Prints the lease in words: "ip=10.1.14.2 ...".
-lease() {
-    cat >/run/station.script <<'END'
-#!/bin/sh
-[ "$1" = bound ] || exit 0
-ip addr replace "$ip/$mask" dev "$interface"
-echo "ip=$ip mask=$mask router=$router dns=$dns" >/run/station.lease
-END
-    chmod +x /run/station.script
-    rm -f /run/station.lease
-    in_air udhcpc -i wlan1 -n -q -f -t 5 -T 2 -s /run/station.script >&2
-    cat /run/station.lease
-}
-
 set_up() {
     plug_radios 3
     configure_ap wlan2 Neighbour 1

@@ -107,4 +107,8 @@ prepare_guest() {
     busybox syslogd -O $system_log
     [ -e /usr/sbin/iwlist.distrib ] || install_product # by the group before, in the same guest
 }
-prepare_guest
+if [ ! -d /run/systemd/system ]; then
+    prepare_guest
+else
+    journalctl --quiet --follow --output=short-monotonic >$system_log &
+fi

@@ -13,7 +13,7 @@ make_gadget() {
     [ ! -e $gadget ] || return 0 # by the group before, in the same guest
     modprobe -a dummy_hcd libcomposite usb_f_serial option ppp_async ppp_deflate bsd_comp
     echo 12d1 1001 ff >/sys/bus/usb-serial/drivers/option1/new_id
-    mount -t configfs none /sys/kernel/config
+    mountpoint -q /sys/kernel/config || mount -t configfs none /sys/kernel/config
     mkdir -p $gadget/strings/0x409 $gadget/configs/c.1
     echo 0x12d1 >$gadget/idVendor
     echo 0x1001 >$gadget/idProduct
@@ -23,8 +23,7 @@ make_gadget() {
         mkdir $gadget/functions/gser.$n
         ln -s $gadget/functions/gser.$n $gadget/configs/c.1/
     done
-    # There is no init system here that would have started it.
-    [ -S /run/udev/control ] || /lib/systemd/systemd-udevd --daemon
+    [ -d /run/systemd/system ] || /lib/systemd/systemd-udevd --daemon
     ip netns add mobile
     ip -n mobile link set lo up
     ip -n mobile addr add $beyond/32 dev lo
