@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #ifndef TAVIWIRELESS_BASE_FILE_NAME_H
 #define TAVIWIRELESS_BASE_FILE_NAME_H
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #ifndef TAVIWIRELESS_BASE_SLEEP_OUT_H
 #define TAVIWIRELESS_BASE_SLEEP_OUT_H
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #ifndef TAVIWIRELESS_BASE_SPLIT_H
 #define TAVIWIRELESS_BASE_SPLIT_H
 

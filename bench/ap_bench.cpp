@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What the access point's files cost: writing hostapd's, and reading and saving the settings of one
 // product where N are stored. Writing and saving run tools (ps, mkdir, grep), which "Tools" runs
 // alone for comparison. The files are in memory, so waiting for a disk is not in the figures.

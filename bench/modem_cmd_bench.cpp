@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What USBModem::ModemCmd costs above the waits that the serial line demands: 100 ms of silence
 // before the command and 200 ms after the reply. The modem is a child process that answers each
 // command at once over a pseudo-terminal.

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What saved networks cost: listing N of them by the time of use, saving one that is there and one
 // more, and beside it how long the real wpa_supplicant takes to read a file of as many. That one
 // includes the start of the process, for which "SupplicantReads/0" stands alone; its keys are given

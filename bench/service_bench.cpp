@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What the modem service costs: the round trip of a call beside one to the bus itself, the time
 // from start to service and from plugging to ready, and the daemon's memory. On a private bus in an
 // appliance root, with simulated modems.

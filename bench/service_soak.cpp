@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The life of the service: modems are plugged in, unplugged, reset, babble, dial and hang up, and
 // the service is restarted, in random order. After each step everything must be as it belongs, or
 // the program ends with status 1 and prints the seed, with which the same order runs again. Time is

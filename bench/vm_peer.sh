@@ -1,4 +1,5 @@
 #!/bin/bash
+# SPDX-License-Identifier: MIT
 # What scripts/test-vm peer runs: the modem service beside ModemManager, with the same modem in the same guest, one
 # after the other. Of the two list commands, ours asks the modem anew.
 # shellcheck source=tests/vm/common.sh

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What TAVIWirelessNetworkScan costs with 1,000 networks in range. One call runs the listing tool
 // twice, since two runs must agree; the tool is a script that prints a file, and the waits for the
 // adapter are cut. "ReadTableTwice" is the same without the library: two shells, two tools, the

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "cli/completed_arguments.h"
 
 #include "cli/ap/ap_changes.h"

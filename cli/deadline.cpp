@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "cli/deadline.h"
 
 #include <unistd.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // taviwireless, the library's functions for a person or a script.
 #include <fcntl.h>
 #include <signal.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #ifndef TAVIWIRELESS_CLI_OPTIONS_H
 #define TAVIWIRELESS_CLI_OPTIONS_H
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What is being waited for, and for how long: on standard error, while a call of the library blocks.
 #include <unistd.h>
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What is asked at the terminal, or read from a pipe.
 #include <bsd/readpassphrase.h>
 #include <unistd.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "cli/qr_code.h"
 
 #include <qrencode.h>

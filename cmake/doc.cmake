@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 # ninja doc: the API reference, of the public headers. In doc/html, and as text: man -l doc/man/man3/wireless.h.3
 find_program(DOXYGEN doxygen)
 if(DOXYGEN)

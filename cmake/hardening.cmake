@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 # What makes a fault in memory end the program rather than give it away. Debian's packages are built with the same.
 include(CheckPIESupported)
 check_pie_supported()

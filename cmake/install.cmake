@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 # What "cmake --install" installs: the library, the host edition of the SDK it runs on, headers,
 # programs, what starts the daemon, a pkg-config file and a CMake package.
 include(CMakePackageConfigHelpers)

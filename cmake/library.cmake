@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 # libtaviwireless.so.4: the product, linked from the object libraries of its folders.
 add_library(taviwireless SHARED cmake/record_layouts.cpp)
 target_link_libraries(taviwireless PRIVATE

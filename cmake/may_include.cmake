@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 # tavi_may_include(target folder...): the folders of this project that the target's sources may name in an #include, such
 # as "base" for "base/unique_fd.h". No other folder is on the compiler's path, so a wrong arrow between folders ends
 # the build. The table of docs/architecture.md says the same.

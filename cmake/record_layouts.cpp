@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The records that callers share with the library, byte for byte: programs that were compiled before
 // hold them as well. Each pair of numbers is for 32 and for 64 bits.
 #include <tavicore/szlist.h>

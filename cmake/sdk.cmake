@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 # The platform SDK: tavi::core and tavi::sdk, from the appliance's sysroot or from the host edition.
 function(tavi_find_sdk name header)
   find_path(${name}_INCLUDE ${header} PATHS ${TAVI_SDK_ROOT}

@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 # tavi_add_test(NAME name SOURCES ... LIBS ...): a GoogleTest program whose cases CTest runs one by one,
 # in parallel. Link tavi_appliance_main for programs that touch system paths, GTest::gmock_main for others.
 find_package(GTest REQUIRED)

@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 # Compiler settings that hold for everything built here.
 add_compile_options(-Wall -Wextra -Wpedantic)
 # What would be another number, or a fault, on a processor of another size. The tests say for themselves that they need

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #ifndef TAVIWIRELESS_COMMON_LOG_H
 #define TAVIWIRELESS_COMMON_LOG_H
 

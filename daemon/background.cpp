@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "daemon/background.h"
 
 #include <fcntl.h>

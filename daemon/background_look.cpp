@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "daemon/background_look.h"
 
 #include <algorithm>

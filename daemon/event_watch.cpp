@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "daemon/event_watch.h"
 
 #include <glib-unix.h>

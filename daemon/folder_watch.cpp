@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "daemon/folder_watch.h"
 
 #include <sys/inotify.h>

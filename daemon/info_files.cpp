@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "daemon/info_files.h"
 
 #include <syslog.h>

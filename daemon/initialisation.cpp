@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "daemon/initialisation.h"
 
 #include <syslog.h>

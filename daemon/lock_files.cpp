@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "daemon/lock_files.h"
 
 #include <cstdlib>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // usbmodemd: serves the USB modems that are plugged in on the session bus.
 #include <fcntl.h>
 #include <glib-unix.h>

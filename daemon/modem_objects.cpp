@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "daemon/modem_objects.h"
 
 #include <sys/stat.h>

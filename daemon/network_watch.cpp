@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "daemon/network_watch.h"
 
 #include <linux/netlink.h>

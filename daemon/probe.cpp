@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "daemon/probe.h"
 
 #include <syslog.h>

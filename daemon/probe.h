@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #ifndef TAVIWIRELESS_DAEMON_PROBE_H
 #define TAVIWIRELESS_DAEMON_PROBE_H
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "daemon/semaphore_sets.h"
 
 #include <sys/ipc.h>

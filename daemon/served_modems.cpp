@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "daemon/served_modems.h"
 
 #include <syslog.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "daemon/session_bus.h"
 
 #include <glib.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "daemon/watchdog.h"
 
 #include <glib.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include <taviwireless/dbus_client.h>
 
 #include <cstdlib>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include <memory>
 
 // The appliance's GLib wants types and threads initialised; later ones do both by themselves.

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The functions that front ends call.
 #include <taviwireless/usbmodem_client.h>
 #include <taviwireless/usbmodem_ui.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include <taviwireless/usbmodem_client.h>
 
 #include <algorithm>

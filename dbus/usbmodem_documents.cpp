@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "dbus/usbmodem_documents.h"
 
 #include <chrono>

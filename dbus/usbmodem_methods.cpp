@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "dbus/usbmodem_methods.h"
 
 #include <algorithm>

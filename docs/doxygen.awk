@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 # Makes of a public header what Doxygen reads: awk -f docs/doxygen.awk HEADER
 # In the headers a comment holds for all declarations below it down to the next blank line, and one that stands alone for
 # all that follows it. A paragraph with indented lines, such as a table, is kept as it stands.

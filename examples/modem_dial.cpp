@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Lists the modems that are ready for use. Given one, unlocks its SIM, with the PIN from standard
 // input, and dials:
 //   modem_dial [DEVICE]    # such as usbmodem0; usbmodemd runs on the session bus

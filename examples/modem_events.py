@@ -1,4 +1,5 @@
 #!/usr/bin/python3
+# SPDX-License-Identifier: MIT
 """Shows USB modems as they come, change and go: examples/modem_events.py (Debian: python3-gi)"""
 from gi.repository import Gio, GLib
 

@@ -1,3 +1,4 @@
+/* SPDX-License-Identifier: MIT */
 /*
  * Lists the Wi-Fi networks in range. Given the name of one, joins it, takes an address by DHCP, and
  * remembers the network:

@@ -1,4 +1,5 @@
 #!/usr/bin/python3
+# SPDX-License-Identifier: MIT
 """Scans for Wi-Fi networks without waiting for it: examples/wifi_worker.py (as root)
 
 The functions of the library take seconds, and of two calls at a time each would disturb the other. So one worker

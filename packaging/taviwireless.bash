@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 # shellcheck shell=bash
 # Completion of taviwireless for bash. The program itself knows what its words may be.
 _taviwireless() {

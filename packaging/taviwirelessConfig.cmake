@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 # find_package(taviwireless 4): taviwireless::taviwireless, for all public headers.
 # With COMPONENTS wifi alone: taviwireless::wifi, for wireless.h, which needs no other package.
 include(${CMAKE_CURRENT_LIST_DIR}/taviwirelessTargets.cmake)

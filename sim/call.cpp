@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "sim/call.h"
 
 #include <fcntl.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #ifndef TAVIWIRELESS_SIM_CONTROL_H
 #define TAVIWIRELESS_SIM_CONTROL_H
 

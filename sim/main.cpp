@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // modemsim: simulated USB 3G modems on real serial lines.
 #include <signal.h>
 #include <sys/signalfd.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #ifndef TAVIWIRELESS_SIM_MODEM_H
 #define TAVIWIRELESS_SIM_MODEM_H
 

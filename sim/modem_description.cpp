@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "sim/modem_description.h"
 
 #include <stdexcept>

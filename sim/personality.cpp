@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "sim/personality.h"
 
 #include <json/reader.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "sim/port.h"
 
 #include <algorithm>

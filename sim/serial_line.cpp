@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "sim/serial_line.h"
 
 #include <fcntl.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #ifndef TAVIWIRELESS_SIM_SIM_CARD_H
 #define TAVIWIRELESS_SIM_SIM_CARD_H
 

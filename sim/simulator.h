@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #ifndef TAVIWIRELESS_SIM_SIMULATOR_H
 #define TAVIWIRELESS_SIM_SIMULATOR_H
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "sim/transcript.h"
 
 #include <fcntl.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "sim/user_text.h"
 
 #include <stdexcept>

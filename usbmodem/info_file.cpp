@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "usbmodem/info_file.h"
 
 #include <tavicore/keyvalue.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "usbmodem/loggable.h"
 
 #include <strings.h>

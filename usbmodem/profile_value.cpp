@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "usbmodem/profile_value.h"
 
 #include <algorithm>

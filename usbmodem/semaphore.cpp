@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include <sys/ipc.h>
 #include <sys/sem.h>
 #include <taviwireless/semaphore.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "usbmodem/state_files.h"
 
 #include <fcntl.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The modem record: construction, copying, accessors, choice of the command set.
 #include <tavicore/file.h>
 #include <taviwireless/usbmodem.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What the modems of single vendors do differently from the standard.
 #include <taviwireless/usbmodem_atif.h>
 

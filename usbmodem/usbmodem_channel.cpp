@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The serial channel to the modem's AT port, and one command and its reply over it.
 #include <sys/file.h>
 #include <taviwireless/usbmodem.h>

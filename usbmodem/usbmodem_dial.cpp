@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Dialling and hanging up: the dialler's settings, its process and its files.
 #include <fcntl.h>
 #include <signal.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The PPP interfaces of USB modems.
 #include <tavicore/error.h>
 #include <taviwireless/usbmodem_enum_if.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What the modem knows about itself and its network.
 #include <json/json.h>
 #include <taviwireless/usbmodem.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The query port that is known: initialising a modem on it, and whether it is still there.
 #include <poll.h>
 #include <sys/stat.h>

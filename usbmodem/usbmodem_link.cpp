@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The state of the link, derived from the dialler's process, its log and the interface's address.
 #include <fcntl.h>
 #include <tavicore/process.h>

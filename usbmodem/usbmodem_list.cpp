@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include <tavicore/error.h>
 #include <tavicore/file.h>
 #include <taviwireless/usbmodem_list.h>

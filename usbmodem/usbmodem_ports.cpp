@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Which of the modem's serial ports does what, and making a new record usable.
 #include <tavicore/file.h>
 #include <taviwireless/usbmodem.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The connection profile of the SIM: one section file per IMSI.
 #include <sys/stat.h>
 #include <tavicore/file.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // A connection that another process dialled: what is known of it without asking the modem, and its
 // end when the modem is gone.
 #include <limits.h>

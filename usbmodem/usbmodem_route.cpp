@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The default route: whether the link may take it, and giving it back.
 #include <tavicore/file.h>
 #include <tavisdk/network.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The lock state of the SIM: PIN, PUK and PIN protection.
 #include <taviwireless/usbmodem.h>
 #include <taviwireless/usbmodem_atif.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // WvStreams' lock file of a serial port, "/var/lock/LCK.." and the port's name, in our own way: as
 // everybody can write in that folder, only what root or the own user wrote there counts, and
 // nothing there is ever waited for. It takes the place of WvStreams' own, which the linker then

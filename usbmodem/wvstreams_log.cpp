@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "usbmodem/wvstreams_log.h"
 
 #include <syslog.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The words that a command line can go on with, for the completion of a shell.
 #include <iostream>
 #include <memory>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What is wrong with a command line, and what it was perhaps to be.
 #include <algorithm>
 

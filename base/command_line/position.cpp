@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "base/command_line/position.h"
 
 #include "base/split.h"

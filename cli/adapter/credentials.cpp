@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "cli/adapter/credentials.h"
 
 #include "cli/command_error.h"

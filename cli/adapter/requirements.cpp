@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "cli/adapter/requirements.h"
 
 #include <taviwireless/wireless.h>

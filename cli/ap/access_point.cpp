@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "cli/ap/access_point.h"
 
 #include <sys/statvfs.h>

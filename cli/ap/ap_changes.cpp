@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "cli/ap/ap_changes.h"
 
 #include <arpa/inet.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // taviwireless ap: the commands, what they are called and what they take.
 #include "cli/ap/ap_changes.h"
 #include "cli/ap/ap_commands.h"

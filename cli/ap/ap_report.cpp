@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "cli/ap/ap_report.h"
 
 #include "cli/ap/country.h"

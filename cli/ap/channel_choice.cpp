@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "cli/ap/channel_choice.h"
 
 #include <algorithm>

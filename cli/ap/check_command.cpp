@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // taviwireless ap check: what the access point would be started with, and what hostapd says of it.
 #include <unistd.h>
 

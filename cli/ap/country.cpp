@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "cli/ap/country.h"
 
 #include <tavicore/keyvalue.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "cli/ap/dry_run.h"
 
 #include <cstdio>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #ifndef TAVIWIRELESS_CLI_AP_DRY_RUN_H
 #define TAVIWIRELESS_CLI_AP_DRY_RUN_H
 

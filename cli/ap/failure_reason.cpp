@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "cli/ap/failure_reason.h"
 
 #include <fcntl.h>

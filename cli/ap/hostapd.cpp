@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "cli/ap/hostapd.h"
 
 #include <net/if.h>

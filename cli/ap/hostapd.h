@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #ifndef TAVIWIRELESS_CLI_AP_HOSTAPD_H
 #define TAVIWIRELESS_CLI_AP_HOSTAPD_H
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // taviwireless ap hotspot and ap qr: a network that somebody joins by a look at the screen.
 #include <fstream>
 #include <iostream>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "cli/ap/radio.h"
 
 #include "cli/command_error.h"

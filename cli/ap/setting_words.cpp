@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "cli/ap/setting_words.h"
 
 #include "base/join.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // taviwireless ap stations: who is connected to the access point.
 #include <sys/stat.h>
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // taviwireless ap: the stored settings, and switching the access point on and off.
 #include "cli/adapter/requirements.h"
 #include "cli/ap/access_point.h"

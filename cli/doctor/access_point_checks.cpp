@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The access point, where the settings say that it is on.
 #include <taviwireless/wireless.h>
 #include <unistd.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The Wi-Fi adapter: hardware, driver, firmware, radio, and who else wants it.
 #include <fcntl.h>
 #include <tavisdk/wireless.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // taviwireless doctor: what a connection needs, what of it is wrong, and what to do.
 #include "cli/doctor/doctor_command.h"
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The files and folders that the library reads and writes.
 #include <sys/stat.h>
 #include <sys/statvfs.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Modems: their ports, and what the service knows of SIM, network and connection. No modem is asked.
 #include <unistd.h>
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What a connection comes to: address, route, name servers.
 #include <arpa/inet.h>
 #include <ifaddrs.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The session bus, and the modem service on it.
 #include <gio/gio.h>
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The programs that the library runs.
 #include <taviwireless/wireless.h>
 #include <unistd.h>

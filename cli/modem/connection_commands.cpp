@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // taviwireless modem connect, disconnect and status: the data connection.
 #include <chrono>
 #include <iomanip>

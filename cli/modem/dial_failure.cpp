@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "cli/modem/dial_failure.h"
 
 #include <tavisdk/network.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "cli/modem/dial_guard.h"
 
 #include <poll.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The modems themselves, through the layer that the service uses too.
 #include <taviwireless/usbmodem_list.h>
 #include <unistd.h>

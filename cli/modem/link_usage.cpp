@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "cli/modem/link_usage.h"
 
 #include <sys/stat.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "cli/modem/modem_access.h"
 
 #include <taviwireless/usbmodem_list.h>

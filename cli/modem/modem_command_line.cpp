@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // taviwireless modem: the commands, what they are called and what they take.
 #include "cli/command_lines.h"
 #include "cli/modem/modem_access.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "cli/modem/modem_report.h"
 
 #include <algorithm>

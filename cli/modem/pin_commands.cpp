@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // taviwireless modem unlock, pin and puk: what the SIM in a modem asks for.
 #include <algorithm>
 

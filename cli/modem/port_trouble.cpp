@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "cli/modem/port_trouble.h"
 
 #include <grp.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // taviwireless modem profile: the connection profile of the SIM in a modem.
 #include <algorithm>
 #include <cctype>

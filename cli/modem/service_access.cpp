@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The modems as the modem service knows them.
 #include <dbus/dbus.h>
 #include <taviwireless/usbmodem_ui.h>

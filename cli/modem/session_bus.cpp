@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // By libdbus: GIO would need a thread, and ends the program where none can be had.
 #include "cli/modem/session_bus.h"
 

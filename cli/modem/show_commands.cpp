@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // taviwireless modem list, show, interfaces, usage and at: what the modems say of themselves.
 #include <unistd.h>
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #ifndef TAVIWIRELESS_CLI_MODEM_TRACE_H
 #define TAVIWIRELESS_CLI_MODEM_TRACE_H
 

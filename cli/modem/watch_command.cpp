@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // taviwireless modem watch: the states of the modems as they change.
 #include <signal.h>
 #include <unistd.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // taviwireless wifi: the adapter and its connection.
 #include <taviwireless/wireless.h>
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "cli/wifi/channels.h"
 
 #include <algorithm>

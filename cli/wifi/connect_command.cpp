@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // taviwireless wifi connect: joins a network, and remembers it.
 #include <algorithm>
 #include <optional>

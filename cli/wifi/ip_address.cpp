@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "cli/wifi/ip_address.h"
 
 #include <arpa/inet.h>

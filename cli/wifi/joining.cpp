@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "cli/wifi/joining.h"
 
 #include <tavisdk/wireless.h>

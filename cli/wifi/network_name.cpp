@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "cli/wifi/network_name.h"
 
 #include <algorithm>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // taviwireless wifi qr: a saved network for somebody else's telephone.
 #include "cli/adapter/credentials.h"
 #include "cli/adapter/requirements.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // taviwireless wifi radio: the stored setting and the kernel's switch in one.
 #include <tavicore/keyvalue.h>
 #include <tavicore/section.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "cli/wifi/raw_scan.h"
 
 #include <cstring>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // taviwireless wifi saved, forget: the networks that were joined before.
 #include <algorithm>
 

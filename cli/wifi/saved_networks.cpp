@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "cli/wifi/saved_networks.h"
 
 #include <dlfcn.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "cli/wifi/station.h"
 
 #include <arpa/inet.h>

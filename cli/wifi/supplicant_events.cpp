@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "cli/wifi/supplicant_events.h"
 
 #include <poll.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // taviwireless wifi watch: the connection and its signal as they change.
 #include <linux/netlink.h>
 #include <linux/rtnetlink.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // taviwireless wifi: the commands, what they are called and what they take.
 #include "cli/adapter/credentials.h"
 #include "cli/command_lines.h"

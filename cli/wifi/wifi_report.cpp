@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "cli/wifi/wifi_report.h"
 
 #include <algorithm>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #ifndef TAVIWIRELESS_DBUS_CLIENT_H
 #define TAVIWIRELESS_DBUS_CLIENT_H
 

@@ -1,3 +1,4 @@
+/* SPDX-License-Identifier: MIT */
 #ifndef TAVIWIRELESS_EXPORT_H
 #define TAVIWIRELESS_EXPORT_H
 

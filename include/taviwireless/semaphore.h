@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #ifndef TAVIWIRELESS_SEMAPHORE_H
 #define TAVIWIRELESS_SEMAPHORE_H
 

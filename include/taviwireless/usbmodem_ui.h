@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #ifndef TAVIWIRELESS_USBMODEM_UI_H
 #define TAVIWIRELESS_USBMODEM_UI_H
 

@@ -1,3 +1,4 @@
+/* SPDX-License-Identifier: MIT */
 /*
  * The Wi-Fi adapter "wlan0" as a station, in ad-hoc mode and as an access point. Plain C.
  *

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "platform/appliance_root/appliance_root.h"
 
 #include <fcntl.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // appliance-root: runs a command in an appliance root.
 #include <getopt.h>
 #include <unistd.h>

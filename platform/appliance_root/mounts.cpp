@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "platform/appliance_root/mounts.h"
 
 #include <fcntl.h>

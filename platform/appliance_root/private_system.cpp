@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "platform/appliance_root/private_system.h"
 
 #include <fcntl.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // taviwireless ap, end to end: the program, the library, a real interface, and the real hostapd.
 #include "tests/cli/cli_runs.h"
 #include "tests/wireless/wifi_fixture.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // taviwireless doctor in situations that each make one line of it go wrong.
 #include "base/split.h"
 #include "tests/cli/cli_runs.h"

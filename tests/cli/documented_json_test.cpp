@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What every command prints with --json is what docs/command-line.md says, key by key.
 #include <map>
 #include <set>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // taviwireless modem --direct, end to end: the program, the library, serial lines and simulated
 // modems; and what is the same with and without the modem service.
 #include "tests/cli/cli_runs.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // taviwireless modem, end to end through the modem service on a bus of its own.
 #include <signal.h>
 

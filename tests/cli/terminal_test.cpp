@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What the program does to the terminal that it runs in.
 #include "tests/support/terminal.h"
 

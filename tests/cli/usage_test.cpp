@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What the program says of its command line: mistakes, help, completion, and output that nobody takes.
 #include "base/split.h"
 #include "tests/cli/cli_runs.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The Wi-Fi adapter of taviwireless_with_wifi, a program beside the test: its driver is associated
 // while there is a file "/tmp/associated", and an access point while there is a file "/tmp/master".
 // Waits cost nothing.

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // taviwireless wifi, end to end: the program, the library, a real interface, and stand-ins for the
 // tools that need a radio.
 #include <sys/socket.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // A connection that runs while the service, its modem or the files around it change.
 
 #include "tests/support/bus.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Which changes of the info files mean that a modem came or went. No modem answers here: what looks
 // for one is left out.
 #include "daemon/modem_keeper.h"

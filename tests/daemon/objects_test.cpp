@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The modems as objects on the bus: what clients that we did not write are told, and when.
 #include <taviwireless/usbmodem_client.h>
 

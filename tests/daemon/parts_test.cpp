@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What processes that were killed leave behind, and the end of a process that looks for a modem.
 #include <gmock/gmock.h>
 #include <sys/sem.h>

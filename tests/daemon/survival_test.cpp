@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What the service lives through on a customer's appliance at 3 a.m.
 #include <taviwireless/usbmodem_client.h>
 

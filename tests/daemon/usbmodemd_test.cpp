@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // usbmodemd on a real bus: starting, the modems it serves, ending.
 #include <gmock/gmock.h>
 #include <sys/socket.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The calling side: the client class against the bus itself and against the service, and the
 // front-end functions.
 #include <gmock/gmock.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The methods of the modem service, called as the bus calls them, with a simulated modem.
 #include "dbus/usbmodem_methods.h"
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Storing an access point's settings in a store of any kind: they read back; or they are refused and
 // nothing changes.
 #include <taviwireless/wireless.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What is sent to a modem for codes that may be anything, what comes of it, and what is logged of the
 // codes whatever the modem answers.
 #include <algorithm>

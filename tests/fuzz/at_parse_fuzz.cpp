@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The command sets by the shapes of 3GPP TS 27.007: the text that a reply carries is what the parser
 // finds, and what the reply does not carry is not found.
 #include <taviwireless/usbmodem_atif.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What a modem says, on its way through the record and the service's document to the command line.
 #include <glib.h>
 #include <json/json.h>

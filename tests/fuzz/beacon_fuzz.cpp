@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // A beacon of any kind in the table of the host root's iwlist, as a scan reads that: it is one
 // network of the name, channel, signal, protocol and protection that it tells, or none if it hides
 // its name, and its neighbours stay what they are.

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Settings of a DHCP server, set through the SDK or written by another hand: those that are taken
 // read back, and what the server is given has the lines of its kind alone.
 #include <arpa/inet.h>

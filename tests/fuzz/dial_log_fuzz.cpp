@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The dialler's log, in which what the modem answered stands too: which interface is taken from it.
 #include <tavisdk/network.h>
 #include <unistd.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #ifndef TAVIWIRELESS_TESTS_FUZZ_FUZZ_H
 #define TAVIWIRELESS_TESTS_FUZZ_FUZZ_H
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What hostapd is given: it has the texts of the settings and nothing else of them, each as the
 // whole value of a line, and shows no secret; or it is said that a line break stands in it.
 #include <cstring>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Files in "/tmp/", which everybody may make: which of them are modems, and which ports are tried.
 #include <taviwireless/usbmodem_list.h>
 #include <unistd.h>

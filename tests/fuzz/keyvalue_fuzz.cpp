@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Setting a key of a key/value file: it reads back, and everything else is as it was.
 #include <tavicore/keyvalue.h>
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What reaches the log and the terminal: text of others is printable there and as it was otherwise,
 // and no PIN or PUK is in it, whatever stands around the command that carries it.
 #include <glib.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "tests/fuzz/modem_line.h"
 
 #include <dlfcn.h>

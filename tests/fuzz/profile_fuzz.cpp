@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The profile of a SIM: a file that may hold anything, values that may be anything, and what of them
 // reaches the dialler.
 #include <sys/mman.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // main() where there is no libFuzzer: gives a target every input of the folders that are named, and
 // then, since the shortest inputs find much, every input of one byte and none at all.
 #include <cstdint>

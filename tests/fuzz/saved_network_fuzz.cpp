@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Saving a network in a store of any kind: it reads back, and is one more only if it is new; or it is
 // refused for a line break.
 #include <taviwireless/wireless.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // A table of any kind, as a scan reads it: each network is one line's, and reads the same when it is
 // printed again.
 #include <algorithm>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Changing a section of a section file: it reads back, and everything else is as it was.
 #include <tavicore/section.h>
 

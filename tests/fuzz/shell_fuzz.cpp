@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Foreign text in a command: a real shell splits it at blanks and does nothing else with it, and the
 // description of the command hides what is secret.
 #include <filesystem>

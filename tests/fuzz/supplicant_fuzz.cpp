@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What the supplicant is given: it has the texts of the saved network and nothing else of it, and
 // its own rules read them as they are; or it is said that a line break stands in it.
 #include <cstring>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The examples do what they say, and say what went wrong.
 #include "tests/support/bus.h"
 #include "tests/wireless/station_fixture.h"

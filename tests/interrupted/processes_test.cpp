@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Programs that are killed at any of their system calls: stores are the old ones or the new ones
 // whole, and the next command works. Programs that stop with a lock: others end with a sentence.
 #include <fcntl.h>

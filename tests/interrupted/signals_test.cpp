@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Signals that are caught at random moments in everything that waits: results are those without.
 #include <fcntl.h>
 #include <sys/file.h>

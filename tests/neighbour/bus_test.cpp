@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Other programs on the bus send what they like, and the service goes on for everybody else.
 #include "tests/support/bus.h"
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Somebody without rights who is on the machine, too, is first at every path of ours in a folder in
 // which he may write. Nobody may notice: what is called gives what it gives without him.
 #include <fcntl.h>

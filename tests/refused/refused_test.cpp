@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What happens when the system refuses something: every system call that can fail, and every
 // allocation of C++, fails once in every public function and in every command that writes.
 //

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The simulated modem: its line, its SIM card, its personality, and how it comes and goes.
 #include <fcntl.h>
 #include <gmock/gmock.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // main() of the test programs that touch system paths: every case runs in an appliance root. What
 // has to come out of it, such as a report, goes to the folder that TAVI_TEST_OUTPUT names. With
 // TAVI_TEST_OLD_KERNEL in the environment the cases run on a kernel as old as Linux 3.10.

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "tests/support/bus.h"
 
 #include <taviwireless/usbmodem_client.h>

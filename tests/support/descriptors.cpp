@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "tests/support/descriptors.h"
 
 #include <filesystem>

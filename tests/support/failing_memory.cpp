@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "tests/support/failing_memory.h"
 
 #include <dlfcn.h>

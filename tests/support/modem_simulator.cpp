@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "tests/support/modem_simulator.h"
 
 #include <json/reader.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "tests/support/old_kernel.h"
 
 #include <fcntl.h>

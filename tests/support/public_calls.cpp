@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "tests/support/public_calls.h"
 
 #include <json/json.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Nothing is missing in the table of public calls.
 #include "tests/support/public_calls.h"
 

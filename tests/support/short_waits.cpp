@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // A library that shortens waits, for a program linked with it or started with it in LD_PRELOAD. It
 // takes the place of sleep() and g_timeout_add_seconds(), whose seconds last 50 ms, and of
 // select(): the waits for silence, before an AT command and behind its reply, are cut to 5 ms, and

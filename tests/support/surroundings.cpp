@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "tests/support/surroundings.h"
 
 #include <sys/wait.h>

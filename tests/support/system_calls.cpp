@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "tests/support/system_calls.h"
 
 #include <elf.h>

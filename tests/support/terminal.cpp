@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "tests/support/terminal.h"
 
 #include <fcntl.h>

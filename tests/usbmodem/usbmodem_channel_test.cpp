@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The serial channel: opening, one command and its reply, modems that misbehave, and the lock between
 // processes.
 #include <sys/prctl.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Dialling over a simulated modem: with the real dialler and a stand-in for pppd, and with a
 // dialler that does as it is told.
 #include <gmock/gmock.h>

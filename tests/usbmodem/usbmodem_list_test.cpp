@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The list: which files are modems, what an update does with them, and its records: copies, and what
 // they keep while the list grows and shrinks.
 #include <sys/resource.h>

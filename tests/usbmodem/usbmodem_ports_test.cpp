@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Finding the ports of a modem and making its record usable.
 #include "tests/support/descriptors.h"
 #include "tests/support/files.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The connection profile of the SIM, over a simulated modem.
 #include <gmock/gmock.h>
 #include <sys/mount.h>

@@ -1,4 +1,5 @@
 #!/bin/bash
+# SPDX-License-Identifier: MIT
 # The Wi-Fi access point: the product's on wlan0, with the real hostapd and udhcpd. A real station at wlan1
 # joins it by wpa_supplicant and udhcpc; wlan2 is a neighbour's access point.
 # shellcheck source=tests/vm/common.sh

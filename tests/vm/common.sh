@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 # shellcheck shell=bash
 # What the tests in the guest share; sourced by the script of each group.
 #

@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 # shellcheck shell=bash
 # A USB modem to plug in: a gadget with three serial ports on a host controller that is itself simulated, so
 # that the kernel's USB and serial drivers are the real ones. On the gadget's side modemsim answers, and gives a

@@ -1,4 +1,5 @@
 #!/bin/bash
+# SPDX-License-Identifier: MIT
 # What is plugged in when the guest with a disk is switched on: nothing at first, then what was when it went down.
 [ -e /etc/test/plugged ] || exit 0
 # shellcheck source=tests/vm/gadget.sh

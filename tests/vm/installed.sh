@@ -1,4 +1,5 @@
 #!/bin/bash
+# SPDX-License-Identifier: MIT
 # The packages on a plain Debian, where systemd is the first process: installed, used, restarted and removed as a
 # person would, with udev, ModemManager and NetworkManager as Debian has them. The guest is restarted in the middle:
 # this runs at each boot.

@@ -1,4 +1,5 @@
 #!/bin/bash
+# SPDX-License-Identifier: MIT
 # The modem: udev and the hot-plug script find it, usbmodemd serves it, and the real wvdial and pppd dial over it.
 # shellcheck source=tests/vm/common.sh
 . "$(dirname "$0")/common.sh"

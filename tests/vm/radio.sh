@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 # shellcheck shell=bash
 # Simulated radios, and what is at the other end; sourced by the tests that use Wi-Fi. wlan0 is the product's;
 # the other radios are in a network namespace of their own, the "air", so that what goes to them does go by radio.

@@ -1,4 +1,5 @@
 #!/bin/bash
+# SPDX-License-Identifier: MIT
 # The Wi-Fi station: simulated radios, real hostapd as the access points, real wpa_supplicant and udhcpc.
 # shellcheck source=tests/vm/common.sh
 . "$(dirname "$0")/common.sh"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The access point on and off: what is in the files afterwards, what ran, what is logged.
 #include <gmock/gmock.h>
 #include <taviwireless/wireless.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The stored settings of the access point.
 #include <gmock/gmock.h>
 #include <taviwireless/wireless.h>

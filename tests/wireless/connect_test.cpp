@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Joining a network and leaving it: what the supplicant is given, what happens around it, and what
 // is undone. kill() can be made to fail.
 #include <fcntl.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What hostapd is started with, and what happens to the one that runs.
 #include <gmock/gmock.h>
 #include <taviwireless/wireless.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The adapter and its interface, addresses, and the route through it.
 #include <tavisdk/wireless.h>
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The file of saved networks, the gateway that a connection should use, and joining the network
 // that was used last.
 #include <ctime>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Scanning: waiting for the adapter, scans until two agree, what is read from the tool's table; names
 // and values.
 #include <gmock/gmock.h>

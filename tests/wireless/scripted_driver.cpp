@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "tests/wireless/scripted_driver.h"
 
 #include <dlfcn.h>

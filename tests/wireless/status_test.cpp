@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What the adapter is doing, as the driver tells it; operation modes and ad-hoc networks.
 #include <gmock/gmock.h>
 #include <tavisdk/network.h>

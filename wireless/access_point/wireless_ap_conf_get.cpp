@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Reading the stored settings of the access point.
 #include <tavicore/section.h>
 #include <taviwireless/wireless.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Under which name the plugged adapter's settings are stored.
 #include <tavicore/file.h>
 #include <tavicore/keyvalue.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Switching the access point off.
 #include <tavicore/error.h>
 #include <tavicore/file.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Switching the access point on.
 #include <tavicore/error.h>
 #include <tavicore/file.h>

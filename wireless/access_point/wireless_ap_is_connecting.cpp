@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include <taviwireless/wireless.h>
 
 #include "wireless/rules/paths.h"

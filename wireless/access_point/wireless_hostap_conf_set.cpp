@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Writing what hostapd is started with.
 #include <signal.h>
 #include <tavicore/file.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include <tavicore/file.h>
 #include <taviwireless/wireless.h>
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Whether the user lets the radio be used.
 #include <tavicore/error.h>
 #include <tavicore/keyvalue.h>

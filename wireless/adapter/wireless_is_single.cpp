@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include <tavisdk/network.h>
 #include <taviwireless/wireless.h>
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include <tavicore/keyvalue.h>
 #include <taviwireless/wireless.h>
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Switching the adapter between access point and client.
 #include <tavicore/process.h>
 #include <taviwireless/wireless.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "wireless/names/vocabulary.h"
 
 int TAVIWirelessAuthParse(const char* text) {

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "wireless/names/vocabulary.h"
 
 int TAVIWirelessEncryptParse(const char* text) {

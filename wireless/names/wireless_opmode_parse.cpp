@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "wireless/names/vocabulary.h"
 
 int TAVIWirelessOpmodeParse(const char* text) {

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The vocabularies: the names that are understood, and the one of each value that is printed, which
 // need not be understood. Where a value has several names, they are those of drivers, tools and
 // configuration files.

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "wireless/rules/hostapd_conf.h"
 
 #include <optional>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "wireless/rules/radio.h"
 
 namespace taviwireless::wireless {

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "wireless/rules/security.h"
 
 #include <algorithm>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "wireless/station/saved_networks.h"
 
 #include <syslog.h>

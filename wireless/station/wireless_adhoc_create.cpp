@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Makes the adapter create, or join, an ad-hoc network.
 #include <tavisdk/network.h>
 #include <taviwireless/wireless.h>

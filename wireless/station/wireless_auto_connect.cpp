@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Joining a saved network, the last used first.
 #include <tavisdk/wireless.h>
 #include <taviwireless/wireless.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "common/log.h"
 #include "wireless/station/saved_networks.h"
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Reading a saved network.
 #include <tavicore/error.h>
 #include <tavicore/file.h>

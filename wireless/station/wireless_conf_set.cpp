@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Saving a network.
 #include <tavicore/error.h>
 #include <tavicore/section.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What the driver says of the wireless interface, one thing at a time.
 #include <tavisdk/network.h>
 #include <taviwireless/wireless.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The gateway that the Wi-Fi connection should use.
 #include <tavicore/keyvalue.h>
 #include <tavisdk/network.h>

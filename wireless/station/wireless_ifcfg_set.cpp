@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Giving the wireless interface the address of a saved network.
 #include <tavisdk/network.h>
 #include <taviwireless/wireless.h>

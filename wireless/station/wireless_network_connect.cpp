@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Joining a network with wpa_supplicant.
 #include <tavicore/file.h>
 #include <tavicore/keyvalue.h>

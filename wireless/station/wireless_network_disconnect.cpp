@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Leaving a network.
 #include <signal.h>
 #include <tavicore/file.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The networks in range, as this system's "iwlist" lists them: a table with one network per line.
 #include <tavisdk/network.h>
 #include <taviwireless/wireless.h>

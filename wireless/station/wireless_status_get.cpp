@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The connection status, and of a connection what is known of its network.
 #include <tavisdk/wireless.h>
 #include <taviwireless/wireless.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "wireless/system/ap_store.h"
 
 #include <tavicore/section.h>

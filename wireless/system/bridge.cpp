@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "wireless/system/bridge.h"
 
 #include <sys/stat.h>

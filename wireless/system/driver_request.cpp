@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "wireless/system/driver_request.h"
 
 #include <sys/ioctl.h>

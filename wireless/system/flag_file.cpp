@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "wireless/system/flag_file.h"
 
 #include <fcntl.h>

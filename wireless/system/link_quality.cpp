@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "wireless/system/link_quality.h"
 
 #include "wireless/system/interface.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "wireless/system/section_store.h"
 
 #include <tavicore/error.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "wireless/system/shell.h"
 
 #include <sys/wait.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "platform/host_root/iwlist/information_elements.h"
 
 #include <cstdint>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The iwlist of the host root: the forms that only the appliance's tool has, and everything else by
 // the stock tool.
 //

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "platform/host_root/iwlist/nl80211.h"
 
 #include <linux/nl80211.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "platform/host_root/iwlist/scan_table.h"
 
 #include <algorithm>

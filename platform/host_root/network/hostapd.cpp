@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "platform/host_root/network/hostapd.h"
 
 #include <unistd.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "platform/host_root/network/kernel_objects.h"
 
 #include <linux/if_addr.h>

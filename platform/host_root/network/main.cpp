@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The network program of the host root, at /etc/rc.network.
 #include <core/failure.h>
 #include <sys/stat.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The plan as a person reads it: what differs between now and then.
 #include <algorithm>
 

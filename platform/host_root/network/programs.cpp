@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "platform/host_root/network/programs.h"
 
 #include <fcntl.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "platform/host_root/network/state.h"
 
 #include <net/if.h>

@@ -1,3 +1,4 @@
+/* SPDX-License-Identifier: MIT */
 /*
  * The SDK's error code: why the last SDK call of this thread failed.
  *

@@ -1,3 +1,4 @@
+/* SPDX-License-Identifier: MIT */
 /*
  * Files and folders: existence, creation, removal, listing, and files that are lists of lines.
  *

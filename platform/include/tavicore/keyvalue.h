@@ -1,3 +1,4 @@
+/* SPDX-License-Identifier: MIT */
 /*
  * Key/value files: text files of KEY=value lines, as shell scripts source them.
  *

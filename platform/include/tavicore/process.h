@@ -1,3 +1,4 @@
+/* SPDX-License-Identifier: MIT */
 /*
  * Processes: running a program, and processes known by their pid file.
  *

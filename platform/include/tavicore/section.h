@@ -1,3 +1,4 @@
+/* SPDX-License-Identifier: MIT */
 /*
  * Section files: text files of sections, each a header line "[name]" followed by its key=value
  * lines, which may be indented.

@@ -1,3 +1,4 @@
+/* SPDX-License-Identifier: MIT */
 /*
  * String hashes: values by key, which remember the order in which keys were first set.
  *

@@ -1,3 +1,4 @@
+/* SPDX-License-Identifier: MIT */
 /*
  * String lists: strings in the order in which they were pushed.
  *

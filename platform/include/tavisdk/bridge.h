@@ -1,3 +1,4 @@
+/* SPDX-License-Identifier: MIT */
 /*
  * Network bridges and their DHCP service, as the appliance's saved settings describe them.
  *

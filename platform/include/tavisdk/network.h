@@ -1,3 +1,4 @@
+/* SPDX-License-Identifier: MIT */
 /*
  * Network interfaces and the default route, IPv4.
  *

@@ -1,3 +1,4 @@
+/* SPDX-License-Identifier: MIT */
 /* Services of the appliance that follow the network. */
 #ifndef TAVIWIRELESS_PLATFORM_INCLUDE_TAVISDK_SERVICE_H
 #define TAVIWIRELESS_PLATFORM_INCLUDE_TAVISDK_SERVICE_H

@@ -1,3 +1,4 @@
+/* SPDX-License-Identifier: MIT */
 /*
  * The public names of Wi-Fi functions that libtaviwireless implements under the same name and
  * "_core". They reach the library that the process has loaded.

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Files and folders, and files that are lists of lines.
 #include <dirent.h>
 #include <fcntl.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Key/value files: KEY=value lines, as shell scripts source them.
 #include <tavicore/keyvalue.h>
 

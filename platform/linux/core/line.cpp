@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Lines of text files.
 #include "line.h"
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "pid_file.h"
 
 #include <climits>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Processes known by their pid file, and children that need no reaping.
 #include <sys/wait.h>
 #include <tavicore/process.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Section files: "[name]" headers, each followed by its key=value lines.
 #include <tavicore/section.h>
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Where the sections of a text stand.
 #include "section_index.h"
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // String hashes.
 #include <tavicore/szhash.h>
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // String lists.
 #include <tavicore/szlist.h>
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Whole text files: read, and replaced in one step.
 #include "text_file.h"
 

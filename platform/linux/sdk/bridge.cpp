@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Bridges, as the files of the network script describe them and as the kernel has them.
 #include <net/if.h>
 #include <tavicore/file.h>

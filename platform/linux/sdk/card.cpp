@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The IPv4 settings of an interface.
 #include <arpa/inet.h>
 #include <tavisdk/network.h>

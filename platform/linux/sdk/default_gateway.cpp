@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The default gateway: in force, and in the saved settings.
 #include <linux/rtnetlink.h>
 #include <tavisdk/network.h>

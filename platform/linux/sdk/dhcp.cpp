@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Addresses by DHCP, from udhcpc. It stays in the background to renew its lease, and calls a script
 // of the host root that sets the address and keeps what is known of the lease.
 #include <sys/stat.h>

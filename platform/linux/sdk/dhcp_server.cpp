@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // DHCP service on bridges, by udhcpd. It serves one interface, so there is one configuration, and
 // one server, for each; the network script runs those whose ".info" file is switched on.
 #include <arpa/inet.h>

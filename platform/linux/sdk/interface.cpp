@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What is known of a network interface.
 #include <arpa/inet.h>
 #include <net/if.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "sdk/interface_name.h"
 
 #include <sys/stat.h>

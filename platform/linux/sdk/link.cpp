@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Interfaces: up, down, and the state of their links.
 #include <net/if.h>
 #include <tavisdk/network.h>

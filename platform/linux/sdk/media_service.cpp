@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The media service.
 #include <tavicore/file.h>
 #include <tavicore/process.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "sdk/netlink.h"
 
 #include <arpa/inet.h>

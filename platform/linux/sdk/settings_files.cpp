@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "sdk/settings_files.h"
 
 #include <tavicore/file.h>

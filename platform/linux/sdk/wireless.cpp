@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The public names of Wi-Fi functions. libtaviwireless needs this library and not the other way
 // round, so its functions are looked up among what the process has loaded.
 #include <dlfcn.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The appliance root as seen from outside: through the program appliance-root.
 #include "platform/appliance_root/appliance_root.h"
 

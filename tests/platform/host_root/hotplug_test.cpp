@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The hot-plug scripts. What is plugged in is laid out over the folders of /sys that they look at.
 #include <gmock/gmock.h>
 #include <sys/mount.h>

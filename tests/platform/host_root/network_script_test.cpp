@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The network program: real bridges and the real DHCP server and client; hostapd, which needs a
 // radio, is a stand-in that stays until it is told to end.
 #include <gmock/gmock.h>

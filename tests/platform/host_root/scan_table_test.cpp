@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The table of the host root's iwlist: from the bytes of beacons to what the library's scan reads.
 #include "platform/host_root/iwlist/scan_table.h"
 

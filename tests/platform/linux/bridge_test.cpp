@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Bridges: what the saved settings say of them, who is in one, and its DHCP service.
 #include <gmock/gmock.h>
 #include <tavicore/error.h>

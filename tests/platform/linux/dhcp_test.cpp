@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Leases, from a real DHCP server at the other end of a veth pair, by the real client.
 #include <gmock/gmock.h>
 #include <tavicore/process.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Interfaces going up and down, their addresses, and the default route, on veth pairs.
 #include <gmock/gmock.h>
 #include <tavicore/error.h>

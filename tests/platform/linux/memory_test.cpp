@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // No memory: every call fails as a C function does, and files are as they were.
 #include <gmock/gmock.h>
 #include <tavicore/error.h>

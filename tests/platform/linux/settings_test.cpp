@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Files of sections, and of keys and values.
 #include <gmock/gmock.h>
 #include <sys/mount.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "tests/platform/linux/skipped_waits.h"
 
 #include <sys/syscall.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Replacing a file: in one step, alike, and one writer after the other.
 #include <gmock/gmock.h>
 #include <signal.h>

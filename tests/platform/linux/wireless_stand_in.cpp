@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Stands in for libtaviwireless.so.4.
 #define STAND_IN extern "C" __attribute__((visibility("default")))
 

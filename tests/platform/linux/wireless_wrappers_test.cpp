@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The public names of Wi-Fi functions, with a library in libtaviwireless' place.
 #include <dlfcn.h>
 #include <gmock/gmock.h>
