@@ -94,10 +94,14 @@ scenario() {
     esac
 }
 
-# The product as a person would have it: what "cmake --install" installs, and the host root at its real paths.
+# What installing the packages would do on a Debian that runs: here, without starting one.
 install_product() {
-    mv /usr/sbin/iwlist /usr/sbin/iwlist.distrib # as "dpkg-divert --rename" does
-    cp -a "$checkout"/build/vm/root/. /
+    local name
+    mv /usr/sbin/iwlist /usr/sbin/iwlist.distrib
+    for name in libtaviwireless4 taviwireless taviwireless-host-root modemsim; do
+        dpkg-deb --fsys-tarfile "$checkout"/build/packages/${name}_*.deb | tar -x --keep-directory-symlink -C /
+    done
+    echo replacedefaultroute >>/etc/ppp/peers/wvdial
     ldconfig
 }
 
