@@ -74,17 +74,27 @@ int ModemService::End(int signal) {
     return process_.Wait().value_or(-1);
 }
 
-RunResult CallService(std::vector<std::string> methodAndArguments) {
-    methodAndArguments[0] = "com.merilond.usbmodem." + methodAndArguments[0];
-    std::vector<std::string> command = {"gdbus", "call", "--session", "-d", "com.merilond.usbmodem",
-                                        "-o",    "/",    "-m"};
-    command.insert(command.end(), methodAndArguments.begin(), methodAndArguments.end());
+namespace {
+
+// A D-Bus client, which prints all letters wherever the tests run.
+RunResult Call(const std::vector<std::string>& words) {
+    std::vector<std::string> command = {"env", "LC_ALL=C.UTF-8", "gdbus", "call", "--session"};
+    command.insert(command.end(), words.begin(), words.end());
     return RunProgram(command);
 }
 
+}  // namespace
+
+RunResult CallService(std::vector<std::string> methodAndArguments) {
+    methodAndArguments[0] = "com.merilond.usbmodem." + methodAndArguments[0];
+    std::vector<std::string> words = {"-d", "com.merilond.usbmodem", "-o", "/", "-m"};
+    words.insert(words.end(), methodAndArguments.begin(), methodAndArguments.end());
+    return Call(words);
+}
+
 RunResult CallObject(const std::string& path, const std::string& method) {
-    return RunProgram({"gdbus", "call", "--session", "-d", "com.merilond.usbmodem.Objects", "-o",
-                       "/com/merilond/usbmodem" + path, "-m", method});
+    return Call({"-d", "com.merilond.usbmodem.Objects", "-o", "/com/merilond/usbmodem" + path, "-m",
+                 method});
 }
 
 }  // namespace taviwireless::test
