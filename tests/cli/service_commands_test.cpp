@@ -163,8 +163,8 @@ TEST(ServiceCommands, TheBusStartsTheServiceWhereItKnowsHow) {
     rules.insert(rules.find("<auth>"), "<servicedir>/tmp/services</servicedir>");
     WriteFile("/tmp/bus.conf", rules);
     WriteFile("/tmp/services/com.merilond.usbmodem.service",
-              "[D-BUS Service]\nName=com.merilond.usbmodem\nExec=" + BuiltProgram("usbmodemd") +
-                  " --foreground\n");
+              "[D-BUS Service]\nName=com.merilond.usbmodem\nExec=\"" + BuiltProgram("usbmodemd") +
+                  "\" --foreground\n");
     bus.Restart();
     Take({{"status usbmodem0", "", 0, "usbmodem0: disconnected\n"}});
 }

@@ -123,9 +123,9 @@ TEST_F(WifiCommands, AScanShowsWhatIsHiddenNewerInUseAndSaved) {
                        ScanLine(36, std::string(32, 'n'), "00:11:22:33:44:ab", 9, "11a", "NONE")});
     for (const size_t columns : {40, 80, 200}) {
         const std::string picture =
-            Shell("script -qec 'stty cols " + std::to_string(columns) + "; LC_ALL=C.UTF-8 " +
+            Shell("script -qec 'stty cols " + std::to_string(columns) + "; LC_ALL=C.UTF-8 \"" +
                   BuiltProgram("taviwireless_with_wifi") +
-                  " wifi scan --channels 2> /dev/null' /dev/null");
+                  "\" wifi scan --channels 2> /dev/null' /dev/null");
         EXPECT_THAT(picture, HasSubstr("76%"));
         for (const std::string& line : Lines(picture)) {
             EXPECT_LE(Width(line), columns) << picture;
