@@ -41,6 +41,9 @@ struct HealthyMachine {
         WriteFile("/etc/resolv.conf", "nameserver 192.168.9.1\n");
         WriteProgram("/etc/rc.network", "#!/bin/sh\n");
         WriteProgram("/sbin/iwlist", "#!/bin/sh\n");
+        // The machine's own are not every user's to run, or to change.
+        WriteProgram("/usr/sbin/pppd", "#!/bin/sh\n");
+        WriteProgram("/usr/sbin/wpa_supplicant", "#!/bin/sh\n");
         WriteProgram("/sbin/iwconfig", "#!/bin/sh\n");
         InstallDialler();
         Shell(
