@@ -10,6 +10,7 @@
 #include "base/unique_fd.h"
 #include "tests/platform/host_root/root_scripts.h"
 #include "tests/platform/veth.h"
+#include "tests/support/wait.h"
 #include "tests/wireless/wifi_fixture.h"
 
 namespace taviwireless::test {
@@ -62,9 +63,17 @@ struct NetworkProgram : testing::Test {
     }
 };
 
-// How many programs of this name run.
+// How many programs of this name run. One that starts a program has a child of its own name for a
+// moment, so two looks have to agree.
 int Running(const std::string& name) {
-    return std::stoi(RunProgram({"pgrep", "--count", "--exact", name}).out);
+    int before = -1;
+    int now = -1;
+    Eventually([&] {
+        before = now;
+        now = std::stoi(RunProgram({"pgrep", "--count", "--exact", name}).out);
+        return now == before;
+    });
+    return now;
 }
 
 // The server's own files are made of what was written by hand, whatever lay there.
