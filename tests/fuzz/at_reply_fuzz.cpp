@@ -33,9 +33,14 @@ std::string Without(std::string text, const char* characters) {
     return text;
 }
 
-// An answer, with a byte for zero in it. A pause counts once, and where the reply is still read: what
-// comes behind any other would come behind the draining, with the next reply.
-std::string Answer(std::string text) {
+// An answer, with a byte for zero in it and one for the end of a line, so that a mutation has to hit
+// one byte for these. A pause counts once, and where the reply is still read: what comes behind any
+// other would come behind the draining, with the next reply.
+std::string Answer(const std::string& input) {
+    std::string text;
+    for (const char c : input) {
+        text += c == '\x05' ? "\r\n" : std::string(1, c);
+    }
     const size_t first = text.find(ModemLine::kPause);
     const size_t kept = first < 1000 ? first + 1 : 0;
     std::replace(text.begin(), text.end(), '\x04', '\0');
