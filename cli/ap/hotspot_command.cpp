@@ -26,8 +26,8 @@ namespace {
 std::string NewKey() {
     constexpr char kLetters[] = "acdefhjkmnprtwxy";
     unsigned char random[16];
-    std::ifstream source("/dev/urandom",
-                         std::ios::binary);  // kernels before 3.17 have no call for it
+    // From the file, as kernels before 3.17 have no getrandom().
+    std::ifstream source("/dev/urandom", std::ios::binary);
     if (!source.read(reinterpret_cast<char*>(random), sizeof random)) {
         throw CommandError(kFailure, "the kernel gives no random numbers for a key");
     }
