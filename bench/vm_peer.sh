@@ -1,11 +1,14 @@
 #!/bin/bash
 # SPDX-License-Identifier: MIT
-# What scripts/test-vm peer runs: the modem service beside ModemManager, with the same modem in the same guest, one
-# after the other. Of the two list commands, ours asks the modem anew.
+# What scripts/test-vm peer runs: the modem service and ModemManager in turns, with the same modem in the same guest. Each
+# is started, has the modem plugged in and out, and is ended. Prints samples for bench/compare/report. The file
+# build/compare/turns says how many turns.
 # shellcheck source=tests/vm/common.sh
 . "$(dirname "$0")/../tests/vm/common.sh"
 # shellcheck source=tests/vm/gadget.sh
 . "$(dirname "$0")/../tests/vm/gadget.sh"
+turns=$(cat "$checkout/build/compare/turns" 2>/dev/null || echo 1)
+samples=/run/samples
 
 our_bus() {
     gdbus call --session -d com.merilond.usbmodem -o / -m com.merilond.usbmodem.GetUSBModemList
@@ -26,82 +29,62 @@ we_list_none() {
 they_list_none() {
     [ "$(their_bus)" = "(@a{oa{sa{sv}}} {},)" ]
 }
+# What is listed first has not been looked at.
+we_know() {
+    gdbus call --session -d com.merilond.usbmodem.Objects -o /com/merilond/usbmodem \
+        -m org.freedesktop.DBus.ObjectManager.GetManagedObjects | grep LastLook | grep -qv "'LastLook': <uint64 0>"
+}
 
-# take NAME COMMAND...: writes how many seconds the command takes.
+sample() { # ROW UNIT WHOSE VALUE
+    printf 'SAMPLE\tvirtual machine: %s\t%s\t%s\t%s\n' "$@" >>$samples
+}
+
+# take ROW WHOSE COMMAND...: samples how long the command takes.
 take() {
-    local name=$1 start=$EPOCHREALTIME
-    shift
+    local row=$1 whose=$2 start=$EPOCHREALTIME
+    shift 2
     "$@" >/dev/null
-    awk "BEGIN { print $EPOCHREALTIME - $start }" >"/run/peer/$name"
+    sample "$row" s "$whose" "$(awk "BEGIN { print $EPOCHREALTIME - $start }")"
 }
 
-five_times() {
-    for _ in 1 2 3 4 5; do
-        "$@"
-    done
-}
-
-resident_memory() { # PROGRAM, in MB
-    awk '$1 == "VmRSS:" { print $2 / 1024 }' "/proc/$(pgrep -x "$1")/status"
-}
-
-# measure WHO BUS LISTED GONE LIST PROGRAM
-measure() {
+measure() { # WHOSE PROGRAM LISTED KNOWN GONE LIST
     plug
-    take "$1.plug" wait_for 120 "$3"
-    take "$1.call" five_times "$2"
+    take "plug to listed" "$1" wait_for 120 "$3"
+    wait_for 60 "$4"
     # shellcheck disable=SC2086 # words of a command
-    take "$1.list" five_times $5
-    resident_memory "$6" >"/run/peer/$1.memory"
+    take "command line: list, with a modem" "$1" $6
+    sample "daemon: resident memory, with a modem" MB "$1" \
+        "$(awk '$1 == "VmRSS:" { print $2 / 1024 }' "/proc/$(pgrep -x "$2")/status")"
     unplug
-    take "$1.unplug" wait_for 60 "$4"
+    take "unplug to noticed" "$1" wait_for 60 "$5"
+    pkill -x "$2"
+    wait_for 10 ended "$2"
 }
 
-measures_ours() {
+turn() {
+    : >$samples
     usbmodemd
-    measure ours our_bus we_list we_list_none "taviwireless modem list" usbmodemd
-    pkill -x usbmodemd
-    wait_for 10 ended usbmodemd
-}
-
-measures_theirs() {
-    mkdir -p /run/dbus
-    dbus-daemon --system --fork
-    wait_for 20 their_bus # starts it
-    measure theirs their_bus they_list they_list_none "mmcli -L" ModemManager
-    pkill -x ModemManager
-    wait_for 10 ended ModemManager
-}
-
-row() { # NAME TITLE UNIT DIVISOR
-    awk -v ours="$(cat "/run/peer/ours.$1")" -v theirs="$(cat "/run/peer/theirs.$1")" -v title="$2" -v unit="$3" \
-        -v divisor="$4" 'BEGIN {
-            printf "    %-30s %8.2f %-2s %8.2f %-2s %8.2f\n",
-                title, ours / divisor, unit, theirs / divisor, unit, ours / theirs
-        }'
+    measure taviwireless usbmodemd we_list we_know we_list_none "taviwireless modem list"
+    their_bus >/dev/null # starts it
+    measure ModemManager ModemManager they_list true they_list_none "mmcli -L"
 }
 
 set_up() {
-    mkdir -p /run/peer
     make_gadget
     unplug || true # by the group before, perhaps
     pkill -x usbmodemd || true
     pkill -x modemsim || true
     wait_for 10 ended modemsim
     start_modem imsi=262019876543210
+    mkdir -p /run/dbus
+    dbus-daemon --system --fork
+    wait_for 20 their_bus
 }
 
 DBUS_SESSION_BUS_ADDRESS=$(dbus-daemon --session --fork --print-address)
 export DBUS_SESSION_BUS_ADDRESS
 scenario "a modem for both" set_up
-[ "$scenario_status" = 0 ] || exit 0
-scenario "measures usbmodemd" measures_ours
-ours=$scenario_status
-scenario "measures ModemManager" measures_theirs
-[ "$ours" = 0 ] && [ "$scenario_status" = 0 ] || exit 0
-printf '    %-30s %11s %11s %8s\n' "" usbmodemd ModemManager ratio
-row plug "plug to listed" s 1
-row call "list call on the bus" s 5
-row list "modem list and mmcli -L" s 5
-row memory "resident memory" MB 1
-row unplug "unplug to noticed" s 1
+for ((n = 1; n <= turns && scenario_status == 0; n++)); do
+    scenario "turn $n of $turns" turn
+    [ "$scenario_status" != 0 ] || cat $samples
+done

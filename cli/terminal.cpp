@@ -29,10 +29,13 @@ bool Steers(gunichar code) {
            type == G_UNICODE_PARAGRAPH_SEPARATOR || isDirection;
 }
 
+bool ShowsMoreThanASCII() {
+    return isatty(STDOUT_FILENO) == 0 || ShowsUTF8();
+}
+
 }  // namespace
 
 std::string Printable(const std::string& text) {
-    const bool onlyASCII = isatty(STDOUT_FILENO) != 0 && !ShowsUTF8();
     std::string printable;
     for (size_t place = 0; place < text.size();) {
         const char* next = &text[place];
@@ -40,7 +43,7 @@ std::string Printable(const std::string& text) {
         const gunichar code = g_utf8_get_char_validated(next, left);
         const bool isValid = code < static_cast<gunichar>(-2);  // else one of two mistakes
         const auto bytes = isValid ? static_cast<size_t>(g_utf8_next_char(next) - next) : 1;
-        const bool isShown = isValid && !Steers(code) && (bytes == 1 || !onlyASCII);
+        const bool isShown = isValid && !Steers(code) && (bytes == 1 || ShowsMoreThanASCII());
         printable += isShown ? text.substr(place, bytes) : "?";
         place += bytes;
     }
