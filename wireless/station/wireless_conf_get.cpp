@@ -57,14 +57,15 @@ int TAVIWirelessConfGet(const char* section, WirelessConf* conf) {
         TAVI_LOG_ERROR("Failed to alloc memory");
         return -1;
     }
-    if (!VEXACFileExist(kSavedNetworks)) {
-        TAVI_LOG_ERROR("Configuration %s doen't exist", kSavedNetworks);
-        return -1;
-    }
     if (VEXACFileGetSection(kSavedNetworks, section, values.Address()) < 1) {
+        const int error = VEXACErrGet();
+        if (!VEXACFileExist(kSavedNetworks)) {
+            TAVI_LOG_ERROR("Configuration %s doen't exist", kSavedNetworks);
+            return -1;
+        }
         // Compatible with log readers: file and section stand in the wrong order.
         TAVI_LOG_ERROR("Not found or failed to get section: %s from %s, errno=0x%X", kSavedNetworks,
-                       section, VEXACErrGet());
+                       section, error);
         return -1;
     }
     Fill(values, section, conf);

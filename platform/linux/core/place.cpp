@@ -44,7 +44,7 @@ Place EntryOf(const std::string& directory, const std::string& path) {
         throw FileFailure();
     }
     place.owner = status.st_uid;
-    place.isShared = (status.st_mode & (S_IWOTH | S_ISVTX)) != 0;
+    place.isShared = IsShared(status);
     place.name = path.substr(directory.size());
     if (place.name.empty()) {
         throw Failure{VEXAC_ERR_IO};  // a folder

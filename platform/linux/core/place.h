@@ -2,6 +2,7 @@
 #ifndef TAVIWIRELESS_PLATFORM_LINUX_CORE_PLACE_H
 #define TAVIWIRELESS_PLATFORM_LINUX_CORE_PLACE_H
 
+#include <sys/stat.h>
 #include <sys/types.h>
 
 #include <string>
@@ -23,6 +24,11 @@ struct Place {
     // when it is root's or one's own.
     bool isShared = false;
 };
+
+// Whether others can put entries into the folder of this status.
+inline bool IsShared(const struct stat& folder) {
+    return (folder.st_mode & (S_IWOTH | S_ISVTX)) != 0;
+}
 
 // Follows the links at the end of the path, in a shared folder only those of root or of one's own:
 // as the kernel does where it protects links, which not every kernel is told to. Throws Failure,

@@ -109,7 +109,7 @@ void ReplacePairs(Lines& lines, const Lines& newPairs) {
 
 // Puts newLine in the place of the key's first line, or at the end of a section's lines; the key's
 // further lines go.
-void SetPair(Lines& lines, std::string_view key, const std::string& newLine) {
+void SetLine(Lines& lines, std::string_view key, const std::string& newLine) {
     bool written = false;
     for (std::string& line : lines) {
         const auto pair = ReadKey(line);
@@ -166,13 +166,12 @@ bool ReadSection(const char* file, const char* name, VEXACSzHash** hash) {
     if (section == nullptr) {
         return false;
     }
-    std::set<std::string> seen;
-    for (const std::string& line : Split(text.Read(section->begin, section->end))) {
-        const auto pair = ReadKey(line);
-        if (pair && seen.insert(std::string(pair->key)).second &&
-            VEXACSzHashSetValue(hash, std::string(pair->key).c_str(),
-                                std::string(pair->value).c_str()) != 0) {
-            throw Failure{VEXAC_ERR_OUT_OF_MEMORY};
+    const std::string lines = text.Read(section->begin, section->end);
+    std::set<std::string_view> seen;
+    for (std::string_view rest = lines; !rest.empty();) {
+        const auto pair = ReadKey(TakeLine(&rest));
+        if (pair && seen.insert(pair->key).second) {
+            SetPair(**hash, pair->key, pair->value);
         }
     }
     return true;
@@ -285,7 +284,7 @@ int VEXACFileSetSectionValue(const char* file, const char* section, const char* 
         CheckSectionName(section);
         const std::string line = FormatPair(PairFormat(format), key, value);
         ChangeText(file, IfMissing::kCreate, [&](std::string* text) {
-            if (!ChangeSection(text, section, [&](Lines& lines) { SetPair(lines, key, line); })) {
+            if (!ChangeSection(text, section, [&](Lines& lines) { SetLine(lines, key, line); })) {
                 AppendSection(text, section, {line});
             }
         });

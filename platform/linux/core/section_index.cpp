@@ -49,21 +49,28 @@ bool IsSettled(const struct stat& status, const timespec& now) {
 }  // namespace
 
 SectionIndex::SectionIndex(std::string_view text) {
-    std::string_view rest = text;
-    while (!rest.empty()) {
-        const size_t lineBegin = text.size() - rest.size();
-        if (auto name = ReadHeader(TakeLine(&rest))) {
+    // Only lines that hold a "[" are looked at.
+    for (size_t bracket = text.find('['); bracket != text.npos;) {
+        const size_t lineBegin = text.rfind('\n', bracket) + 1;
+        std::string_view rest = text.substr(lineBegin);
+        auto name = ReadHeader(TakeLine(&rest));
+        const size_t lineEnd = text.size() - rest.size();
+        if (name) {
             if (!sections_.empty()) {
                 sections_.back().end = lineBegin;
             }
-            firstByName_.emplace(*name, sections_.size());
-            sections_.push_back({std::move(*name), text.size() - rest.size(), text.size()});
+            sections_.push_back({std::move(*name), lineEnd, text.size()});
         }
+        bracket = text.find('[', lineEnd);
+    }
+    firstByName_.reserve(sections_.size());
+    for (size_t i = 0; i < sections_.size(); ++i) {
+        firstByName_.emplace(sections_[i].name, i);
     }
 }
 
 const Section* SectionIndex::Find(const std::string& name) const {
-    const auto exact = firstByName_.find(name);
+    const auto exact = firstByName_.find(std::string_view(name));
     if (exact != firstByName_.end()) {
         return &sections_[exact->second];
     }

@@ -23,6 +23,8 @@ class SectionIndex {
   public:
     SectionIndex() = default;
     explicit SectionIndex(std::string_view text);
+    SectionIndex(SectionIndex&&) = default;
+    SectionIndex& operator=(SectionIndex&&) = default;
 
     const std::vector<Section>& Sections() const { return sections_; }
     // Null when there is none. An exact match goes before one without regard to case.
@@ -30,7 +32,7 @@ class SectionIndex {
 
   private:
     std::vector<Section> sections_;
-    std::unordered_map<std::string, size_t> firstByName_;
+    std::unordered_map<std::string_view, size_t> firstByName_;  // names of sections_
 };
 
 // The index of a file, which stands until this thread's next call. It is kept while the file stays

@@ -9,18 +9,28 @@ using namespace tavicore;
 
 namespace {
 
-void Append(VEXACSzHash* hash, std::string key, std::string value) {
-    hash->pairs.push_back({std::move(key), std::move(value)});
+void Append(VEXACSzHash& hash, std::string_view key, std::string_view value) {
+    auto& pair = hash.pairs.emplace_back();
     try {
-        auto& pair = hash->pairs.back();
-        hash->byKey.emplace(pair.key, &pair);
+        pair.key = key;
+        pair.value = value;
+        hash.byKey.emplace(pair.key, &pair);
     } catch (...) {
-        hash->pairs.pop_back();
+        hash.pairs.pop_back();
         throw;
     }
 }
 
 }  // namespace
+
+void tavicore::SetPair(VEXACSzHash& hash, std::string_view key, std::string_view value) {
+    const auto found = hash.byKey.find(key);
+    if (found != hash.byKey.end()) {
+        found->second->value = std::string(value);  // which may be a part of the old one
+    } else {
+        Append(hash, key, value);
+    }
+}
 
 VEXACSzHash* VEXACSzHashAlloc(int size) {
     return Guarded<VEXACSzHash*>(nullptr, [&] {
@@ -35,23 +45,18 @@ int VEXACSzHashSetValue(VEXACSzHash** hash, const char* key, const char* value) 
     return Guarded(-1, [&] {
         RequireAll(hash, key, value);
         RequireAll(*hash);
-        std::string copy = value;  // first, because value may be one of the hash's own
-        const auto found = (*hash)->byKey.find(key);
-        if (found != (*hash)->byKey.end()) {
-            found->second->value = std::move(copy);
-        } else {
-            Append(*hash, key, std::move(copy));
-        }
+        SetPair(**hash, key, value);
         return 0;
     });
 }
 
 const char* VEXACSzHashGetValue(const VEXACSzHash* hash, const char* key) {
-    return Guarded<const char*>(nullptr, [&] {
+    return Guarded<const char*>(nullptr, [&]() -> const char* {
         RequireAll(hash, key);
         const auto found = hash->byKey.find(key);
         if (found == hash->byKey.end()) {
-            throw Failure{VEXAC_ERR_NOT_FOUND};
+            VEXACErrSet(VEXAC_ERR_NOT_FOUND);  // not thrown: most sections lack a key
+            return nullptr;
         }
         return found->second->value.c_str();
     });

@@ -18,4 +18,11 @@ struct VEXACSzHash {
     std::unordered_map<std::string_view, Pair*> byKey;
 };
 
+namespace tavicore {
+
+// As VEXACSzHashSetValue; throws when there is no memory.
+void SetPair(VEXACSzHash& hash, std::string_view key, std::string_view value);
+
+}  // namespace tavicore
+
 #endif

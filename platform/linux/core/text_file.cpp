@@ -17,6 +17,9 @@ namespace {
 // terminal taken over.
 constexpr int kCarefully = O_RDONLY | O_NOFOLLOW | O_CLOEXEC | O_NONBLOCK | O_NOCTTY;
 
+// Bytes that a changed text is mostly longer than the old one at most.
+constexpr size_t kRoomForMore = 4096;
+
 void WriteAll(int descriptor, std::string_view text) {
     while (!text.empty()) {
         const ssize_t count = write(descriptor, text.data(), text.size());
@@ -25,6 +28,15 @@ void WriteAll(int descriptor, std::string_view text) {
         }
         text.remove_prefix(count > 0 ? static_cast<size_t>(count) : 0);
     }
+}
+
+// Whether a file that is no link would be read wherever it stood, or does not stand where others
+// can put it.
+bool IsPlain(const struct stat& status, const std::string& path) {
+    struct stat folder {};
+    return taviwireless::IsTrustedOwner(status.st_uid) &&
+           (status.st_size <= taviwireless::kTrustedFileLimit ||
+            (stat(path.substr(0, path.rfind('/') + 1).c_str(), &folder) == 0 && !IsShared(folder)));
 }
 
 Place FindForWriting(const char* path, IfMissing ifMissing) {
@@ -112,7 +124,14 @@ class LockedPlace {
 
 }  // namespace
 
-TextFile::TextFile(const char* path) : TextFile(FindPlace(path)) {}
+// Most files are plain, and then there is no place to be found.
+TextFile::TextFile(const char* path) : file_(open(path, kCarefully)) {
+    const bool isPlain = file_ && fstat(file_.Get(), &status_) == 0 && S_ISREG(status_.st_mode) &&
+                         IsPlain(status_, path);
+    if (!isPlain) {
+        *this = TextFile(FindPlace(path));
+    }
+}
 
 TextFile::TextFile(const Place& place)
     : file_(place.isShared
@@ -169,7 +188,9 @@ void ChangeText(const char* path, IfMissing ifMissing,
         throw Failure{VEXAC_ERR_NOT_FOUND};
     }
     const std::string oldText = old ? old->Read() : std::string();
-    std::string text = oldText;
+    std::string text;
+    text.reserve(oldText.size() + kRoomForMore);
+    text = oldText;
     change(&text);
     if (!old || text != oldText) {
         place.Replace(text, old ? &old->Status() : nullptr);
