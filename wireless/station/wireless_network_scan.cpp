@@ -7,10 +7,12 @@
 #include <cctype>
 #include <cerrno>
 #include <cstdio>
+#include <cstdlib>
 #include <cstring>
 #include <optional>
 #include <string>
 #include <string_view>
+#include <utility>
 
 #include "base/sleep_out.h"
 #include "common/log.h"
@@ -54,10 +56,49 @@ std::string_view ColumnsFrom(std::string_view line, size_t column) {
     return line.substr(std::min(column, line.size()));
 }
 
+// Reads one item after the other as sscanf() does, which takes most of the time of a long table.
+class Items {
+  public:
+    explicit Items(const char* text) : rest_(text) {}
+
+    // As "%d".
+    bool Number(int& number) {
+        char* end = nullptr;
+        number = static_cast<int>(strtol(rest_, &end, 10));
+        const char* const begin = std::exchange(rest_, end);
+        return end != begin;
+    }
+    // As "%x".
+    bool Hex(unsigned char& byte) {
+        char* end = nullptr;
+        byte = static_cast<unsigned char>(strtoul(rest_, &end, 16));
+        const char* const begin = std::exchange(rest_, end);
+        return end != begin;
+    }
+    bool Colon() {
+        const bool isThere = *rest_ == ':';
+        rest_ += isThere ? 1 : 0;
+        return isThere;
+    }
+    // As "%31s".
+    bool Word(char (&word)[kWordSize]) {
+        rest_ += strspn(rest_, kWhiteSpace);
+        const size_t size = std::min(strcspn(rest_, kWhiteSpace), kWordSize - 1);
+        word[std::string_view(rest_, size).copy(word, size)] = '\0';
+        rest_ += size;
+        return size > 0;
+    }
+
+  private:
+    static constexpr char kWhiteSpace[] = " \t\n\v\f\r";
+    const char* rest_;
+};
+
 // A channel of five digits leaves no blank before the ESSID, which may begin with one.
-std::string ChannelColumns(std::string_view line) {
+bool ParseChannel(std::string_view line, int& channel) {
     const bool isFull = isdigit(static_cast<unsigned char>(line[kEssidColumn - 1])) != 0;
-    return std::string(isFull ? line.substr(0, kEssidColumn) : line);
+    return isFull ? Items(std::string(line.substr(0, kEssidColumn)).c_str()).Number(channel)
+                  : Items(line.data()).Number(channel);
 }
 
 // Reads the ESSID. False when it is blank: the network hides its name.
@@ -81,28 +122,28 @@ void ParseSecurity(const char* security, WirelessNetwork& network) {
         network.encrypt = WIRELESS_ENCRYPT_WEP;
         return;
     }
-    char auth[kWordSize];
-    char encrypt[kWordSize];
-    if (sscanf(security, " %31[^/]/%31s", auth, encrypt) < 2) {
+    const char* slash = strchr(security, '/');
+    if (slash == nullptr || slash == security || slash[1] == '\0') {
         TAVI_LOG_ERROR("Failed to parse security field '%s'", security);
         return;
     }
-    network.auth = TAVIWirelessAuthParse(auth);
-    network.encrypt = TAVIWirelessEncryptParse(encrypt);
+    network.auth = TAVIWirelessAuthParse(std::string(security, slash).c_str());
+    network.encrypt = TAVIWirelessEncryptParse(slash + 1);
 }
 
 // columns begin with the address.
 bool ParseAddressAndMore(const char* columns, WirelessNetwork& network) {
-    constexpr int kItems = 9;
-    unsigned bssid[6];
+    Items items(columns);
+    for (unsigned char& byte : network.bssid) {
+        if ((&byte != network.bssid && !items.Colon()) || !items.Hex(byte)) {
+            return false;
+        }
+    }
     char protocol[kWordSize];
     char security[kWordSize];
-    if (sscanf(columns, " %x:%x:%x:%x:%x:%x %d %31s %31s", &bssid[0], &bssid[1], &bssid[2],
-               &bssid[3], &bssid[4], &bssid[5], &network.signal, protocol, security) < kItems) {
+    if (!items.Number(network.signal) || !items.Word(protocol) || !items.Word(security)) {
         return false;
     }
-    std::transform(bssid, bssid + 6, network.bssid,
-                   [](unsigned group) { return static_cast<unsigned char>(group); });
     network.protocol = TAVIWirelessProtocolParse(protocol);
     ParseSecurity(security, network);
     return true;
@@ -115,7 +156,7 @@ std::optional<WirelessNetwork> ParseLine(const char* text) {
         return std::nullopt;
     }
     WirelessNetwork network{};
-    if (sscanf(ChannelColumns(line).c_str(), " %d", &network.channel) < 1) {
+    if (!ParseChannel(line, network.channel)) {
         TAVI_LOG_ERROR("Failed to parse channel(%s)", text);
         return std::nullopt;
     }
