@@ -57,8 +57,8 @@ bool EndsWell(pid_t pid, int limit) {
 }
 
 bool AwaitPidFile(const Program& program) {
-    constexpr int kMostLooks = 200;
-    constexpr useconds_t kPause = 50000;  // µs
+    constexpr int kMostLooks = 5000;
+    constexpr useconds_t kPause = 2000;  // µs
     struct stat status {};
     for (int i = 0; i < kMostLooks; ++i) {
         if (stat(program.pidFile.c_str(), &status) == 0 && status.st_size > 0) {
@@ -120,6 +120,9 @@ void Start(const Program& program) {
 }
 
 void Stop(const Program& program) {
+    if (access(program.pidFile.c_str(), F_OK) != 0 && errno == ENOENT) {
+        return;  // it did not run
+    }
     const Outcome outcome = Run({kStopProgram, program.name, program.pidFile}, kStopLimit);
     if (!outcome.isDone) {
         throw Error("cannot end " + program.name + " on " + program.interface + ": " +

@@ -145,8 +145,8 @@ void AwaitRadios(const Plan& plan, const State& wanted) {
             radios.insert(name);
         }
     }
-    constexpr int kMostLooks = 100;
-    constexpr useconds_t kPause = 100000;  // µs
+    constexpr int kMostLooks = 500;
+    constexpr useconds_t kPause = 20000;  // µs
     for (int i = 0; i < kMostLooks && Runs(Hostapd(plan.settings.interface)) &&
                     !FirstDifference(wanted, radios).empty();
          ++i) {
