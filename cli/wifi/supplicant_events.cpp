@@ -3,14 +3,12 @@
 
 #include <poll.h>
 #include <sys/socket.h>
-#include <sys/un.h>
 
 #include <system_error>
 
-#include "base/fixed_field.h"
 #include "base/unique_fd.h"
 #include "cli/adapter/requirements.h"
-#include "wireless/rules/paths.h"
+#include "wireless/system/supplicant_socket.h"
 
 namespace taviwireless::cli {
 
@@ -30,23 +28,6 @@ constexpr Reason kReasons[] = {
 };
 constexpr char kPing[] = "PING";  // it answers
 constexpr char kEnd[] = "CTRL-EVENT-TERMINATING";
-
-// A socket to which the supplicant sends its events; none while it does not run.
-UniqueFd Attach() {
-    UniqueFd handle(socket(AF_UNIX, SOCK_DGRAM | SOCK_CLOEXEC, 0));
-    sockaddr_un own{};
-    own.sun_family = AF_UNIX;
-    sockaddr_un supplicant = own;
-    CopyField(supplicant.sun_path, wireless::kSupplicantSockets + ("/" + WifiInterface()));
-    constexpr char kAttach[] = "ATTACH";
-    // An address of its own without a file, which the kernel chooses.
-    const bool isAttached =
-        handle &&
-        bind(handle.Get(), reinterpret_cast<sockaddr*>(&own), sizeof own.sun_family) == 0 &&
-        connect(handle.Get(), reinterpret_cast<sockaddr*>(&supplicant), sizeof supplicant) == 0 &&
-        send(handle.Get(), kAttach, sizeof kAttach - 1, MSG_DONTWAIT) > 0;
-    return isAttached ? std::move(handle) : UniqueFd();
-}
 
 }  // namespace
 
@@ -76,7 +57,7 @@ void SupplicantEvents::Stop() {
 void SupplicantEvents::Listen() {
     constexpr int kPause = 20;  // ms
     do {
-        if (const UniqueFd handle = Attach(); handle) {
+        if (const UniqueFd handle = wireless::AttachToSupplicant(WifiInterface()); handle) {
             Hear(handle.Get());
         }
     } while (!IsOver(kPause));

@@ -3,12 +3,15 @@
 // is undone. kill() can be made to fail.
 #include <fcntl.h>
 #include <signal.h>
+#include <sys/socket.h>
 #include <sys/syscall.h>
+#include <sys/un.h>
 #include <tavicore/error.h>
 #include <unistd.h>
 
 #include <cerrno>
 #include <regex>
+#include <thread>
 
 #include "base/unique_fd.h"
 #include "tests/support/sleep_capture.h"
@@ -139,6 +142,32 @@ TEST(Connect, PollsFifteenTimesForTheWholeWord) {
         EXPECT_EQ(station.tools.Commands().back(), result != 0 ? kTerminate : kStatus);
         EXPECT_EQ(Exists(kRecord), result == 0);
     }
+}
+
+TEST(Connect, WaitsNoLongerOnceTheSupplicantTellsThatItIsConnected) {
+    Station station;
+    WriteFile("/tmp/state", "wpa_state=ASSOCIATING");
+    sockaddr_un address{AF_UNIX, "/var/run/wpa_supplicant/wlan0"};
+    Shell("mkdir -p /var/run/wpa_supplicant");
+    const UniqueFd supplicant(socket(AF_UNIX, SOCK_DGRAM, 0));
+    ASSERT_EQ(bind(supplicant.Get(), reinterpret_cast<sockaddr*>(&address), sizeof address), 0);
+    std::thread answering([&] {
+        sockaddr_un client{};
+        socklen_t size = sizeof client;
+        char request[16] = "";
+        auto* const to = reinterpret_cast<sockaddr*>(&client);
+        recvfrom(supplicant.Get(), request, sizeof request, 0, to, &size);
+        WriteFile("/tmp/state", "wpa_state=COMPLETED");
+        for (const std::string answer : {"OK\n", "<3>CTRL-EVENT-CONNECTED - Connection to"}) {
+            sendto(supplicant.Get(), answer.data(), answer.size(), 0, to, size);
+        }
+    });
+    const SleepCapture sleeps;
+    WirelessConf conf = MakeConf();
+    EXPECT_EQ(TAVIWirelessNetworkConnect(&conf), 0);
+    EXPECT_EQ(sleeps.Calls(), std::vector<unsigned>{1});
+    shutdown(supplicant.Get(), SHUT_RDWR);  // it may never have been asked
+    answering.join();
 }
 
 TEST(Connect, FailsCleanlyAndNeverLeavesTheFlag) {

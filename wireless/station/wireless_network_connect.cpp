@@ -1,13 +1,18 @@
 // SPDX-License-Identifier: MIT
 // Joining a network with wpa_supplicant.
+#include <poll.h>
+#include <sys/socket.h>
 #include <tavicore/file.h>
 #include <tavicore/keyvalue.h>
 #include <tavisdk/service.h>
 #include <taviwireless/wireless.h>
 
+#include <algorithm>
+#include <chrono>
 #include <cstring>
 #include <sstream>
 #include <string>
+#include <thread>
 
 #include "base/sleep_out.h"
 #include "base/trusted_file.h"
@@ -19,6 +24,7 @@
 #include "wireless/system/guarded.h"
 #include "wireless/system/interface.h"
 #include "wireless/system/shell.h"
+#include "wireless/system/supplicant_socket.h"
 
 namespace taviwireless::wireless {
 
@@ -69,9 +75,37 @@ bool IsAssociated() {
            strcmp(state, "COMPLETED") == 0;
 }
 
-bool WaitForAssociation() {
+// Waits a second, or until the supplicant tells that it is connected.
+void AwaitConnection(const UniqueFd& events) {
+    using std::chrono::milliseconds;
+    using Clock = std::chrono::steady_clock;
+    const auto end = Clock::now() + std::chrono::seconds(1);
+    char text[2048] = "";
+    for (milliseconds left(1000); left.count() > 0 && strstr(text, "EVENT-CONNECTED") == nullptr;
+         left = std::chrono::ceil<milliseconds>(end - Clock::now())) {
+        pollfd event{events.Get(), POLLIN, 0};
+        if (poll(&event, 1, static_cast<int>(left.count())) > 0) {
+            const ssize_t size = recv(events.Get(), text, sizeof text - 1, MSG_DONTWAIT);
+            text[std::max<ssize_t>(size, 0)] = '\0';
+            if (size <= 0) {  // the supplicant has ended
+                std::this_thread::sleep_until(end);
+            }
+        }
+    }
+}
+
+// The first second is always waited for: only then has the supplicant begun.
+bool WaitForAssociation(const std::string& interface) {
+    UniqueFd events;
     for (int i = 0; i < kPolls; ++i) {
-        SleepOut(1);
+        if (i > 0 && !events) {
+            events = AttachToSupplicant(interface);
+        }
+        if (events) {
+            AwaitConnection(events);
+        } else {
+            SleepOut(1);
+        }
         if (IsAssociated()) {
             return true;
         }
@@ -114,7 +148,7 @@ int Connect(const std::string& interface, const WirelessConf* conf) {
     if (VEXACFileExist(kSupplicantPidFile) && !StopSupplicant()) {
         return -1;
     }
-    if (!StartSupplicant(interface) || !WaitForAssociation()) {
+    if (!StartSupplicant(interface) || !WaitForAssociation(interface)) {
         return -1;
     }
     if (!RecordConnection(conf->network)) {
