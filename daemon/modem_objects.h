@@ -2,38 +2,26 @@
 #ifndef TAVIWIRELESS_DAEMON_MODEM_OBJECTS_H
 #define TAVIWIRELESS_DAEMON_MODEM_OBJECTS_H
 
-#include <gio/gio.h>
-#include <taviwireless/usbmodem.h>
+#include <dbus/dbus.h>
+#include <glib.h>
 
 #include <atomic>
-#include <cstdint>
-#include <ctime>
 #include <functional>
 #include <map>
 #include <memory>
+#include <mutex>
+#include <set>
 #include <string>
 #include <thread>
 #include <vector>
 
+#include "daemon/modem_state.h"
+#include "daemon/property.h"
+
 namespace taviwireless::daemon {
 
-// What the object of a modem shows.
-struct ModemState {
-    std::string id;
-    bool answers = false;
-    usbmodem_lib::KnownModem known;
-    time_t lastLook = 0;  // 0: never
-    time_t dialledAt = 0;
-    std::uint64_t bytesSent = 0;
-    std::uint64_t bytesReceived = 0;
-};
-
-// All that can be told of a modem without asking it.
-ModemState StateOf(const usbmodem_lib::USBModem& modem, time_t lastLook);
-
 // The objects of modem_objects.xml, on a bus connection and a thread of their own: so they answer
-// while the main loop waits for a modem. The two threads share nothing but the work that one leaves
-// for the other.
+// while the main loop waits for a modem. The two threads share what the objects show.
 class ModemObjects {
   public:
     // Ends a call of Look or Command: with an empty name it succeeded, and the text is what Command
@@ -52,38 +40,48 @@ class ModemObjects {
     ModemObjects& operator=(const ModemObjects&) = delete;
 
     // Makes the objects what these modems are. What did not change is not sent.
-    void Publish(std::vector<ModemState> modems);
+    void Publish(const std::vector<ModemState>& modems);
 
     // Whether somebody who has called the objects is still on the bus.
     bool HasClients() const { return hasClients_; }
 
   private:
-    static gboolean HandleLook(GDBusInterfaceSkeleton* modem, GDBusMethodInvocation* call,
-                               gpointer self);
-    static gboolean HandleCommand(GDBusInterfaceSkeleton* modem, GDBusMethodInvocation* call,
-                                  const char* command, gpointer self);
-    static GDBusMessage* NoteCaller(GDBusConnection* connection, GDBusMessage* message,
-                                    gboolean isIncoming, gpointer self);
-    void Run();
-    void Show(const std::vector<ModemState>& modems);
-    void Export(const std::string& id, GDBusInterfaceSkeleton* modem);
+    struct Method;
+    using Message = std::shared_ptr<DBusMessage>;
+
+    static const Method* FindMethod(const Message& call);
+    static DBusHandlerResult Handle(DBusConnection* connection, DBusMessage* call, void* self);
+    static DBusHandlerResult NoteCaller(DBusConnection* connection, DBusMessage* message,
+                                        void* self);
+    void Serve(const Message& call);
+    void Introspect(const Message& call);
+    void Get(const Message& call);
+    void GetAll(const Message& call);
+    void Set(const Message& call);
+    void GetManagedObjects(const Message& call);
+    void Look(const Message& call);
+    void Command(const Message& call);
+    const Properties* PropertiesFor(const Message& call, const std::string& interface) const;
+    const Property* FindProperty(const Message& call) const;
+    void TellChanges(const std::string& id, const Properties& before, const Properties& now) const;
+    void TellAdded(const std::string& id, const Properties& properties) const;
+    void TellRemoved(const std::string& id) const;
+    Reply ReplyTo(const Message& call) const;
+    void Refuse(const Message& call, const std::string& error, const std::string& sentence) const;
+    void Answer(const Message& call, const Message& reply) const;
+    void Send(const Message& message) const;
     void AddClient(const std::string& name);
     void DropClient(const std::string& name);
-
-    template <typename Object, typename Deleter = void (*)(gpointer)>
-    using Owned = std::unique_ptr<Object, Deleter>;
 
     OnLook onLook_;
     OnCommand onCommand_;
     std::atomic<bool> hasClients_{false};
-    Owned<GDBusConnection> connection_{nullptr, g_object_unref};
-    guint filter_ = 0;
-    Owned<GMainContext, void (*)(GMainContext*)> context_;
-    Owned<GMainLoop, void (*)(GMainLoop*)> loop_;
-    // These belong to the thread.
-    Owned<GDBusObjectManagerServer> manager_{nullptr, g_object_unref};
-    std::map<std::string, Owned<GDBusInterfaceSkeleton>> modems_;
-    std::map<std::string, guint> clients_;  // unique names, and what watches for their end
+    std::unique_ptr<GMainContext, void (*)(GMainContext*)> context_;
+    std::unique_ptr<GMainLoop, void (*)(GMainLoop*)> loop_;
+    std::unique_ptr<DBusConnection, void (*)(DBusConnection*)> connection_;
+    std::mutex mutex_;                          // of what follows, and of the order of signals
+    std::map<std::string, Properties> modems_;  // by device id
+    std::set<std::string> clients_;             // unique names; of the thread alone
     std::thread thread_;
 };
 

@@ -1,5 +1,6 @@
 // SPDX-License-Identifier: MIT
 // The modems as objects on the bus: what clients that we did not write are told, and when.
+#include <gio/gio.h>
 #include <taviwireless/usbmodem_client.h>
 
 #include <algorithm>
@@ -43,13 +44,29 @@ class Monitor {
               nullptr, nullptr, nullptr)) {
         g_dbus_connection_signal_subscribe(connection_, kName, nullptr, nullptr, nullptr, nullptr,
                                            G_DBUS_SIGNAL_FLAGS_NONE, Take, this, nullptr);
-        g_variant_unref(g_dbus_connection_call_sync(
-            connection_, kName, kPath, "org.freedesktop.DBus.ObjectManager", "GetManagedObjects",
-            nullptr, nullptr, G_DBUS_CALL_FLAGS_NONE, -1, nullptr, nullptr));
+        g_variant_unref(Call("", "org.freedesktop.DBus.ObjectManager", "GetManagedObjects", "()"));
     }
     ~Monitor() {
         g_dbus_connection_close_sync(connection_, nullptr, nullptr);
         g_object_unref(connection_);
+    }
+
+    // Calls a method below the manager, such as "/usbmodem0"; the arguments are written as gdbus
+    // takes them. Returns the reply, or the name of the error.
+    GVariant* Call(const std::string& path, const std::string& interface, const char* method,
+                   const char* arguments, std::string* error = nullptr) {
+        GError* failure = nullptr;
+        GVariant* reply = g_dbus_connection_call_sync(
+            connection_, kName, (kPath + path).c_str(), interface.c_str(), method,
+            g_variant_parse(nullptr, arguments, nullptr, nullptr, nullptr), nullptr,
+            G_DBUS_CALL_FLAGS_NONE, -1, nullptr, &failure);
+        if (failure != nullptr) {
+            char* name = g_dbus_error_get_remote_error(failure);
+            *error = name;
+            g_free(name);
+            g_error_free(failure);
+        }
+        return reply;
     }
 
     // The signals up to the one that holds this, a line each: object, name, arguments.
@@ -115,6 +132,70 @@ TEST(ModemObjects, WhatDoesNotChangeIsNotSent) {
               "('com.merilond.usbmodem.Modem', {'Signal': <uint32 2>}, [])\n");
     EXPECT_THAT(ManagedObjects(), HasSubstr("'BytesSent': <uint64 1000000>"));
     EXPECT_THAT(ManagedObjects(), HasSubstr("'LastLook': <uint64 999>"));
+}
+
+TEST(ModemObjects, AreWhatIntrospectTells) {
+    ShownModem shown;
+    Monitor monitor;
+    GVariant* text =
+        monitor.Call("/usbmodem0", "org.freedesktop.DBus.Introspectable", "Introspect", "()");
+    const char* xml = nullptr;
+    g_variant_get(text, "(&s)", &xml);
+    GDBusNodeInfo* node = g_dbus_node_info_new_for_xml(xml, nullptr);
+    std::string described;
+    for (GDBusPropertyInfo** property =
+             g_dbus_node_info_lookup_interface(node, "com.merilond.usbmodem.Modem")->properties;
+         *property != nullptr; ++property) {
+        described += std::string((*property)->name) + ' ' + (*property)->signature + '\n';
+    }
+    GVariant* all = monitor.Call("/usbmodem0", "org.freedesktop.DBus.Properties", "GetAll",
+                                 "('com.merilond.usbmodem.Modem',)");
+    GVariantIter* values = nullptr;
+    g_variant_get(all, "(a{sv})", &values);
+    std::string shownAre;
+    const char* name = nullptr;
+    for (GVariant* value = nullptr; g_variant_iter_loop(values, "{&sv}", &name, &value);) {
+        shownAre += std::string(name) + ' ' + g_variant_get_type_string(value) + '\n';
+    }
+    EXPECT_EQ(shownAre, described);
+    g_variant_iter_free(values);
+    g_variant_unref(all);
+    g_dbus_node_info_unref(node);
+    g_variant_unref(text);
+}
+
+TEST(ModemObjects, RefuseWithTheStandardErrors) {
+    const std::string properties = "org.freedesktop.DBus.Properties";
+    const std::string modem = "com.merilond.usbmodem.Modem";
+    const std::string manager = "org.freedesktop.DBus.ObjectManager";
+    const struct {
+        const char* path;
+        std::string interface;
+        const char* method;
+        const char* arguments;
+        const char* error;
+    } kCalls[] = {
+        {"/usbmodem0", properties, "Get", "('com.merilond.usbmodem.Modem', 'X')", "InvalidArgs"},
+        {"/usbmodem0", properties, "Get", "('', 'Vendor')", "InvalidArgs"},
+        {"/usbmodem0", properties, "GetAll", "('org.freedesktop.DBus.Peer',)", "InvalidArgs"},
+        {"/usbmodem0", properties, "Set", "('com.merilond.usbmodem.Modem', 'Vendor', <'x'>)",
+         "InvalidArgs"},
+        {"/usbmodem0", properties, "GetAll", "(1,)", "InvalidArgs"},
+        {"/usbmodem0", modem, "Command", "()", "InvalidArgs"},
+        {"/usbmodem0", modem, "X", "()", "UnknownMethod"},
+        {"/usbmodem0", manager, "GetManagedObjects", "()", "UnknownMethod"},
+        {"", modem, "Look", "()", "UnknownMethod"},
+        {"/usbmodem7", modem, "Look", "()", "UnknownMethod"},
+    };
+    ShownModem shown;
+    Monitor monitor;
+    for (const auto& call : kCalls) {
+        SCOPED_TRACE(std::string(call.path) + ' ' + call.method + call.arguments);
+        std::string error;
+        EXPECT_EQ(monitor.Call(call.path, call.interface, call.method, call.arguments, &error),
+                  nullptr);
+        EXPECT_EQ(error.substr(error.rfind('.') + 1), call.error);
+    }
 }
 
 TEST(ModemObjects, TextsAreValidWhateverAModemSays) {
