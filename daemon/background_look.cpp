@@ -66,20 +66,7 @@ BackgroundLook::BackgroundLook(usbmodem_lib::USBModemList& list, guint refresh,
     : list_(list),
       refresh_(refresh),
       isListenedTo_(std::move(isListenedTo)),
-      onAnswer_(std::move(onAnswer)) {
-    if (refresh_ > 0) {
-        tick_ = g_timeout_add_seconds(
-            refresh_,
-            [](gpointer data) -> gboolean {
-                auto* self = static_cast<BackgroundLook*>(data);
-                if (++self->ticks_ % kIdleFactor == 0 || self->isListenedTo_()) {
-                    self->BeginAll();
-                }
-                return G_SOURCE_CONTINUE;
-            },
-            this);
-    }
-}
+      onAnswer_(std::move(onAnswer)) {}
 
 BackgroundLook::~BackgroundLook() {
     for (const guint source : {tick_, turn_, link_}) {
@@ -109,6 +96,21 @@ void BackgroundLook::Follow() {
             Begin(modem);
         }
     }
+    if (tick_ == 0 && refresh_ > 0 && !modems_.empty()) {
+        tick_ = g_timeout_add_seconds(refresh_, Call<BackgroundLook, &BackgroundLook::Tick>, this);
+    }
+}
+
+// Ends with the last modem.
+bool BackgroundLook::Tick() {
+    if (modems_.empty()) {
+        tick_ = 0;
+        return false;
+    }
+    if (++ticks_ % kIdleFactor == 0 || isListenedTo_()) {
+        BeginAll();
+    }
+    return true;
 }
 
 // Whether SIM or connection are in another state than before.

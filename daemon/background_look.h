@@ -64,6 +64,7 @@ class BackgroundLook {
     static bool TakeState(const usbmodem_lib::USBModem& record, Modem& modem);
     void Begin(Modem& modem);
     void BeginAll();
+    bool Tick();
     bool AskNext();
     void Ask(usbmodem_lib::USBModem& record, Modem& modem);
     static void End(Modem& modem, const std::string& error, const std::string& sentence);

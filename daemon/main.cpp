@@ -33,7 +33,6 @@ constexpr char kName[] = "usbmodemd";
 constexpr char kBusLost[] = "the session bus has gone away; ending";
 constexpr char kIsServed[] = " is served by another process already; end that first";
 constexpr int kUsageError = 2;
-constexpr guint kLookPause = 5;  // seconds between looks at the modems
 
 constexpr char kDescription[] =
     "Serves the USB modems that are plugged in as com.merilond.usbmodem on the session bus.\n"
@@ -136,11 +135,6 @@ gboolean End(gpointer server) {
     return G_SOURCE_CONTINUE;
 }
 
-gboolean FindDeadPorts(gpointer modems) {
-    static_cast<ServedModems*>(modems)->FindDeadPorts();
-    return G_SOURCE_CONTINUE;
-}
-
 // Serves until a signal or the end of the bus. Returns the exit status.
 int Serve(std::optional<Background>& background) {
     int status = EXIT_SUCCESS;
@@ -164,7 +158,6 @@ int Serve(std::optional<Background>& background) {
     for (const int number : {SIGTERM, SIGINT}) {
         g_unix_signal_add(number, End, &server);
     }
-    g_timeout_add_seconds(kLookPause, FindDeadPorts, &modems);
     FeedWatchdog();
     if (background) {
         background->Ready();

@@ -20,6 +20,7 @@ namespace {
 using namespace usbmodem_lib;
 
 constexpr bool kEachWriting = true;
+constexpr guint kLookPause = 5;  // seconds between looks for dead ports
 
 std::string FileName(const std::string& path) {
     return path.substr(path.rfind('/') + 1);
@@ -63,6 +64,12 @@ ServedModems::ServedModems(USBModemList& list, unsigned int refresh)
     }
 }
 
+ServedModems::~ServedModems() {
+    if (deadPorts_ != 0) {
+        g_source_remove(deadPorts_);
+    }
+}
+
 void ServedModems::Begin() {
     ModemKeeper::EndOrphanedConnections();
     keeper_.Rescan();
@@ -98,6 +105,15 @@ void ServedModems::Update() {
     RemovePrivateSemaphoreSets(getpid());
     look_.Follow();
     stateFiles_.Begin();  // the folder may come with the first connection
+    if (deadPorts_ == 0 && list_.begin() != list_.end()) {
+        deadPorts_ = g_timeout_add_seconds(
+            kLookPause,
+            [](gpointer self) -> gboolean {
+                return static_cast<ServedModems*>(self)->FindDeadPorts() ? G_SOURCE_CONTINUE
+                                                                         : G_SOURCE_REMOVE;
+            },
+            this);
+    }
     if (!objects_) {
         return;
     }
@@ -105,7 +121,17 @@ void ServedModems::Update() {
     for (const USBModem& modem : list_) {
         states.push_back(StateOf(modem, look_.LastLook(modem)));
     }
-    objects_->Publish(std::move(states));
+    objects_->Publish(states);
+}
+
+// False when there are no modems any more.
+bool ServedModems::FindDeadPorts() {
+    if (list_.begin() == list_.end()) {
+        deadPorts_ = 0;
+        return false;
+    }
+    keeper_.LookAfterModems();
+    return true;
 }
 
 }  // namespace taviwireless::daemon

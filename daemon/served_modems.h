@@ -21,6 +21,9 @@ class ServedModems {
     // list is borrowed; refresh: see BackgroundLook. Throws std::exception when something cannot be
     // watched.
     ServedModems(usbmodem_lib::USBModemList& list, unsigned int refresh);
+    ~ServedModems();
+    ServedModems(const ServedModems&) = delete;
+    ServedModems& operator=(const ServedModems&) = delete;
 
     // Looks for modems from now on, and ends the connections of those that went meanwhile.
     void Begin();
@@ -28,13 +31,11 @@ class ServedModems {
     // To be called after each call of a method, which may have dialled or hung up.
     void HasServed();
 
-    // To be called at times.
-    void FindDeadPorts() { keeper_.LookAfterModems(); }
-
   private:
     void Command(const std::string& id, const std::string& command,
                  const ModemObjects::Reply& reply);
     void Update();
+    bool FindDeadPorts();
 
     usbmodem_lib::USBModemList& list_;
     std::unique_ptr<ModemObjects> objects_;  // null when the bus does not let us show any
@@ -43,6 +44,7 @@ class ServedModems {
     FolderWatch infoFiles_;
     FolderWatch stateFiles_;
     NetworkWatch network_;
+    unsigned int deadPorts_ = 0;  // GLib source, while there are modems
 };
 
 }  // namespace taviwireless::daemon
