@@ -4,6 +4,7 @@
 
 #include <dbus/dbus.h>
 
+#include <chrono>
 #include <functional>
 #include <string>
 
@@ -27,6 +28,8 @@ class SessionBus {
     bool IsLost() const;
 
   private:
+    using Clock = std::chrono::steady_clock;
+
     static DBusHandlerResult Look(DBusConnection* connection, DBusMessage* message, void* self);
     bool HasLeft(const char* caller);
     void Serve();
@@ -34,9 +37,10 @@ class SessionBus {
     std::function<void()> onServed_;
     std::function<void()> onLost_;
     DBusConnection* connection_;
-    unsigned int served_ = 0;  // GLib source, while one is waiting
-    unsigned int idle_ = 0;    // GLib source; while there is one, calls have been waiting
-    std::string gone_;         // the last caller that had left; names are never used again
+    unsigned int served_ = 0;      // GLib source, while one is waiting
+    unsigned int idle_ = 0;        // GLib source; while there is one, calls have been waiting
+    Clock::time_point busySince_;  // when the first of those calls came
+    std::string gone_;             // the last caller that had left; names are never used again
 };
 
 }  // namespace taviwireless::daemon
