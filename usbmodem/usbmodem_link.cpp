@@ -22,8 +22,9 @@ int USBModem::GetLinkStats() {
         TAVI_LOG_ERROR("cannot open %s: %s", pidFile.c_str(), strerror(errno));
         return -1;
     }
+    const bool wasDialled = static_cast<bool>(file);
     file.Close();
-    if (VEXACProcAliveByPidFile(pidFile.c_str()) != 1) {
+    if (!wasDialled || VEXACProcAliveByPidFile(pidFile.c_str()) != 1) {
         netStatus_ =
             connectFailedAttempts_ < 1 ? NetStatus::kDisconnected : NetStatus::kConnectionLost;
         return 0;
