@@ -3,6 +3,7 @@
 
 #include <chrono>
 #include <functional>
+#include <vector>
 
 #include "usbmodem/rules/profile.h"
 
@@ -67,15 +68,16 @@ class Document {
 };
 
 void AddProfile(Document& document, const char* indent) {
-    for (const char* key : {profile::kLocation, profile::kISP, profile::kAPN, profile::kNumber,
-                            profile::kUser, profile::kPassword}) {
-        document.Quoted(indent, key, document.Ask([key](USBModem& modem, bool& err) {
-            return modem.GetProfileWithKey(key, err);
-        }));
+    const std::vector<std::string> keys = {
+        profile::kLocation, profile::kISP,      profile::kAPN,           profile::kNumber,
+        profile::kUser,     profile::kPassword, profile::kDefaultGateway};
+    const std::vector<std::string> values = document.Ask(
+        [&keys](USBModem& modem, bool& err) { return modem.GetProfileWithKeys(keys, err); });
+    for (size_t i = 0; i + 1 < keys.size(); ++i) {
+        document.Quoted(indent, keys[i].c_str(), values[i]);
     }
     document.Bare(indent, profile::kRoaming, document.Ask(&USBModem::GetRoaming));
-    const bool takesRoute = document.Ask(&USBModem::GetProfileDefaultGW) == "true";
-    document.Last(indent, profile::kDefaultGateway, takesRoute ? "true" : "false");
+    document.Last(indent, profile::kDefaultGateway, values.back() == "true" ? "true" : "false");
 }
 
 }  // namespace

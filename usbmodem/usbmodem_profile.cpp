@@ -7,6 +7,7 @@
 #include <unistd.h>
 
 #include <cerrno>
+#include <cstring>
 
 #include "common/log.h"
 #include "common/sz_hash.h"
@@ -146,6 +147,35 @@ std::string USBModem::GetProfileWithKey(const std::string& key, bool& err) {
         err = true;
     }
     return value;
+}
+
+std::vector<std::string> USBModem::GetProfileWithKeys(const std::vector<std::string>& keys,
+                                                      bool& err) {
+    std::vector<std::string> values(keys.size());
+    if (simStatus_ == SimStatus::kBusy || simStatus_ == SimStatus::kError) {
+        return values;
+    }
+    const bool isUnknown = simStatus_ < SimStatus::kReady || simStatus_ > SimStatus::kError;
+    const bool hasProfile = InitProfile() == 0;
+    SzHash pairs(64);
+    if (hasProfile) {  // a failure shows in each key
+        VEXACFileGetSection(profilePath_.c_str(), kSection, pairs.Address());
+    }
+    for (size_t i = 0; i < keys.size(); ++i) {
+        const char* key = keys[i].c_str();
+        const char* value = pairs[key];
+        if (isUnknown) {
+            TAVI_LOG_ERROR("sim status is busy or error, cannot get key %s", key);
+            err = true;
+        }
+        if (value != nullptr && strlen(value) < profile::kValueSize) {
+            values[i] = value;
+        } else if (hasProfile) {
+            TAVI_LOG_ERROR("failed on get key value %s", key);
+            err = true;
+        }
+    }
+    return values;
 }
 
 int USBModem::SetProfilePhone(const std::string& number) {

@@ -287,6 +287,9 @@ class TAVIWIRELESS_API USBModem {
     // there is no profile and none can be made; empty with err when the profile lacks the key. A
     // SIM of unknown status sets err, but the value is read.
     std::string GetProfileWithKey(const std::string& key, bool& err);
+    // Reads several keys at once, which takes no longer than one: their values in this order, each
+    // as GetProfileWithKey returns it.
+    std::vector<std::string> GetProfileWithKeys(const std::vector<std::string>& keys, bool& err);
 
     // One key each, by SetProfileWithKey and GetProfileWithKey.
     // "number": what the modem dials.

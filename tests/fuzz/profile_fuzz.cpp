@@ -43,6 +43,9 @@ Values Read(usbmodem_lib::USBModem& modem) {
         bool err = false;
         const std::string value = modem.GetProfileWithKey(key, err);
         values[key] = err ? "(error)" : value;
+        err = false;
+        const std::string same = modem.GetProfileWithKeys({"IMSI", key}, err).back();
+        Demand(value == same, "all at once are read as one is", same);
     }
     return values;
 }

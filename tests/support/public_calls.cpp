@@ -141,7 +141,7 @@ const PublicCall kCalls[] = {
         "/var/lib/usbmodem/log")),
     MODEM(ChangePIN(kPin, kPin)), MODEM(ChangePINEnable(kPin, true)),
     MODEM(ChangePINWithPUK(kPuk, kPin)), MODEM(GetProfileWithKey("apn", err)),
-    FRESH(InitInfo("/dev/ttyUSB1")), MODEM(ModemCmd("AT+CSQ", text)),
+    MODEM(GetProfileWithKeys({"apn"}, err).at(0)), FRESH(InitInfo("/dev/ttyUSB1")), MODEM(ModemCmd("AT+CSQ", text)),
     FRESH(OpenFileDevice("/dev/ttyUSB0")), MODEM(PINSet(kPin, "", true)), MODEM(PINUnlock(kPin)),
     MODEM(PUKSet(kPuk, kPin)), MODEM(SetDefaultRoute("false")), MODEM(SetHardwareFuncLvl("1")),
     MODEM(SetProfileAPN("internet")), MODEM(SetProfileDefaultGW("false")),
