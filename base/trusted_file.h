@@ -7,6 +7,7 @@
 #include <sys/types.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <cerrno>
 #include <optional>
 #include <string>
@@ -58,19 +59,19 @@ inline std::optional<std::string> ReadTrusted(const std::string& path,
     if (!file) {
         return std::nullopt;
     }
-    std::string text(static_cast<size_t>(limit), '\0');
-    size_t length = 0;
-    while (length < text.size()) {
-        const ssize_t count = read(file.Get(), &text[length], text.size() - length);
+    std::string text;
+    char buffer[4096];
+    const auto most = static_cast<size_t>(limit);
+    while (text.size() < most) {
+        const ssize_t count = read(file.Get(), buffer, std::min(sizeof buffer, most - text.size()));
         if (count < 0 && errno != EINTR) {
             return std::nullopt;
         }
         if (count == 0) {
             break;
         }
-        length += count > 0 ? static_cast<size_t>(count) : 0;
+        text.append(buffer, count > 0 ? static_cast<size_t>(count) : 0);
     }
-    text.resize(length);
     return text;
 }
 
