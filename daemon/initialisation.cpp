@@ -2,12 +2,10 @@
 #include "daemon/initialisation.h"
 
 #include <syslog.h>
-#include <unistd.h>
 
 #include <algorithm>
 #include <utility>
 
-#include "daemon/semaphore_sets.h"
 #include "usbmodem/rules/paths.h"
 
 namespace taviwireless::daemon {
@@ -18,25 +16,6 @@ using usbmodem_lib::USBModem;
 
 constexpr guint kFirstPause = 2;     // seconds
 constexpr guint kLongestPause = 60;  // seconds
-
-// Whether the SIM is known: otherwise the next look at a running connection would take its log for
-// missing and end it. A SIM that waits for its PIN, or is missing, has nothing to tell and counts
-// as known.
-bool KnowsItsSIM(USBModem& modem) {
-    const int connection = modem.RecallConnection();
-    if (connection > 0) {
-        return true;
-    }
-    constexpr int kReady = 1;
-    constexpr int kUnknown = -1;
-    const int sim = modem.UpdateSIMStatus();
-    if (sim != kReady) {
-        return connection == 0 && sim != kUnknown;
-    }
-    bool failed = false;
-    modem.GetIMSI(failed);
-    return !failed;
-}
 
 USBModem NewRecord(int interfaceId) {
     USBModem modem(static_cast<unsigned int>(interfaceId), usbmodem_lib::InfoPath(interfaceId));
@@ -60,22 +39,18 @@ Initialisation::~Initialisation() {
 }
 
 void Initialisation::Try() {
-    probe_.emplace(interfaceId_, [this](const std::string& queryNode) { Probed(queryNode); });
+    probe_.emplace(interfaceId_, [this](const std::string& findings) { Probed(findings); });
 }
 
-void Initialisation::Probed(const std::string& queryNode) {
+void Initialisation::Probed(const std::string& findings) {
     probe_.reset();
     USBModem& modem = list_.FindUSBModem(interfaceId_);
-    if (!queryNode.empty() && modem.InitInfo(queryNode) == 0) {
-        const bool isReady = KnowsItsSIM(modem);
-        RemovePrivateSemaphoreSets(getpid());
-        if (isReady) {
-            syslog(LOG_INFO, "usbmodem%d is ready", interfaceId_);
-            const auto onReady = onReady_;
-            onReady();  // which may drop the modem, and this with it
-            return;
-        }
-        modem = NewRecord(interfaceId_);
+    if (!findings.empty() && modem.TakeOver(findings) == 0) {
+        modem.RecallConnection();
+        syslog(LOG_INFO, "usbmodem%d is ready", interfaceId_);
+        const auto onReady = onReady_;
+        onReady();  // which may drop the modem, and this with it
+        return;
     }
     syslog(LOG_WARNING, "usbmodem%d does not answer; next try in %u s", interfaceId_, pause_);
     retry_ = g_timeout_add_seconds(

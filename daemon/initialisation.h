@@ -28,7 +28,7 @@ class Initialisation {
 
   private:
     void Try();
-    void Probed(const std::string& queryNode);
+    void Probed(const std::string& findings);
 
     usbmodem_lib::USBModemList& list_;
     int interfaceId_;

@@ -25,7 +25,8 @@ constexpr int kMostAtOnce = 4;
 
 // A port that does not answer takes 1.3 s, one that talks without end 2.5 s.
 constexpr unsigned int kLimitPerPort = 3;  // seconds
-constexpr unsigned int kLimit = 10;        // seconds, for everything else
+// Seconds, for everything else: six exchanges with a modem that takes its time for each.
+constexpr unsigned int kLimit = 34;
 
 int running = 0;
 std::vector<Probe*> waiting;
@@ -42,7 +43,7 @@ unsigned int TimeLimit(const std::string& info) {
 }
 
 std::string ReadAll(const UniqueFd& output) {
-    char text[64];  // a device path
+    char text[256];  // a device path and two numbers
     const ssize_t length = read(output.Get(), text, sizeof text);
     return std::string(text, length > 0 ? static_cast<size_t>(length) : 0);
 }
@@ -113,9 +114,9 @@ void Probe::Reap(GPid process, gint status, gpointer probe) {
 
 // The call back may destroy this object, so it comes last.
 void Probe::Ended(bool answers) {
-    const std::string queryNode = answers ? ReadAll(output_) : "";
+    const std::string findings = answers ? ReadAll(output_) : "";
     const auto onEnd = onEnd_;
-    onEnd(queryNode);
+    onEnd(findings);
 }
 
 int Probe::Run(int interfaceId) {
@@ -123,11 +124,11 @@ int Probe::Run(int interfaceId) {
     alarm(TimeLimit(info));
     usbmodem_lib::USBModem modem(static_cast<unsigned int>(interfaceId),
                                  usbmodem_lib::InfoPath(interfaceId));
-    modem.SetATInterface();
-    if (modem.AssignConnectNode() != 0 || modem.AssignQuaryNode() != 0) {
+    std::string findings;
+    if (modem.MakeReady(findings) != 0) {
         return EXIT_FAILURE;
     }
-    std::fputs(modem.GetQueryNode().c_str(), stdout);
+    std::fputs(findings.c_str(), stdout);
     return EXIT_SUCCESS;
 }
 

@@ -11,13 +11,13 @@
 
 namespace taviwireless::daemon {
 
-// Finds out, in a process of its own, on which port a modem answers: a port that is silent or talks
-// without end takes seconds or minutes, in which the service could answer nobody. Few such
-// processes run at a time; the others wait for their turn.
+// Makes a modem ready in a process of its own: that takes seconds, with a port that is silent or
+// talks without end minutes, in which the service could answer nobody. Few such processes run at a
+// time; the others wait for their turn.
 class Probe {
   public:
-    // Gets the query port that answers, or an empty text.
-    using OnEnd = std::function<void(const std::string& queryNode)>;
+    // Gets what USBModem::TakeOver takes, or an empty text.
+    using OnEnd = std::function<void(const std::string& findings)>;
 
     // Starts, or waits for its turn. Calls back from the main loop.
     Probe(int interfaceId, OnEnd onEnd);
@@ -26,8 +26,7 @@ class Probe {
     Probe(const Probe&) = delete;
     Probe& operator=(const Probe&) = delete;
 
-    // What the process does: finds both ports of the modem and prints the query port. Returns its
-    // exit status.
+    // What the process does: makes the modem ready and prints its findings. Returns its exit status.
     static int Run(int interfaceId);
 
   private:

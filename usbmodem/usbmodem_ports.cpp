@@ -36,45 +36,61 @@ void Retry(Assign assign, LogFailure logFailure) {
 
 }  // namespace
 
-int USBModem::AssignConnectNode() {
-    connectNode_.clear();
+bool USBModem::ReadConnectNode() {
     const std::string number = ReadInfo(infoPath_, "CONNECTNODE");
+    connectNode_ = number.empty() ? "" : kPortPrefix + number;
     if (number.empty()) {
         TAVI_LOG_ERROR("error on parsing CONNECTNODE from %s", infoPath_.c_str());
+    }
+    return !number.empty();
+}
+
+int USBModem::AssignConnectNode() {
+    if (!ReadConnectNode()) {
         CloseFileDevice();
         return -1;
     }
-    const std::string node = kPortPrefix + number;
     std::string reply;
-    if (OpenFileDevice(node) != 0 || QuerySIMStatus(reply) != 0) {
-        TAVI_LOG_ERROR("warning: cannot test CONNECTNODE %s", node.c_str());
+    if (OpenFileDevice(connectNode_) != 0 || QuerySIMStatus(reply) != 0) {
+        TAVI_LOG_ERROR("warning: cannot test CONNECTNODE %s", connectNode_.c_str());
     }
-    connectNode_ = node;
     CloseFileDevice();
     return 0;
 }
 
 int USBModem::AssignQuaryNode() {
+    std::string reply;
+    return FindQueryNode(reply) ? 0 : -1;
+}
+
+// The reply is that to the SIM status query.
+bool USBModem::FindQueryNode(std::string& reply) {
     queryNode_.clear();
     const std::string numbers = ReadInfo(infoPath_, "DEVICENODE");
     if (numbers.empty()) {
         TAVI_LOG_ERROR("error on parsing DEVICENODE from %s", infoPath_.c_str());
-        return -1;
+        return false;
     }
     for (const std::string& number : Split(numbers, ',')) {
         const std::string node = kPortPrefix + number;
-        if (node == connectNode_ || OpenFileDevice(node) != 0) {
-            continue;
+        if (node != connectNode_ && TryQueryNode(node, reply)) {
+            return true;
         }
-        std::string reply;
-        if (QuerySIMStatus(reply) == 0) {
-            queryNode_ = node;  // and its channel stays open for all that is asked later
-            return 0;
-        }
-        CloseFileDevice();
     }
     TAVI_LOG_ERROR("Cannot find any device for quary node");
-    return -1;
+    return false;
+}
+
+bool USBModem::TryQueryNode(const std::string& node, std::string& reply) {
+    if (OpenFileDevice(node) != 0) {
+        return false;
+    }
+    if (QuerySIMStatus(reply) != 0) {
+        CloseFileDevice();
+        return false;
+    }
+    queryNode_ = node;  // and its channel stays open for all that is asked later
+    return true;
 }
 
 int USBModem::AssignConnectInfo() {
@@ -118,21 +134,29 @@ int USBModem::InitInfo() {
     return CompleteInit(FindPortsAndPrepare());
 }
 
+int USBModem::FailInit() {
+    initState_ = kInitFailed;
+    CloseFileDevice();
+    UnsetATInterface();
+    return -1;
+}
+
 int USBModem::CompleteInit(bool isPrepared) {
     if (!isPrepared) {
-        initState_ = kInitFailed;
-        CloseFileDevice();
-        UnsetATInterface();
-        return -1;
+        return FailInit();
     }
+    AskForSIM();
+    initState_ = kInited;
+    return 0;
+}
+
+void USBModem::AskForSIM() {
     UpdateSIMStatus();
     if (simStatus_ == SimStatus::kBusy || simStatus_ == SimStatus::kError) {
         TAVI_LOG_ERROR("Warning: sim error or busy detected when init");
     } else if (simStatus_ == SimStatus::kUnknown) {
         TAVI_LOG_ERROR("Warning: unexpect sim result when init");
     }
-    initState_ = kInited;
-    return 0;
 }
 
 bool USBModem::FindPortsAndPrepare() {

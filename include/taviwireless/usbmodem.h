@@ -129,6 +129,14 @@ class TAVIWIRELESS_API USBModem {
     // device path such as GetQueryNode returns: no port is searched and nothing is tried twice, so
     // that the caller is not kept waiting.
     int InitInfo(const std::string& queryNode);
+    // InitInfo for another process, which is not to be kept waiting by a modem that does not answer:
+    // nothing is tried twice, the dial port is not tested, and a SIM that was ready where the query
+    // port was found is not asked whether it is. Fails also when the SIM cannot be told: its IMSI
+    // is not read although it is ready, unless it is known from the dialler that runs.
+    // findings: set on success only: for TakeOver in the other process, once this record is gone.
+    int MakeReady(std::string& findings);
+    // InitInfo by what MakeReady found in another process: opens the query port, and asks nothing.
+    int TakeOver(const std::string& findings);
     // The query port's device path; empty while none was found.
     std::string GetQueryNode() const;
     // Whether the query port is open and still the one that its path names: false once it hung up,
@@ -398,6 +406,12 @@ class TAVIWIRELESS_API USBModem {
     bool FindPortsAndPrepare();
     bool Prepare();
     int CompleteInit(bool isPrepared);
+    int FailInit();
+    void AskForSIM();
+    bool ReadConnectNode();
+    bool TryQueryNode(const std::string& node, std::string& reply);
+    bool FindQueryNode(std::string& reply);
+    bool KnowsItsSIM();
     bool Open(const std::string& node, std::string& error);
     int Exchange(const std::string& cmd, std::string& reply);
     int QuerySIMStatus(std::string& reply);

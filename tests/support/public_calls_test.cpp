@@ -16,9 +16,9 @@ using Names = std::multiset<std::string>;
 // What no caller calls: data, destructors, and private members of classes, which stand at the end.
 const char kNotCalled[] =
     "^(vtable|typeinfo|gWireless)|~|::nullObject$|::vendorTable|Semaphore::Change\\(|USBModem::("
-    "AttemptRemain|CommandSet|CompleteInit|ComputeProfilePath|EnterP[IU][NK]|Exchange|FillDefaults|"
-    "FindPortsAndPrepare|Open|PidFilePath|Prepare|PrepareToDial|QuerySIMStatus|ReadDialSettings|"
-    "Refresh)[[(]";
+    "AskForSIM|AttemptRemain|CommandSet|CompleteInit|ComputeProfilePath|EnterP[IU][NK]|Exchange|"
+    "FailInit|FillDefaults|FindPortsAndPrepare|FindQueryNode|KnowsItsSIM|Open|PidFilePath|Prepare|"
+    "PrepareToDial|QuerySIMStatus|ReadConnectNode|ReadDialSettings|Refresh|TryQueryNode)[[(]";
 
 // The names of the commands that the help of this command lists, and of those in them.
 void AddCommands(const std::string& command, std::set<std::string>& names) {

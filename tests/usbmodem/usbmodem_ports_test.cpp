@@ -58,6 +58,34 @@ TEST(Init, AfterAFailedOneAsksForEverythingOnceInItsOrder) {
     EXPECT_EQ(modem.log.Text(), "");
 }
 
+TEST(Init, ForAnotherProcessAsksNothingTwiceAndThatOneNothingAtAll) {
+    const struct {
+        const char* sim;
+        const char* asksLast;
+        const char* status;
+        const char* imsi;
+    } kSIMs[] = {{"", "AT+CIMI", "ready", "001010123456789"},
+                 {",pin=1234", "AT+CPIN?", "pin_protect", ""}};
+    for (const auto& row : kSIMs) {
+        SCOPED_TRACE(row.sim);
+        NewModem modem(std::string("12d1,ports=dial/at") + row.sim);
+        std::string findings;
+        {
+            USBModem prober(1, kInfo1);
+            ASSERT_EQ(prober.MakeReady(findings), 0);
+        }
+        EXPECT_THAT(modem.simulator.Received("1"),
+                    ElementsAre("AT+CPIN?", "AT+CFUN?", "AT+CFUN=1", "AT^CURC?", "AT^CURC=0",
+                                row.asksLast));
+        EXPECT_EQ(modem.record.TakeOver(findings), 0);
+        EXPECT_TRUE(modem.record.IsInited());
+        EXPECT_TRUE(modem.record.IsPortAlive());
+        EXPECT_EQ(modem.record.Known().simStatus, row.status);
+        EXPECT_EQ(modem.record.Known().imsi, row.imsi);
+        EXPECT_THAT(modem.simulator.Received("1"), IsEmpty());
+    }
+}
+
 TEST(Init, TriesThreeTimesForEachPortWithASecondBetween) {
     const struct {
         const char* info;
