@@ -284,7 +284,8 @@ TEST_F(StoppedHolder, OfAWifiStoreKeepsOthersForASentence) {
     EXPECT_THAT(OthersIn("/usr/tavi/etc/.wireless.conf.lock", {cli, "wifi", "connect", "My Net"}),
                 testing::HasSubstr("connected to My Net but could not save it; "));
     InstallRootScripts();
-    WriteProgram("/usr/local/bin/flock", "#!/bin/sh\nexec /usr/bin/flock -n 9\n");  // not a minute
+    WriteProgram("/usr/local/bin/flock",  // not a minute
+                 "#!/bin/sh\nfor file; do :; done\nexec /usr/bin/flock -n $file\n");
     EXPECT_EQ(OthersIn("/var/run/usb.plug.lock", {"/usr/tavi/hotplug/usb.plug"}),
               "usb.plug: another usb.plug has had /var/run/usb.plug.lock for a minute\n");
 }

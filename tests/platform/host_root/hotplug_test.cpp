@@ -51,6 +51,9 @@ TEST_F(Hotplug, ModemHasItsInfoFileWhileItIsPluggedIn) {
     AddPort(11, "1-1", "12d1", "option", 2);
     AddPort(2, "1-2", "0403", "ftdi_sio", 2);  // a cable
     AddPort(3, "1-3", "1199", "sierra", 2);
+    // While one looks and another waits, a third leaves it to that.
+    Shell("cd /var/run; flock usb.plug.lock flock usb.plug.lock.next /usr/tavi/hotplug/usb.plug");
+    EXPECT_FALSE(Exists("/tmp/usbmodem.info0"));
     Plug();
     EXPECT_EQ(ReadFile("/tmp/usbmodem.info0"),
               "USB_ID_VENDOR=12d1\nCONNECTNODE=10\nDEVICENODE=9,10,11\nUSB_DEVICE=/tmp/usb/1-1\n");
