@@ -131,12 +131,11 @@ bool ChangeSection(std::string* text, const char* name,
     if (section == nullptr) {
         return false;
     }
-    std::string before = text->substr(0, section->begin);
-    EndLastLine(&before);  // a header may be the last line of all
-    Lines lines =
-        Split(std::string_view(*text).substr(section->begin, section->end - section->begin));
+    const size_t size = section->end - section->begin;
+    Lines lines = Split(std::string_view(*text).substr(section->begin, size));
     change(lines);
-    *text = before + Join(lines) + text->substr(section->end);
+    const bool isHeaderEnded = (*text)[section->begin - 1] == '\n';  // it may be the last line
+    text->replace(section->begin, size, (isHeaderEnded ? "" : "\n") + Join(lines));
     return true;
 }
 
@@ -155,7 +154,7 @@ bool RemoveSection(std::string* text, const char* name) {
         return ReadKey(line).has_value();
     });
     lines.erase(lines.begin(), lastPair.base());
-    *text = text->substr(0, header) + Join(lines) + text->substr(section->end);
+    text->replace(header, section->end - header, Join(lines));
     return true;
 }
 
