@@ -306,10 +306,10 @@ TAVIWIRELESS_API int TAVIWirelessCheckBlock(void);
  *
  * Writes "/usr/tavi/etc/wpa_supplicant.conf" with mode 0600, ends a supplicant that runs
  * ("/usr/sbin/wpa_cli terminate"), starts "/usr/sbin/wpa_supplicant" and asks wpa_cli every second
- * until it is associated, 15 times at most and then the supplicant is ended; after the first
- * second sooner, when the supplicant tells that it is connected. With anyBssid, or an all zero BSSID, any access
- * point of the ESSID will do. A WEP key has 5 or 13 characters, or 10 or 26 hexadecimal digits;
- * another one is left out, with a line in the log.
+ * until it is associated, 15 times at most, and then the supplicant is ended; after the first
+ * second sooner, when the supplicant tells that it is connected. With anyBssid, or an all zero
+ * BSSID, any access point of the ESSID will do. A WEP key has 5 or 13 characters, or 10 or 26
+ * hexadecimal digits; another one is left out, with a line in the log.
  *
  * When it is joined, the network is noted in "/var/tmp/.wireless_current_connection" for
  * TAVIWirelessStatusGet, the media service is restarted where "/etc/taviinfo.conf" says that it
