@@ -1,7 +1,9 @@
 // SPDX-License-Identifier: MIT
 // What the modem service costs: the round trip of a call beside one to the bus itself, the time
-// from start to service and from plugging to ready, and the daemon's memory. On a private bus in an
-// appliance root, with simulated modems.
+// from start to service and from plugging to ready, the daemon's memory and its wake-ups. On a
+// private bus in an appliance root, with simulated modems. Prints a line "NAME VALUE UNIT" for each
+// figure.
+//   service_bench [PART]      calls, start, plugging, memory, wakeups; all, if none is given
 #include <dbus/dbus.h>
 #include <signal.h>
 #include <taviwireless/usbmodem_client.h>
@@ -9,6 +11,8 @@
 #include <algorithm>
 #include <chrono>
 #include <cstdio>
+#include <cstring>
+#include <filesystem>
 #include <fstream>
 #include <functional>
 #include <optional>
@@ -24,7 +28,6 @@
 namespace {
 
 using namespace taviwireless::test;
-using taviwireless::dbus::DBusClient;
 using taviwireless::dbus::USBModemClient;
 using Clock = std::chrono::steady_clock;
 
@@ -32,72 +35,121 @@ double Milliseconds(Clock::duration time) {
     return std::chrono::duration<double, std::milli>(time).count();
 }
 
-// The median of so many runs, in milliseconds.
-double Median(int runs, const std::function<double()>& run) {
-    std::vector<double> times;
-    for (int i = 0; i < runs; ++i) {
-        times.push_back(run());
+double Median(std::vector<double> values) {
+    std::sort(values.begin(), values.end());
+    return values[values.size() / 2];
+}
+
+void Print(const std::string& name, double value, const char* unit) {
+    std::printf("%s %.3f %s\n", name.c_str(), value, unit);
+}
+
+// As an appliance runs it, and not with the short waits of the tests, which are a library more.
+std::vector<std::string> Command() {
+    return {BuiltProgram("usbmodemd"), "--foreground"};
+}
+
+// A call of a method with one argument, or none, whose reply is not looked at.
+void Call(DBusConnection* bus, const char* name, const char* path, const char* interface,
+          const char* method, const char* argument) {
+    DBusMessage* call = dbus_message_new_method_call(name, path, interface, method);
+    if (argument != nullptr) {
+        dbus_message_append_args(call, DBUS_TYPE_STRING, &argument, DBUS_TYPE_INVALID);
     }
-    std::nth_element(times.begin(), times.begin() + runs / 2, times.end());
-    return times[static_cast<size_t>(runs) / 2];
+    DBusMessage* reply = dbus_connection_send_with_reply_and_block(bus, call, -1, nullptr);
+    if (reply == nullptr) {
+        throw std::runtime_error(std::string(method) + " failed");
+    }
+    dbus_message_unref(reply);
+    dbus_message_unref(call);
 }
 
-double RoundTrip(const std::function<bool()>& call) {
-    constexpr int kRuns = 2001;
-    return Median(kRuns, [&call] {
-        const auto begin = Clock::now();
-        if (!call()) {
-            throw std::runtime_error("a call failed");
-        }
-        return Milliseconds(Clock::now() - begin);
-    });
-}
-
-void PrintRoundTrips() {
+void PrintCalls() {
     ModemSimulator simulator({"--modem", "12d1,ports=dial/at"});
-    ModemService service;
+    ModemService service(Command());
     service.Lists({"usbmodem0"});
-    DBusClient bus(DBUS_SERVICE_DBUS, DBUS_PATH_DBUS, DBUS_INTERFACE_DBUS, DBUS_BUS_SESSION);
-    USBModemClient client;
-    std::string reply;
-    const double own = RoundTrip([&] {
-        return bus.NewMessage("GetId") == 0 && bus.SendMessage(true, -1) == 0 &&
-               bus.GetReply(reply) == 0;
-    });
-    std::printf("%-34s %8.3f ms\n", "call of the bus (GetId)", own);
-    const double list = RoundTrip([&] { return client.GetUSBModemList(reply) == 0; });
-    std::printf("%-34s %8.3f ms  %4.1f times the bus's\n", "GetUSBModemList", list, list / own);
-    const double profile = RoundTrip([&] { return client.GetProfile("usbmodem0", reply) == 0; });
-    std::printf("%-34s %8.3f ms  %4.1f times the bus's, %zu bytes\n", "GetProfile", profile,
-                profile / own, reply.size());
+    DBusConnection* bus = dbus_bus_get(DBUS_BUS_SESSION, nullptr);
+    const char* kModem = "com.merilond.usbmodem";
+    const std::pair<const char*, std::function<void()>> calls[] = {
+        {"bus",
+         [&] {
+             Call(bus, DBUS_SERVICE_DBUS, DBUS_PATH_DBUS, DBUS_INTERFACE_DBUS, "GetId", nullptr);
+         }},
+        {"list", [&] { Call(bus, kModem, "/", kModem, "GetUSBModemList", nullptr); }},
+        {"profile", [&] { Call(bus, kModem, "/", kModem, "GetProfile", "usbmodem0"); }},
+        {"known_document",
+         [&] {
+             Call(bus, "com.merilond.usbmodem.Objects", "/com/merilond/usbmodem/usbmodem0",
+                  DBUS_INTERFACE_PROPERTIES, "GetAll", "com.merilond.usbmodem.Modem");
+         }},
+    };
+    constexpr int kRuns = 2001;
+    std::vector<double> times[std::size(calls)];
+    for (int i = 0; i < kRuns; ++i) {  // in turns, since the machine may have others to serve
+        for (size_t call = 0; call < std::size(calls); ++call) {
+            const auto begin = Clock::now();
+            calls[call].second();
+            times[call].push_back(Milliseconds(Clock::now() - begin));
+        }
+    }
+    const double own = Median(times[0]);
+    for (size_t call = 0; call < std::size(calls); ++call) {
+        Print(std::string("call_") + calls[call].first, Median(times[call]), "ms");
+        Print(std::string("call_") + calls[call].first + "_ratio", Median(times[call]) / own,
+              "times");
+    }
+}
+
+// Waits for the signal that the service's name has an owner, or has none any more.
+void AwaitName(DBusConnection* bus, bool isOwned) {
+    for (bool isSeen = false; !isSeen && dbus_connection_read_write(bus, -1) != FALSE;) {
+        while (DBusMessage* message = dbus_connection_pop_message(bus)) {
+            const char* name = nullptr;
+            const char* before = nullptr;
+            const char* now = nullptr;
+            isSeen =
+                isSeen ||
+                (dbus_message_is_signal(message, DBUS_INTERFACE_DBUS, "NameOwnerChanged") &&
+                 dbus_message_get_args(message, nullptr, DBUS_TYPE_STRING, &name, DBUS_TYPE_STRING,
+                                       &before, DBUS_TYPE_STRING, &now, DBUS_TYPE_INVALID) &&
+                 (*now != '\0') == isOwned);
+            dbus_message_unref(message);
+        }
+    }
 }
 
 void PrintStart() {
-    const double start = Median(21, [] {
+    DBusConnection* bus = dbus_bus_get_private(DBUS_BUS_SESSION, nullptr);
+    dbus_bus_add_match(bus, "type='signal',member='NameOwnerChanged',arg0='com.merilond.usbmodem'",
+                       nullptr);
+    dbus_connection_flush(bus);
+    std::vector<double> times;
+    for (int i = 0; i < 41; ++i) {
         const auto begin = Clock::now();
-        ModemService service;
-        const auto end = Clock::now();
-        service.Daemon().Signal(SIGTERM);
-        service.Daemon().Wait();
-        while (USBModemClient().IsServerReady()) {
-        }
-        return Milliseconds(end - begin);
-    });
-    std::printf("%-34s %8.1f ms\n", "start to name owned", start);
+        Process service(Command());
+        AwaitName(bus, true);
+        times.push_back(Milliseconds(Clock::now() - begin));
+        service.Signal(SIGTERM);
+        service.Wait();
+        AwaitName(bus, false);
+    }
+    Print("start_to_name", Median(times), "ms");
+    dbus_connection_close(bus);
+    dbus_connection_unref(bus);
 }
 
 void PrintPlugging() {
-    ModemService service;
-    const double ready = Median(3, [&service] {
+    ModemService service(Command());
+    std::vector<double> times;
+    for (int i = 0; i < 3; ++i) {
         const auto begin = Clock::now();
         ModemSimulator simulator({"--modem", "12d1,ports=dial/at"});
         service.Lists({"usbmodem0"});
-        const auto end = Clock::now();
+        times.push_back(Milliseconds(Clock::now() - begin));
         simulator.Unplug("0");
         service.Lists({});
-        return Milliseconds(end - begin);
-    });
-    std::printf("%-34s %8.1f ms\n", "info file to ready", ready);
+    }
+    Print("info_file_to_ready", Median(times), "ms");
 }
 
 // A value of the process's smaps_rollup, in MB.
@@ -111,40 +163,85 @@ double Memory(pid_t process, const std::string& name) {
     throw std::runtime_error("no " + name);
 }
 
-void PrintMemory(int modems) {
-    std::vector<std::string> arguments;
-    std::vector<std::string> devids;
-    for (int i = 0; i < modems; ++i) {
-        arguments.insert(arguments.end(), {"--modem", "12d1,ports=dial/at"});
-        devids.push_back("usbmodem" + std::to_string(i));
+// The service with so many modems, each asked everything once.
+struct ServiceWith {
+    explicit ServiceWith(int modems) : service(Command()) {
+        std::vector<std::string> arguments;
+        std::vector<std::string> devids;
+        for (int i = 0; i < modems; ++i) {
+            arguments.insert(arguments.end(), {"--modem", "12d1,ports=dial/at"});
+            devids.push_back("usbmodem" + std::to_string(i));
+        }
+        if (modems > 0) {
+            simulator.emplace(arguments);
+        }
+        for (int tries = 0; tries < 3 && !service.Lists(devids); ++tries) {
+        }
+        std::string document;
+        for (const std::string& devid : devids) {
+            USBModemClient().GetUSBModem(devid, document);
+        }
     }
-    std::optional<ModemSimulator> simulator;  // it would make one modem of no argument
-    if (modems > 0) {
-        simulator.emplace(arguments);
-    }
+
     ModemService service;
-    for (int tries = 0; tries < 3 && !service.Lists(devids); ++tries) {
+    std::optional<ModemSimulator> simulator;  // it would make one modem of no argument
+};
+
+// "Anonymous" is what the process has written to; of "Private_Dirty" the pages of a library that was
+// just built are a part, until they are on the disk.
+void PrintMemory() {
+    for (const int modems : {0, 1, 8}) {
+        ServiceWith with(modems);
+        const pid_t process = with.service.Daemon().Pid();
+        const std::string name = "memory_" + std::to_string(modems) + "_modems_";
+        Print(name + "resident", Memory(process, "Rss"), "MB");
+        Print(name + "written", Memory(process, "Anonymous"), "MB");
+        Print(name + "unique", Memory(process, "Private_Clean") + Memory(process, "Private_Dirty"),
+              "MB");
     }
-    std::string document;
-    for (const std::string& devid : devids) {
-        USBModemClient().GetUSBModem(devid, document);
+}
+
+// How often the threads of a process have waited for something.
+long Waits(pid_t process) {
+    long waits = 0;
+    for (const auto& thread :
+         std::filesystem::directory_iterator("/proc/" + std::to_string(process) + "/task")) {
+        std::ifstream file(thread.path() / "status");
+        for (std::string line; std::getline(file, line);) {
+            if (line.rfind("voluntary_ctxt_switches:", 0) == 0) {
+                waits += std::stol(line.substr(line.find(':') + 1));
+            }
+        }
     }
-    const pid_t process = service.Daemon().Pid();
-    std::printf(
-        "memory with %d modems: resident %.1f MB, its share of shared pages counted %.1f MB, its "
-        "own %.1f MB\n",
-        modems, Memory(process, "Rss"), Memory(process, "Pss"), Memory(process, "Private_Dirty"));
+    return waits;
+}
+
+// Without anybody who listens.
+void PrintWakeups() {
+    for (const int modems : {0, 1}) {
+        ServiceWith with(modems);
+        const pid_t process = with.service.Daemon().Pid();
+        std::this_thread::sleep_for(std::chrono::seconds(10));  // until its first look is over
+        const long before = Waits(process);
+        std::this_thread::sleep_for(std::chrono::minutes(1));
+        Print("wakeups_" + std::to_string(modems) + "_modems",
+              static_cast<double>(Waits(process) - before), "per_minute");
+    }
 }
 
 }  // namespace
 
-int main() {
+int main(int argc, char** argv) {
     taviwireless::EnterApplianceRoot();
     PrivateBus bus;
-    PrintRoundTrips();
-    PrintStart();
-    PrintPlugging();
-    for (const int modems : {0, 1, 8}) {
-        PrintMemory(modems);
+    const std::pair<const char*, void (*)()> kParts[] = {{"calls", PrintCalls},
+                                                         {"start", PrintStart},
+                                                         {"plugging", PrintPlugging},
+                                                         {"memory", PrintMemory},
+                                                         {"wakeups", PrintWakeups}};
+    for (const auto& [name, print] : kParts) {
+        if (argc < 2 || std::strcmp(argv[1], name) == 0) {
+            print();
+        }
     }
 }
