@@ -126,7 +126,7 @@ TEST(Usbmodemd, FeedsTheWatchdogOfTheServiceManager) {
 
 // The most processes that look for a modem's ports at the same time, until all have looked once.
 TEST(Usbmodemd, LooksForFewModemsAtATime) {
-    constexpr int kModems = 8;
+    constexpr int kModems = 20;
     std::vector<std::string> modems;
     for (int i = 0; i < kModems; ++i) {
         modems.insert(modems.end(), {"--modem", "generic,ports=dial/mute,fault=silent"});
@@ -145,7 +145,7 @@ TEST(Usbmodemd, LooksForFewModemsAtATime) {
         using Words = std::istream_iterator<std::string>;
         most = std::max(most, std::distance(Words(children), Words()));
     }
-    EXPECT_EQ(most, 4);
+    EXPECT_EQ(most, 16);
 }
 
 }  // namespace
