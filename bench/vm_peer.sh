@@ -1,14 +1,11 @@
 #!/bin/bash
 # SPDX-License-Identifier: MIT
 # What scripts/test-vm peer runs: the modem service and ModemManager in turns, with the same modem in the same guest. Each
-# is started, has the modem plugged in and out, and is ended. Prints samples for bench/compare/report. The file
-# build/compare/turns says how many turns.
-# shellcheck source=tests/vm/common.sh
-. "$(dirname "$0")/../tests/vm/common.sh"
+# is started, has the modem plugged in and out, and is ended.
+# shellcheck source=bench/vm_samples.sh
+. "$(dirname "$0")/vm_samples.sh"
 # shellcheck source=tests/vm/gadget.sh
 . "$(dirname "$0")/../tests/vm/gadget.sh"
-turns=$(cat "$checkout/build/compare/turns" 2>/dev/null || echo 1)
-samples=/run/samples
 
 our_bus() {
     gdbus call --session -d com.merilond.usbmodem -o / -m com.merilond.usbmodem.GetUSBModemList
@@ -31,20 +28,10 @@ they_list_none() {
 }
 # What is listed first has not been looked at.
 we_know() {
-    gdbus call --session -d com.merilond.usbmodem.Objects -o /com/merilond/usbmodem \
-        -m org.freedesktop.DBus.ObjectManager.GetManagedObjects | grep LastLook | grep -qv "'LastLook': <uint64 0>"
-}
-
-sample() { # ROW UNIT WHOSE VALUE
-    printf 'SAMPLE\tvirtual machine: %s\t%s\t%s\t%s\n' "$@" >>$samples
-}
-
-# take ROW WHOSE COMMAND...: samples how long the command takes.
-take() {
-    local row=$1 whose=$2 start=$EPOCHREALTIME
-    shift 2
-    "$@" >/dev/null
-    sample "$row" s "$whose" "$(awk "BEGIN { print $EPOCHREALTIME - $start }")"
+    local objects
+    objects=$(gdbus call --session -d com.merilond.usbmodem.Objects -o /com/merilond/usbmodem \
+        -m org.freedesktop.DBus.ObjectManager.GetManagedObjects)
+    [[ $objects = *LastLook* && $objects != *"'LastLook': <uint64 0>"* ]]
 }
 
 measure() { # WHOSE PROGRAM LISTED KNOWN GONE LIST
@@ -53,8 +40,8 @@ measure() { # WHOSE PROGRAM LISTED KNOWN GONE LIST
     wait_for 60 "$4"
     # shellcheck disable=SC2086 # words of a command
     take "command line: list, with a modem" "$1" $6
-    sample "daemon: resident memory, with a modem" MB "$1" \
-        "$(awk '$1 == "VmRSS:" { print $2 / 1024 }' "/proc/$(pgrep -x "$2")/status")"
+    sample "daemon: resident memory, with a modem" "$1" \
+        "$(awk '$1 == "VmRSS:" { print $2 / 1024 }' "/proc/$(pgrep -x "$2")/status")" MB
     unplug
     take "unplug to noticed" "$1" wait_for 60 "$5"
     pkill -x "$2"
@@ -62,7 +49,6 @@ measure() { # WHOSE PROGRAM LISTED KNOWN GONE LIST
 }
 
 turn() {
-    : >$samples
     usbmodemd
     measure taviwireless usbmodemd we_list we_know we_list_none "taviwireless modem list"
     their_bus >/dev/null # starts it
@@ -83,8 +69,4 @@ set_up() {
 
 DBUS_SESSION_BUS_ADDRESS=$(dbus-daemon --session --fork --print-address)
 export DBUS_SESSION_BUS_ADDRESS
-scenario "a modem for both" set_up
-for ((n = 1; n <= turns && scenario_status == 0; n++)); do
-    scenario "turn $n of $turns" turn
-    [ "$scenario_status" != 0 ] || cat $samples
-done
+in_turns set_up turn
