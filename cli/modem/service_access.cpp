@@ -183,7 +183,8 @@ class ServiceAccess : public ModemAccess {
     }
 
     std::string LogFile(const ModemState& state) override {
-        return TextProperty(state.id, "LogFile");
+        const auto known = objects_.Read();
+        return known && known->count(state.id) != 0 ? known->at(state.id).logFile : "";
     }
 
     Connection LookAtConnection(const std::string& id) override {

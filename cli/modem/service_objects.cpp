@@ -1,8 +1,7 @@
 // SPDX-License-Identifier: MIT
 #include "cli/modem/service_objects.h"
 
-#include <cstring>
-
+#include "cli/modem/session_bus.h"
 #include "cli/terminal.h"
 #include "usbmodem/rules/objects.h"
 
@@ -12,38 +11,43 @@ namespace {
 
 namespace objects = usbmodem_lib::objects;
 
-struct Unreference {
-    void operator()(GVariant* value) const { g_variant_unref(value); }
-};
-using Variant = std::unique_ptr<GVariant, Unreference>;
+using Properties = std::map<std::string, DBusMessageIter>;
 
-std::string TextOf(GVariant* properties, const char* name) {
-    const char* text = "";
-    g_variant_lookup(properties, name, "&s", &text);
-    return text;
+// The value of a property, if it is of this type.
+template <typename Value>
+Value ValueOf(const Properties& properties, const char* name, int type, Value value) {
+    const auto place = properties.find(name);
+    if (place != properties.end()) {
+        DBusMessageIter found = place->second;
+        if (dbus_message_iter_get_arg_type(&found) == type) {
+            dbus_message_iter_get_basic(&found, &value);
+        }
+    }
+    return value;
 }
 
-std::vector<std::string> TextsOf(GVariant* properties, const char* name) {
-    const Variant value(g_variant_lookup_value(properties, name, G_VARIANT_TYPE_STRING_ARRAY));
+std::string TextOf(const Properties& properties, const char* name) {
+    return ValueOf(properties, name, DBUS_TYPE_STRING, "");
+}
+
+bool IsSet(const Properties& properties, const char* name) {
+    return ValueOf<dbus_bool_t>(properties, name, DBUS_TYPE_BOOLEAN, FALSE) != FALSE;
+}
+
+std::vector<std::string> TextsOf(const Properties& properties, const char* name) {
     std::vector<std::string> texts;
-    for (gsize i = 0; value && i < g_variant_n_children(value.get()); ++i) {
-        const char* text = nullptr;
-        g_variant_get_child(value.get(), i, "&s", &text);
-        texts.emplace_back(text);
+    const auto place = properties.find(name);
+    if (place != properties.end()) {
+        ForEachText(place->second, [&](const char* text) { texts.emplace_back(text); });
     }
     return texts;
 }
 
-bool IsSet(GVariant* properties, const char* name) {
-    gboolean value = FALSE;
-    g_variant_lookup(properties, name, "b", &value);
-    return value;
-}
-
-KnownModem ReadProperties(const std::string& id, GVariant* properties) {
+KnownModem ReadProperties(const std::string& id, const Properties& properties) {
     KnownModem modem;
     modem.answers = IsSet(properties, "Answers");
-    g_variant_lookup(properties, "LastLook", "t", &modem.lastLook);
+    modem.lastLook = ValueOf<dbus_uint64_t>(properties, "LastLook", DBUS_TYPE_UINT64, 0);
+    modem.logFile = TextOf(properties, "LogFile");
     ModemState& state = modem.state;
     state.id = id;
     state.imsi = TextOf(properties, "Imsi");
@@ -56,105 +60,89 @@ KnownModem ReadProperties(const std::string& id, GVariant* properties) {
     state.netStatus = TextOf(properties, "NetState");
     state.simStatus = TextOf(properties, "SimState");
     state.pinProtected = IsSet(properties, "PinLock");
-    guint signal = 0;
-    g_variant_lookup(properties, "Signal", "u", &signal);
-    state.signal = static_cast<int>(signal);
-    g_variant_lookup(properties, "PinAttempts", "i", &state.pinRemains);
-    g_variant_lookup(properties, "PukAttempts", "i", &state.pukRemains);
+    state.signal =
+        static_cast<int>(ValueOf<dbus_uint32_t>(properties, "Signal", DBUS_TYPE_UINT32, 0));
+    state.pinRemains = ValueOf(properties, "PinAttempts", DBUS_TYPE_INT32, state.pinRemains);
+    state.pukRemains = ValueOf(properties, "PukAttempts", DBUS_TYPE_INT32, state.pukRemains);
     return modem;
 }
 
 }  // namespace
 
-ServiceObjects::~ServiceObjects() {
-    for (const guint watch : watches_) {
-        g_dbus_connection_signal_unsubscribe(connection_.get(), watch);
-    }
-}
-
 bool ServiceObjects::Connect() {
-    if (!connection_) {
-        connection_.reset(g_bus_get_sync(G_BUS_TYPE_SESSION, nullptr, nullptr));
-        if (connection_) {
-            g_dbus_connection_set_exit_on_close(connection_.get(), FALSE);
-        }
+    BusFailure failure;
+    if (!bus_ && FindSessionBus()) {
+        bus_ = ConnectToBus(failure);
     }
-    return connection_ != nullptr;
+    return bus_ != nullptr;
 }
 
 std::optional<std::map<std::string, KnownModem>> ServiceObjects::Read() {
-    if (!Connect()) {
-        return std::nullopt;
-    }
-    const Variant reply(g_dbus_connection_call_sync(
-        connection_.get(), objects::kService, objects::kManager,
-        "org.freedesktop.DBus.ObjectManager", "GetManagedObjects", nullptr,
-        G_VARIANT_TYPE("(a{oa{sa{sv}}})"), G_DBUS_CALL_FLAGS_NO_AUTO_START, -1, nullptr, nullptr));
+    BusFailure failure;
+    const Message call = NewCall(objects::kService, objects::kManager,
+                                 "org.freedesktop.DBus.ObjectManager", "GetManagedObjects");
+    dbus_message_set_auto_start(call.get(), FALSE);
+    const Message reply = Connect() ? Ask(bus_.get(), call, "a{oa{sa{sv}}}", failure) : nullptr;
     if (!reply) {
         return std::nullopt;
     }
     std::map<std::string, KnownModem> modems;
-    const Variant all(g_variant_get_child_value(reply.get(), 0));
-    GVariantIter next;
-    g_variant_iter_init(&next, all.get());
-    const char* path = nullptr;
-    GVariant* interfaces = nullptr;
-    while (g_variant_iter_loop(&next, "{&o@a{sa{sv}}}", &path, &interfaces)) {
-        const Variant properties(
-            g_variant_lookup_value(interfaces, objects::kModem, G_VARIANT_TYPE("a{sv}")));
-        if (properties) {
-            const std::string id = strrchr(path, '/') + 1;
-            modems[id] = ReadProperties(id, properties.get());
-        }
-    }
+    ForEachEntry(Content(reply), [&](const std::string& path, DBusMessageIter interfaces) {
+        ForEachEntry(interfaces, [&](const std::string& interface, DBusMessageIter values) {
+            if (interface == objects::kModem) {
+                Properties properties;
+                ForEachEntry(values, [&](const std::string& name, DBusMessageIter variant) {
+                    dbus_message_iter_recurse(&variant, &properties[name]);
+                });
+                const std::string id = path.substr(path.rfind('/') + 1);
+                modems[id] = ReadProperties(id, properties);
+            }
+        });
+    });
     return modems;
 }
 
 std::string ServiceObjects::Command(const std::string& id, const std::string& command) {
-    GError* error = nullptr;
-    const Variant reply(
-        Connect() ? g_dbus_connection_call_sync(
-                        connection_.get(), objects::kService,
-                        (std::string(objects::kManager) + '/' + id).c_str(), objects::kModem,
-                        "Command", g_variant_new("(s)", command.c_str()), G_VARIANT_TYPE("(s)"),
-                        G_DBUS_CALL_FLAGS_NO_AUTO_START, G_MAXINT, nullptr, &error)
-                  : nullptr);
+    BusFailure failure;
+    const Message call = NewCall(objects::kService, std::string(objects::kManager) + '/' + id,
+                                 objects::kModem, "Command", {command});
+    dbus_message_set_auto_start(call.get(), FALSE);
+    const Message reply =
+        Connect() ? Ask(bus_.get(), call, "s", failure, DBUS_TIMEOUT_INFINITE) : nullptr;
     if (reply) {
         const char* text = nullptr;
-        g_variant_get(reply.get(), "(&s)", &text);
+        dbus_message_get_args(reply.get(), nullptr, DBUS_TYPE_STRING, &text, DBUS_TYPE_INVALID);
         return text;
     }
-    const std::unique_ptr<GError, void (*)(GError*)> failure(error, g_error_free);
-    char* remote = failure ? g_dbus_error_get_remote_error(failure.get()) : nullptr;
-    const std::string name = remote != nullptr ? remote : "";
-    g_free(remote);
+    const std::string name = failure.error.name != nullptr ? failure.error.name : "";
     if (name.rfind("com.merilond.usbmodem.Error.", 0) != 0) {
         throw CommandError(kUsage,
                            "this modem service sends no AT commands; end it, and add --direct");
     }
-    g_dbus_error_strip_remote_error(failure.get());
     const bool isBusy = name.rfind("Busy") != std::string::npos;
-    throw CommandError(isBusy ? kBusy : kFailure, Printable(failure->message));
+    throw CommandError(isBusy ? kBusy : kFailure, failure.Text());
 }
 
+// All signals that come are of what was asked for.
 void ServiceObjects::WaitForChange() {
-    if (watches_.empty()) {
-        const auto watch = [this](const char* sender, const char* interface, const char* argument) {
-            watches_.push_back(g_dbus_connection_signal_subscribe(
-                connection_.get(), sender, interface, nullptr, nullptr, argument,
-                G_DBUS_SIGNAL_FLAGS_NONE,
-                [](GDBusConnection*, const char*, const char*, const char*, const char*, GVariant*,
-                   gpointer self) { static_cast<ServiceObjects*>(self)->hasChanged_ = true; },
-                this, nullptr));
-        };
-        watch(objects::kService, nullptr, nullptr);
-        watch("org.freedesktop.DBus", "org.freedesktop.DBus", objects::kService);
+    if (!isWatching_) {
+        isWatching_ = true;
+        for (const char* wanted :
+             {"type='signal',sender='com.merilond.usbmodem.Objects'",
+              "type='signal',sender='org.freedesktop.DBus',interface='org.freedesktop.DBus',"
+              "arg0='com.merilond.usbmodem.Objects'"}) {
+            dbus_bus_add_match(bus_.get(), wanted, nullptr);
+        }
+        dbus_connection_flush(bus_.get());
         return;
     }
-    while (!hasChanged_ && !g_dbus_connection_is_closed(connection_.get())) {
-        g_main_context_iteration(nullptr, TRUE);
-    }
-    hasChanged_ = false;
+    constexpr int kNoTimeout = -1;
+    bool hasChanged = false;
+    do {
+        while (const Message signal{dbus_connection_pop_message(bus_.get())}) {
+            hasChanged = true;
+        }
+    } while (!hasChanged && dbus_connection_read_write(bus_.get(), kNoTimeout));
 }
 
 }  // namespace taviwireless::cli

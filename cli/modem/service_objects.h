@@ -2,21 +2,19 @@
 #ifndef TAVIWIRELESS_CLI_MODEM_SERVICE_OBJECTS_H
 #define TAVIWIRELESS_CLI_MODEM_SERVICE_OBJECTS_H
 
-#include <gio/gio.h>
-
 #include <cstdint>
 #include <map>
-#include <memory>
 #include <optional>
 #include <string>
-#include <vector>
 
+#include "cli/modem/bus.h"
 #include "cli/modem/modem_access.h"
 
 namespace taviwireless::cli {
 
 struct KnownModem {
     ModemState state;  // without the profile
+    std::string logFile;
     bool answers = false;
     std::uint64_t lastLook = 0;  // Unix time; 0: never
 };
@@ -25,11 +23,6 @@ struct KnownModem {
 // asked, and nobody waits.
 class ServiceObjects {
   public:
-    ServiceObjects() = default;
-    ~ServiceObjects();
-    ServiceObjects(const ServiceObjects&) = delete;
-    ServiceObjects& operator=(const ServiceObjects&) = delete;
-
     // All that are plugged in, by device id; nothing when there is no service, or one without such
     // objects.
     std::optional<std::map<std::string, KnownModem>> Read();
@@ -45,12 +38,8 @@ class ServiceObjects {
   private:
     bool Connect();
 
-    struct Release {
-        void operator()(gpointer object) const { g_object_unref(object); }
-    };
-    std::unique_ptr<GDBusConnection, Release> connection_;
-    std::vector<guint> watches_;
-    bool hasChanged_ = false;
+    Bus bus_;
+    bool isWatching_ = false;
 };
 
 }  // namespace taviwireless::cli

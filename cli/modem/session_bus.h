@@ -20,9 +20,6 @@ void HangUpByBus(const std::string& id);
 // to start where it knows how. Returns whether it was started now. Throws CommandError.
 bool RequireService();
 
-// A property of the service's object of a modem; empty when it cannot be had.
-std::string TextProperty(const std::string& id, const char* property);
-
 }  // namespace taviwireless::cli
 
 #endif
