@@ -8,7 +8,9 @@
 
 #include <algorithm>
 #include <iostream>
+#include <iterator>
 #include <new>
+#include <string>
 
 #include "cli/command_error.h"
 #include "cli/command_lines.h"
@@ -21,6 +23,7 @@ namespace taviwireless::cli {
 
 namespace {
 
+constexpr char kAllGroups[] = "";
 constexpr char kFooter[] =
     "taviwireless help COMMAND tells more of a command.\n"
     "With --json, a failure is {\"error\": SENTENCE} on standard output.\n"
@@ -34,7 +37,17 @@ constexpr char kFooter[] =
     "  4  busy: it has a connection already, or is connecting\n"
     "  5  the modem service is not running\n";
 
-void Define(const Command& program, Options& options) {
+struct Group {
+    const char* name;
+    void (*add)(const Command& program, Options& options);
+};
+constexpr Group kGroups[] = {{"modem", AddModemCommands},
+                             {"wifi", AddWifiCommands},
+                             {"ap", AddAPCommands},
+                             {"doctor", AddDoctorCommand}};
+
+// All groups, or the one of this name.
+void Define(const Command& program, Options& options, const std::string& only) {
     program.SetVersion("taviwireless " TAVI_VERSION);
     program.AddFlag("--json", options.json, "Print JSON instead of text");
     program
@@ -51,10 +64,11 @@ void Define(const Command& program, Options& options) {
         },
         "Show what is done, and the library's log, on standard error");
     program.RequireCommand();
-    AddModemCommands(program, options);
-    AddWifiCommands(program, options);
-    AddAPCommands(program, options);
-    AddDoctorCommand(program, options);
+    for (const Group& group : kGroups) {
+        if (only.empty() || only == group.name) {
+            group.add(program, options);
+        }
+    }
     program.AddCompletion("complete-words", CompletedArguments());
     program.SetFooter(kFooter);  // of the program's help alone
 }
@@ -70,12 +84,32 @@ void RequireOutput() {
     }
 }
 
+void Read(int argc, char** argv, Options& options, const std::string& only) {
+    ReadCommandLine(argc, argv, "taviwireless",
+                    "Wireless connectivity of the appliance: USB modems and Wi-Fi",
+                    [&](const Command& program) { Define(program, options, only); });
+}
+
+// To describe the other groups would take a fifth of the start.
+void ReadQuickly(int argc, char** argv, Options& options) {
+    const std::string first = argc > 1 ? argv[1] : "";
+    const bool isGroup = std::any_of(std::begin(kGroups), std::end(kGroups),
+                                     [&](const Group& group) { return first == group.name; });
+    if (!isGroup && first != "--version") {
+        Read(argc, argv, options, kAllGroups);
+        return;
+    }
+    try {
+        Read(argc, argv, options, first);
+    } catch (const UsageError&) {
+        Read(argc, argv, options, kAllGroups);  // fails as well, and knows where else a command is
+    }
+}
+
 void RunCommandLine(int argc, char** argv, Options& options) {
     try {
         RequireOutput();
-        ReadCommandLine(argc, argv, "taviwireless",
-                        "Wireless connectivity of the appliance: USB modems and Wi-Fi",
-                        [&](const Command& program) { Define(program, options); });
+        ReadQuickly(argc, argv, options);
         FlushOutput();
     } catch (const UsageError& error) {
         options.json = std::count(argv, argv + argc, std::string("--json")) > 0;
