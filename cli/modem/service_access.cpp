@@ -302,7 +302,13 @@ class ServiceAccess : public ModemAccess {
     }
 
     ModemState ReadyModem(const std::string& id, bool withProfile) override {
-        if (!known_ || !IsRecent(known_->at(id))) {
+        if (known_ && !IsRecent(known_->at(id))) {
+            ShowProgress("Asking " + id + " ...");
+            if (objects_.Look(id)) {
+                known_ = objects_.Read();
+            }
+        }
+        if (!known_ || known_->count(id) == 0 || !IsRecent(known_->at(id))) {
             ModemState state = Look(id);
             AddDetails(state);
             return state;

@@ -102,14 +102,23 @@ std::optional<std::map<std::string, KnownModem>> ServiceObjects::Read() {
     return modems;
 }
 
+Message ServiceObjects::Call(const std::string& id, const char* method,
+                             const std::vector<std::string>& arguments, const char* signature,
+                             BusFailure& failure) {
+    const Message call = NewCall(objects::kService, std::string(objects::kManager) + '/' + id,
+                                 objects::kModem, method, arguments);
+    dbus_message_set_auto_start(call.get(), FALSE);
+    return Connect() ? Ask(bus_.get(), call, signature, failure, DBUS_TIMEOUT_INFINITE) : nullptr;
+}
+
+bool ServiceObjects::Look(const std::string& id) {
+    BusFailure failure;
+    return Call(id, "Look", {}, "", failure) != nullptr;
+}
+
 std::string ServiceObjects::Command(const std::string& id, const std::string& command) {
     BusFailure failure;
-    const Message call = NewCall(objects::kService, std::string(objects::kManager) + '/' + id,
-                                 objects::kModem, "Command", {command});
-    dbus_message_set_auto_start(call.get(), FALSE);
-    const Message reply =
-        Connect() ? Ask(bus_.get(), call, "s", failure, DBUS_TIMEOUT_INFINITE) : nullptr;
-    if (reply) {
+    if (const Message reply = Call(id, "Command", {command}, "s", failure)) {
         const char* text = nullptr;
         dbus_message_get_args(reply.get(), nullptr, DBUS_TYPE_STRING, &text, DBUS_TYPE_INVALID);
         return text;

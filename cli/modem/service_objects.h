@@ -19,13 +19,16 @@ struct KnownModem {
     std::uint64_t lastLook = 0;  // Unix time; 0: never
 };
 
-// The modems as the objects of the modem service show them (daemon/modem_objects.xml): nobody is
-// asked, and nobody waits.
+// The modems as the objects of the modem service show them (daemon/modem_objects.xml).
 class ServiceObjects {
   public:
-    // All that are plugged in, by device id; nothing when there is no service, or one without such
-    // objects.
+    // All that are plugged in, by device id, without asking them; nothing when there is no service,
+    // or one without such objects.
     std::optional<std::map<std::string, KnownModem>> Read();
+
+    // Has the service ask one of them everything, and waits until it has; whether all was answered.
+    // A look that goes on already is the one that is waited for.
+    bool Look(const std::string& id);
 
     // Has the service send one of them an AT command, and returns what it answers. Throws
     // CommandError.
@@ -37,6 +40,10 @@ class ServiceObjects {
 
   private:
     bool Connect();
+    // Null on failure.
+    Message Call(const std::string& id, const char* method,
+                 const std::vector<std::string>& arguments, const char* signature,
+                 BusFailure& failure);
 
     Bus bus_;
     bool isWatching_ = false;
