@@ -27,8 +27,8 @@ constexpr int kMostAtOnce = 16;
 
 // A port that does not answer takes 1.3 s, one that talks without end 2.5 s.
 constexpr unsigned int kLimitPerPort = 3;  // seconds
-// Seconds, for everything else: six exchanges with a modem that takes its time for each.
-constexpr unsigned int kLimit = 34;
+// Seconds, for everything else: a lock that nobody gives back, and six exchanges that take long.
+constexpr unsigned int kLimit = 39;
 
 int running = 0;
 std::vector<Probe*> waiting;

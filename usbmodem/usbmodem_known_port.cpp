@@ -16,6 +16,17 @@
 
 namespace taviwireless::usbmodem_lib {
 
+namespace {
+
+// A lock that its holder never gives back is free for this process from now on: otherwise the first
+// command would fail for it, and there is no second attempt.
+void PassLock(semaphore::Semaphore& lock) {
+    lock.Enter();
+    lock.Release();
+}
+
+}  // namespace
+
 std::string USBModem::GetQueryNode() const {
     return queryNode_;
 }
@@ -28,6 +39,7 @@ int USBModem::InitInfo(const std::string& queryNode) {
 }
 
 int USBModem::MakeReady(std::string& findings) {
+    PassLock(semaphore_);
     SetATInterface();
     std::string reply;
     if (!ReadConnectNode() || !FindQueryNode(reply) || !Prepare()) {
@@ -67,6 +79,7 @@ int USBModem::TakeOver(const std::string& findings) {
     if (values.size() < 2 || OpenFileDevice(values[0]) != 0) {
         return FailInit();
     }
+    PassLock(semaphore_);
     queryNode_ = values[0];
     simStatus_ = SimStatus(ToInt(values[1]));
     imsi_ = values.size() > 2 ? values[2] : "";
