@@ -1,5 +1,6 @@
 // SPDX-License-Identifier: MIT
 // The serial channel to the modem's AT port, and one command and its reply over it.
+#include <poll.h>
 #include <sys/file.h>
 #include <taviwireless/usbmodem.h>
 #include <wvmodem.h>
@@ -22,12 +23,14 @@ namespace taviwireless::usbmodem_lib {
 namespace {
 
 using std::chrono::milliseconds;
+using std::chrono::nanoseconds;
 using Clock = std::chrono::steady_clock;
 
 constexpr int kBaud = 9600;
 constexpr milliseconds kFirstByteWait{1000};  // until a reply begins
 constexpr milliseconds kReplyQuiet{200};      // without input: the reply has ended
 constexpr milliseconds kDrainQuiet{100};      // without input: the modem is quiet
+constexpr milliseconds kLastWait{2};          // of these, waited for by itself
 constexpr size_t kMaxReply = 1024;            // bytes
 // Bytes. What the line does not take at once would be kept, and sent for hours.
 constexpr size_t kMaxCommand = 1024;
@@ -37,14 +40,27 @@ constexpr milliseconds kReplyLimit{2000};
 
 enum class Input { kCame, kTimeOut, kHungUp };
 
+// Waits until there is input, or for a while, for patience at most. The kernel may stretch a wait by
+// a thousandth, so the last bit of a long one is waited for by itself, which takes more precision
+// than WvStreams has.
+bool WaitForInput(WvModem& modem, Clock::duration patience) {
+    milliseconds wait{0};
+    if (patience > kLastWait) {
+        wait = std::chrono::floor<milliseconds>(patience) - milliseconds(1);
+    } else if (patience > Clock::duration::zero()) {
+        pollfd port{modem.getrfd(), POLLIN, 0};
+        const timespec limit{0, static_cast<long>(nanoseconds(patience).count())};
+        ppoll(&port, 1, &limit, nullptr);
+    }
+    return modem.select(static_cast<time_t>(wait.count()), /*readable=*/true, /*writable=*/false);
+}
+
 // Waits for input and reads what has come behind text, at most kMaxReply bytes in all. Only the
 // deadline ends the wait: WvStreams' own wait is over at any signal that was caught.
 Input Receive(WvModem& modem, milliseconds patience, std::string& text) {
     const auto deadline = Clock::now() + patience;
     while (modem.isok()) {
-        const auto left = std::chrono::ceil<milliseconds>(deadline - Clock::now());
-        const auto wait = static_cast<time_t>(std::max(left, milliseconds::zero()).count());
-        if (modem.select(wait, /*readable=*/true, /*writable=*/false)) {
+        if (WaitForInput(modem, deadline - Clock::now())) {
             char buffer[kMaxReply];
             const size_t count = modem.read(buffer, kMaxReply - text.size());
             text.append(buffer, count);
