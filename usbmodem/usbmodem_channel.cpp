@@ -50,7 +50,9 @@ bool WaitForInput(WvModem& modem, Clock::duration patience) {
     } else if (patience > Clock::duration::zero()) {
         pollfd port{modem.getrfd(), POLLIN, 0};
         const timespec limit{0, static_cast<long>(nanoseconds(patience).count())};
-        ppoll(&port, 1, &limit, nullptr);
+        if (ppoll(&port, 1, &limit, nullptr) <= 0) {
+            return false;
+        }
     }
     return modem.select(static_cast<time_t>(wait.count()), /*readable=*/true, /*writable=*/false);
 }
