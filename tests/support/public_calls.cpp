@@ -373,7 +373,7 @@ std::vector<std::string> CommandCall::Argv() const {
         argv.insert(argv.begin() + 2, "--direct");
     }
     if (name == "modem watch" || name == "wifi watch") {
-        argv.insert(argv.begin(), {"timeout", "--preserve-status", "--signal=INT", "0.5"});
+        argv.insert(argv.begin(), {"timeout", "--preserve-status", "--signal=INT", "2"});
     }
     return WithShortWaits(argv);
 }

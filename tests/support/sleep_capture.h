@@ -10,8 +10,8 @@ namespace taviwireless::test {
 // Records the calls of sleep() while it lives; at most one may live at a time.
 //
 // A program linked with tavi_test_support defines sleep() itself, for the shared libraries it loads
-// as well: it returns 0 at once, with or without a SleepCapture, unless told otherwise. usleep(),
-// nanosleep() and waiting in poll() or select() stay as they are.
+// as well: it returns 0 at once, with or without a SleepCapture, unless told otherwise. ppoll()
+// waits 50 ms at most. usleep(), nanosleep() and waiting in poll() or select() stay as they are.
 class SleepCapture {
   public:
     // Called with the seconds at each sleep, after it was recorded and in the thread that sleeps:

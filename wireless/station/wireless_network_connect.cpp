@@ -8,11 +8,11 @@
 #include <taviwireless/wireless.h>
 
 #include <algorithm>
+#include <cerrno>
 #include <chrono>
 #include <cstring>
 #include <sstream>
 #include <string>
-#include <thread>
 
 #include "base/sleep_out.h"
 #include "base/trusted_file.h"
@@ -75,22 +75,28 @@ bool IsAssociated() {
            strcmp(state, "COMPLETED") == 0;
 }
 
-// Waits a second, or until the supplicant tells that it is connected.
-void AwaitConnection(const UniqueFd& events) {
-    using std::chrono::milliseconds;
+// Waits a second, or until the supplicant tells that it is connected. Closes events once it has ended.
+void AwaitConnection(UniqueFd& events) {
+    using std::chrono::nanoseconds;
     using Clock = std::chrono::steady_clock;
     const auto end = Clock::now() + std::chrono::seconds(1);
     char text[2048] = "";
-    for (milliseconds left(1000); left.count() > 0 && strstr(text, "EVENT-CONNECTED") == nullptr;
-         left = std::chrono::ceil<milliseconds>(end - Clock::now())) {
+    for (nanoseconds left = std::chrono::seconds(1);
+         left.count() > 0 && strstr(text, "EVENT-CONNECTED") == nullptr;
+         left = end - Clock::now()) {
         pollfd event{events.Get(), POLLIN, 0};
-        if (poll(&event, 1, static_cast<int>(left.count())) > 0) {
-            const ssize_t size = recv(events.Get(), text, sizeof text - 1, MSG_DONTWAIT);
-            text[std::max<ssize_t>(size, 0)] = '\0';
-            if (size <= 0) {  // the supplicant has ended
-                std::this_thread::sleep_until(end);
-            }
+        constexpr long kSecond = 1000000000;  // ns
+        const timespec limit{left.count() / kSecond, left.count() % kSecond};
+        if (ppoll(&event, 1, &limit, nullptr) == 0) {
+            return;
         }
+        const ssize_t size = recv(events.Get(), text, sizeof text - 1, MSG_DONTWAIT);
+        if (size == 0 || (size < 0 && errno != EAGAIN)) {
+            events.Close();
+            SleepOut(1);
+            return;
+        }
+        text[std::max<ssize_t>(size, 0)] = '\0';
     }
 }
 
