@@ -92,8 +92,8 @@ void SessionBus::Serve() {
                 return G_SOURCE_REMOVE;
             },
             this);
-        busySince_ = Clock::now();
     }
+    began_ = Clock::now();
 }
 
 DBusHandlerResult SessionBus::Look(DBusConnection* /*connection*/, DBusMessage* message,
@@ -105,8 +105,8 @@ DBusHandlerResult SessionBus::Look(DBusConnection* /*connection*/, DBusMessage* 
     if (dbus_message_get_type(message) != DBUS_MESSAGE_TYPE_METHOD_CALL) {
         return DBUS_HANDLER_RESULT_NOT_YET_HANDLED;
     }
-    // One that comes right behind another has not, and asking the bus would take it as long again.
-    const bool hasWaited = self->idle_ != 0 && Clock::now() - self->busySince_ > kShortWait;
+    // Behind a short call nobody has: to ask the bus would take as long as most calls.
+    const bool hasWaited = self->idle_ != 0 && Clock::now() - self->began_ > kShortWait;
     const char* caller = dbus_message_get_sender(message);
     // A caller that wants no reply may leave before it is served.
     if (hasWaited && caller != nullptr && dbus_message_get_no_reply(message) == FALSE &&

@@ -37,10 +37,10 @@ class SessionBus {
     std::function<void()> onServed_;
     std::function<void()> onLost_;
     DBusConnection* connection_;
-    unsigned int served_ = 0;      // GLib source, while one is waiting
-    unsigned int idle_ = 0;        // GLib source; while there is one, calls have been waiting
-    Clock::time_point busySince_;  // when the first of those calls came
-    std::string gone_;             // the last caller that had left; names are never used again
+    unsigned int served_ = 0;  // GLib source, while one is waiting
+    unsigned int idle_ = 0;    // GLib source; while there is one, calls have been waiting
+    Clock::time_point began_;  // when the last call that was served came
+    std::string gone_;         // the last caller that had left; names are never used again
 };
 
 }  // namespace taviwireless::daemon
