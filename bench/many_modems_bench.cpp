@@ -60,9 +60,9 @@ double WakeUps(const fs::path& process) {
 }
 
 double ListCall() {
+    taviwireless::dbus::USBModemClient client;
     std::vector<double> times;
     for (int i = 0; i < 501; ++i) {
-        taviwireless::dbus::USBModemClient client;
         std::string list;
         const auto begin = Clock::now();
         if (client.GetUSBModemList(list) != 0) {
