@@ -85,8 +85,9 @@ void AwaitConnection(UniqueFd& events) {
          left.count() > 0 && strstr(text, "EVENT-CONNECTED") == nullptr;
          left = end - Clock::now()) {
         pollfd event{events.Get(), POLLIN, 0};
-        constexpr long kSecond = 1000000000;  // ns
-        const timespec limit{left.count() / kSecond, left.count() % kSecond};
+        const auto seconds = std::chrono::floor<std::chrono::seconds>(left);
+        const timespec limit{static_cast<time_t>(seconds.count()),
+                             static_cast<long>((left - seconds).count())};
         if (ppoll(&event, 1, &limit, nullptr) == 0) {
             return;
         }
