@@ -56,6 +56,8 @@ turn() {
 }
 
 set_up() {
+    # The packages keep ModemManager off these modems.
+    sed -i 's/\({ID_MM_DEVICE_IGNORE}=\)"1"/\1"0"/' /usr/lib/udev/rules.d/90-taviwireless.rules
     make_gadget
     unplug || true # by the group before, perhaps
     pkill -x usbmodemd || true
@@ -65,6 +67,8 @@ set_up() {
     mkdir -p /run/dbus
     dbus-daemon --system --fork
     wait_for 20 their_bus
+    pkill -x ModemManager
+    wait_for 10 ended ModemManager
 }
 
 DBUS_SESSION_BUS_ADDRESS=$(dbus-daemon --session --fork --print-address)
