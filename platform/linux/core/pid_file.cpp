@@ -17,9 +17,10 @@ struct ProcessStatus {
     std::string startTime;  // clock ticks since boot
 };
 
-// Throws when there is no such process.
+// Throws when there is no such process. The file is opened in its folder: what a process reads of
+// itself by the whole path, the emulator of another processor makes up.
 ProcessStatus ReadStatus(const std::string& pid) {
-    const std::string text = ReadText(("/proc/" + pid + "/stat").c_str());
+    const std::string text = TextFile(FindPlace(("/proc/" + pid + "/stat").c_str())).Read();
     // The program's name, in brackets, may hold blanks and brackets itself.
     const size_t state = text.rfind(')') + 2;
     constexpr int kFieldsToStartTime = 19;  // from the state (field 3) to the start time (field 22)
